@@ -1,0 +1,27 @@
+# callcontrol_folder(LIBRARY lib [PREFIX sub] HEADERS ... SOURCES ... [TESTS ...])
+#
+# One folder of the tree: its sources go into LIBRARY, its headers are installed under include/callcontrol/ at the path
+# by which they are included, and its tests (files named after the class that they test) become one executable,
+# <folder>_test. Files are listed explicitly.
+function(callcontrol_folder)
+    cmake_parse_arguments(PARSE_ARGV 0 ARG "" "LIBRARY" "HEADERS;SOURCES;TESTS")
+    file(RELATIVE_PATH folder ${PROJECT_SOURCE_DIR}/src ${CMAKE_CURRENT_SOURCE_DIR})
+    foreach(file IN LISTS ARG_SOURCES ARG_HEADERS)
+        target_sources(${ARG_LIBRARY} PRIVATE ${CMAKE_CURRENT_SOURCE_DIR}/${file})
+    endforeach()
+    foreach(file IN LISTS ARG_HEADERS)
+        get_filename_component(sub ${file} DIRECTORY)
+        install(FILES ${file} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/callcontrol/${folder}/${sub})
+    endforeach()
+    if(CALLCONTROL_BUILD_TESTS AND ARG_TESTS)
+        string(REPLACE "/" "_" name ${folder})
+        callcontrol_test(${name}_test ${ARG_TESTS})
+    endif()
+endfunction()
+
+# callcontrol_test(name files...): an executable of GoogleTest cases under our test main, each case known to ctest.
+function(callcontrol_test name)
+    add_executable(${name} ${ARGN})
+    target_link_libraries(${name} PRIVATE callcontrol_settings callcontrol-testing-main GTest::gmock)
+    gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 120 PROPERTIES TIMEOUT 120)
+endfunction()
