@@ -1,0 +1,83 @@
+#pragma once
+
+#include "platform/base/Export.h"
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+/// A text, held by value. It may contain NUL bytes; two strings are equal when their lengths and bytes are.
+///
+/// Memory that runs out throws std::bad_alloc; the library's operations catch it at their boundary.
+///
+///     String line;
+///     line.format("%u calls", calls).concatf(", %s", name.c_str());
+class CC_EXPORT String
+{
+public:
+    String() = default;
+    String(char const* text) ///< here and below a null pointer stands for the empty text
+        : m_text(TEXT_OF(text))
+    {
+    }
+    String(char const* text, std::size_t length) : m_text(text, length) {}
+    explicit String(std::string_view text) : m_text(text) {}
+
+    char const* c_str() const { return m_text.c_str(); }
+    std::size_t length() const { return m_text.size(); }
+    bool isEmpty() const { return m_text.empty(); }
+    std::string_view view() const { return m_text; }
+
+    String& operator+=(String const& other)
+    {
+        m_text += other.m_text;
+        return *this;
+    }
+    String& operator+=(char const* text)
+    {
+        m_text += TEXT_OF(text);
+        return *this;
+    }
+    void clear() { m_text.clear(); }
+
+    /// Replaces the content by the printf-style text.
+    String& format(char const* format, ...) __attribute__((format(printf, 2, 3)));
+    /// Appends the printf-style text.
+    String& concatf(char const* format, ...) __attribute__((format(printf, 2, 3)));
+
+    /// Whether the string begins with `prefix`; every string begins with the empty one.
+    bool startsWith(String const& prefix) const { return m_text.starts_with(prefix.m_text); }
+    /// Deletes up to `count` bytes from `position` on; a position past the end deletes nothing.
+    void deleteRegion(std::size_t position, std::size_t count);
+    /// Equality that takes the letters A to Z and a to z for the same.
+    bool equalsIgnoreCase(String const& other) const;
+
+    friend bool operator==(String const& left, String const& right) { return left.m_text == right.m_text; }
+    friend bool operator==(String const& left, char const* right) { return left.m_text == TEXT_OF(right); }
+    friend bool operator<(String const& left, String const& right) { return left.m_text < right.m_text; }
+    friend String operator+(String left, String const& right) { return left += right; }
+
+    static String stringOf(bool value); ///< "true" or "false"
+    static String stringOf(int value);
+    static String stringOf(unsigned int value);
+    static String stringOf(long value);
+    static String stringOf(unsigned long value);
+    static String stringOf(long long value);
+    static String stringOf(unsigned long long value);
+    /// A pointer would silently become a bool; `addressOf` prints one.
+    template <class T>
+    static String stringOf(T*) = delete;
+    /// The address as "%p" prints it.
+    static String addressOf(void const* object);
+
+    /// The empty string, for getters that return a reference. Ready before any other static initialiser runs.
+    static String const s_empty;
+
+private:
+    static char const* TEXT_OF(char const* text) { return text == nullptr ? "" : text; }
+
+    std::string m_text;
+};
+
+/// "true" or "false".
+CC_EXPORT char const* TRUE_FALSE(bool value);

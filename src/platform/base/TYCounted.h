@@ -1,0 +1,28 @@
+#pragma once
+
+#include "platform/base/Export.h"
+
+#include <atomic>
+
+/// The base of an object that lives as long as somebody holds a reference on it. Born with none (a TYPtr takes the
+/// first); the count is atomic, so references may be given up on any thread.
+class CC_EXPORT TYCounted
+{
+public:
+    TYCounted() = default;
+    TYCounted(TYCounted const&) = delete;
+    TYCounted& operator=(TYCounted const&) = delete;
+
+    void addReference() const { m_references.fetch_add(1, std::memory_order_relaxed); }
+    void removeReference() const
+    {
+        if (m_references.fetch_sub(1, std::memory_order_acq_rel) == 1)
+            delete this;
+    }
+
+protected:
+    virtual ~TYCounted() = default;
+
+private:
+    mutable std::atomic<int> m_references{0};
+};

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "platform/base/Export.h"
+
+namespace TY
+{
+/// A moment of a clock, as seconds and nanoseconds (0 to 999999999).
+///
+///     TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
+struct CC_EXPORT Time
+{
+    /// The clock sources: time since start-up, which never steps, and the time of day.
+    enum Source : unsigned int
+    {
+        MONOTONIC = 0,
+        REALTIME = 1
+    };
+    /// Replaces the system's clocks; null restores them. Tests drive time with it.
+    using Clock = Time (*)(unsigned int source);
+
+    long long seconds = 0;
+    long nanoseconds = 0;
+
+    static Time NOW(unsigned int source);
+    static void SET_CLOCK(Clock clock);
+
+    friend bool operator==(Time const&, Time const&) = default;
+};
+} // namespace TY

@@ -1,0 +1,67 @@
+#pragma once
+
+#include "platform/base/XCode.h"
+
+#include <cstddef>
+#include <new>
+#include <stdexcept>
+#include <utility>
+#include <vector>
+
+/// A growing array of values. Growing reports memory that runs out as an XCode.
+template <class T>
+class TYVector
+{
+public:
+    TYVector() = default;
+
+    std::size_t getSize() const { return m_values.size(); }
+    bool isEmpty() const { return m_values.empty(); }
+    /// REQUIRES: index < getSize()
+    T const& operator[](std::size_t index) const { return m_values[index]; }
+    T& operator[](std::size_t index) { return m_values[index]; }
+
+    /// OK, or NO_ELEMENT when memory is out; the vector is then unchanged.
+    XCode append(T const& value)
+    {
+        try
+        {
+            m_values.push_back(value);
+            return XCode::OK;
+        }
+        catch (std::bad_alloc const&)
+        {
+            return XCode::NO_ELEMENT;
+        }
+    }
+    /// Makes room for `size` values: OK, or NO_ELEMENT.
+    XCode reserve(std::size_t size)
+    {
+        try
+        {
+            m_values.reserve(size);
+            return XCode::OK;
+        }
+        catch (std::bad_alloc const&)
+        {
+            return XCode::NO_ELEMENT;
+        }
+        catch (std::length_error const&) // more than any memory could hold
+        {
+            return XCode::NO_ELEMENT;
+        }
+    }
+    /// REQUIRES: index < getSize()
+    void remove(std::size_t index) { m_values.erase(m_values.begin() + static_cast<std::ptrdiff_t>(index)); }
+    void clear() { m_values.clear(); }
+
+    auto begin() const { return m_values.begin(); }
+    auto end() const { return m_values.end(); }
+    auto begin() { return m_values.begin(); }
+    auto end() { return m_values.end(); }
+
+    friend bool operator==(TYVector const&, TYVector const&) = default;
+
+private:
+    std::vector<T> m_values;
+};
