@@ -1,0 +1,101 @@
+#include "properties/CC_Flags.h"
+
+#include <algorithm>
+#include <bit>
+#include <new>
+
+namespace
+{
+constexpr unsigned int BITS_PER_WORD = 32;
+
+constexpr unsigned int WORD_OF(unsigned int bit) { return bit / BITS_PER_WORD; }
+constexpr unsigned int MASK_OF(unsigned int bit) { return 1U << (bit % BITS_PER_WORD); }
+} // namespace
+
+CC_Flags& CC_Flags::operator=(CC_Flags const& other)
+{
+    if (this == &other)
+        return *this;
+    unsigned int copied = other.m_count;
+    if (copied > m_capacity)
+    {
+        m_count = 0; // what enlarge need not copy
+        if (!enlarge(copied).isOk())
+            copied = m_capacity;
+    }
+    std::copy_n(other.m_entries, copied, m_entries);
+    m_count = copied;
+    return *this;
+}
+
+bool CC_Flags::get(unsigned int bit) const
+{
+    unsigned int const word = WORD_OF(bit);
+    for (unsigned int i = 0; i < m_count && m_entries[i].wordIndex <= word; ++i)
+        if (m_entries[i].wordIndex == word)
+            return (m_entries[i].bits & MASK_OF(bit)) != 0;
+    return false;
+}
+
+XCode CC_Flags::set(unsigned int bit, bool value)
+{
+    unsigned int const word = WORD_OF(bit);
+    unsigned int position = 0;
+    while (position < m_count && m_entries[position].wordIndex < word)
+        ++position;
+    if (position < m_count && m_entries[position].wordIndex == word)
+    {
+        unsigned int& bits = m_entries[position].bits;
+        bits = value ? bits | MASK_OF(bit) : bits & ~MASK_OF(bit);
+        return XCode::OK;
+    }
+    if (!value)
+        return XCode::OK;
+    if (m_count == m_capacity)
+        if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: a set holds only a few words
+            return enlarged;
+    std::copy_backward(m_entries + position, m_entries + m_count, m_entries + m_count + 1);
+    m_entries[position] = {word, MASK_OF(bit)};
+    ++m_count;
+    return XCode::OK;
+}
+
+unsigned int CC_Flags::getFirstSet(unsigned int from) const
+{
+    unsigned int const word = WORD_OF(from);
+    for (unsigned int i = 0; i < m_count; ++i)
+    {
+        Entry const& entry = m_entries[i];
+        if (entry.wordIndex < word)
+            continue;
+        unsigned int const candidates = entry.wordIndex == word ? entry.bits & ~(MASK_OF(from) - 1) : entry.bits;
+        if (candidates != 0)
+            return entry.wordIndex * BITS_PER_WORD + static_cast<unsigned int>(std::countr_zero(candidates));
+    }
+    return NONE;
+}
+
+bool CC_Flags::isEmpty() const
+{
+    if (m_count == 0)
+        return true;
+    unsigned int const volatile& bits = m_entries[0].bits; // another thread may set them; a plain loop may be deleted
+    while (bits == 0)
+    {
+    }
+    return false;
+}
+
+XCode CC_Flags::enlarge(unsigned int newCapacity)
+{
+    if (newCapacity < m_count)
+        return XCode::REFUSED;
+    Entry* const entries = new (std::nothrow) Entry[newCapacity]();
+    if (entries == nullptr)
+        return XCode::NO_ELEMENT;
+    std::copy_n(m_entries, m_count, entries);
+    delete[] m_entries;
+    m_entries = entries;
+    m_capacity = newCapacity;
+    return XCode::OK;
+}

@@ -1,0 +1,72 @@
+#pragma once
+
+#include "platform/base/Export.h"
+#include "platform/base/XCode.h"
+
+#include <utility>
+
+/// A set of property ids, as bits of which only the 32-bit words that hold any are stored: which properties changed.
+/// A value; not locked.
+///
+/// Ids crowd around 0x400000, so a set is one to a few words and grows by exactly one at a time.
+///
+///     CC_Flags changed;
+///     if (changed.set(CC_PropertyId::STATE, true).isOk() && changed.get(CC_PropertyId::STATE))
+///         ...
+///     for (unsigned int id = changed.getFirstSet(0); id != CC_Flags::NONE; id = changed.getFirstSet(id + 1))
+///         ...
+class CC_EXPORT CC_Flags
+{
+public:
+    /// One stored word: bit n of `bits` stands for the number 32 * `wordIndex` + n.
+    struct Entry
+    {
+        unsigned int wordIndex;
+        unsigned int bits;
+    };
+    /// What getFirstSet returns when there is none.
+    static constexpr unsigned int NONE = 0xffffffff;
+
+    CC_Flags() = default; ///< empty, without memory
+    CC_Flags(CC_Flags const& other) { *this = other; }
+    /// Leaves `other` empty; needs no memory.
+    CC_Flags(CC_Flags&& other) noexcept
+        : m_capacity(std::exchange(other.m_capacity, 0))
+        , m_count(std::exchange(other.m_count, 0))
+        , m_entries(std::exchange(other.m_entries, nullptr))
+    {
+    }
+    ~CC_Flags() { delete[] m_entries; }
+    /// The capacity never shrinks, which is why an assignment never takes the other's memory over. When memory is out,
+    /// as many words as fit are copied and the rest is missing; nothing tells so.
+    CC_Flags& operator=(CC_Flags const& other);
+
+    bool get(unsigned int bit) const;
+    /// OK, or NO_ELEMENT when a word is needed and memory is out; the set is then unchanged. A word whose bits all
+    /// become clear stays in place.
+    XCode set(unsigned int bit, bool value);
+    /// The lowest number in the set that is not below `from`, or NONE.
+    unsigned int getFirstSet(unsigned int from) const;
+
+    /// Whether nothing was set since the set was made or cleared.
+    ///
+    /// It looks at the first word alone. If that word's bits were all taken back by `set(bit, false)`, the operation
+    /// waits until another thread sets one: intended, a set is emptied by `clear()` and never bit by bit.
+    bool isEmpty() const;
+    /// Empties the set; the memory stays for the next use.
+    void clear() { m_count = 0; }
+
+    /// Makes room for exactly `newCapacity` words. OK; REFUSED below the number of words in use; NO_ELEMENT when memory
+    /// is out. The set is unchanged unless OK.
+    XCode enlarge(unsigned int newCapacity);
+
+    unsigned int getCapacity() const { return m_capacity; } ///< words there is room for
+    unsigned int getCount() const { return m_count; }       ///< words in use
+    /// The words in use, in ascending order. REQUIRES: index < getCount()
+    Entry const& getEntry(unsigned int index) const { return m_entries[index]; }
+
+private:
+    unsigned int m_capacity = 0;
+    unsigned int m_count = 0;
+    Entry* m_entries = nullptr;
+};

@@ -1,0 +1,71 @@
+#include "properties/CC_Property.h"
+
+#include "properties/CC_PropertyTable.h"
+
+#include <new>
+
+unsigned int CC_Property::s_numberOfInstances = 0;
+unsigned int CC_Property::s_typeId = CC_Property::NO_TYPE_ID;
+unsigned int CC_Property::s_numberOfFailedAssignments = 0;
+unsigned int CC_Property::s_nextFreeTypeId = 0;
+
+namespace
+{
+constexpr char const* UNKNOWN_NAME = "(unknown)";
+constexpr char const* NO_VALUE = "(none)";
+constexpr char const* NO_MEMORY = "(out of memory)"; // short enough for a String that allocates nothing
+
+char const* NAME_OR_UNKNOWN(char const* name) { return name != nullptr ? name : UNKNOWN_NAME; }
+} // namespace
+
+unsigned int CC_Property::getTypeId() const { return TYPE_ID(); }
+
+char const* CC_Property::getTypeName() const { return "Property"; }
+
+XCode CC_Property::setValueString(String& error, String const&) { return REFUSE(error, "Invalid value"); }
+
+InfoContainer& CC_Property::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const
+{
+    if (level > maxLevel || detail > maxDetail)
+        return info; // before anything is formatted
+    try
+    {
+        String text;
+        if (getValueString(text).isEmpty())
+            text = NO_VALUE;
+        if (detail < maxDetail)
+            text.format("%s (%s)", text.c_str(), getTypeName());
+        info.addWithin(maxLevel, level, maxDetail, detail, prefix, getPropertyName(), text);
+    }
+    catch (std::bad_alloc const&)
+    {
+        info.addWithin(maxLevel, level, maxDetail, detail, prefix, getPropertyName(), NO_MEMORY);
+    }
+    return info;
+}
+
+char const* CC_Property::getPropertyName() const
+{
+    CC_PropertyTable::Row const* const row = CC_PropertyTable::FIND(m_id);
+    return NAME_OR_UNKNOWN(row != nullptr ? row->longName : nullptr);
+}
+
+char const* CC_Property::getPropertyShortName() const
+{
+    CC_PropertyTable::Row const* const row = CC_PropertyTable::FIND(m_id);
+    return NAME_OR_UNKNOWN(row != nullptr ? row->shortName : nullptr);
+}
+
+XCode CC_Property::REFUSE(String& error, char const* message)
+{
+    try
+    {
+        error = message;
+    }
+    catch (std::bad_alloc const&)
+    {
+        // the result tells the failure without a message
+    }
+    return XCode::FAILURE;
+}

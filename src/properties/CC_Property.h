@@ -1,0 +1,99 @@
+#pragma once
+
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/LinkedListManager.h"
+#include "platform/base/String.h"
+#include "platform/base/XCode.h"
+
+/// One value that the two sides of a call exchange: a number, an indicator, a state, a cause. The base of every value
+/// class.
+///
+/// A property knows its id (CC_PropertyId), copies itself, compares itself with another of its class, prints itself and
+/// may read its value from text. It is a plain value that belongs to whoever holds it, nearly always a
+/// CC_PropertyContainer, which links it into its list through the two pointers that every property carries.
+///
+/// Value classes derive from CC_PropertyClass or CC_PropertyValue (CC_PropertyClass.h), which write down once what they
+/// have in common. Constructors, setters and `getValueString` of values that need memory throw std::bad_alloc when it
+/// is out; the other operations report it as they say.
+///
+/// Not locked: a property belongs to the thread of its owner. Type numbers are assigned lazily and unguarded, so the
+/// thread that starts call control must have asked each class for its own before other threads use properties.
+///
+///     CC_PropertyBoolean dataProvided(CC_PropertyId::PROVIDES_DATA, true);
+///     String text;
+///     dataProvided.getValueString(text); // "true"
+class CC_EXPORT CC_Property : public LinkedListElement<CC_Property>
+{
+public:
+    /// The value of a class's type number as long as none was assigned.
+    static constexpr unsigned int NO_TYPE_ID = 0xffffffff;
+
+    explicit CC_Property(unsigned int id) noexcept : m_id(id) { ++s_numberOfInstances; }
+    /// The copy is in no list.
+    CC_Property(CC_Property const& other) noexcept : LinkedListElement(other), m_id(other.m_id)
+    {
+        ++s_numberOfInstances;
+    }
+    /// Copies the id; the place in a list stays.
+    CC_Property& operator=(CC_Property const& other) noexcept
+    {
+        m_id = other.m_id;
+        return *this;
+    }
+
+    virtual ~CC_Property() { --s_numberOfInstances; }
+    /// Takes over id and value of `other` if that is of this class or derives from it. Otherwise, and when memory is
+    /// out, nothing changes (NUMBER_OF_FAILED_ASSIGNMENTS counts the latter). Returns this object.
+    virtual CC_Property& assign(CC_Property const& other) = 0;
+    /// A copy of the same class, owned by the caller; null when memory is out.
+    virtual CC_Property* clone() const = 0;
+    /// The number of the object's class in this process: TYPE_ID() of the class. Never to be stored or sent.
+    virtual unsigned int getTypeId() const;
+    /// The name of the object's class ("Boolean").
+    virtual char const* getTypeName() const;
+    /// Whether the object is of the class with that type number or derives from it.
+    virtual bool isOfType(unsigned int typeId) const { return typeId == TYPE_ID(); }
+    /// Replaces `out` by the value as text, unless a class says that it appends; returns `out`.
+    virtual String& getValueString(String& out) const = 0;
+    /// Reads the value from text: OK, or FAILURE with a message in `error` for a text that is none of the class's
+    /// values; FAILURE as well when memory is out. The value is then unchanged. The base takes no text at all.
+    virtual XCode setValueString(String& error, String const& text);
+    /// Whether `other` is of this class, or derives from it, and has the same value. The ids do not matter.
+    virtual bool isEqual(CC_Property const& other) const = 0;
+    /// Adds one line, prefix and long name with the value; the class as well while `detail` is below `maxDetail`.
+    virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                   unsigned int maxDetail, unsigned int detail, String const& prefix) const;
+
+    unsigned int getId() const { return m_id; }
+    /// The long name of the id ("Presentation-Indicator"), "(unknown)" for an id without one. Lives for ever.
+    char const* getPropertyName() const;
+    /// The name of the id in configuration texts ("pi"), "(unknown)" for an id without one. Lives for ever.
+    char const* getPropertyShortName() const;
+
+    static unsigned int TYPE_ID() { return ASSIGN_TYPE_ID(s_typeId); }
+    /// The number in `typeId`, a class's own variable; the first call assigns the next free one.
+    static unsigned int ASSIGN_TYPE_ID(unsigned int& typeId)
+    {
+        if (typeId == NO_TYPE_ID)
+            typeId = s_nextFreeTypeId++;
+        return typeId;
+    }
+    /// How many times `assign` lacked memory. It has no result of its own, so a caller that must know compares the
+    /// number before and after.
+    static unsigned int NUMBER_OF_FAILED_ASSIGNMENTS() { return s_numberOfFailedAssignments; }
+
+    static unsigned int s_numberOfInstances; ///< live properties of all classes
+    static unsigned int s_typeId;
+
+protected:
+    /// Sets `error`, as far as memory allows, and returns FAILURE.
+    static XCode REFUSE(String& error, char const* message);
+
+    static unsigned int s_numberOfFailedAssignments;
+
+private:
+    static unsigned int s_nextFreeTypeId;
+
+    unsigned int m_id;
+};

@@ -1,0 +1,23 @@
+#include "properties/CC_PropertyCallLegState.h"
+
+#include "platform/base/NameOf.h"
+
+unsigned int CC_PropertyCallLegState::s_typeId = CC_Property::NO_TYPE_ID;
+
+String& CC_PropertyCallLegState::getValueString(String& out) const { return out = STATE_NAME(m_state); }
+
+char const* CC_PropertyCallLegState::STATE_NAME(State state)
+{
+    static constexpr NamedValue<State> NAMES[] = {
+        {IDLE, "IDLE"},
+        {RELEASED, "RELEASED"},
+        {DISCONNECTING, "DISCONNECTING"},
+        {TRYING, "TRYING"},
+        {ADDRESS_INCOMPLETE, "ADDRESS-INCOMPLETE"},
+        {PROCEEDING, "PROCEEDING"},
+        {ALERTING, "ALERTING"},
+        {HELD, "HELD"},
+        {CONNECTED, "CONNECTED"},
+    };
+    return NAME_OF(NAMES, state);
+}

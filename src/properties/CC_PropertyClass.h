@@ -1,0 +1,108 @@
+#pragma once
+
+#include "properties/CC_Property.h"
+
+#include <new>
+#include <type_traits>
+#include <typeinfo>
+#include <utility>
+
+/// Whether Derived declares a type-number variable of its own. An inherited one would give it the number of its base.
+template <class Derived, class Base>
+inline constexpr bool HAS_OWN_TYPE_ID = &Derived::s_typeId != &Base::s_typeId;
+
+/// What all property classes have in common, written once: `Derived` is the class itself, `Base` the property class
+/// that it extends.
+///
+/// A class states its name, its variable for the type number, its text and how to compare its value. The variable and
+/// `getValueString` are defined in the class's .cpp: a variable in a template or an inline function would exist once
+/// per shared object, and the objects of a call would disagree about the class.
+///
+///     // CC_PropertyPoint.h
+///     class CC_EXPORT CC_PropertyPoint : public CC_PropertyClass<CC_PropertyPoint>
+///     {
+///     public:
+///         static constexpr char const* TYPE_NAME = "Point";
+///         static unsigned int s_typeId;
+///         using CC_PropertyClass::CC_PropertyClass;                      // from the id alone
+///         CC_PropertyPoint(unsigned int id, int x, int y) : CC_PropertyClass(id), m_x(x), m_y(y) {}
+///         String& getValueString(String& out) const override;
+///         bool hasSameValue(CC_PropertyPoint const& other) const { return m_x == other.m_x && m_y == other.m_y; }
+///
+///     private:
+///         int m_x = 0;
+///         int m_y = 0;
+///     };
+///
+///     // CC_PropertyPoint.cpp
+///     unsigned int CC_PropertyPoint::s_typeId = CC_Property::NO_TYPE_ID;
+///     String& CC_PropertyPoint::getValueString(String& out) const { return out.format("%d/%d", m_x, m_y); }
+template <class Derived, class Base = CC_Property>
+class CC_EXPORT CC_PropertyClass : public Base
+{
+public:
+    using Base::Base;
+
+    static unsigned int TYPE_ID()
+    {
+        static_assert(HAS_OWN_TYPE_ID<Derived, Base>, "the class needs a static unsigned int s_typeId of its own");
+        return CC_Property::ASSIGN_TYPE_ID(Derived::s_typeId);
+    }
+
+    CC_Property& assign(CC_Property const& other) override
+    {
+        Derived const* const same = SAME_CLASS(other);
+        if (same != nullptr && same != &self())
+            take(*same);
+        return *this;
+    }
+    CC_Property* clone() const override
+    {
+        try
+        {
+            return new Derived(self());
+        }
+        catch (std::bad_alloc const&)
+        {
+            return nullptr;
+        }
+    }
+    unsigned int getTypeId() const override { return TYPE_ID(); }
+    char const* getTypeName() const override { return Derived::TYPE_NAME; }
+    bool isOfType(unsigned int typeId) const override { return typeId == TYPE_ID() || Base::isOfType(typeId); }
+    bool isEqual(CC_Property const& other) const override
+    {
+        Derived const* const same = SAME_CLASS(other);
+        return same != nullptr && self().hasSameValue(*same);
+    }
+
+private:
+    Derived& self() { return static_cast<Derived&>(*this); }
+    Derived const& self() const { return static_cast<Derived const&>(*this); }
+
+    /// `other` if it is of this class or derives from it, otherwise null.
+    static Derived const* SAME_CLASS(CC_Property const& other)
+    {
+        if (typeid(other) == typeid(Derived)) // nearly always, and much cheaper than the cast
+            return static_cast<Derived const*>(&other);
+        return other.isOfType(TYPE_ID()) ? dynamic_cast<Derived const*>(&other) : nullptr;
+    }
+
+    void take(Derived const& other)
+    {
+        if constexpr (std::is_nothrow_copy_assignable_v<Derived>)
+            self() = other;
+        else
+        {
+            try
+            {
+                Derived copy(other); // what lacks memory half-way leaves the value as it was
+                self() = std::move(copy);
+            }
+            catch (std::bad_alloc const&)
+            {
+                ++CC_Property::s_numberOfFailedAssignments;
+            }
+        }
+    }
+};

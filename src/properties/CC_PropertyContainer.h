@@ -1,0 +1,93 @@
+#pragma once
+
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/LinkedListManager.h"
+#include "platform/base/XCode.h"
+#include "properties/CC_Property.h"
+
+/// The properties of a call, a leg, an adapter or an event: owned, in the order in which they were added, at most one
+/// per id. Lists are short, so look-up is a linear search. Not locked.
+///
+///     CC_PropertyContainer properties;
+///     if (!properties.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, "49891234")).isOk())
+///         ...
+///     for (CC_Property const& property : properties)
+///         ...
+class CC_EXPORT CC_PropertyContainer
+{
+public:
+    /// Takes every id group that exists.
+    static constexpr unsigned int ALL_GROUPS = 0xff00;
+
+    class ConstIterator
+    {
+    public:
+        explicit ConstIterator(LinkedListManager<CC_Property>::Iterator position) : m_position(position) {}
+        CC_Property const& operator*() const { return *m_position; }
+        CC_Property const* operator->() const { return &*m_position; }
+        ConstIterator& operator++()
+        {
+            ++m_position;
+            return *this;
+        }
+        friend bool operator==(ConstIterator const& left, ConstIterator const& right)
+        {
+            return left.m_position == right.m_position;
+        }
+
+    private:
+        LinkedListManager<CC_Property>::Iterator m_position;
+    };
+
+    CC_PropertyContainer() = default;
+    CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
+    ~CC_PropertyContainer() = default;
+    /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
+    /// tells so.
+    CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
+
+    /// The property of that id, null if there is none. It stays the container's; removing it ends it.
+    CC_Property* get(unsigned int id);
+    CC_Property const* get(unsigned int id) const;
+    /// The property at that position, null past the end.
+    CC_Property* getByIndex(unsigned int index);
+    CC_Property const* getByIndex(unsigned int index) const;
+    unsigned int getNumberOfProperties() const { return m_properties.getCount(); }
+    bool isEmpty() const { return m_properties.isEmpty(); }
+    /// In order. Adding properties does not disturb a walk, removing the one it stands on does.
+    ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
+    ConstIterator end() const { return ConstIterator(m_properties.end()); }
+
+    /// Stores a copy: assigned to the property of that id if there is one, otherwise appended.
+    ///
+    /// OK, also when the stored property is of another class and keeps its value: intended, an id's class is fixed by
+    /// its first owner. NO_ELEMENT when memory is out, FAILURE when the list refuses; the container is then unchanged.
+    XCode set(CC_Property const& property);
+    /// Stores the other's properties whose id has a bit in common with `mask`, in order: 0x100 takes the 0x4001xx ids,
+    /// 0x200 the 0x4002xx ids, 0x400 and 0x800 likewise, 0x1000 and above the 0x401xxx ids. OK, or FAILURE at the
+    /// first one that is refused; those before it stay stored.
+    XCode set(CC_PropertyContainer const& other, unsigned int mask);
+    /// The same for all groups. A property whose id belongs to no group (bits 8 to 15 clear) is left out.
+    XCode set(CC_PropertyContainer const& other) { return set(other, ALL_GROUPS); }
+
+    /// Deletes the property of that id; whether there was one.
+    bool remove(unsigned int id);
+    /// Deletes the property at that position; whether there was one.
+    bool removeByIndex(unsigned int index);
+    void clear() { m_properties.clear(); }
+
+    /// Adds the line "Properties" and, unless this dump is already part of a container's, the properties one level
+    /// below it. Returns `info`.
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const;
+
+    /// A shared container without properties, for parameters that are not used.
+    static CC_PropertyContainer const& EMPTY();
+
+private:
+    CC_Property* find(unsigned int id) const;
+    CC_Property* findByIndex(unsigned int index) const;
+
+    LinkedListManager<CC_Property> m_properties;
+};

@@ -1,0 +1,317 @@
+#include "properties/CC_PropertyContainer.h"
+
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "properties/PropertyTesting.h"
+
+#include <gtest/gtest.h>
+#include <iterator>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace
+{
+/// One property of every group, in ascending order, and one whose id belongs to none.
+constexpr unsigned int UNGROUPED = 0x400042;
+constexpr unsigned int s_ids[] = {UNGROUPED,
+                                  CC_PropertyId::NETWORK,
+                                  CC_PropertyId::NAME,
+                                  CC_PropertyId::CONTEXT,
+                                  CC_PropertyId::TARIFF,
+                                  CC_PropertyId::CHARGE};
+
+void FILL(CC_PropertyContainer& properties)
+{
+    for (unsigned int const id : s_ids)
+        EXPECT_TRUE(properties.set(CC_PropertyUnsigned(id, id)).isOk());
+}
+
+std::vector<unsigned int> IDS_OF(CC_PropertyContainer const& properties)
+{
+    std::vector<unsigned int> ids;
+    for (CC_Property const& property : properties)
+        ids.push_back(property.getId());
+    return ids;
+}
+
+/// A property whose clones are in a list already, so that no container takes them.
+class Caught : public CC_PropertyClass<Caught>
+{
+public:
+    static constexpr char const* TYPE_NAME = "Caught";
+    static unsigned int s_typeId;
+    static LinkedListManager_Untyped s_trap;
+
+    using CC_PropertyClass::CC_PropertyClass;
+    Caught(Caught const& other) = default;
+    ~Caught() override
+    {
+        if (isLinked())
+            s_trap.unlink(*this);
+    }
+    CC_Property* clone() const override
+    {
+        auto* const copy = new Caught(*this);
+        EXPECT_TRUE(s_trap.append(*copy).isOk());
+        return copy;
+    }
+    String& getValueString(String& out) const override { return out = "caught"; }
+    bool hasSameValue(Caught const&) const { return true; }
+};
+unsigned int Caught::s_typeId = CC_Property::NO_TYPE_ID;
+LinkedListManager_Untyped Caught::s_trap;
+
+/// A property that contains others, as a list of forwarding targets would.
+class Nested : public CC_PropertyClass<Nested>
+{
+public:
+    static constexpr char const* TYPE_NAME = "Nested";
+    static unsigned int s_typeId;
+    using CC_PropertyClass::CC_PropertyClass;
+    Nested(unsigned int id, CC_PropertyContainer const& inner) : CC_PropertyClass(id), m_inner(inner) {}
+    String& getValueString(String& out) const override { return out = "nested"; }
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const&) const override
+    {
+        return m_inner.getInfo(info, maxLevel, level, maxDetail, detail, "inner ");
+    }
+    bool hasSameValue(Nested const&) const { return true; }
+
+private:
+    CC_PropertyContainer m_inner;
+};
+unsigned int Nested::s_typeId = CC_Property::NO_TYPE_ID;
+} // namespace
+
+TEST(CC_PropertyContainer, KeepsCopiesInTheOrderOfTheirAdding)
+{
+    CC_PropertyContainer properties;
+    CC_PropertyString given(CC_PropertyId::NAME, "Anna");
+    ASSERT_TRUE(properties.set(given).isOk());
+    ASSERT_TRUE(properties.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, 3)).isOk());
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NETWORK, "pstn")).isOk());
+    given.setValue("Berta");
+    EXPECT_EQ((std::vector<unsigned int>{CC_PropertyId::NAME, CC_PropertyId::HOPS, CC_PropertyId::NETWORK}),
+              IDS_OF(properties));
+    ASSERT_NE(nullptr, properties.get(CC_PropertyId::NAME));
+    EXPECT_EQ("Anna", VALUE_OF(*properties.get(CC_PropertyId::NAME)));
+    EXPECT_EQ(3U, properties.getNumberOfProperties());
+}
+
+TEST(CC_PropertyContainer, AnAbsentIdIsNull)
+{
+    CC_PropertyContainer properties;
+    EXPECT_TRUE(properties.isEmpty());
+    EXPECT_EQ(nullptr, properties.get(CC_PropertyId::NAME));
+    FILL(properties);
+    EXPECT_EQ(nullptr, properties.get(CC_PropertyId::HOPS));
+    EXPECT_EQ(nullptr, std::as_const(properties).get(CC_PropertyId::HOPS));
+    EXPECT_EQ(properties.get(CC_PropertyId::NAME), std::as_const(properties).get(CC_PropertyId::NAME));
+}
+
+TEST(CC_PropertyContainer, SettingAPresentIdAssignsInPlace)
+{
+    CC_PropertyContainer properties;
+    FILL(properties);
+    CC_Property const* const stored = properties.get(CC_PropertyId::NAME);
+    ASSERT_TRUE(properties.set(CC_PropertyUnsigned(CC_PropertyId::NAME, 9)).isOk());
+    EXPECT_EQ(stored, properties.get(CC_PropertyId::NAME));
+    EXPECT_EQ("0x00000009", VALUE_OF(*stored));
+    EXPECT_EQ(std::vector<unsigned int>(std::begin(s_ids), std::end(s_ids)), IDS_OF(properties));
+}
+
+// intended: the first owner of an id fixes its class
+TEST(CC_PropertyContainer, APropertyOfAnotherClassIsTakenForOkAndDropped)
+{
+    CC_PropertyContainer properties;
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
+    EXPECT_EQ(XCode::OK, properties.set(CC_PropertyBoolean(CC_PropertyId::NAME, true)));
+    EXPECT_EQ("Anna", VALUE_OF(*properties.get(CC_PropertyId::NAME)));
+    EXPECT_STREQ("String", properties.get(CC_PropertyId::NAME)->getTypeName());
+}
+
+TEST(CC_PropertyContainer, AMaskSelectsAGroup)
+{
+    CC_PropertyContainer all;
+    FILL(all);
+    struct Case
+    {
+        unsigned int mask;
+        std::vector<unsigned int> ids;
+    };
+    for (Case const& row : {Case{0x100, {CC_PropertyId::NETWORK}}, Case{0x200, {CC_PropertyId::NAME}},
+                            Case{0x400, {CC_PropertyId::CONTEXT}}, Case{0x800, {CC_PropertyId::TARIFF}},
+                            Case{0x1000, {CC_PropertyId::CHARGE}},
+                            Case{0x300, {CC_PropertyId::NETWORK, CC_PropertyId::NAME}}, Case{0, {}}})
+    {
+        CC_PropertyContainer some;
+        EXPECT_EQ(XCode::OK, some.set(all, row.mask));
+        EXPECT_EQ(row.ids, IDS_OF(some)) << std::hex << row.mask;
+    }
+}
+
+TEST(CC_PropertyContainer, SettingAnotherSkipsAnIdWithoutGroupWhichCopyingTakes)
+{
+    CC_PropertyContainer all;
+    FILL(all);
+    CC_PropertyContainer set;
+    EXPECT_EQ(XCode::OK, set.set(all));
+    EXPECT_EQ(std::vector<unsigned int>(std::begin(s_ids) + 1, std::end(s_ids)), IDS_OF(set));
+
+    CC_PropertyContainer const copied(all);
+    EXPECT_EQ(std::vector<unsigned int>(std::begin(s_ids), std::end(s_ids)), IDS_OF(copied));
+}
+
+TEST(CC_PropertyContainer, SettingAnotherKeepsWhatIsThere)
+{
+    CC_PropertyContainer properties;
+    CC_PropertyContainer other;
+    ASSERT_TRUE(properties.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, 1)).isOk());
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
+    ASSERT_TRUE(other.set(CC_PropertyString(CC_PropertyId::NETWORK, "pstn")).isOk());
+    ASSERT_TRUE(other.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, 2)).isOk());
+    ASSERT_TRUE(properties.set(other).isOk());
+    EXPECT_EQ((std::vector<unsigned int>{CC_PropertyId::HOPS, CC_PropertyId::NAME, CC_PropertyId::NETWORK}),
+              IDS_OF(properties));
+    EXPECT_EQ("0x00000002", VALUE_OF(*properties.get(CC_PropertyId::HOPS)));
+}
+
+TEST(CC_PropertyContainer, ACopyReplacesEverything)
+{
+    CC_PropertyContainer properties;
+    CC_PropertyContainer other;
+    FILL(other);
+    ASSERT_TRUE(properties.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, 1)).isOk());
+    properties = other;
+    EXPECT_EQ(IDS_OF(other), IDS_OF(properties));
+    CC_PropertyContainer const& same = properties;
+    properties = same;
+    EXPECT_EQ(IDS_OF(other), IDS_OF(properties));
+    properties = CC_PropertyContainer::EMPTY();
+    EXPECT_TRUE(properties.isEmpty());
+}
+
+TEST(CC_PropertyContainer, RemovingDeletesOneProperty)
+{
+    CC_PropertyContainer properties;
+    FILL(properties);
+    unsigned int const before = CC_Property::s_numberOfInstances;
+    EXPECT_TRUE(properties.remove(CC_PropertyId::CONTEXT));
+    EXPECT_FALSE(properties.remove(CC_PropertyId::CONTEXT));
+    EXPECT_TRUE(properties.removeByIndex(0));
+    EXPECT_FALSE(properties.removeByIndex(4));
+    EXPECT_TRUE(properties.removeByIndex(3));
+    EXPECT_EQ(before - 3, CC_Property::s_numberOfInstances);
+    EXPECT_EQ((std::vector<unsigned int>{CC_PropertyId::NETWORK, CC_PropertyId::NAME, CC_PropertyId::TARIFF}),
+              IDS_OF(properties));
+    properties.clear();
+    EXPECT_EQ(before - 6, CC_Property::s_numberOfInstances);
+    EXPECT_TRUE(properties.isEmpty());
+}
+
+TEST(CC_PropertyContainer, PositionsCountFromTheFirstAdded)
+{
+    CC_PropertyContainer properties;
+    FILL(properties);
+    for (unsigned int i = 0; i < std::size(s_ids); ++i)
+    {
+        EXPECT_EQ(properties.get(s_ids[i]), properties.getByIndex(i));
+        EXPECT_EQ(properties.get(s_ids[i]), std::as_const(properties).getByIndex(i));
+    }
+    EXPECT_EQ(nullptr, properties.getByIndex(std::size(s_ids)));
+}
+
+TEST(CC_PropertyContainer, ACopyThatNoListTakesIsAFailure)
+{
+    CC_PropertyContainer properties;
+    EXPECT_EQ(XCode::FAILURE, properties.set(Caught(CC_PropertyId::NAME)));
+    EXPECT_TRUE(properties.isEmpty());
+    EXPECT_TRUE(Caught::s_trap.isEmpty()); // the copy is deleted
+}
+
+TEST(CC_PropertyContainer, WithoutMemoryNothingIsAddedNorChanged)
+{
+    CC_PropertyString const property(CC_PropertyId::NAME, std::string(100, 'x').c_str());
+    CC_PropertyContainer properties;
+    XCode result;
+    auto const set = [&] { result = properties.set(property); };
+    EXPECT_EQ(2U, WITH_EACH_ALLOCATION_FAILING(set,
+                                               [&]
+                                               {
+                                                   EXPECT_EQ(XCode::NO_ELEMENT, result);
+                                                   EXPECT_TRUE(properties.isEmpty());
+                                               }));
+    EXPECT_EQ(XCode::OK, result);
+
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
+    EXPECT_EQ(1U, WITH_EACH_ALLOCATION_FAILING(set,
+                                               [&]
+                                               {
+                                                   EXPECT_EQ(XCode::NO_ELEMENT, result);
+                                                   EXPECT_EQ("Anna", VALUE_OF(*properties.get(CC_PropertyId::NAME)));
+                                               }));
+    EXPECT_EQ(XCode::OK, result);
+    EXPECT_TRUE(properties.get(CC_PropertyId::NAME)->isEqual(property));
+}
+
+TEST(CC_PropertyContainer, SettingAnotherStopsWhereMemoryEnds)
+{
+    CC_PropertyContainer all;
+    FILL(all);
+    CC_PropertyContainer properties;
+    FailingAllocator::failNth(3); // one allocation per property
+    XCode const result = properties.set(all, CC_PropertyContainer::ALL_GROUPS);
+    FailingAllocator::stop();
+    EXPECT_EQ(XCode::FAILURE, result);
+    EXPECT_EQ((std::vector<unsigned int>{CC_PropertyId::NETWORK, CC_PropertyId::NAME}), IDS_OF(properties));
+}
+
+TEST(CC_PropertyContainer, ACopySilentlyLacksWhatMemoryRefused)
+{
+    CC_PropertyContainer all;
+    FILL(all);
+    CC_PropertyContainer properties;
+    FailingAllocator::failNth(3);
+    properties = all;
+    FailingAllocator::stop();
+    std::vector<unsigned int> expected(std::begin(s_ids), std::end(s_ids));
+    expected.erase(expected.begin() + 2);
+    EXPECT_EQ(expected, IDS_OF(properties));
+}
+
+TEST(CC_PropertyContainer, ADumpListsThePropertiesOneLevelDeeper)
+{
+    CC_PropertyContainer properties;
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NETWORK)).isOk());
+    EXPECT_EQ("own Properties\n  Name: Anna (String)\n  Network: (none) (String)\n", DUMP(properties, 1, 1, "own "));
+    EXPECT_EQ("Properties\n  Name: Anna\n  Network: (none)\n", DUMP(properties, 1, 0));
+    EXPECT_EQ("Properties\n", DUMP(properties, 0, 9));
+
+    InfoContainer info;
+    properties.getInfo(info, 1, 2, 9, 0, "");
+    properties.getInfo(info, 9, 0, 1, 2, "");
+    EXPECT_EQ(0U, info.getNumberOfEntries());
+}
+
+// intended: a dump descends into the outermost container only
+TEST(CC_PropertyContainer, AContainerWithinAContainersDumpIsAHeadlineOnly)
+{
+    CC_PropertyContainer inner;
+    ASSERT_TRUE(inner.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
+    CC_PropertyContainer outer;
+    ASSERT_TRUE(outer.set(Nested(CC_PropertyId::URI, inner)).isOk());
+    ASSERT_TRUE(outer.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, 1)).isOk());
+    EXPECT_EQ("Properties\n  inner Properties\n  Hops: 0x00000001\n", DUMP(outer, 9, 0));
+    EXPECT_EQ("Properties\n  Name: Anna\n", DUMP(inner, 9, 0)); // the count is back at zero
+}
+
+TEST(CC_PropertyContainer, TheSharedEmptyOneIsAlwaysTheSame)
+{
+    EXPECT_EQ(&CC_PropertyContainer::EMPTY(), &CC_PropertyContainer::EMPTY());
+    EXPECT_TRUE(CC_PropertyContainer::EMPTY().isEmpty());
+    EXPECT_TRUE(CC_PropertyContainer::EMPTY().begin() == CC_PropertyContainer::EMPTY().end());
+}

@@ -1,0 +1,28 @@
+#include "properties/CC_PropertyContextId.h"
+
+#include "callcontrol/CallControl.h" // upward: the repository of the media contexts is known to call control alone
+#include "platform/media/MG_IContextRepository.h"
+
+#include <tuple>
+
+unsigned int CC_PropertyContextId::s_typeId = CC_Property::NO_TYPE_ID;
+
+CC_PropertyContextId::CC_PropertyContextId(unsigned int id, MG_IContext* context) : CC_PropertyClass(id)
+{
+    setContext(context);
+}
+
+String& CC_PropertyContextId::getValueString(String& out) const
+{
+    if (!m_context)
+        return out = "(none)";
+    return out.format("0x%8.8x", m_context->getId());
+}
+
+void CC_PropertyContextId::setContext(MG_IContext* context)
+{
+    if (context != nullptr)
+        m_context.set(context);
+    else if (MG_IContextRepository* const repository = CallControl::GET_MG_CONTEXT_REPOSITORY())
+        std::ignore = repository->createContext(m_context); // a call without media is still a call
+}

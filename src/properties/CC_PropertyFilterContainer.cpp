@@ -1,0 +1,107 @@
+#include "properties/CC_PropertyFilterContainer.h"
+
+#include "platform/base/NestingGuard.h"
+
+namespace
+{
+unsigned int s_infoDepth = 0; // of all filter containers' dumps
+} // namespace
+
+CC_PropertyFilter::~CC_PropertyFilter() = default;
+
+CC_PropertyFilterContainer::~CC_PropertyFilterContainer()
+{
+    for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
+        delete element->getValue();
+}
+
+CC_PropertyFilter const* CC_PropertyFilterContainer::getFilter(unsigned int index) const
+{
+    Element const* const element = find(index);
+    return element != nullptr ? element->getValue() : nullptr;
+}
+
+XCode CC_PropertyFilterContainer::addFilter(CC_PropertyFilter const& filter)
+{
+    return addFilter(filter, getNumberOfFilters());
+}
+
+XCode CC_PropertyFilterContainer::addFilter(CC_PropertyFilter const& filter, unsigned int index)
+{
+    CC_PropertyFilter* const copy = filter.clone();
+    return copy != nullptr ? insert(copy, index) : XCode::NO_ELEMENT;
+}
+
+XCode CC_PropertyFilterContainer::replaceFilter(CC_PropertyFilter const& filter, unsigned int index)
+{
+    CC_PropertyFilter* const copy = filter.clone();
+    if (copy == nullptr)
+        return XCode::NO_ELEMENT;
+    Element* const element = find(index);
+    if (element == nullptr)
+        return insert(copy, index);
+    CC_PropertyFilter const* const replaced = element->getValue();
+    element->setValue(copy);
+    delete replaced;
+    return XCode::OK;
+}
+
+void CC_PropertyFilterContainer::removeFilter(unsigned int index)
+{
+    Element* const element = find(index);
+    if (element == nullptr)
+        return;
+    CC_PropertyFilter const* const removed = element->getValue();
+    m_filters.remove(element);
+    delete removed;
+}
+
+XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties) const
+{
+    XCode result = XCode::OK;
+    for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
+        if (XCode const applied = element->getValue()->apply(properties); result.isOk())
+            result = applied;
+    return result;
+}
+
+InfoContainer& CC_PropertyFilterContainer::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                                   unsigned int maxDetail, unsigned int detail,
+                                                   String const& prefix) const
+{
+    NestingGuard const nesting(s_infoDepth);
+    info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call-Control Property Filter Container",
+                   String::s_empty);
+    if (level + 1 <= maxLevel && detail <= maxDetail && nesting.isOutermost())
+        for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
+            element->getValue()->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
+    return info;
+}
+
+CC_PropertyFilterContainer::Element* CC_PropertyFilterContainer::find(unsigned int index) const
+{
+    Element* element = m_filters.getFirst();
+    while (element != nullptr && index-- != 0)
+        element = element->getNext();
+    return element;
+}
+
+/// Takes the filter over, also when it fails.
+XCode CC_PropertyFilterContainer::insert(CC_PropertyFilter* owned, unsigned int index)
+{
+    Element* const added = m_filters.append(nullptr);
+    if (added == nullptr)
+    {
+        delete owned;
+        return XCode::NO_ELEMENT;
+    }
+    // the list only appends: from the position on, every filter moves one element up
+    for (Element* element = index < getNumberOfFilters() ? find(index) : added; element != nullptr;
+         element = element->getNext())
+    {
+        CC_PropertyFilter* const displaced = element->getValue();
+        element->setValue(owned);
+        owned = displaced;
+    }
+    return XCode::OK;
+}

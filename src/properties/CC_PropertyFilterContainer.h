@@ -1,0 +1,53 @@
+#pragma once
+
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/TYList.h"
+#include "platform/base/XCode.h"
+#include "properties/CC_PropertyFilter.h"
+
+/// Filters in the order in which they are applied. It owns copies of what it is given.
+///
+/// Made and filled by whoever made the endpoint that it is handed to; the endpoint only borrows it. Filled before it is
+/// attached and only read afterwards; not locked.
+///
+///     CC_PropertyFilterContainer outputFilters;
+///     if (outputFilters.addFilter(WithholdName()).isOk())
+///         endpoint.setOutputFilterContainer(&outputFilters);
+class CC_EXPORT CC_PropertyFilterContainer
+{
+public:
+    CC_PropertyFilterContainer() = default;
+    ~CC_PropertyFilterContainer();
+    CC_PropertyFilterContainer(CC_PropertyFilterContainer const&) = delete;
+    CC_PropertyFilterContainer& operator=(CC_PropertyFilterContainer const&) = delete;
+
+    unsigned int getNumberOfFilters() const { return m_filters.getCount(); }
+    /// The filter at that position (0 is applied first), null past the end. It stays the container's.
+    CC_PropertyFilter const* getFilter(unsigned int index) const;
+
+    /// Appends a copy: OK, or NO_ELEMENT when memory is out; nothing changes then.
+    XCode addFilter(CC_PropertyFilter const& filter);
+    /// Inserts a copy at that position, at the end for one past it. Results as above.
+    XCode addFilter(CC_PropertyFilter const& filter, unsigned int index);
+    /// Puts a copy in place of the filter at that position; past the end it is appended. Results as above.
+    XCode replaceFilter(CC_PropertyFilter const& filter, unsigned int index);
+    /// Deletes the filter at that position; past the end nothing happens.
+    void removeFilter(unsigned int index);
+
+    /// Applies all filters in order, each to what the ones before have left, also after one has failed. The first
+    /// code that is not OK, otherwise OK.
+    XCode applyFilters(CC_PropertyContainer& properties) const;
+
+    /// Adds the line "Call-Control Property Filter Container" and, unless this dump is already part of such a one, the
+    /// filters one level below it. Returns `info`.
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const;
+
+private:
+    using Element = TYList<CC_PropertyFilter*>::Element;
+    Element* find(unsigned int index) const;
+    XCode insert(CC_PropertyFilter* owned, unsigned int index);
+
+    TYList<CC_PropertyFilter*> m_filters;
+};

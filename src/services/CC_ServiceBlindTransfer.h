@@ -1,0 +1,27 @@
+#pragma once
+
+#include "services/CC_ServiceClass.h"
+
+/// Asks the peer to send its party to another number, without waiting for that number to answer.
+///
+///     CC_ServiceBlindTransfer transfer("*7", "49891234");
+///     leg.invokeSynchronousService(transfer);
+class CC_EXPORT CC_ServiceBlindTransfer : public CC_ServiceClass<CC_ServiceBlindTransfer>
+{
+public:
+    /// `code`: the feature code that asked for it, empty when there was none. Throws std::bad_alloc when memory is out.
+    CC_ServiceBlindTransfer(String const& code, String const& number);
+
+    String getInfo() const override;
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const override;
+
+    String const& getCode() const { return m_code; }
+    String const& getNumber() const { return m_number; }
+
+    static unsigned int TYPE();
+
+private:
+    String m_code;
+    String m_number;
+};
