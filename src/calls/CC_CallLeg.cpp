@@ -1,0 +1,198 @@
+#include "calls/CC_CallLeg.h"
+
+#include "calls/CC_Call.h"
+#include "calls/CC_Monitor.h"
+#include "platform/base/NestingGuard.h"
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyCause.h"
+#include "properties/CC_PropertyId.h"
+
+#include <limits>
+#include <new>
+#include <tuple>
+#include <utility>
+
+unsigned int CC_CallLeg::s_numberOfInstances = 0;
+
+namespace
+{
+unsigned int s_infoDepth = 0;
+
+void LOG_PROPERTY(String const& legName, CC_Property const& property)
+{
+    // a quality record prints as many lines
+    bool const isBulky = property.getId() == CC_PropertyId::QUALITY_OF_SERVICE;
+    RTD::Monitor const* const monitor = CC_Monitor::FOR(isBulky ? RTD::LEVEL_BULK : RTD::LEVEL_CHANGE);
+    if (monitor == nullptr)
+        return;
+    try
+    {
+        String value;
+        property.getValueString(value);
+        if (isBulky)
+            monitor->debug("[EP %s] Set call-leg property: %s\n%s", legName.c_str(), property.getPropertyName(),
+                           value.c_str());
+        else
+            monitor->debug("[EP %s] Set call-leg property: %s -> %s", legName.c_str(), property.getPropertyName(),
+                           value.c_str());
+    }
+    catch (std::bad_alloc const&)
+    {
+        // a log line is not worth a call
+    }
+}
+
+/// Whether the property may become a leg's State: never IDLE again, and never another class.
+bool IS_STATE_ACCEPTED(CC_Property const& property)
+{
+    auto const* const state = dynamic_cast<CC_PropertyCallLegState const*>(&property);
+    return state != nullptr && state->getState() != CC_PropertyCallLegState::IDLE;
+}
+} // namespace
+
+CC_CallLeg::CC_CallLeg()
+{
+    ++s_numberOfInstances;
+    // straight into the container: this is the one time that the state is IDLE. What memory refuses is absent, and a
+    // leg without State counts as released.
+    std::ignore = m_properties.set(CC_PropertyCallLegState(CC_PropertyId::STATE, CC_PropertyCallLegState::IDLE));
+    std::ignore = m_properties.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA));
+    std::ignore = m_properties.set(CC_PropertyCause(CC_PropertyId::CAUSE));
+}
+
+CC_CallLeg::~CC_CallLeg()
+{
+    // an observer that takes and gives up a reference in here must not find the last one a second time
+    m_referenceCount.store(std::numeric_limits<int>::max() / 2, std::memory_order_relaxed);
+    if (m_call != nullptr)
+    {
+        m_observers.broadcastEvent(CC_EvCallLegCallRelinked(*this, nullptr, m_call),
+                                   &CC_CallLegObserver::onCallLegCallRelinked);
+        m_call = nullptr;
+    }
+    m_observers.broadcastEvent(CC_EvCallLegObservationEnded(*this), &CC_CallLegObserver::onCallLegObservationEnded);
+    m_observers.silence();
+    --s_numberOfInstances;
+}
+
+void CC_CallLeg::addReference() { m_referenceCount.fetch_add(1); }
+
+void CC_CallLeg::removeReference()
+{
+    if (m_referenceCount.fetch_sub(1) == 1)
+        delete this;
+}
+
+XCode CC_CallLeg::setName(String const& name)
+{
+    try
+    {
+        m_name = name;
+        return XCode::OK;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE;
+    }
+}
+
+XCode CC_CallLeg::addCallLegObserver(CC_CallLegObserver* observer) { return m_observers.addObserver(observer); }
+
+void CC_CallLeg::removeCallLegObserver(CC_CallLegObserver const* observer) { m_observers.removeObserver(observer); }
+
+int CC_CallLeg::getState() const
+{
+    auto const* const state = dynamic_cast<CC_PropertyCallLegState const*>(m_properties.get(CC_PropertyId::STATE));
+    return state != nullptr ? state->getState() : CC_PropertyCallLegState::RELEASED;
+}
+
+XCode CC_CallLeg::setPropertyNoNotification(CC_Property const& property, bool& changed)
+{
+    changed = false;
+    CC_Property const* const stored = m_properties.get(property.getId());
+    if (stored != nullptr && stored->isEqual(property))
+        return XCode::OK;
+    LOG_PROPERTY(m_name, property);
+    if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
+        return XCode::REFUSED;
+    if (!m_properties.set(property).isOk())
+        return XCode::REFUSED;
+    changed = true;
+    return XCode::OK;
+}
+
+XCode CC_CallLeg::setProperty(CC_Property const& property)
+{
+    CC_Flags flags;
+    bool changed = false;
+    if (!store(property, flags, changed).isOk())
+        return XCode::FAILURE;
+    if (changed)
+        notifyPropertyChange(flags);
+    return XCode::OK;
+}
+
+XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
+{
+    XCode result = XCode::OK;
+    CC_Flags flags;
+    CC_Property const* state = nullptr;
+    auto const storeNext = [&](CC_Property const& property)
+    {
+        bool changed = false;
+        if (XCode const stored = store(property, flags, changed); result.isOk())
+            result = stored;
+    };
+    for (CC_Property const& property : properties)
+    {
+        if (property.getId() == CC_PropertyId::STATE)
+            state = &property;
+        else
+            storeNext(property);
+    }
+    if (state != nullptr)
+        storeNext(*state);
+    notifyPropertyChange(flags);
+    return result;
+}
+
+/// Stores one property and marks it in the flags if it changed.
+XCode CC_CallLeg::store(CC_Property const& property, CC_Flags& flags, bool& changed)
+{
+    XCode const result = setPropertyNoNotification(property, changed);
+    // a change that memory keeps from being told must not keep the call from being cleaned up
+    if (changed && !flags.set(property.getId(), true).isOk() && m_call != nullptr)
+        m_call->defer();
+    return result;
+}
+
+/// Hands the flags over: a copy could lack memory, and the call must hear of a State.
+void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
+{
+    Reference const self(*this);
+    m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
+                               &CC_CallLegObserver::onCallLegPropertyChanged);
+}
+
+void CC_CallLeg::invokeSynchronousService(CC_Service& service)
+{
+    Reference const self(*this);
+    m_observers.broadcastEvent(CC_EvCallLegSynchronousService(*this, service),
+                               &CC_CallLegObserver::onCallLegSynchronousService);
+}
+
+InfoContainer& CC_CallLeg::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                   unsigned int maxDetail, unsigned int detail, String const& prefix) const
+{
+    NestingGuard const nesting(s_infoDepth);
+    info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Leg",
+                   m_name.isEmpty() ? String::addressOf(this) : m_name);
+    if (level < maxLevel && detail < maxDetail && nesting.isOutermost())
+    {
+        if (m_call != nullptr)
+            m_call->getInfo(info, maxLevel, level + 1, maxDetail, detail + 1, String::s_empty);
+        m_properties.getInfo(info, maxLevel, level + 1, maxDetail, detail + 1, String::s_empty);
+    }
+    return info;
+}

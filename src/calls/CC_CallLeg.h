@@ -1,0 +1,110 @@
+#pragma once
+
+#include "calls/CC_CallLegObserver.h"
+#include "calls/CC_ObserverContainer.h"
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/String.h"
+#include "platform/base/XCode.h"
+#include "properties/CC_PropertyContainer.h"
+
+#include <atomic>
+
+class CC_Call;
+class CC_Service;
+
+/// One side of a call: what one endpoint's call adapter drives.
+///
+/// Shared by reference count between its creator, the call that it is in and whoever else holds it; born with the
+/// creator's reference. Its State property is its activity level, on which the call's state, the choice of the most
+/// active leg and the call's end rest. Belongs to the call-control loop's thread; only references may be given up
+/// elsewhere.
+///
+///     CC_CallLeg* const leg = new CC_CallLeg;
+///     leg->setName("sip/7");
+///     std::ignore = call.addCallLeg(*leg);
+///     std::ignore = leg->setProperty(CC_PropertyCallLegState(CC_PropertyId::STATE,
+///     CC_PropertyCallLegState::ALERTING)); leg->removeReference();
+class CC_EXPORT CC_CallLeg
+{
+public:
+    /// In no call, without a name, with the properties State (IDLE), Provides Data (false) and Cause (none).
+    CC_CallLeg();
+    CC_CallLeg(CC_CallLeg const&) = delete;
+    CC_CallLeg& operator=(CC_CallLeg const&) = delete;
+
+    void addReference();
+    /// Gives one reference up; the last one destroys the leg. From any thread, except for the last.
+    void removeReference();
+
+    /// The call that the leg is in, or null.
+    CC_Call* getCall() const { return m_call; }
+    /// Sets the pointer alone: a leg is put into a call by `CC_Call::addCallLeg`.
+    void setCall(CC_Call* call) { m_call = call; }
+
+    String const& getName() const { return m_name; }
+    /// The text after "EP" in the leg's log lines. OK, or FAILURE when memory is out.
+    XCode setName(String const& name);
+
+    /// OK, or NO_ELEMENT when memory is out. Registrations are counted.
+    XCode addCallLegObserver(CC_CallLegObserver* observer);
+    void removeCallLegObserver(CC_CallLegObserver const* observer);
+
+    /// The value of the State property (`CC_PropertyCallLegState::State`); RELEASED (-1) when the leg has none.
+    int getState() const;
+    /// The same as the state: IDLE -2, RELEASED -1, DISCONNECTING 0 and upward to CONNECTED 6.
+    int getActivityLevel() const { return getState(); }
+
+    CC_PropertyContainer const& getProperties() const { return m_properties; }
+    CC_PropertyContainer& getProperties() { return m_properties; }
+
+    /// Stores the property unless it equals the stored one, and tells nobody; `changed` says whether it was stored.
+    /// OK; REFUSED for a State that is IDLE or of another class (a leg never goes back to IDLE), or when memory is out.
+    XCode setPropertyNoNotification(CC_Property const& property, bool& changed);
+    /// Stores the property and tells the observers if it changed. OK, or FAILURE; nothing is told then.
+    XCode setProperty(CC_Property const& property);
+    /// Stores each property, State last whatever its place, so that who reacts to the state sees what came with it; of
+    /// several States the last counts. The observers are always told once, of the ids that changed, even of none.
+    /// OK, or the first failure (REFUSED); the others are stored all the same.
+    XCode setProperties(CC_PropertyContainer const& properties);
+
+    /// Hands the service to the leg's observers at once. The adapters of the call's other legs are among them.
+    void invokeSynchronousService(CC_Service& service);
+
+    /// Diagnostic dump; returns `info`.
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const;
+
+    /// The number of legs alive.
+    static unsigned int s_numberOfInstances;
+
+    /// A reference for as long as it lives.
+    class Reference
+    {
+    public:
+        explicit Reference(CC_CallLeg& leg) : m_leg(leg) { m_leg.addReference(); }
+        ~Reference() { m_leg.removeReference(); }
+        Reference(Reference const&) = delete;
+        Reference& operator=(Reference const&) = delete;
+
+    private:
+        CC_CallLeg& m_leg;
+    };
+
+private:
+    friend class CC_Call;
+    struct Move;
+
+    ~CC_CallLeg();
+    XCode store(CC_Property const& property, CC_Flags& flags, bool& changed);
+    void notifyPropertyChange(CC_Flags& flags);
+
+    std::atomic<int> m_referenceCount{1};
+    CC_Call* m_call = nullptr;
+    CC_ObserverContainer<CC_CallLegObserver, CC_CallLeg> m_observers;
+    String m_name;
+    CC_PropertyContainer m_properties;
+    CC_Call const* m_observedBy = nullptr; // the call whose leg observers are among ours
+    Move* m_move = nullptr;                // the move between calls that is under way
+    unsigned long long m_lastWalk = 0;     // the last of a call's walks over its legs that handled this one
+};

@@ -1,0 +1,92 @@
+// What a call decides from the event loop: its end, and whether two of its legs form an internal loop.
+#include "callcontrol/CC_CallPool.h" // upward: a call gives itself back to its pool
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "calls/CC_Monitor.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "services/CC_ServicePushBack.h"
+
+#include <algorithm>
+#include <tuple>
+
+void CC_Call::defer()
+{
+    if (m_deferredEvent != nullptr)
+        std::ignore = m_deferredEvent->setIfNotPending(); // fails only for an event that was destroyed
+}
+
+void CC_Call::DEFERRED(void* call) { static_cast<CC_Call*>(call)->deferred(); }
+
+void CC_Call::deferred()
+{
+    Hold const self(this);
+    removeReleasedCallLegs();
+    if (self.isReleased())
+        return; // an observer was faster
+    if (hasLiveCallLeg())
+        pushBackOnLoop();
+    else
+        giveBack();
+}
+
+bool CC_Call::hasLiveCallLeg() const
+{
+    return std::any_of(m_callLegs.begin(), m_callLegs.end(),
+                       [](CC_CallLeg const* leg) { return leg->getState() != CC_PropertyCallLegState::RELEASED; });
+}
+
+void CC_Call::giveBack()
+{
+    destroyParticipatingCallLegs();
+    if (m_isReleased)
+        return;
+    if (m_callPool != nullptr)
+        m_callPool->releaseCall(this);
+    else
+        destroy();
+}
+
+/// The call's two legs are on the same network and both up: the gateway is connected with itself, and one of the two
+/// modules may take the call back onto its own side.
+void CC_Call::pushBackOnLoop()
+{
+    CC_CallLeg* const target = findPushBackTarget();
+    if (target == nullptr)
+        return;
+    auto const& network =
+        static_cast<CC_PropertyString const&>(*m_callLegs[0]->getProperties().get(CC_PropertyId::NETWORK));
+    auto const& id = static_cast<CC_PropertyUnsigned const&>(*target->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
+        monitor->debug("[Call %s] Internal loop detected; push-back to %s", m_name.c_str(), network.getValue().c_str());
+    CC_ServicePushBack pushBack(id.getValue());
+    target->invokeSynchronousService(pushBack);
+}
+
+/// The less active of two looped legs, by Call-Leg-ID when they are equally active; null when there is no loop.
+CC_CallLeg* CC_Call::findPushBackTarget() const
+{
+    if (m_callLegs.getSize() != 2)
+        return nullptr;
+    CC_CallLeg* const legs[2] = {m_callLegs[0], m_callLegs[1]};
+    CC_PropertyString const* networks[2];
+    CC_PropertyUnsigned const* ids[2];
+    for (unsigned int i = 0; i < 2; ++i)
+    {
+        networks[i] = dynamic_cast<CC_PropertyString const*>(legs[i]->getProperties().get(CC_PropertyId::NETWORK));
+        ids[i] = dynamic_cast<CC_PropertyUnsigned const*>(legs[i]->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+        if (networks[i] == nullptr || ids[i] == nullptr)
+            return nullptr;
+    }
+    if (!(networks[0]->getValue() == networks[1]->getValue()))
+        return nullptr;
+    int const levels[2] = {legs[0]->getActivityLevel(), legs[1]->getActivityLevel()};
+    if (std::max(levels[0], levels[1]) < CC_PropertyCallLegState::CONNECTED ||
+        std::min(levels[0], levels[1]) < CC_PropertyCallLegState::ALERTING)
+        return nullptr;
+    if (levels[0] != levels[1])
+        return levels[0] < levels[1] ? legs[0] : legs[1];
+    return ids[0]->getValue() < ids[1]->getValue() ? legs[0] : legs[1];
+}
