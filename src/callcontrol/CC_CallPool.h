@@ -1,0 +1,91 @@
+#pragma once
+
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/String.h"
+#include "platform/base/TYLifeline.h"
+#include "platform/base/TYList.h"
+#include "platform/base/TYMutex.h"
+#include "platform/base/TYPtr.h"
+#include "platform/base/TYTime.h"
+#include "platform/driver/IRebootMgmt.h"
+
+class CC_Call;
+class MG_IContext;
+
+/// The calls of one context: makes them, keeps them in the order of their acquisition and destroys them when they come
+/// back. While it holds a call it keeps a graceful lock on reloads of the device.
+///
+/// Owned by its context; belongs to the call-control loop's thread. Destroying a pool leaves its calls alive: they end
+/// when their legs are gone, and the reload lock stays held.
+///
+///     CC_Call* const call = pool.acquireCall();
+///     ...
+///     pool.releaseCall(call);
+class CC_EXPORT CC_CallPool
+{
+public:
+    /// Counts over all pools of the process since its start. Read them after `prepareGet()`.
+    class CC_EXPORT Statistics
+    {
+    public:
+        /// A call was acquired, a call was removed. Both take the lock.
+        void onCallAdded();
+        void onCallRemoved();
+        /// Accounts for the time up to now. With the lock held; the first update only starts the clock.
+        void updateCallTime();
+        /// With the lock held.
+        void updateMaxActiveCalls();
+        /// Restarts the highest number of simultaneous calls. Takes no lock.
+        void resetMax() { m_maxActiveCalls = 0; }
+        /// Brings the counters up to date for a reader. Takes the lock.
+        void prepareGet();
+
+        unsigned long long m_callsAdded = 0;
+        unsigned long long m_callsRemoved = 0;
+        unsigned long long m_callTime = 0; ///< call-milliseconds: the number of active calls, summed over time
+        unsigned long long m_maxActiveCalls = 0;
+
+        static TY::Time s_tLastUpdate;
+        static TYMutex s_mutex;
+    };
+
+    CC_CallPool() = default;
+    ~CC_CallPool();
+    CC_CallPool(CC_CallPool const&) = delete;
+    CC_CallPool& operator=(CC_CallPool const&) = delete;
+
+    /// A new call of this pool with the property Context (0x400400) for `mgContext`; null: the media layer is asked for
+    /// a new one. Null when memory is out.
+    CC_Call* acquireCall() { return acquireCall(nullptr); }
+    CC_Call* acquireCall(MG_IContext* mgContext);
+    /// Takes the call back and destroys it. Counts and destroys also a call that is not of this pool, so hand back only
+    /// its own. Null is ignored.
+    void releaseCall(CC_Call* call);
+
+    unsigned int getNumberOfAcquiredCalls() const { return m_calls.getCount(); }
+    /// The call at that place in the order of acquisition; null past the end.
+    CC_Call* getAcquiredCall(unsigned int index);
+    /// Takes the legs out of every call, or of the calls of that name; the calls then end by themselves. The first text
+    /// is not used.
+    void dropCalls(String const& unused, String const& callName);
+
+    /// Takes and gives back the lock on reloads, "Call-Control" / "Calls are ongoing"; without a reboot management
+    /// driver nothing happens.
+    void addReloadGracefulLock();
+    void releaseReloadGracefulLock();
+
+    /// Diagnostic dump; returns `info`.
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const;
+
+    static Statistics s_statistics;
+    static TY::Time s_tLastUpdate;
+
+private:
+    void unlist(CC_Call& call);
+
+    TYList<CC_Call*> m_calls;
+    TYPPtr<IRebootMgmt> m_rebootMgmt;
+    TYLifeline m_lifeline;
+};

@@ -1,0 +1,72 @@
+#include "callcontrol/provider/CC_Endpoint.h"
+
+#include "adapters/CC_CallAdapter.h" // upward: a rejection goes through an adapter, like any other answer
+#include "properties/CC_PropertyContainer.h"
+#include "properties/CC_PropertyFilterContainer.h"
+
+#include <new>
+#include <tuple>
+
+unsigned int CC_Endpoint::s_numberOfInstances = 0;
+
+CC_Endpoint::Observer::~Observer() = default;
+
+CC_Endpoint::CC_Endpoint(CC_PropertyFilterContainer* inputFilters, CC_PropertyFilterContainer* outputFilters)
+    : m_inputFilterContainer(inputFilters), m_outputFilterContainer(outputFilters)
+{
+    ++s_numberOfInstances;
+}
+
+CC_Endpoint::~CC_Endpoint()
+{
+    m_observers.notifyObservers(NOTIFY_OBSERVER_ABOUT_DESTROY, *this, nullptr);
+    m_observers.silence();
+    m_inputFilterContainer = nullptr;
+    m_outputFilterContainer = nullptr;
+    --s_numberOfInstances;
+}
+
+XCode CC_Endpoint::addEndpointObserver(Observer& observer)
+{
+    // FAILURE where a context reports NO_ELEMENT, as for providers
+    return m_observers.addObserver(observer).isOk() ? XCode::OK : XCode::FAILURE;
+}
+
+void CC_Endpoint::removeEndpointObserver(Observer& observer) { m_observers.removeObserver(observer); }
+
+XCode CC_Endpoint::offer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
+{
+    if (m_outputFilterContainer == nullptr)
+        return handleOffer(call, name, properties);
+    CC_PropertyContainer filtered(properties);
+    if (filtered.getNumberOfProperties() != properties.getNumberOfProperties())
+        return XCode::FAILURE; // no memory for the copy
+    try
+    {
+        std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE;
+    }
+    return handleOffer(call, name, filtered);
+}
+
+void CC_Endpoint::actionRejectOfferedCall_WithCause(CC_Call& call, CC_PropertyContainer const& properties, QCause cause)
+{
+    // a failed step leaves the adapter idle, and dropping an idle adapter does nothing
+    CC_CallAdapter adapter;
+    std::ignore = adapter.setup("reject", *this, nullptr);
+    std::ignore = adapter.accept(call, properties);
+    adapter.drop(cause, 0);
+}
+
+void CC_Endpoint::NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void*)
+{
+    observer.aboutFinished(endpoint);
+}
+
+void CC_Endpoint::NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Endpoint& endpoint, void*)
+{
+    observer.aboutDestroy(endpoint);
+}
