@@ -1,0 +1,152 @@
+#include "adapters/CC_CallAdapter.h"
+
+#include "adapters/CC_CallAdapterObserver.h"
+#include "adapters/CC_CallAdapter_Attempt.h"
+#include "adapters/CC_CallAdapter_Event.h"
+#include "callcontrol/provider/CC_Endpoint.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "calls/CC_Monitor.h"
+#include "platform/base/NameOf.h"
+#include "platform/base/NestingGuard.h"
+#include "services/CC_Service.h"
+
+#include <new>
+#include <tuple>
+#include <utility>
+
+unsigned int CC_CallAdapter::s_numberOfInstances = 0;
+
+CC_CallAdapterObserver::~CC_CallAdapterObserver() = default;
+
+CC_CallAdapter::CC_CallAdapter() { ++s_numberOfInstances; }
+
+CC_CallAdapter::~CC_CallAdapter()
+{
+    CC_CallAdapter::cleanup();
+    --s_numberOfInstances;
+}
+
+XCode CC_CallAdapter::setup(String const& name, CC_Endpoint& endpoint, CC_CallAdapterObserver* observer)
+{
+    TYLifeline::Watch const self(m_lifeline);
+    dropOwnCallLeg(QCause::UNSPECIFIED, 0);
+    if (!self.isAlive())
+        return XCode::FAILURE;
+    try
+    {
+        m_name = nameOrAddress(name);
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE;
+    }
+    m_observer = observer;
+    m_endpoint = &endpoint;
+    return XCode::OK;
+}
+
+void CC_CallAdapter::cleanup()
+{
+    TYLifeline::Watch const self(m_lifeline);
+    while (m_ownCallLeg != nullptr) // again if an observer of the ending leg has used the adapter for a new one
+    {
+        dropOwnCallLeg(QCause::UNSPECIFIED, 0);
+        if (!self.isAlive())
+            return;
+    }
+    letGoOfTheRest();
+    if (!self.isAlive())
+        return;
+    m_endpoint = nullptr;
+    m_name.clear();
+    m_observer = nullptr;
+}
+
+String CC_CallAdapter::nameOrAddress(String const& name) const
+{
+    return name.isEmpty() ? String::addressOf(this) : name;
+}
+
+void CC_CallAdapter::setName(String const& name)
+{
+    try
+    {
+        String newName = nameOrAddress(name);
+        if (newName == m_name)
+            return;
+        if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_NAMING))
+            monitor->debug("[EP %s/%s] Set name: %s", getEndpointName(), m_name.c_str(), newName.c_str());
+        m_name = std::move(newName);
+        if (m_ownCallLeg != nullptr)
+            std::ignore = m_ownCallLeg->setName(makeCallLegName()); // without memory the leg keeps its old name
+    }
+    catch (std::bad_alloc const&)
+    {
+        // the name is for logs and dumps: the old one serves
+    }
+}
+
+char const* CC_CallAdapter::getEndpointName() const
+{
+    return m_endpoint != nullptr ? m_endpoint->getName().c_str() : "";
+}
+
+String CC_CallAdapter::makeCallLegName() const { return m_endpoint->getName() + "/" + m_name; }
+
+String const& CC_CallAdapter::getCallLegName() const
+{
+    return m_ownCallLeg != nullptr ? m_ownCallLeg->getName() : String::s_empty;
+}
+
+CC_Call* CC_CallAdapter::getCall() const { return m_ownCallLeg != nullptr ? m_ownCallLeg->getCall() : nullptr; }
+
+void CC_CallAdapter::invokeSynchronousService(CC_Service& service)
+{
+    if (m_ownCallLeg == nullptr)
+        return;
+    try
+    {
+        if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
+            monitor->debug("[EP %s/%s] Invoke service: %s", getEndpointName(), m_name.c_str(),
+                           service.getInfo().c_str());
+    }
+    catch (std::bad_alloc const&)
+    {
+        // a log line is not worth a service
+    }
+    m_ownCallLeg->invokeSynchronousService(service);
+}
+
+InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                       unsigned int maxDetail, unsigned int detail, String const& prefix) const
+{
+    static unsigned int s_infoDepth = 0;
+    static String const NEAR_END("Near End ");
+    static String const FAR_END("Far End ");
+    static String const CALL("Call ");
+    NestingGuard const nesting(s_infoDepth);
+    info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Adapter", m_name);
+    if (level >= maxLevel || detail > maxDetail || !nesting.isOutermost())
+        return info;
+    if (m_endpoint != nullptr)
+        m_endpoint->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
+    m_ownProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
+    m_peerProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
+    m_callProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, CALL);
+    if (m_ownCallLeg != nullptr)
+        m_ownCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
+    if (m_peerCallLeg != nullptr)
+        m_peerCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
+    return info;
+}
+
+void CC_CallAdapter::notifyPeerPropertyChange(CC_Flags const&) {}
+
+void CC_CallAdapter::notifyPeerSynchronousService(CC_Service&) {}
+
+char const* CC_CallAdapter::DESTINATION_TYPE_NAME(DestinationType type)
+{
+    static constexpr NamedValue<DestinationType> NAMES[] = {{NONE, "none"}, {PROVIDER, "provider"}, {TABLE, "table"}};
+    return NAME_OF(NAMES, type);
+}

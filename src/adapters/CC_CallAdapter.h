@@ -1,0 +1,219 @@
+#pragma once
+
+#include "calls/CC_CallLegObserver.h"
+#include "calls/CC_CallObserver.h"
+#include "platform/base/Export.h"
+#include "platform/base/InfoContainer.h"
+#include "platform/base/String.h"
+#include "platform/base/TYLifeline.h"
+#include "platform/base/XCode.h"
+#include "platform/signalling/QCause.h"
+#include "properties/CC_PropertyContainer.h"
+
+class CC_CallAdapterObserver;
+class CC_Endpoint;
+class CC_PropertyFilterContainer;
+class CC_Provider;
+class MG_IContext;
+
+/// Drives one leg of one call for one endpoint of a signalling module.
+///
+/// The module owns the adapter, binds it with `setup` and dials or accepts; the adapter then has a leg of its own and,
+/// while another leg is in the call, a peer: the most active of the others. What the module writes passes through its
+/// endpoint's input filters; what it reads of the peer and the call has passed through the output filters. Changes of
+/// peer and call reach the module once per turn of the call-control loop, services at once. Belongs to that loop's
+/// thread. After `drop` it is idle and may dial or accept again.
+///
+///     CC_CallAdapter adapter;
+///     std::ignore = adapter.setup("line 7", endpoint, &observer);
+///     CC_PropertyContainer own;
+///     std::ignore = own.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, "4420791234"));
+///     if (!adapter.dial("SWITCH", "isdn", "4989123", own, offer, CC_PropertyContainer::EMPTY(), nullptr).isOk())
+///         ...
+///     adapter.drop(QCause::NORMAL_CALL_CLEARING, 0);
+class CC_EXPORT CC_CallAdapter : public CC_CallObserver, public CC_CallLegObserver
+{
+public:
+    /// Kinds of destinations, for modules that route.
+    enum DestinationType : int
+    {
+        NONE = 0,
+        PROVIDER = 1,
+        TABLE = 2
+    };
+
+    CC_CallAdapter();
+    ~CC_CallAdapter() override; ///< `cleanup()`
+    CC_CallAdapter(CC_CallAdapter const&) = delete;
+    CC_CallAdapter& operator=(CC_CallAdapter const&) = delete;
+
+    void onCallObservationEnded(CC_Event<CC_Call> const& event) override;
+    void onCallCallLegAdded(CC_Event<CC_Call> const& event) override;
+    void onCallCallLegRemoved(CC_Event<CC_Call> const& event) override;
+    void onCallPropertyChanged(CC_Event<CC_Call> const& event) override;
+
+    /// Binds the adapter to its endpoint and observer (may be null), which must outlive its use. An empty name becomes
+    /// the adapter's address. An adapter with a leg drops it first, without a cause. OK, or FAILURE when memory is out.
+    virtual XCode setup(String const& name, CC_Endpoint& endpoint, CC_CallAdapterObserver* observer);
+    /// Drops the leg without a cause and forgets endpoint, name and observer: as newly made.
+    virtual void cleanup();
+    /// Hands the service to the adapters of all other legs of the call, at once. Nothing happens without a leg.
+    virtual void invokeSynchronousService(CC_Service& service);
+    /// Places a call: makes the own leg (CONNECTED), acquires a call from the context's pool and has the provider carry
+    /// it to `destination`. `ownProperties` describe this side, `offerProperties` travel with the offer,
+    /// `callProperties` belong to the call; `datapathContext` (null: a new one) becomes the call's Context.
+    /// OK; REFUSED when the adapter is not idle or not set up, nothing has changed then; NO_ELEMENT when no call could
+    /// be had; FAILURE for an unknown provider, one that refuses, and all else. After these two the own leg was dropped
+    /// with cause 38.
+    virtual XCode dial(String const& contextName, String const& providerName, String const& destination,
+                       CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
+                       CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
+    /// Joins a call that was offered to the endpoint, with an own leg in state TRYING. OK; REFUSED as for `dial`;
+    /// FAILURE otherwise, the own leg was then dropped with cause 38.
+    virtual XCode accept(CC_Call& call, CC_PropertyContainer const& ownProperties);
+    /// Moves the other legs of the other adapter's call into this one's. With `removeOwnLeg` this adapter's leg leaves
+    /// its call first (a transfer: the two peers are connected), without it stays (a conference). The other adapter's
+    /// leg stays in its call; both legs stay with their adapters, who drop them.
+    /// OK; REFUSED when a leg or call is absent or both are in one call; FAILURE when a leg could not be moved, those
+    /// before it stay moved.
+    virtual XCode transfer(CC_CallAdapter const& other, bool removeOwnLeg);
+    /// Ends the own leg: writes Provides Data false, the cause with its SIP code (0: none) and State RELEASED, and lets
+    /// the leg go. QCause::UNSPECIFIED with 0 writes no cause. Nothing happens on an idle adapter.
+    virtual void drop(QCause cause, unsigned int causeValue);
+
+    /// Diagnostic dump; returns `info`.
+    virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                   unsigned int maxDetail, unsigned int detail, String const& prefix) const;
+
+    /// Told instead of the observer when there is none; a subclass may override them. They do nothing.
+    virtual void notifyPeerPropertyChange(CC_Flags const& flags);
+    virtual void notifyPeerSynchronousService(CC_Service& service);
+
+    void onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event) override;
+    void onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event) override;
+    void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event) override;
+    void onCallLegSynchronousService(CC_Event<CC_CallLeg> const& event) override;
+
+    /// `drop` without its log line.
+    void dropOwnCallLeg(QCause cause, unsigned int causeValue);
+
+    String const& getName() const { return m_name; }
+    /// Also renames the leg. An empty name becomes the adapter's address. Without memory the old name stays.
+    void setName(String const& name);
+    CC_Endpoint* getEndpoint() const { return m_endpoint; }
+    CC_CallAdapterObserver* getObserver() const { return m_observer; }
+    /// Empty without an own leg.
+    String const& getCallLegName() const;
+    /// The own leg's call; null without.
+    CC_Call* getCall() const;
+
+    // --- properties --------------------------------------------------------------------------------------------------
+    // Own leg, peer leg and call. Filtered: the endpoint's view; getters read a copy that is kept up to date, setters
+    // write it and then the leg or call through the input filters (the whole copy, since a filter may derive one
+    // property from several). Unfiltered: the leg or call itself.
+    // Getters of one property: null when it, the leg or the call is absent. Getters of several copy those whose id has
+    // a bit in common with `mask` (its group: 0x100, 0x200, 0x400, 0x800, 0x1000): OK, ABSENT without the leg or call,
+    // or the first failure, the others are copied all the same. Setters: OK; ABSENT without the leg or call, nothing
+    // has changed then; FAILURE for anything else.
+
+    CC_Property const* getOwnProperty(unsigned int id) const;
+    CC_Property const* getOwnPropertyUnfiltered(unsigned int id) const;
+    XCode getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode getOwnPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode setOwnProperty(CC_Property const& property);
+    XCode setOwnProperties(CC_PropertyContainer const& properties);
+    XCode setOwnPropertyUnfiltered(CC_Property const& property);
+    XCode setOwnPropertiesUnfiltered(CC_PropertyContainer const& properties);
+
+    CC_Property const* getPeerProperty(unsigned int id) const;
+    CC_Property const* getPeerPropertyUnfiltered(unsigned int id) const;
+    XCode getPeerProperties(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode getPeerPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode setPeerProperty(CC_Property const& property);
+    XCode setPeerProperties(CC_PropertyContainer const& properties);
+    XCode setPeerPropertyUnfiltered(CC_Property const& property);
+    XCode setPeerPropertiesUnfiltered(CC_PropertyContainer const& properties);
+
+    CC_Property const* getCallProperty(unsigned int id) const;
+    CC_Property const* getCallPropertyUnfiltered(unsigned int id) const;
+    XCode getCallProperties(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode getCallPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const;
+    XCode setCallProperty(CC_Property const& property);
+    XCode setCallProperties(CC_PropertyContainer const& properties);
+    XCode setCallPropertyUnfiltered(CC_Property const& property);
+    XCode setCallPropertiesUnfiltered(CC_PropertyContainer const& properties);
+
+    /// The media context of the call (its property 0x400400). Setting goes through the input filters and reports
+    /// nothing; null is returned without a leg, a call or such a property.
+    void setDatapathContext(MG_IContext* context);
+    MG_IContext* getDatapathContext();
+    MG_IContext const* getDatapathContext() const;
+
+    /// ERROR::INVALID for other values.
+    static char const* DESTINATION_TYPE_NAME(DestinationType type);
+
+    /// The number of adapters alive.
+    static unsigned int s_numberOfInstances;
+
+private:
+    class Event;
+    class Attempt;
+
+    char const* getEndpointName() const;
+    String nameOrAddress(String const& name) const;
+    String makeCallLegName() const;
+    CC_PropertyFilterContainer* getInputFilters() const;
+    CC_PropertyFilterContainer* getOutputFilters() const;
+
+    bool isReady() const;
+    XCode tryDial(String const& contextName, String const& providerName, String const& destination,
+                  CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
+                  CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
+    XCode joinNewCall(CC_Call& call, CC_PropertyContainer const& properties);
+    XCode offerToProvider(CC_Provider& provider, CC_Call& call, String const& providerName, String const& destination,
+                          CC_PropertyContainer const& properties);
+    XCode tryAccept(CC_Call& call, CC_PropertyContainer const& ownProperties);
+    XCode createEvents();
+    static XCode setInitialProperties(CC_PropertyContainer& properties, int state);
+    XCode createOwnCallLeg();
+    XCode startOwnCallLeg(CC_PropertyContainer& properties);
+    void writeFinalProperties(QCause cause, unsigned int causeValue);
+    void letGoOfTheRest();
+    XCode tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg);
+
+    CC_PropertyContainer const* filterInput(CC_PropertyContainer const& properties,
+                                            CC_PropertyContainer& filtered) const;
+    template <class Target, class Written>
+    XCode writeFiltered(CC_PropertyContainer& view, Target* target, Written const& written);
+    template <class Target, class Written>
+    XCode writeUnfiltered(CC_PropertyContainer& view, Target* target, Written const& written);
+
+    void observeCall(CC_Call& call);
+    void unobserveCall();
+    void updateOwnCallLeg();
+    void updatePeerCallLeg();
+    void updateCall();
+    void updateView(CC_PropertyContainer& view, CC_PropertyContainer const& source);
+    void mark(unsigned int id);
+    bool linkPeerCallLeg();
+    void unlinkPeerCallLeg();
+    void onPeerPropertyChanged(CC_Flags const& flags);
+    void onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags const& flags);
+
+    CC_CallAdapterObserver* m_observer = nullptr;
+    String m_name;
+    CC_Endpoint* m_endpoint = nullptr;
+    CC_CallLeg* m_ownCallLeg = nullptr;
+    CC_PropertyContainer m_ownProperties;
+    Event* m_peerChangeEvent = nullptr;
+    Event* m_secondEvent = nullptr; // made and destroyed with the first; nothing posts it
+    CC_CallLeg* m_peerCallLeg = nullptr;
+    CC_PropertyContainer m_peerProperties;
+    CC_PropertyContainer m_callProperties;
+    CC_Call* m_observedCall = nullptr; // the call with which we are registered
+    bool m_isCallObserver = false;     // of m_observedCall: which of the two registrations it took
+    bool m_isCallLegObserver = false;  // of all its legs
+    bool m_observesOwnCallLeg = false;
+    unsigned int m_attempt = 0; // counts the legs we have let go, to tell one attempt from the next
+    TYLifeline m_lifeline;
+};

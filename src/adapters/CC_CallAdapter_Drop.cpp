@@ -1,0 +1,110 @@
+// How the own leg ends, and how legs are moved between calls: drop and transfer.
+#include "adapters/CC_CallAdapter.h"
+#include "adapters/CC_CallAdapter_Attempt.h"
+#include "adapters/CC_CallAdapter_Event.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "calls/CC_Monitor.h"
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyCause.h"
+#include "properties/CC_PropertyId.h"
+
+#include <tuple>
+#include <utility>
+
+void CC_CallAdapter::drop(QCause cause, unsigned int causeValue)
+{
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW);
+        monitor != nullptr && getCall() != nullptr)
+        monitor->debug("[EP %s/%s] Drop call %s", getEndpointName(), m_name.c_str(), getCall()->getName().c_str());
+    dropOwnCallLeg(cause, causeValue);
+}
+
+void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
+{
+    if (m_ownCallLeg == nullptr)
+        return;
+    unobserveCall();
+    if (std::exchange(m_observesOwnCallLeg, false))
+        m_ownCallLeg->removeCallLegObserver(this);
+    // who hears of the final properties may drop, reuse or destroy this adapter: the leg is then gone already
+    Attempt const attempt(*this);
+    writeFinalProperties(cause, causeValue);
+    if (attempt.isOver())
+        return;
+    std::exchange(m_ownCallLeg, nullptr)->removeReference();
+    if (attempt.isOver())
+        return;
+    m_ownProperties.clear();
+    letGoOfTheRest();
+}
+
+/// Tells the other legs that no data, why, and that it is over, while we are still in the call.
+void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
+{
+    Attempt const attempt(*this);
+    // each is written whatever became of the one before
+    std::ignore = setOwnProperty(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, false));
+    if (!attempt.isOver() && (cause != QCause::UNSPECIFIED || causeValue != 0))
+        std::ignore = setOwnProperty(CC_PropertyCause(CC_PropertyId::CAUSE, cause, causeValue));
+    if (attempt.isOver())
+        return;
+    CC_PropertyCallLegState const released(CC_PropertyId::STATE, CC_PropertyCallLegState::RELEASED);
+    // a leg that memory keeps from being released would keep its call for ever: then past our copy and the filters
+    if (!setOwnProperty(released).isOk() && !attempt.isOver())
+        std::ignore = m_ownCallLeg->setProperty(released); // no State at all counts as released, too
+}
+
+/// Gives up what an adapter holds besides its leg.
+void CC_CallAdapter::letGoOfTheRest()
+{
+    Attempt const attempt(*this);
+    m_peerProperties.clear();
+    if (CC_CallLeg* const peer = std::exchange(m_peerCallLeg, nullptr))
+        peer->removeReference();
+    if (attempt.isOver())
+        return;
+    for (Event** const event : {&m_secondEvent, &m_peerChangeEvent})
+        if (*event != nullptr)
+            std::exchange(*event, nullptr)->destroy();
+    m_callProperties.clear();
+    ++m_attempt;
+}
+
+XCode CC_CallAdapter::transfer(CC_CallAdapter const& other, bool removeOwnLeg)
+{
+    TYLifeline::Watch const self(m_lifeline);
+    XCode const result = tryTransfer(other, removeOwnLeg);
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE);
+        monitor != nullptr && !result.isOk() && self.isAlive())
+        monitor->debug("[EP %s/%s] TRANSFER FAILED", getEndpointName(), m_name.c_str());
+    return result;
+}
+
+XCode CC_CallAdapter::tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg)
+{
+    CC_Call* const to = getCall();
+    CC_Call* const from = other.getCall();
+    if (to == nullptr || from == nullptr || to == from)
+        return XCode::REFUSED;
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
+        monitor->debug("[EP %s/%s] Transfer call %s to %s%s", getEndpointName(), m_name.c_str(),
+                       from->getName().c_str(), to->getName().c_str(), removeOwnLeg ? "" : " ==> conference");
+    CC_Call::Hold const keepTo(to);
+    CC_Call::Hold const keepFrom(from);
+    CC_CallLeg::Reference const keepStaying(*other.m_ownCallLeg);
+    CC_CallLeg const& staying = *other.m_ownCallLeg;
+    if (removeOwnLeg)
+        to->removeCallLeg(*m_ownCallLeg);
+    while (CC_CallLeg* const leg = from->getOtherCallLeg(0, staying))
+    {
+        if (!to->addCallLeg(*leg).isOk())
+            return XCode::FAILURE;
+        if (from->getOtherCallLeg(0, staying) == leg)
+            break; // in the middle of a move, which will take it along
+    }
+    if (from->getNumberOfCallLegs() == 0)
+        from->defer(); // somebody who was told of a move took the staying leg away
+    return XCode::OK;
+}

@@ -1,0 +1,224 @@
+// The module's access to the properties of the own leg, the peer leg and the call.
+#include "adapters/CC_CallAdapter.h"
+#include "callcontrol/provider/CC_Endpoint.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "properties/CC_PropertyContextId.h"
+#include "properties/CC_PropertyFilterContainer.h"
+#include "properties/CC_PropertyId.h"
+
+#include <new>
+#include <tuple>
+#include <utility>
+
+namespace
+{
+/// The properties whose id shares a bit with the mask. The first failure is the result, the copying goes on.
+XCode COPY(CC_PropertyContainer& to, CC_PropertyContainer const& from, unsigned int mask)
+{
+    XCode result = XCode::OK;
+    for (CC_Property const& property : from)
+        if ((property.getId() & mask) != 0)
+            if (XCode const copied = to.set(property); result.isOk())
+                result = copied;
+    return result;
+}
+
+XCode OK_OR_FAILURE(XCode result) { return result.isOk() ? XCode::OK : XCode::FAILURE; }
+
+XCode WRITE(CC_CallLeg& leg, CC_Property const& property) { return OK_OR_FAILURE(leg.setProperty(property)); }
+XCode WRITE(CC_CallLeg& leg, CC_PropertyContainer const& many) { return OK_OR_FAILURE(leg.setProperties(many)); }
+XCode WRITE(CC_Call& call, CC_Property const& property) { return OK_OR_FAILURE(call.setProperty(property)); }
+XCode WRITE(CC_Call& call, CC_PropertyContainer const& many) { return OK_OR_FAILURE(call.setProperties(many)); }
+} // namespace
+
+/// The properties as the input filters leave them, in `filtered` if there are filters; null when one of them failed.
+CC_PropertyContainer const* CC_CallAdapter::filterInput(CC_PropertyContainer const& properties,
+                                                        CC_PropertyContainer& filtered) const
+{
+    CC_PropertyFilterContainer const* const filters = getInputFilters();
+    if (filters == nullptr)
+        return &properties;
+    filtered = properties;
+    bool const isComplete =
+        filtered.getNumberOfProperties() == properties.getNumberOfProperties(); // else memory is out
+    return isComplete && filters->applyFilters(filtered).isOk() ? &filtered : nullptr;
+}
+
+/// Writes one property or several to our view and through the input filters to the leg or call.
+template <class Target, class Written>
+XCode CC_CallAdapter::writeFiltered(CC_PropertyContainer& view, Target* target, Written const& written)
+{
+    if (target == nullptr)
+        return XCode::ABSENT;
+    if (!view.set(written).isOk())
+        return XCode::FAILURE;
+    if (getInputFilters() == nullptr)
+        return WRITE(*target, written);
+    try
+    {
+        CC_PropertyContainer filtered;
+        CC_PropertyContainer const* const all = filterInput(view, filtered);
+        return all != nullptr ? WRITE(*target, *all) : XCode::FAILURE;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE; // a filter ran out of memory
+    }
+}
+
+template <class Target, class Written>
+XCode CC_CallAdapter::writeUnfiltered(CC_PropertyContainer& view, Target* target, Written const& written)
+{
+    if (target == nullptr)
+        return XCode::ABSENT;
+    return view.set(written).isOk() ? WRITE(*target, written) : XCode::FAILURE;
+}
+
+CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
+{
+    return m_endpoint != nullptr ? m_endpoint->getInputFilterContainer() : nullptr;
+}
+
+CC_PropertyFilterContainer* CC_CallAdapter::getOutputFilters() const
+{
+    return m_endpoint != nullptr ? m_endpoint->getOutputFilterContainer() : nullptr;
+}
+
+// --- own leg ---------------------------------------------------------------------------------------------------------
+
+CC_Property const* CC_CallAdapter::getOwnProperty(unsigned int id) const { return m_ownProperties.get(id); }
+
+CC_Property const* CC_CallAdapter::getOwnPropertyUnfiltered(unsigned int id) const
+{
+    return m_ownCallLeg != nullptr ? std::as_const(*m_ownCallLeg).getProperties().get(id) : nullptr;
+}
+
+XCode CC_CallAdapter::getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    return COPY(properties, m_ownProperties, mask);
+}
+
+XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    return m_ownCallLeg != nullptr ? COPY(properties, m_ownCallLeg->getProperties(), mask) : XCode::ABSENT;
+}
+
+XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
+{
+    return writeFiltered(m_ownProperties, m_ownCallLeg, property);
+}
+
+XCode CC_CallAdapter::setOwnProperties(CC_PropertyContainer const& properties)
+{
+    return writeFiltered(m_ownProperties, m_ownCallLeg, properties);
+}
+
+XCode CC_CallAdapter::setOwnPropertyUnfiltered(CC_Property const& property)
+{
+    return writeUnfiltered(m_ownProperties, m_ownCallLeg, property);
+}
+
+XCode CC_CallAdapter::setOwnPropertiesUnfiltered(CC_PropertyContainer const& properties)
+{
+    return writeUnfiltered(m_ownProperties, m_ownCallLeg, properties);
+}
+
+// --- peer leg --------------------------------------------------------------------------------------------------------
+
+CC_Property const* CC_CallAdapter::getPeerProperty(unsigned int id) const { return m_peerProperties.get(id); }
+
+CC_Property const* CC_CallAdapter::getPeerPropertyUnfiltered(unsigned int id) const
+{
+    return m_peerCallLeg != nullptr ? std::as_const(*m_peerCallLeg).getProperties().get(id) : nullptr;
+}
+
+XCode CC_CallAdapter::getPeerProperties(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    return COPY(properties, m_peerProperties, mask);
+}
+
+XCode CC_CallAdapter::getPeerPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    return m_peerCallLeg != nullptr ? COPY(properties, m_peerCallLeg->getProperties(), mask) : XCode::ABSENT;
+}
+
+XCode CC_CallAdapter::setPeerProperty(CC_Property const& property)
+{
+    return writeFiltered(m_peerProperties, m_peerCallLeg, property);
+}
+
+XCode CC_CallAdapter::setPeerProperties(CC_PropertyContainer const& properties)
+{
+    return writeFiltered(m_peerProperties, m_peerCallLeg, properties);
+}
+
+XCode CC_CallAdapter::setPeerPropertyUnfiltered(CC_Property const& property)
+{
+    return writeUnfiltered(m_peerProperties, m_peerCallLeg, property);
+}
+
+XCode CC_CallAdapter::setPeerPropertiesUnfiltered(CC_PropertyContainer const& properties)
+{
+    return writeUnfiltered(m_peerProperties, m_peerCallLeg, properties);
+}
+
+// --- call ------------------------------------------------------------------------------------------------------------
+
+CC_Property const* CC_CallAdapter::getCallProperty(unsigned int id) const { return m_callProperties.get(id); }
+
+CC_Property const* CC_CallAdapter::getCallPropertyUnfiltered(unsigned int id) const
+{
+    CC_Call const* const call = getCall();
+    return call != nullptr ? call->getProperties().get(id) : nullptr;
+}
+
+XCode CC_CallAdapter::getCallProperties(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    return COPY(properties, m_callProperties, mask);
+}
+
+XCode CC_CallAdapter::getCallPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
+{
+    CC_Call const* const call = getCall();
+    return call != nullptr ? COPY(properties, call->getProperties(), mask) : XCode::ABSENT;
+}
+
+XCode CC_CallAdapter::setCallProperty(CC_Property const& property)
+{
+    return writeFiltered(m_callProperties, getCall(), property);
+}
+
+XCode CC_CallAdapter::setCallProperties(CC_PropertyContainer const& properties)
+{
+    return writeFiltered(m_callProperties, getCall(), properties);
+}
+
+XCode CC_CallAdapter::setCallPropertyUnfiltered(CC_Property const& property)
+{
+    return writeUnfiltered(m_callProperties, getCall(), property);
+}
+
+XCode CC_CallAdapter::setCallPropertiesUnfiltered(CC_PropertyContainer const& properties)
+{
+    return writeUnfiltered(m_callProperties, getCall(), properties);
+}
+
+// --- media context ---------------------------------------------------------------------------------------------------
+
+void CC_CallAdapter::setDatapathContext(MG_IContext* context)
+{
+    std::ignore = setCallProperty(CC_PropertyContextId(CC_PropertyId::CONTEXT, context)); // reports nothing
+}
+
+MG_IContext* CC_CallAdapter::getDatapathContext()
+{
+    return const_cast<MG_IContext*>(std::as_const(*this).getDatapathContext());
+}
+
+MG_IContext const* CC_CallAdapter::getDatapathContext() const
+{
+    auto const* const context =
+        dynamic_cast<CC_PropertyContextId const*>(getCallPropertyUnfiltered(CC_PropertyId::CONTEXT));
+    return context != nullptr ? context->getContext() : nullptr;
+}
