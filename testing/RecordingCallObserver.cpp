@@ -1,0 +1,46 @@
+#include "testing/RecordingCallObserver.h"
+
+#include "testing/FailingAllocator.h"
+#include "testing/PropertyNames.h"
+
+RecordingCallObserver::~RecordingCallObserver() = default;
+
+void RecordingCallObserver::onCallObservationEnded(CC_Event<CC_Call> const& event)
+{
+    auto const& ended = dynamic_cast<CC_EvCallObservationEnded const&>(event);
+    {
+        FailingAllocator::Pause const unseen;
+        record(textOf(ended.getSource()) + " ended");
+    }
+    m_onEnded(ended);
+}
+
+void RecordingCallObserver::onCallCallLegAdded(CC_Event<CC_Call> const& event)
+{
+    auto const& added = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    {
+        FailingAllocator::Pause const unseen;
+        record(textOf(added.getCallLeg()) + " joined " + textOf(added.getSource()));
+    }
+    m_onLegAdded(added);
+}
+
+void RecordingCallObserver::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
+{
+    auto const& removed = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    {
+        FailingAllocator::Pause const unseen;
+        record(textOf(removed.getCallLeg()) + " left " + textOf(removed.getSource()));
+    }
+    m_onLegRemoved(removed);
+}
+
+void RecordingCallObserver::onCallPropertyChanged(CC_Event<CC_Call> const& event)
+{
+    auto const& changed = dynamic_cast<CC_EvCallPropertyChanged const&>(event);
+    {
+        FailingAllocator::Pause const unseen;
+        record(textOf(changed.getSource()) + " changed (" + PROPERTY_NAMES(changed.getFlags()) + ")");
+    }
+    m_onChanged(changed);
+}

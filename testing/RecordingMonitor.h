@@ -1,0 +1,44 @@
+#pragma once
+
+#include "calls/CC_Monitor.h"
+#include "platform/monitor/Monitor.h"
+#include "testing/Journal.h"
+
+#include <string>
+#include <vector>
+
+/// Collects what a monitor logs (call control's, 41, unless told otherwise) up to a level while it lives. It is the
+/// process's one writer meanwhile, so one at a time; afterwards the monitor is off.
+///
+///     RecordingMonitor monitor(RTD::LEVEL_FLOW);
+///     adapter.drop(QCause::NORMAL_CALL_CLEARING, 0);
+///     EXPECT_TRUE(monitor.contains("[EP line/7] Drop"));
+///     EXPECT_EQ(monitor.linesOfLevel(RTD::LEVEL_FAILURE), Lines());
+class RecordingMonitor : public RTD::Writer
+{
+public:
+    struct Line
+    {
+        unsigned int level;
+        std::string text;
+        friend bool operator==(Line const&, Line const&) = default;
+    };
+
+    explicit RecordingMonitor(unsigned int level = RTD::LEVEL_BULK, unsigned int monitorId = CC_Monitor::ID);
+    ~RecordingMonitor() override;
+    RecordingMonitor(RecordingMonitor const&) = delete;
+    RecordingMonitor& operator=(RecordingMonitor const&) = delete;
+
+    void write(unsigned int monitorId, unsigned int level, char const* text) override;
+
+    std::vector<Line> const& getLines() const { return m_lines; }
+    /// The texts of one level, in their order.
+    Lines linesOfLevel(unsigned int level) const;
+    /// Whether a line contains the text.
+    bool contains(std::string const& text) const;
+    void clear() { m_lines.clear(); }
+
+private:
+    unsigned int m_monitorId;
+    std::vector<Line> m_lines;
+};
