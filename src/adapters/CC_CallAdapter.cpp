@@ -30,17 +30,21 @@ CC_CallAdapter::~CC_CallAdapter()
 XCode CC_CallAdapter::setup(String const& name, CC_Endpoint& endpoint, CC_CallAdapterObserver* observer)
 {
     TYLifeline::Watch const self(m_lifeline);
-    dropOwnCallLeg(QCause::UNSPECIFIED, 0);
-    if (!self.isAlive())
-        return XCode::FAILURE;
+    String newName; // made first: the given one may be that of the leg
     try
     {
-        m_name = nameOrAddress(name);
+        newName = nameOrAddress(name);
     }
     catch (std::bad_alloc const&)
     {
         return XCode::FAILURE;
     }
+    m_isResetting = true;
+    dropOwnCallLeg(QCause::UNSPECIFIED, 0);
+    if (!self.isAlive())
+        return XCode::FAILURE;
+    m_isResetting = false;
+    m_name = std::move(newName);
     m_observer = observer;
     m_endpoint = &endpoint;
     return XCode::OK;
@@ -49,15 +53,14 @@ XCode CC_CallAdapter::setup(String const& name, CC_Endpoint& endpoint, CC_CallAd
 void CC_CallAdapter::cleanup()
 {
     TYLifeline::Watch const self(m_lifeline);
-    while (m_ownCallLeg != nullptr) // again if an observer of the ending leg has used the adapter for a new one
-    {
-        dropOwnCallLeg(QCause::UNSPECIFIED, 0);
-        if (!self.isAlive())
-            return;
-    }
+    m_isResetting = true;
+    dropOwnCallLeg(QCause::UNSPECIFIED, 0);
+    if (!self.isAlive())
+        return;
     letGoOfTheRest();
     if (!self.isAlive())
         return;
+    m_isResetting = false;
     m_endpoint = nullptr;
     m_name.clear();
     m_observer = nullptr;

@@ -155,6 +155,12 @@ public:
     /// The number of adapters alive.
     static unsigned int s_numberOfInstances;
 
+protected:
+    /// For an operation of a subclass that calls out and then goes on: a watch on it tells whether the adapter lives.
+    TYLifeline const& getLifeline() const { return m_lifeline; }
+    /// Whether the adapter is set up and idle, so that `dial` and `accept` are not refused.
+    bool isReady() const;
+
 private:
     class Event;
     class Attempt;
@@ -165,10 +171,12 @@ private:
     CC_PropertyFilterContainer* getInputFilters() const;
     CC_PropertyFilterContainer* getOutputFilters() const;
 
-    bool isReady() const;
     XCode tryDial(String const& contextName, String const& providerName, String const& destination,
                   CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                   CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
+    XCode joinAndOffer(CC_Provider& provider, CC_Call& call, String const& contextName, String const& providerName,
+                       String const& destination, CC_PropertyContainer const& offerProperties,
+                       CC_PropertyContainer const& callProperties);
     XCode joinNewCall(CC_Call& call, CC_PropertyContainer const& properties);
     XCode offerToProvider(CC_Provider& provider, CC_Call& call, String const& providerName, String const& destination,
                           CC_PropertyContainer const& properties);
@@ -215,5 +223,6 @@ private:
     bool m_isCallLegObserver = false;  // of all its legs
     bool m_observesOwnCallLeg = false;
     unsigned int m_attempt = 0; // counts the legs we have let go, to tell one attempt from the next
+    bool m_isResetting = false; // in setup or cleanup: who is told of the ending leg cannot begin another
     TYLifeline m_lifeline;
 };

@@ -22,7 +22,8 @@
 
 bool CC_CallAdapter::isReady() const
 {
-    return m_endpoint != nullptr && m_ownCallLeg == nullptr && m_peerChangeEvent == nullptr && m_secondEvent == nullptr;
+    return m_endpoint != nullptr && !m_isResetting && m_ownCallLeg == nullptr && m_peerChangeEvent == nullptr &&
+           m_secondEvent == nullptr;
 }
 
 XCode CC_CallAdapter::dial(String const& contextName, String const& providerName, String const& destination,
@@ -61,6 +62,8 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
         return XCode::FAILURE;
     }
     CC_PropertyContainer own(ownProperties);
+    if (own.getNumberOfProperties() != ownProperties.getNumberOfProperties()) // else memory is out
+        return XCode::FAILURE;
     if (!createEvents().isOk() || !setInitialProperties(own, CC_PropertyCallLegState::CONNECTED).isOk() ||
         !createOwnCallLeg().isOk() || !startOwnCallLeg(own).isOk() || attempt.isOver())
         return XCode::FAILURE;
@@ -68,36 +71,41 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
     if (call == nullptr)
         return XCode::NO_ELEMENT;
     CC_Call::Hold const keepCall(call);
-    if (attempt.isOver() || !joinNewCall(*call, callProperties).isOk() || attempt.isOver())
-    {
-        if (attempt.isOver() || m_ownCallLeg->getCall() == nullptr)
-            call->defer(); // nobody else would hand it back to its pool
+    XCode const result = attempt.isOver() ? XCode::FAILURE
+                                          : joinAndOffer(*provider, *call, contextName, providerName, destination,
+                                                         offerProperties, callProperties);
+    if (!result.isOk() && (attempt.isOver() || m_ownCallLeg->getCall() == nullptr))
+        call->defer(); // nobody else would hand it back to its pool
+    return result;
+}
+
+/// The second half of dialling: the new call gets its properties and the own leg, and goes to the provider.
+XCode CC_CallAdapter::joinAndOffer(CC_Provider& provider, CC_Call& call, String const& contextName,
+                                   String const& providerName, String const& destination,
+                                   CC_PropertyContainer const& offerProperties,
+                                   CC_PropertyContainer const& callProperties)
+{
+    Attempt const attempt(*this);
+    CC_Call::Hold const keepCall(&call);
+    if (!joinNewCall(call, callProperties).isOk() || attempt.isOver() || keepCall.isReleased())
         return XCode::FAILURE;
-    }
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[EP %s/%s] Dial to provider %s (%s) using call %s", getEndpointName(), m_name.c_str(),
-                       providerName.c_str(), destination.c_str(), call->getName().c_str());
-    if (CallControl::GET_PROVIDER(contextName, providerName) != provider)
+                       providerName.c_str(), destination.c_str(), call.getName().c_str());
+    if (CallControl::GET_PROVIDER(contextName, providerName) != &provider)
         return XCode::FAILURE; // taken out by somebody who was told of the call
-    return offerToProvider(*provider, *call, providerName, destination, offerProperties);
+    return offerToProvider(provider, call, providerName, destination, offerProperties);
 }
 
 /// Gives a new call its properties and the own leg.
 XCode CC_CallAdapter::joinNewCall(CC_Call& call, CC_PropertyContainer const& properties)
 {
     Attempt const attempt(*this);
-    try
-    {
-        CC_PropertyContainer filtered;
-        CC_PropertyContainer const* const written = filterInput(properties, filtered);
-        if (written == nullptr || !call.setProperties(*written).isOk() || attempt.isOver())
-            return XCode::FAILURE;
-        return call.addCallLeg(*m_ownCallLeg);
-    }
-    catch (std::bad_alloc const&)
-    {
+    CC_PropertyContainer filtered;
+    CC_PropertyContainer const* const written = filterInput(properties, filtered);
+    if (written == nullptr || !call.setProperties(*written).isOk() || attempt.isOver())
         return XCode::FAILURE;
-    }
+    return call.addCallLeg(*m_ownCallLeg);
 }
 
 XCode CC_CallAdapter::offerToProvider(CC_Provider& provider, CC_Call& call, String const& providerName,

@@ -8,6 +8,7 @@
 #include "testing/RecordingMonitor.h"
 
 #include <cstdint>
+#include <memory>
 
 namespace
 {

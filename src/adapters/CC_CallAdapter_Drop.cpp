@@ -34,10 +34,8 @@ void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
     if (attempt.isOver())
         return;
     std::exchange(m_ownCallLeg, nullptr)->removeReference();
-    if (attempt.isOver())
-        return;
-    m_ownProperties.clear();
-    letGoOfTheRest();
+    if (!attempt.isOver())
+        letGoOfTheRest();
 }
 
 /// Tells the other legs that no data, why, and that it is over, while we are still in the call.
@@ -60,6 +58,7 @@ void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
 void CC_CallAdapter::letGoOfTheRest()
 {
     Attempt const attempt(*this);
+    m_ownProperties.clear();
     m_peerProperties.clear();
     if (CC_CallLeg* const peer = std::exchange(m_peerCallLeg, nullptr))
         peer->removeReference();
@@ -97,13 +96,10 @@ XCode CC_CallAdapter::tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg
     CC_CallLeg const& staying = *other.m_ownCallLeg;
     if (removeOwnLeg)
         to->removeCallLeg(*m_ownCallLeg);
-    while (CC_CallLeg* const leg = from->getOtherCallLeg(0, staying))
-    {
-        if (!to->addCallLeg(*leg).isOk())
+    // no more than there are now: an observer that always puts one back must not keep us here for ever
+    for (unsigned int left = from->getNumberOfOtherCallLegs(staying); left > 0; --left)
+        if (CC_CallLeg* const leg = from->getOtherCallLeg(0, staying); leg != nullptr && !to->addCallLeg(*leg).isOk())
             return XCode::FAILURE;
-        if (from->getOtherCallLeg(0, staying) == leg)
-            break; // in the middle of a move, which will take it along
-    }
     if (from->getNumberOfCallLegs() == 0)
         from->defer(); // somebody who was told of a move took the staying leg away
     return XCode::OK;

@@ -1,6 +1,8 @@
 #include "adapters/TestLine.h"
 #include "testing/RecordingCallLegObserver.h"
 
+#include <new>
+
 namespace
 {
 using namespace CC_PropertyId;

@@ -162,6 +162,8 @@ void CC_CallAdapter::updateView(CC_PropertyContainer& view, CC_PropertyContainer
     if (filters != nullptr)
     {
         filtered = source;
+        if (filtered.getNumberOfProperties() != source.getNumberOfProperties())
+            return; // memory is out: better the view of before than one that calls what is there gone
         std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
     }
     CC_PropertyContainer const& current = filters != nullptr ? filtered : source;

@@ -1,6 +1,7 @@
 #include "adapters/TestLine.h"
 #include "services/CC_ServiceUserInput.h"
 
+#include <memory>
 #include <typeinfo>
 
 namespace
@@ -19,8 +20,6 @@ protected:
     }
     /// Whose leg is a's peer: the network's name says so.
     std::string peerOfA() const { return a.peer(NETWORK); }
-
-    bool m_isNameHidden = false;
 };
 } // namespace
 
@@ -227,18 +226,18 @@ TEST_F(CC_CallAdapter_Observation_Test, ARemovedCallPropertyIsReportedAsGone)
     connect();
     EXPECT_EQ(b.adapter.setCallProperty(CC_PropertyString(NAME, "talk")), XCode::OK);
     listen();
-    m_isNameHidden = true;
+    auto const isHidden = std::make_shared<bool>(true);
     a.filterOutput(
-        [this](CC_PropertyContainer& properties)
+        [isHidden](CC_PropertyContainer& properties)
         {
-            if (m_isNameHidden)
+            if (*isHidden)
                 properties.remove(NAME);
             return XCode::OK;
         });
     EXPECT_EQ(b.adapter.setCallProperty(CC_PropertyString(DISPLAY, "x")), XCode::OK);
     EXPECT_EQ(heardBy(a), Lines{"a: peer changed (Name, Display)"});
     EXPECT_EQ(a.call(NAME), "-");
-    m_isNameHidden = false;
+    *isHidden = false;
     EXPECT_EQ(b.adapter.setCallProperty(CC_PropertyString(DISPLAY, "y")), XCode::OK);
     EXPECT_EQ(heardBy(a), Lines{"a: peer changed (Name, Display)"});
     EXPECT_EQ(a.call(NAME), "talk");

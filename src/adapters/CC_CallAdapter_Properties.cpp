@@ -7,7 +7,6 @@
 #include "properties/CC_PropertyFilterContainer.h"
 #include "properties/CC_PropertyId.h"
 
-#include <new>
 #include <tuple>
 #include <utility>
 
@@ -55,16 +54,9 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyContainer& view, Target* target, 
         return XCode::FAILURE;
     if (getInputFilters() == nullptr)
         return WRITE(*target, written);
-    try
-    {
-        CC_PropertyContainer filtered;
-        CC_PropertyContainer const* const all = filterInput(view, filtered);
-        return all != nullptr ? WRITE(*target, *all) : XCode::FAILURE;
-    }
-    catch (std::bad_alloc const&)
-    {
-        return XCode::FAILURE; // a filter ran out of memory
-    }
+    CC_PropertyContainer filtered;
+    CC_PropertyContainer const* const all = filterInput(view, filtered);
+    return all != nullptr ? WRITE(*target, *all) : XCode::FAILURE;
 }
 
 template <class Target, class Written>

@@ -33,12 +33,10 @@ void RELEASE_LOCK(TYPPtr<IRebootMgmt>& holder)
 
 void REMOVE_CALL_LEGS(CC_Call& call)
 {
-    while (CC_CallLeg* const leg = call.getCallLeg(0))
-    {
-        call.removeCallLeg(*leg);
-        if (call.getCallLeg(0) == leg) // in the middle of a move, which will take it out
-            return;
-    }
+    // no more than there are now: an observer that always puts one back must not keep us here for ever
+    for (unsigned int left = call.getNumberOfCallLegs(); left > 0; --left)
+        if (CC_CallLeg* const leg = call.getCallLeg(0))
+            call.removeCallLeg(*leg);
 }
 } // namespace
 
@@ -88,7 +86,7 @@ void CC_CallPool::releaseCall(CC_Call* call)
     s_statistics.onCallRemoved();
     call->destroy();
     if (self.isAlive() ? m_calls.isEmpty() : wasLast)
-        RELEASE_LOCK(rebootMgmt);
+        RELEASE_LOCK(self.isAlive() ? m_rebootMgmt : rebootMgmt);
 }
 
 /// Takes the call out of our list if it is there, in constant time.
@@ -111,12 +109,21 @@ CC_Call* CC_CallPool::getAcquiredCall(unsigned int index)
 void CC_CallPool::dropCalls(String const&, String const& callName)
 {
     TYLifeline::Watch const self(m_lifeline);
+    String name; // the given one may be a call's own, which can end in here
+    try
+    {
+        name = callName;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return; // longer than any call's name
+    }
     for (TYList<CC_Call*>::Element* element = m_calls.getFirst(); element != nullptr;)
     {
         CC_Call& call = *element->getValue();
         CC_Call::Hold const keepCall(&call);
         CC_Call::Hold const keepNext(element->getNext() != nullptr ? element->getNext()->getValue() : nullptr);
-        if (callName.isEmpty() || callName == call.getName())
+        if (name.isEmpty() || name == call.getName())
             REMOVE_CALL_LEGS(call);
         if (!self.isAlive())
             return;

@@ -2,7 +2,6 @@
 
 #include "callcontrol/CC_CallPool.h"
 #include "calls/CC_Call.h"
-#include "platform/base/Assert.h"
 #include "platform/base/NestingGuard.h"
 
 #include <new>
@@ -78,7 +77,6 @@ void CC_Context::removeProvider(String const& name)
 
 CC_Provider* CC_Context::getProvider(unsigned int index) const
 {
-    TY_ASSERT(index < getNumberOfProviders(), "a provider past the last");
     auto const* entry = m_providerTable.getFirst();
     while (entry != nullptr && index-- > 0)
         entry = entry->getNext();

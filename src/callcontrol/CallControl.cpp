@@ -51,6 +51,8 @@ CallControl::~CallControl()
     }
     m_ccEventLoop = nullptr;
     m_dpEventLoop = nullptr;
+    m_mgContextRepository.set(nullptr);
+    m_mgTerminationRepository.set(nullptr);
     if (s_pInstance == this)
         s_pInstance = nullptr;
 }
@@ -80,6 +82,8 @@ XCode CallControl::addPropertyFactory(CC_PropertyFactory* factory)
         TYVector<unsigned int> ids;
         std::ignore = ids.reserve(8);
         factory->getPropertyIds(ids);
+        if (ids.hasRefused())
+            return XCode::FAILURE;
         if (std::any_of(ids.begin(), ids.end(), [this](unsigned int id) { return m_factoryTable.find(id) != nullptr; }))
             return XCode::REFUSED;
         for (unsigned int const id : ids)
@@ -106,6 +110,14 @@ void CallControl::removePropertyFactory(CC_PropertyFactory* factory)
     // whoever holds the id: a factory that takes over from another one removes the other's registration, on purpose
     for (unsigned int const id : ids)
         m_factoryTable.remove(id);
+    // a list that memory cut short must not leave ids behind that lead to a factory which is gone
+    for (auto const* entry = m_factoryTable.getFirst(); ids.hasRefused() && entry != nullptr;)
+    {
+        auto const* const next = entry->getNext();
+        if (entry->getValue() == factory)
+            m_factoryTable.remove(unsigned{entry->getKey()});
+        entry = next;
+    }
 }
 
 XCode CallControl::createContext(String const& name)
@@ -129,9 +141,20 @@ XCode CallControl::createContext(String const& name)
 
 void CallControl::destroyContext(String const& name)
 {
-    tellContextObservers([&](ContextObserver& observer) { observer.contextDestroyed(name); });
-    std::unique_ptr<CC_Context> const context(m_contextTable.get(name));
-    m_contextTable.remove(name);
+    String kept;
+    String const* used = &name;
+    try
+    {
+        kept = name; // the given one may be the context's own, and an observer be faster
+        used = &kept;
+    }
+    catch (std::bad_alloc const&)
+    {
+        // then the given one has to do
+    }
+    tellContextObservers([&](ContextObserver& observer) { observer.contextDestroyed(*used); });
+    std::unique_ptr<CC_Context> const context(m_contextTable.get(*used));
+    m_contextTable.remove(*used);
 }
 
 CC_Context* CallControl::getContext(String const& name) const { return m_contextTable.get(name); }

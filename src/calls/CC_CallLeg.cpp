@@ -63,6 +63,7 @@ CC_CallLeg::CC_CallLeg()
 
 CC_CallLeg::~CC_CallLeg()
 {
+    m_isEnding = true;
     // an observer that takes and gives up a reference in here must not find the last one a second time
     m_referenceCount.store(std::numeric_limits<int>::max() / 2, std::memory_order_relaxed);
     if (m_call != nullptr)
@@ -162,7 +163,7 @@ XCode CC_CallLeg::store(CC_Property const& property, CC_Flags& flags, bool& chan
 {
     XCode const result = setPropertyNoNotification(property, changed);
     // a change that memory keeps from being told must not keep the call from being cleaned up
-    if (changed && !flags.set(property.getId(), true).isOk() && m_call != nullptr)
+    if (changed && (!flags.set(property.getId(), true).isOk() || m_isMissedByCall) && m_call != nullptr)
         m_call->defer();
     return result;
 }

@@ -106,5 +106,7 @@ private:
     CC_PropertyContainer m_properties;
     CC_Call const* m_observedBy = nullptr; // the call whose leg observers are among ours
     Move* m_move = nullptr;                // the move between calls that is under way
+    bool m_isMissedByCall = false;         // our call is not among our observers: memory was out
+    bool m_isEnding = false;               // in the destructor: goes into no call any more
     unsigned long long m_lastWalk = 0;     // the last of a call's walks over its legs that handled this one
 };

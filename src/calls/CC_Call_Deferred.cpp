@@ -22,6 +22,8 @@ void CC_Call::DEFERRED(void* call) { static_cast<CC_Call*>(call)->deferred(); }
 
 void CC_Call::deferred()
 {
+    if (m_isEnding || m_isReleased)
+        return; // asked for from inside its end
     Hold const self(this);
     removeReleasedCallLegs();
     if (self.isReleased())

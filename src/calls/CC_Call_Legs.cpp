@@ -55,7 +55,7 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         return XCode::OK;
     if (to != nullptr)
     {
-        if (to->m_isEnding || !to->m_callLegs.append(&leg).isOk())
+        if (to->m_isEnding || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
             return XCode::NO_ELEMENT;
         leg.addReference(); // the new call's
     }
@@ -81,13 +81,19 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
 void CC_Call::giveObserversTo(CC_CallLeg& leg)
 {
     leg.m_observedBy = this;
-    // when memory is out an observer beyond the usual ones misses this leg
-    m_callLegObservers.forEach([&](CC_CallLegObserver& observer) { std::ignore = leg.addCallLegObserver(&observer); });
+    // when memory is out an observer beyond the usual ones misses this leg; the leg makes up for us
+    m_callLegObservers.forEach(
+        [&](CC_CallLegObserver& observer)
+        {
+            if (!leg.addCallLegObserver(&observer).isOk() && &observer == this)
+                leg.m_isMissedByCall = true;
+        });
 }
 
 void CC_Call::takeObserversFrom(CC_CallLeg& leg)
 {
     leg.m_observedBy = nullptr;
+    leg.m_isMissedByCall = false;
     m_callLegObservers.forEach([&](CC_CallLegObserver& observer) { leg.removeCallLegObserver(&observer); });
 }
 

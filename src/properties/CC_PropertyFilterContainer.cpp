@@ -2,6 +2,8 @@
 
 #include "platform/base/NestingGuard.h"
 
+#include <new>
+
 namespace
 {
 unsigned int s_infoDepth = 0; // of all filter containers' dumps
@@ -56,11 +58,28 @@ void CC_PropertyFilterContainer::removeFilter(unsigned int index)
     delete removed;
 }
 
+namespace
+{
+/// A filter is a module's code, and building a property may lack memory: that is a failure of the filter like any
+/// other.
+XCode APPLY(CC_PropertyFilter const& filter, CC_PropertyContainer& properties)
+{
+    try
+    {
+        return filter.apply(properties);
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::NO_ELEMENT;
+    }
+}
+} // namespace
+
 XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties) const
 {
     XCode result = XCode::OK;
     for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
-        if (XCode const applied = element->getValue()->apply(properties); result.isOk())
+        if (XCode const applied = APPLY(*element->getValue(), properties); result.isOk())
             result = applied;
     return result;
 }

@@ -4,7 +4,6 @@
 #include "properties/CC_PropertyContainer.h"
 #include "properties/CC_PropertyFilterContainer.h"
 
-#include <new>
 #include <tuple>
 
 unsigned int CC_Endpoint::s_numberOfInstances = 0;
@@ -40,15 +39,8 @@ XCode CC_Endpoint::offer(CC_Call& call, String const& name, CC_PropertyContainer
         return handleOffer(call, name, properties);
     CC_PropertyContainer filtered(properties);
     if (filtered.getNumberOfProperties() != properties.getNumberOfProperties())
-        return XCode::FAILURE; // no memory for the copy
-    try
-    {
-        std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
-    }
-    catch (std::bad_alloc const&)
-    {
-        return XCode::FAILURE;
-    }
+        return XCode::FAILURE; // memory is out
+    std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
     return handleOffer(call, name, filtered);
 }
 

@@ -8,7 +8,8 @@
 #include <utility>
 #include <vector>
 
-/// A growing array of values. Growing reports memory that runs out as an XCode.
+/// A growing array of values. Growing reports memory that runs out as an XCode, and the vector remembers it for whoever
+/// had somebody else fill it.
 template <class T>
 class TYVector
 {
@@ -31,7 +32,7 @@ public:
         }
         catch (std::bad_alloc const&)
         {
-            return XCode::NO_ELEMENT;
+            return refuse();
         }
     }
     /// Makes room for `size` values: OK, or NO_ELEMENT.
@@ -44,11 +45,11 @@ public:
         }
         catch (std::bad_alloc const&)
         {
-            return XCode::NO_ELEMENT;
+            return refuse();
         }
         catch (std::length_error const&) // more than any memory could hold
         {
-            return XCode::NO_ELEMENT;
+            return refuse();
         }
     }
     /// REQUIRES: index < getSize()
@@ -60,8 +61,18 @@ public:
     auto begin() { return m_values.begin(); }
     auto end() { return m_values.end(); }
 
-    friend bool operator==(TYVector const&, TYVector const&) = default;
+    /// Whether memory has ever kept the vector from growing, so that something may be missing.
+    bool hasRefused() const { return m_hasRefused; }
+
+    friend bool operator==(TYVector const& left, TYVector const& right) { return left.m_values == right.m_values; }
 
 private:
+    XCode refuse()
+    {
+        m_hasRefused = true;
+        return XCode::NO_ELEMENT;
+    }
+
     std::vector<T> m_values;
+    bool m_hasRefused = false;
 };
