@@ -1,0 +1,73 @@
+#pragma once
+
+#include <cstdint>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+/// An address of the internet and a port, as a configuration writes it: "192.0.2.1:5060" or "[2001:db8::1]:5060".
+struct SocketAddress
+{
+    std::string host; ///< an address, never a name; version 6 without its brackets
+    std::uint16_t port = 0;
+
+    bool isVersion6() const { return host.find(':') != std::string::npos; }
+    /// The form above.
+    std::string text() const;
+    /// Throws std::invalid_argument with the reason for anything else, port 0 included.
+    static SocketAddress PARSE(std::string const& text);
+};
+
+/// What cannot be served in a configuration: one line, "FILE: KEY: REASON".
+class ConfigurationError : public std::runtime_error
+{
+public:
+    ConfigurationError(std::string const& file, std::string const& key, std::string const& reason);
+};
+
+/// The gateway's configuration file as read: complete, checked, with defaults filled in. A plain value.
+///
+///     Configuration const configuration = Configuration::READ("/etc/callcontrol-gateway.toml");
+///     for (Configuration::Interface const& interface : configuration.interfaces)
+///         ...
+///
+/// README.md lists the keys.
+struct Configuration
+{
+    /// One SIP interface: where it listens, and the peer to which its calls go.
+    struct Interface
+    {
+        std::string name;
+        SocketAddress listen;
+        SocketAddress peer;
+        bool usesTcp = false;             ///< towards the peer; it always listens on UDP and TCP
+        unsigned int t1 = 500;            ///< milliseconds: the first retransmission
+        unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
+        unsigned int answerTimeout = 180; ///< seconds that the peer may ring
+    };
+    /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
+    struct Route
+    {
+        std::string from;
+        std::string prefix;
+        std::string to;
+    };
+
+    std::string file;
+    std::string context;                  ///< the call-control context; empty: its default
+    std::string logLevel = "info";        ///< of spdlog
+    unsigned int callControlLogLevel = 1; ///< of the library's monitor, 0 to 5
+    unsigned int maxCalls = 0;            ///< at the same time; 0: no limit
+    unsigned int maxCallsPerSecond = 0;   ///< 0: no limit
+    unsigned int clearAfter = 10;         ///< seconds that calls may go on after the request to end
+    std::vector<Interface> interfaces;
+    std::vector<Route> routes;
+
+    /// Throws ConfigurationError.
+    static Configuration READ(std::string const& file);
+    /// The same from the text itself; `file` names it in errors.
+    static Configuration PARSE(std::string_view text, std::string const& file);
+
+    Interface const* findInterface(std::string_view name) const;
+};

@@ -1,0 +1,185 @@
+#include "Gateway.h"
+
+#include "MediaContexts.h"
+#include "adapters/CC_CallAdapter.h"
+#include "callcontrol/CC_CallPool.h"
+#include "callcontrol/CallControl.h"
+#include "callcontrol/provider/CC_Endpoint.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "platform/eventloop/TYEvent.h"
+#include "sip/SipCause.h"
+
+#include <spdlog/spdlog.h>
+
+#include <algorithm>
+#include <csignal>
+#include <cstdio>
+#include <stdexcept>
+#include <sys/signalfd.h>
+#include <unistd.h>
+
+namespace
+{
+constexpr unsigned int EVERYTHING = 99; // levels and details of a dump
+
+sigset_t HANDLED_SIGNALS()
+{
+    sigset_t signals;
+    sigemptyset(&signals);
+    for (int const signal : {SIGTERM, SIGINT, SIGUSR1})
+        sigaddset(&signals, signal);
+    return signals;
+}
+
+String CONTEXT_NAME(Configuration const& configuration)
+{
+    return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
+}
+} // namespace
+
+Gateway::Signals::Signals()
+{
+    sigset_t const signals = HANDLED_SIGNALS();
+    m_descriptor = signalfd(-1, &signals, SFD_NONBLOCK | SFD_CLOEXEC);
+    if (m_descriptor < 0)
+        throw std::runtime_error("no descriptor for signals");
+}
+
+Gateway::Signals::~Signals() { close(m_descriptor); }
+
+void Gateway::BLOCK_SIGNALS()
+{
+    sigset_t const signals = HANDLED_SIGNALS();
+    sigprocmask(SIG_BLOCK, &signals, nullptr);
+    std::signal(SIGPIPE, SIG_IGN);
+}
+
+unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
+{
+    unsigned int const ofCalls =
+        CC_Call::s_numberOfInstances + CC_CallLeg::s_numberOfInstances + CC_CallAdapter::s_numberOfInstances;
+    unsigned int const ofModules = CC_Endpoint::s_numberOfInstances + CC_Provider::s_numberOfInstances;
+    unsigned int const inside =
+        CC_Property::s_numberOfInstances + TYEvent::s_numberOfInstances.load() + MediaContext::s_numberOfInstances;
+    return ofCalls + ofModules + inside;
+}
+
+Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
+    : m_configuration(configuration)
+    , m_host(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration))
+    , m_environment{m_stack,
+                    m_host.getContextName(),
+                    Routing(configuration.routes),
+                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond),
+                    CallTrace(tracedCalls),
+                    {},
+                    0,
+                    false,
+                    [this] { stopIfIdle(); }}
+    , m_clearTimer(m_stack.getRoot(), [this] { onClearTimer(); })
+{
+    m_stack.attach(m_callControlLoop);
+    m_stack.attach(m_datapathLoop);
+    m_stack.watch(m_signals.get(), [this] { onSignal(); });
+    openPorts();
+}
+
+void Gateway::openPorts()
+{
+    for (std::size_t i = 0; i < m_configuration.interfaces.size(); ++i)
+        try
+        {
+            m_ports.push_back(std::make_unique<Port>(m_environment, m_host, m_configuration.interfaces[i]));
+        }
+        catch (std::runtime_error const& error)
+        {
+            throw ConfigurationError(m_configuration.file, "interface[" + std::to_string(i) + "].listen", error.what());
+        }
+}
+
+void Gateway::run()
+{
+    for (auto const& port : m_ports)
+        spdlog::info("interface {} listens on {}, its peer is {}", port->interface.getName().view(),
+                     port->interface.getConfiguration().listen.text(), port->interface.getConfiguration().peer.text());
+    m_stack.run();
+}
+
+void Gateway::onSignal()
+{
+    signalfd_siginfo info = {};
+    while (read(m_signals.get(), &info, sizeof info) == static_cast<ssize_t>(sizeof info))
+        if (info.ssi_signo == SIGUSR1)
+            printState();
+        else
+            end();
+}
+
+/// The first request lets the calls go on for a while, another one clears them at once.
+void Gateway::end()
+{
+    if (m_environment.isEnding)
+    {
+        clearCalls();
+        return;
+    }
+    m_environment.isEnding = true;
+    spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
+                 m_configuration.clearAfter);
+    if (!m_clearTimer.start(m_configuration.clearAfter * 1000))
+        clearCalls();
+    stopIfIdle();
+}
+
+void Gateway::onClearTimer()
+{
+    if (!m_isClearing)
+        clearCalls();
+    else
+        m_stack.stop(); // a peer does not answer; we have waited for as long as its transaction lives
+}
+
+void Gateway::clearCalls()
+{
+    m_isClearing = true;
+    spdlog::info("ending: {} calls are cleared", CallControl::GET_NUMBER_OF_CALLS());
+    unsigned int wait = 0;
+    for (auto const& port : m_ports)
+    {
+        port->interface.clearCalls({QCause::TEMPORARY_FAILURE, 0, {}});
+        wait = std::max(wait, port->interface.getConfiguration().t1x64);
+    }
+    if (!m_clearTimer.start(wait))
+        m_stack.stop();
+    stopIfIdle();
+}
+
+void Gateway::stopIfIdle()
+{
+    if (m_environment.isEnding && !hasEndpoints())
+        m_stack.stop();
+}
+
+bool Gateway::hasEndpoints() const
+{
+    return std::any_of(m_ports.begin(), m_ports.end(),
+                       [](auto const& port) { return port->interface.getNumberOfEndpoints() != 0; });
+}
+
+void Gateway::printState() const
+{
+    InfoContainer info;
+    CallControl::GET_PROVIDER_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
+    CallControl::GET_CALL_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
+    CC_CallPool::Statistics& pool = CC_CallPool::s_statistics;
+    pool.prepareGet();
+    Counters const& counters = m_environment.counters;
+    std::printf("state: %u calls up\n%s", CallControl::GET_NUMBER_OF_CALLS(), info.getString_TreeFormat().c_str());
+    std::printf("pool: %llu calls added, %llu removed, at most %llu at once, %llu ms of calls\n", pool.m_callsAdded,
+                pool.m_callsRemoved, pool.m_maxActiveCalls, pool.m_callTime);
+    std::printf("counters: %llu placed, %llu answered, %llu cleared, %llu failed, %llu refused, %u up\n",
+                counters.placed, counters.answered, counters.cleared, counters.failed, counters.refused,
+                CallControl::GET_NUMBER_OF_CALLS());
+    std::fflush(stdout);
+}

@@ -1,0 +1,101 @@
+// callcontrol-gateway: SIP clients call each other through the call-control library. README.md tells how it is used.
+#include "Gateway.h"
+#include "Log.h"
+
+#include <CLI/CLI.hpp>
+
+#include <cstdio>
+#include <exception>
+#include <string>
+
+namespace
+{
+/// Exit statuses.
+constexpr int ALL_RIGHT = 0;
+constexpr int LEFT_OVERS = 1;   ///< or any other fault of ours
+constexpr int CANNOT_SERVE = 2; ///< the command line, the configuration or a port
+
+constexpr unsigned int CALL_CONTROL_MONITOR = 41;
+
+struct Arguments
+{
+    std::string file;
+    bool isCheck = false;
+    unsigned int tracedCalls = 0;
+    std::string logLevel;
+};
+
+int COMPLAIN(char const* what)
+{
+    std::fprintf(stderr, "callcontrol-gateway: %s\n", what);
+    return CANNOT_SERVE;
+}
+
+void DECLARE(CLI::App& app, Arguments& arguments)
+{
+    app.add_option("-c,--config", arguments.file, "The configuration file (TOML)")->required();
+    app.add_flag("--check", arguments.isCheck, "Only read the configuration file");
+    app.add_option("--trace-calls", arguments.tracedCalls, "Print a ladder of each of the first N calls");
+    app.add_option("--log-level", arguments.logLevel, "Instead of the configuration's log-level")
+        ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
+}
+
+int SERVE(Configuration const& configuration, unsigned int tracedCalls)
+{
+    Counters counters;
+    {
+        Gateway gateway(configuration, tracedCalls);
+        gateway.run();
+        counters = gateway.getCounters();
+    }
+    unsigned int const leftOver = Gateway::GET_NUMBER_OF_LEFT_OVERS();
+    std::printf("gateway: %llu calls placed, %llu answered, %llu cleared, %llu failed, %u left over\n", counters.placed,
+                counters.answered, counters.cleared, counters.failed, leftOver);
+    return leftOver == 0 ? ALL_RIGHT : LEFT_OVERS;
+}
+
+int RUN(Arguments const& arguments)
+{
+    Configuration configuration = Configuration::READ(arguments.file);
+    if (arguments.isCheck)
+    {
+        std::printf("%s: all right\n", arguments.file.c_str());
+        return ALL_RIGHT;
+    }
+    SET_UP_LOG(arguments.logLevel.empty() ? configuration.logLevel : arguments.logLevel);
+    static MonitorWriter writer;
+    RTD::REPOSITORY::SET_WRITER(&writer);
+    RTD::REPOSITORY::ENABLE(CALL_CONTROL_MONITOR, configuration.callControlLogLevel);
+    Gateway::BLOCK_SIGNALS();
+    return SERVE(configuration, arguments.tracedCalls);
+}
+} // namespace
+
+int main(int argc, char** argv)
+{
+    Arguments arguments;
+    CLI::App app("A media gateway's call control between SIP interfaces");
+    DECLARE(app, arguments);
+    try
+    {
+        app.parse(argc, argv);
+        return RUN(arguments);
+    }
+    catch (CLI::Success const& help)
+    {
+        return app.exit(help);
+    }
+    catch (CLI::Error const& error)
+    {
+        return COMPLAIN(error.what());
+    }
+    catch (ConfigurationError const& error)
+    {
+        return COMPLAIN(error.what());
+    }
+    catch (std::exception const& error)
+    {
+        std::fprintf(stderr, "callcontrol-gateway: %s\n", error.what());
+        return LEFT_OVERS;
+    }
+}

@@ -1,0 +1,146 @@
+#pragma once
+
+#include "CallTrace.h"
+#include "adapters/CC_CallAdapter.h"
+#include "adapters/CC_CallAdapterObserver.h"
+#include "callcontrol/provider/CC_Endpoint.h"
+#include "sip/SipCause.h"
+#include "sip/SipRequestHandler.h"
+#include "sip/SipTimer.h"
+
+#include <spdlog/fmt/fmt.h>
+
+#include <memory>
+#include <optional>
+#include <string>
+
+class SipInterface;
+
+/// One side of one call: a SIP dialog on the one hand, a call leg on the other.
+///
+/// On the calling side it answers the INVITE that its interface received, on the called side it sends one for the call
+/// that it was offered. What the peer leg does becomes a SIP message, and the other way round:
+///
+///     100 PROCEEDING     180 ALERTING     183 PROCEEDING with data     200 CONNECTED     the end RELEASED and a cause
+///
+/// Owned by its interface, which destroys it once both the dialog is over and the leg dropped. Belongs to the thread of
+/// the stack's loop, which is also that of the call-control loop.
+class SipEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, public SipRequestHandler
+{
+public:
+    SipEndpoint(SipInterface& interface, unsigned int callNumber);
+    ~SipEndpoint() override;
+
+    /// The calling side: takes over a new INVITE and dials `number` on the provider. 0, or the status with which the
+    /// transaction is given up at once.
+    int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                      std::string const& number);
+    /// Clears the call for a reason of the gateway's own.
+    void clear(SipCause const& cause);
+
+    // --- CC_Endpoint
+    String const& getName() const override;
+    String const& getNetwork() const override;
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const override;
+    /// The called side: accepts the call and sends an INVITE.
+    XCode handleOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties) override;
+
+    // --- CC_CallAdapterObserver
+    void notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const& flags) override;
+    void notifyPeerSynchronousService(CC_CallAdapter& adapter, CC_Service& service) override;
+
+    /// Requests inside the dialog.
+    int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
+
+private:
+    enum class Dialog
+    {
+        NONE,
+        INVITE_RECEIVED, ///< not answered finally
+        ANSWERED,        ///< 200 sent, the ACK is outstanding
+        INVITE_SENT,
+        CANCELLED, ///< CANCEL sent, the INVITE's final answer is outstanding
+        UP,
+        BYE_SENT,
+        OVER
+    };
+    static char const* DIALOG_NAME(Dialog dialog);
+
+    // calling side: SipEndpoint_Calling.cpp
+    bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
+    XCode dial(sip_t const* request, std::string const& provider, std::string const& number);
+    void onDialFailed();
+    static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
+    void onAck(sip_t const* request);
+    void onAckMissing();
+    void onCancel(sip_t const* request);
+    void followPeer();
+    void answer();
+    void answerProvisionally(int status, char const* phrase, bool hasData);
+    void answerFinally(unsigned int status, std::string const& reasonHeader);
+    void forgetTransaction();
+
+    // called side: SipEndpoint_Called.cpp
+    bool sendInvite(CC_PropertyContainer const& offerProperties);
+    bool startInvite(std::string const& uri, unsigned int maxForwards);
+    static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    void onProvisional(unsigned int status, sip_t const* response);
+    void onAnswer(sip_t const* response);
+    void onRejected(unsigned int status, sip_t const* response);
+    void onAnswerTimeout();
+    void confirmDialog(sip_t const* response);
+    void acknowledge(std::string const& sessionDescription);
+    void acknowledgeLate();
+    void cancel(SipCause const& cause);
+    void forgetInvite();
+
+    // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
+    int onBye(sip_t const* request);
+    void sendBye(SipCause const& cause);
+    static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    void endDialog(SipCause const& cause);
+    void setDialog(Dialog dialog);
+    void leaveCall(SipCause const& cause);
+    void onPeerReleased();
+    void finishIfDone();
+    XCode writeOwn(CC_PropertyContainer const& properties);
+    static std::string REASON_OF(sip_t const* message);
+    static std::string SESSION_OF(sip_t const* message);
+    template <class Property>
+    Property const* getPeer(unsigned int id) const
+    {
+        return dynamic_cast<Property const*>(m_adapter.getPeerProperty(id));
+    }
+    std::string getPeerText(unsigned int id) const;
+    bool isPeerReleased() const;
+
+    bool isTraced() const { return m_ladder != nullptr; }
+    void trace(std::string text) const;
+    void traceFlags(CC_Flags const& flags) const;
+    static std::string TEXT_OF(CC_Property const& property);
+    static std::string TEXT_OF(CC_PropertyContainer const& properties);
+
+    SipInterface& m_interface;
+    unsigned int m_callNumber;
+    std::shared_ptr<CallTrace::Ladder> m_ladder;
+    bool m_isCalling = false;
+    Dialog m_dialog = Dialog::NONE;
+    nta_leg_t* m_leg = nullptr;
+    nta_incoming_t* m_transaction = nullptr; // the INVITE received
+    nta_outgoing_t* m_invite = nullptr;      // the INVITE sent; kept for answers that are repeated
+    nta_outgoing_t* m_ack = nullptr;
+    nta_outgoing_t* m_bye = nullptr;
+    unsigned int m_inviteSequence = 0;
+    SipTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
+    std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
+    bool m_hasOffer = false;               // the INVITE carried a session description
+    bool m_isAckLate = false;              // the ACK must carry the answer, which the other side does not have yet
+    bool m_hasRung = false;
+    bool m_hasEarlyMedia = false;
+    bool m_wasAnswered = false;
+    bool m_hadPeer = false;
+    bool m_isInCall = false;
+    bool m_isFinished = false;
+    CC_CallAdapter m_adapter; // last: silenced first
+};

@@ -1,0 +1,207 @@
+// The calling side: the INVITE was received, the peer leg says how it is answered.
+#include "SipEndpoint.h"
+
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "sip/SipAddress.h"
+#include "sip/SipInterface.h"
+#include "sip/SipPropertyId.h"
+#include "sip/SipReason.h"
+
+#include <tuple>
+
+namespace
+{
+constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
+
+std::string CALLER_OF(sip_t const* request)
+{
+    char const* const user = request->sip_from->a_url->url_user;
+    return user != nullptr ? SipAddress::UNESCAPE_USER(user) : std::string();
+}
+
+std::string CALLER_NAME_OF(sip_t const* request)
+{
+    char const* const display = request->sip_from->a_display;
+    return display != nullptr ? SipReason::UNQUOTE(display) : std::string();
+}
+
+/// Without memory for one of them the call goes on without it.
+void ADD_TEXT(CC_PropertyContainer& properties, unsigned int id, std::string const& text)
+{
+    if (!text.empty())
+        std::ignore = properties.set(CC_PropertyString(id, String(std::string_view(text))));
+}
+} // namespace
+
+int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                               std::string const& number)
+{
+    m_isCalling = true;
+    m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
+    trace("<- INVITE to " + number + " from " + CALLER_OF(request));
+    m_isInCall = true;
+    if (!makeServerDialog(transaction, request))
+    {
+        m_dialog = Dialog::OVER;
+        leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        return 503;
+    }
+    nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
+    trace("-> 100");
+    // the stack still holds the transaction, which must not end under it: a failure waits until it has let go
+    if (!dial(request, provider, number).isOk() && !m_timer.start(0))
+        onDialFailed();
+    return 0;
+}
+
+void SipEndpoint::onDialFailed() { clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}}); }
+
+bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* request)
+{
+    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(request->sip_call_id),
+                            SIPTAG_FROM(request->sip_to), SIPTAG_TO(request->sip_from), TAG_END());
+    if (m_leg == nullptr)
+        return false;
+    nta_leg_tag(m_leg, nta_incoming_tag(transaction, nullptr));
+    nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
+    m_transaction = transaction;
+    nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
+    m_dialog = Dialog::INVITE_RECEIVED;
+    return true;
+}
+
+XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, std::string const& number)
+{
+    std::string const session = SESSION_OF(request);
+    m_hasOffer = !session.empty();
+    CC_PropertyContainer own;
+    ADD_TEXT(own, CC_PropertyId::E164_NUMBER, CALLER_OF(request));
+    ADD_TEXT(own, CC_PropertyId::NAME, CALLER_NAME_OF(request));
+    ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+    std::ignore = own.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, m_hasOffer)); // else a new leg's: none
+    CC_PropertyContainer offer;
+    unsigned long const maxForwards =
+        request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;
+    std::ignore = offer.set(CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, maxForwards - 1)); // else the default
+    CC_PropertyContainer call;
+    std::ignore = call.set(CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
+    if (isTraced())
+        trace("did  dial " + provider + " (" + number + "), State=CONNECTED, " + TEXT_OF(own));
+    String name;
+    name.format("%u", m_callNumber);
+    if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
+        return bound;
+    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), number.c_str(), own, offer, call,
+                          nullptr);
+}
+
+int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
+{
+    if (request == nullptr)
+        endpoint->onAckMissing();
+    else if (request->sip_request->rq_method == sip_method_cancel)
+        endpoint->onCancel(request);
+    else
+        endpoint->onAck(request);
+    return 0;
+}
+
+void SipEndpoint::onAck(sip_t const* request)
+{
+    if (m_dialog != Dialog::ANSWERED)
+        return;
+    trace("<- ACK");
+    forgetTransaction(); // it would live on for half a minute
+    m_dialog = Dialog::UP;
+    if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
+    {
+        CC_PropertyContainer own;
+        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+        std::ignore = writeOwn(own); // without memory the called side gives up in its time
+    }
+    if (m_byeAfterAck)
+        sendBye(*m_byeAfterAck);
+}
+
+void SipEndpoint::onAckMissing()
+{
+    if (m_dialog != Dialog::ANSWERED)
+        return;
+    trace("the 200 was not acknowledged");
+    forgetTransaction();
+    SipCause const cause = m_byeAfterAck.value_or(SipCause{QCause::RECOVERY_ON_TIMER_EXPIRY, 0, {}});
+    sendBye(cause);
+    leaveCall(cause);
+}
+
+void SipEndpoint::onCancel(sip_t const* request)
+{
+    if (m_dialog != Dialog::INVITE_RECEIVED)
+        return; // answered already: the BYE will follow
+    trace("<- CANCEL");
+    SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
+    answerFinally(487, {});
+    leaveCall(cause);
+}
+
+/// Brings the INVITE's answers up to where the peer leg has come.
+void SipEndpoint::followPeer()
+{
+    auto const* const state = getPeer<CC_PropertyCallLegState>(CC_PropertyId::STATE);
+    if (state == nullptr)
+        return;
+    m_hadPeer = true;
+    if (m_dialog != Dialog::INVITE_RECEIVED)
+        return;
+    auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
+    bool const hasData = data != nullptr && data->getValue();
+    if (state->getState() >= CC_PropertyCallLegState::HELD)
+        answer();
+    else if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
+        answerProvisionally(SIP_180_RINGING, hasData);
+    else if (hasData && !m_hasEarlyMedia)
+        answerProvisionally(SIP_183_SESSION_PROGRESS, hasData);
+}
+
+void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
+{
+    std::string const session = hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string();
+    m_hasEarlyMedia = m_hasEarlyMedia || hasData;
+    trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
+    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+                        TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+                        TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+}
+
+void SipEndpoint::answer()
+{
+    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
+    trace(std::string("-> 200") + (session.empty() ? "" : " with a session description"));
+    m_dialog = Dialog::ANSWERED;
+    m_wasAnswered = true;
+    ++m_interface.getEnvironment().counters.answered;
+    nta_incoming_treply(m_transaction, SIP_200_OK, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+                        TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+                        TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+}
+
+void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)
+{
+    trace("-> " + std::to_string(status) + (reasonHeader.empty() ? "" : ", Reason: ") + reasonHeader);
+    nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
+                        TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
+    forgetTransaction(); // the stack goes on repeating the answer until its ACK
+    setDialog(Dialog::OVER);
+}
+
+void SipEndpoint::forgetTransaction()
+{
+    if (m_transaction == nullptr)
+        return;
+    nta_incoming_bind(m_transaction, nullptr, nullptr);
+    nta_incoming_destroy(std::exchange(m_transaction, nullptr));
+}

@@ -1,0 +1,25 @@
+#pragma once
+
+/// The SIP stack's headers, with our classes as the arguments that it hands back to its callbacks. Every file of the
+/// SIP module includes the stack through here, so that all of them agree.
+class SipDescriptorHandler;
+class SipEndpoint;
+class SipRequestHandler;
+class SipTimer;
+
+#define NTA_LEG_MAGIC_T SipRequestHandler
+#define NTA_OUTGOING_MAGIC_T SipEndpoint
+#define NTA_INCOMING_MAGIC_T SipEndpoint
+#define SU_WAKEUP_ARG_T SipDescriptorHandler
+#define SU_TIMER_ARG_T SipTimer
+
+#include <sofia-sip/msg_header.h>
+#include <sofia-sip/nta.h>
+#include <sofia-sip/nta_tag.h>
+#include <sofia-sip/sip_header.h>
+#include <sofia-sip/sip_protos.h>
+#include <sofia-sip/sip_status.h>
+#include <sofia-sip/sip_tag.h>
+#include <sofia-sip/su_log.h>
+#include <sofia-sip/su_wait.h>
+#include <sofia-sip/tport_tag.h>

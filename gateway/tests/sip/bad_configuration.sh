@@ -1,0 +1,48 @@
+# What cannot be served: one line on the standard error stream, exit status 2, nothing left running.
+. "$(dirname "$0")/../lib.bash"
+
+# refused REGEXP [ARGUMENT]...
+refused() {
+    local status=0
+    timeout 10 "$GATEWAY" "${@:2}" >"$WORK/gateway.out" 2>"$WORK/gateway.err" || status=$?
+    ((status == 2)) || fail "exit status $status instead of 2 for: $1"
+    (($(wc -l <"$WORK/gateway.err") == 1)) || fail "not one line"
+    grep -qE -- "^callcontrol-gateway: $1" "$WORK/gateway.err" || fail "the line does not match: $1"
+    [[ ! -s $WORK/gateway.out ]] || fail "something on the standard output"
+}
+# bad REGEXP SED-COMMAND: the good configuration, changed
+bad() {
+    write_configuration
+    sed -i -e "$2" "$WORK/gateway.toml"
+    refused "$WORK/gateway.toml: $1" --config "$WORK/gateway.toml" --check
+    refused "$WORK/gateway.toml: $1" --config "$WORK/gateway.toml"
+}
+
+refused ".*--config" --check
+refused ".*--nonsense" --config x --nonsense
+refused "$WORK/none.toml: file: cannot be read" --config "$WORK/none.toml"
+refused "$WORK: file: cannot be read" --config "$WORK"
+bad "gateway.max-cals: is not a key" 's/^call-control-log-level.*/max-cals = 3/'
+bad "gateway.max-calls: expected a whole number" 's/^call-control-log-level.*/max-calls = "3"/'
+bad "gateway.max-calls: must be from 0 to " 's/^call-control-log-level.*/max-calls = -1/'
+bad "interface\[1\].listen: 'localhost' is not an address" "s/listen = \"$HOST:$PORT_B\"/listen = \"localhost:5060\"/"
+bad "interface\[0\].peer: is missing" "/peer = \"$HOST:$PORT_CALLER\"/d"
+bad "interface\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
+bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
+bad "line 2: " '2s/.*/call = = 3/'
+bad "interface: is missing" '/^\[\[interface/,$d'
+
+# a port in use, of each transport; the first interface is given back, too
+write_configuration
+start_gateway
+sed "s/:$PORT_A\"/:$((PORT + 30))\"/" "$WORK/gateway.toml" >"$WORK/second.toml"
+mv "$WORK/gateway.err" "$WORK/first.err"
+mv "$WORK/gateway.out" "$WORK/first.out"
+refused "$WORK/second.toml: interface\[1\].listen: cannot listen on $HOST:$PORT_B \(udp\): Address already in use" \
+    --config "$WORK/second.toml"
+kill -TERM $gateway_pid
+wait $gateway_pid || fail "the first gateway: exit status $?"
+gateway_pid=0
+grep -qx "gateway: 0 calls placed, 0 answered, 0 cleared, 0 failed, 0 left over" "$WORK/first.out" || fail "the last line"
+"$GATEWAY" --config "$WORK/second.toml" --check | grep -qx "$WORK/second.toml: all right" || fail "--check"
+finish
