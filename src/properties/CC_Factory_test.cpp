@@ -155,7 +155,7 @@ TEST(CC_Factory, EveryClassHasATypeNumberOfItsOwn)
         EXPECT_EQ(added.first->second, property->getTypeName());
         EXPECT_GT(CC_Property::NO_TYPE_ID, property->getTypeId());
     }
-    EXPECT_EQ(21U, names.size()); // twenty value classes and the base
+    EXPECT_EQ(23U, names.size()); // twenty-two value classes and the base
 }
 
 // this test is another object than the library: both have to use the same variable

@@ -43,6 +43,49 @@ TEST(InfoContainer, FurtherLinesOfATextAreIndentedLikeChildren)
     EXPECT_STREQ("  text: first\n    second\n    \n", info.getString_TreeFormat().c_str());
 }
 
+TEST(InfoContainer, TextsBeginInTheColumnOfTheKeyWidth)
+{
+    InfoContainer info;
+    info.add(0, 0, "Local", "");
+    info.add(1, 0, "Jitter", "12 ms");
+    info.add(1, 0, "Ten letter", "at the column");
+    info.add(1, 0, "Eleven let.", "past it\nand on");
+    String text("left from before");
+    EXPECT_EQ(&text, &info.getString_TreeFormat(text, 14, 0, 0));
+    EXPECT_STREQ("Local\n  Jitter:     12 ms\n  Ten letter: at the column\n  Eleven let.: past it\n    and on\n",
+                 text.c_str());
+}
+
+TEST(InfoContainer, AMarginStandsBeforeEveryLine)
+{
+    InfoContainer info;
+    info.add(0, 0, "a", "1\n2");
+    info.add(1, 0, "b", "3");
+    String text;
+    EXPECT_STREQ("   a:  1\n     2\n     b: 3\n", info.getString_TreeFormat(text, 4, 3, 0).c_str());
+}
+
+TEST(InfoContainer, TheBaseLevelStandsAtTheMargin)
+{
+    InfoContainer info;
+    info.add(1, 0, "above", "1");
+    info.add(2, 0, "base", "2");
+    info.add(3, 0, "below", "3");
+    String text;
+    EXPECT_STREQ("above: 1\nbase: 2\n  below: 3\n", info.getString_TreeFormat(text, 0, 0, 2).c_str());
+}
+
+TEST(InfoContainer, WithoutSettingsBothFormsAreTheSame)
+{
+    InfoContainer info;
+    info.add(1, 0, "key", "text\nmore");
+    info.add(0, 0, "heading", "");
+    info.markIncomplete();
+    String text;
+    EXPECT_TRUE(info.getString_TreeFormat() == info.getString_TreeFormat(text, 0, 0, 0));
+    EXPECT_STREQ("  key: text\n    more\nheading\n(incomplete: memory ran out)\n", text.c_str());
+}
+
 TEST(InfoContainer, AnEntryKeepsWhatWasAdded)
 {
     InfoContainer info;
