@@ -39,7 +39,7 @@ XCode CC_Endpoint::offer(CC_Call& call, String const& name, CC_PropertyContainer
         return handleOffer(call, name, properties);
     CC_PropertyContainer filtered(properties);
     if (filtered.getNumberOfProperties() != properties.getNumberOfProperties())
-        return XCode::FAILURE; // memory is out
+        return XCode::FAILURE;                                     // memory is out
     std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
     return handleOffer(call, name, filtered);
 }
