@@ -60,7 +60,7 @@ public:
     {
         if (!has(key))
             refuse(key, "is missing");
-        std::string const value = text(key, {});
+        std::string value = text(key, {});
         if (value.empty())
             refuse(key, "must not be empty");
         return value;
@@ -81,7 +81,7 @@ public:
 
     std::string oneOf(char const* key, char const* fallback, std::initializer_list<char const*> allowed) const
     {
-        std::string const value = text(key, fallback);
+        std::string value = text(key, fallback);
         std::string list;
         for (char const* const candidate : allowed)
         {

@@ -69,9 +69,9 @@ int RUN(Arguments const& arguments)
     Gateway::BLOCK_SIGNALS();
     return SERVE(configuration, arguments.tracedCalls);
 }
-} // namespace
 
-int main(int argc, char** argv)
+/// Reads the command line and runs; what is wrong with either is told in one line.
+int START(int argc, char** argv)
 {
     Arguments arguments;
     CLI::App app("A media gateway's call control between SIP interfaces");
@@ -92,6 +92,15 @@ int main(int argc, char** argv)
     catch (ConfigurationError const& error)
     {
         return COMPLAIN(error.what());
+    }
+}
+} // namespace
+
+int main(int argc, char** argv)
+{
+    try
+    {
+        return START(argc, argv);
     }
     catch (std::exception const& error)
     {
