@@ -86,6 +86,37 @@ TEST_P(OutOfMemory, AWholeCallSurvivesEachSingleFailure)
 
 INSTANTIATE_TEST_SUITE_P(WithAndWithoutFilters, OutOfMemory, testing::Bool());
 
+TEST(OutOfMemoryOfTheCopy, AnAcceptedCallHasAllThatWasGivenOrIsNotAccepted)
+{
+    CallControlFixture fixture;
+    Party anna("anna");
+    CC_PropertyContainer own;
+    ASSERT_EQ(own.set(CC_PropertyString(CC_PropertyId::NETWORK, "given")), XCode::OK);
+    unsigned int refused = 0;
+    for (unsigned long n = 1;; ++n)
+    {
+        CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+        FailingAllocator::failNth(n);
+        XCode const accepted = anna.adapter->accept(*call, own);
+        FailingAllocator::stop();
+        if (accepted.isOk())
+        {
+            auto const* const network = dynamic_cast<CC_PropertyString const*>(
+                call->getCallLeg(0)->getProperties().get(CC_PropertyId::NETWORK));
+            ASSERT_NE(network, nullptr) << "allocation " << n;
+            EXPECT_STREQ(network->getValue().c_str(), "given") << "allocation " << n;
+        }
+        refused += accepted.isOk() ? 0 : 1;
+        anna.adapter->cleanup();
+        CallControl::RELEASE_CALL("SWITCH", call);
+        fixture.m_loop.settle();
+        anna.setup();
+        if (!FailingAllocator::hasFailed())
+            break;
+    }
+    EXPECT_GT(refused, 3u);
+}
+
 TEST(OutOfMemoryAtStartUp, CreatingAContextReportsEachFailureAndLeavesNothing)
 {
     CallControlFixture fixture;

@@ -146,8 +146,10 @@ XCode CC_CallAdapter::tryAccept(CC_Call& call, CC_PropertyContainer const& ownPr
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[EP %s/%s] Accept call %s", getEndpointName(), m_name.c_str(), call.getName().c_str());
     CC_PropertyContainer own(ownProperties);
-    if (!createOwnCallLeg().isOk() || !setInitialProperties(own, CC_PropertyCallLegState::TRYING).isOk() ||
-        !startOwnCallLeg(own).isOk() || attempt.isOver())
+    bool const isComplete = own.getNumberOfProperties() == ownProperties.getNumberOfProperties(); // else memory is out
+    if (!createOwnCallLeg().isOk() || !isComplete ||
+        !setInitialProperties(own, CC_PropertyCallLegState::TRYING).isOk() || !startOwnCallLeg(own).isOk() ||
+        attempt.isOver())
         return XCode::FAILURE;
     return call.addCallLeg(*m_ownCallLeg).isOk() ? XCode::OK : XCode::FAILURE;
 }
