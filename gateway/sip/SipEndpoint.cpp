@@ -5,6 +5,7 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyString.h"
 #include "sip/SipInterface.h"
 #include "sip/SipPropertyId.h"
@@ -13,6 +14,28 @@
 #include <spdlog/spdlog.h>
 
 #include <tuple>
+#include <utility>
+
+namespace
+{
+/// Texts of several lines, and of columns, as the one line that a trace has for them.
+std::string ON_ONE_LINE(std::string_view text)
+{
+    std::string line;
+    char const* separator = "";
+    for (char const c : text)
+        if (c == '\n')
+            separator = ", ";
+        else if (c == ' ')
+            separator = *separator == '\0' ? " " : separator;
+        else
+        {
+            char const* const before = std::exchange(separator, "");
+            line.append(line.empty() ? "" : before).append(1, c);
+        }
+    return line;
+}
+} // namespace
 
 SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     : CC_Endpoint(nullptr, nullptr)
@@ -77,7 +100,8 @@ bool SipEndpoint::isPeerReleased() const
 
 void SipEndpoint::onPeerReleased()
 {
-    SipCause const cause = SipCause::FROM_PROPERTY(getPeer<CC_PropertyCause>(CC_PropertyId::CAUSE));
+    SipCause const cause =
+        SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     endDialog(cause);
     leaveCall(cause);
 }
@@ -96,6 +120,7 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         finishIfDone();
         return;
     }
+    recordQuality();
     CC_PropertyContainer last;
     std::ignore = last.set(cause.getProperty()); // without memory the leg is released without words
     std::ignore = writeOwn(last);
@@ -111,6 +136,17 @@ void SipEndpoint::leaveCall(SipCause const& cause)
                  m_isCalling ? "calling" : "called", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
                  cause.sipCode, cause.text.empty() ? "" : ", \"", cause.text, cause.text.empty() ? "" : "\"");
     finishIfDone();
+}
+
+/// While the leg is still in the call, so that the other side sees it.
+void SipEndpoint::recordQuality()
+{
+    std::optional<CC_QoS> const record = m_quality.getRecord();
+    if (!record)
+        return;
+    if (isTraced())
+        trace("did  " + TEXT_OF(CC_PropertyQoS(CC_PropertyId::QUALITY_OF_SERVICE, *record)));
+    std::ignore = m_adapter.setOwnQoS(*record); // without memory the call ends without a record
 }
 
 void SipEndpoint::setDialog(Dialog dialog)
@@ -196,7 +232,7 @@ std::string SipEndpoint::TEXT_OF(CC_Property const& property)
     std::string const name = SipPropertyId::NAME(property.getId());
     if (property.getId() == SipPropertyId::SESSION_DESCRIPTION)
         return name + fmt::format(" ({} bytes)", value.length());
-    return name + "=" + std::string(value.view());
+    return name + "=" + ON_ONE_LINE(value.view());
 }
 
 std::string SipEndpoint::TEXT_OF(CC_PropertyContainer const& properties)

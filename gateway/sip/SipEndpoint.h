@@ -1,10 +1,12 @@
 #pragma once
 
 #include "CallTrace.h"
-#include "adapters/CC_CallAdapter.h"
+#include "adapters/CC_CallAdapterE164.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "sip/SipCause.h"
+#include "sip/SipParty.h"
+#include "sip/SipQuality.h"
 #include "sip/SipRequestHandler.h"
 #include "sip/SipTimer.h"
 
@@ -31,10 +33,10 @@ public:
     SipEndpoint(SipInterface& interface, unsigned int callNumber);
     ~SipEndpoint() override;
 
-    /// The calling side: takes over a new INVITE and dials `number` on the provider. 0, or the status with which the
-    /// transaction is given up at once.
+    /// The calling side: takes over a new INVITE and dials the called party on the provider. 0, or the status with
+    /// which the transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                      std::string const& number);
+                      SipParty const& called);
     /// Clears the call for a reason of the gateway's own.
     void clear(SipCause const& cause);
 
@@ -69,7 +71,7 @@ private:
 
     // calling side: SipEndpoint_Calling.cpp
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
-    XCode dial(sip_t const* request, std::string const& provider, std::string const& number);
+    XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
     void onDialFailed();
     static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
     void onAck(sip_t const* request);
@@ -78,12 +80,13 @@ private:
     void followPeer();
     void answer();
     void answerProvisionally(int status, char const* phrase, bool hasData);
+    void answerFromPeer(int status, char const* phrase, std::string const& session);
     void answerFinally(unsigned int status, std::string const& reasonHeader);
     void forgetTransaction();
 
     // called side: SipEndpoint_Called.cpp
-    bool sendInvite(CC_PropertyContainer const& offerProperties);
-    bool startInvite(std::string const& uri, unsigned int maxForwards);
+    bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
+    bool startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards);
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
@@ -102,6 +105,7 @@ private:
     void endDialog(SipCause const& cause);
     void setDialog(Dialog dialog);
     void leaveCall(SipCause const& cause);
+    void recordQuality();
     void onPeerReleased();
     void finishIfDone();
     XCode writeOwn(CC_PropertyContainer const& properties);
@@ -142,5 +146,6 @@ private:
     bool m_hadPeer = false;
     bool m_isInCall = false;
     bool m_isFinished = false;
-    CC_CallAdapter m_adapter; // last: silenced first
+    SipQuality m_quality;
+    CC_CallAdapterE164 m_adapter; // last: silenced first
 };

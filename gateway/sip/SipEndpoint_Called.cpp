@@ -5,14 +5,18 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/SipAddress.h"
+#include "sip/SipDiversion.h"
+#include "sip/SipIdentity.h"
 #include "sip/SipInterface.h"
+#include "sip/SipProperty.h"
 #include "sip/SipPropertyId.h"
 
 #include <algorithm>
 #include <tuple>
+
+using namespace SipProperty;
 
 namespace
 {
@@ -20,7 +24,7 @@ constexpr unsigned int DEFAULT_MAX_FORWARDS = 69;
 
 void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State state)
 {
-    std::ignore = properties.set(CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
+    ADD(properties, CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
 }
 
 /// What an answer with a session description brings: the description, and that media may come.
@@ -28,9 +32,17 @@ void ADD_SESSION(CC_PropertyContainer& properties, std::string const& session)
 {
     if (session.empty())
         return;
-    std::ignore =
-        properties.set(CC_PropertyString(SipPropertyId::SESSION_DESCRIPTION, String(std::string_view(session))));
-    std::ignore = properties.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
+    ADD_TEXT(properties, SipPropertyId::SESSION_DESCRIPTION, session);
+    ADD(properties, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
+}
+
+/// Who answers, if the answer says so.
+void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
+{
+    if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response))
+        connected->addTo(properties);
+    else if (std::string const name = SipIdentity::READ_NAME_OF_TO(response); !name.empty())
+        ADD_TEXT(properties, CC_PropertyId::NAME, name); // most often the one that our INVITE had
 }
 } // namespace
 
@@ -41,43 +53,45 @@ XCode SipEndpoint::handleOffer(CC_Call& call, String const& name, CC_PropertyCon
         trace("told offer " + std::string(name.view()) + (properties.isEmpty() ? "" : ", ") + TEXT_OF(properties));
     String adapterName;
     adapterName.format("%u", m_callNumber);
-    CC_PropertyContainer own;
-    std::ignore = own.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, name)); // a call without it goes on
+    SipParty called = SipParty::OF_OFFER(properties);
+    if (called.number.empty())
+        called.number = name.view();
     if (XCode const bound = m_adapter.setup(adapterName, *this, this); !bound.isOk())
         return bound;
-    if (XCode const accepted = m_adapter.accept(call, own); !accepted.isOk())
+    if (XCode const accepted = m_adapter.accept(call, STRING(called.number), called.type, called.plan,
+                                                called.presentation, called.screening, STRING(called.name));
+        !accepted.isOk())
         return accepted;
     m_isInCall = true;
     m_hadPeer = true;
     if (isTraced())
-        trace("did  accept, State=TRYING, " + TEXT_OF(own));
-    if (!sendInvite(properties))
+        trace("did  accept as " + called.getText() + ", State=TRYING");
+    if (!sendInvite(called, properties))
         clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
     return XCode::OK;
 }
 
-bool SipEndpoint::sendInvite(CC_PropertyContainer const& offerProperties)
+bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties)
 {
     Configuration::Interface const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
-    auto const* const number =
-        dynamic_cast<CC_PropertyString const*>(m_adapter.getOwnProperty(CC_PropertyId::E164_NUMBER));
-    std::string const to = SipAddress::MAKE_URI(number != nullptr ? number->getValue().view() : std::string_view(),
-                                                configuration.peer, configuration.usesTcp);
-    std::string const caller = getPeerText(CC_PropertyId::E164_NUMBER);
-    std::string const from = SipAddress::MAKE_NAME_ADDR(
-        getPeerText(CC_PropertyId::NAME),
-        SipAddress::MAKE_URI(caller.empty() ? "anonymous" : caller, configuration.listen, false));
-    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_FROM_STR(from.c_str()),
-                            SIPTAG_TO_STR(("<" + to + ">").c_str()), TAG_END());
+    SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
+    std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
+    std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
+    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
+                            SIPTAG_FROM_STR(caller.getFrom(configuration.listen).c_str()), SIPTAG_TO_STR(to.c_str()),
+                            TAG_END());
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
-    return startInvite(to, maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
-                                                  : DEFAULT_MAX_FORWARDS);
+    std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.listen) +
+                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.listen, uri);
+    return startInvite(uri, identityHeaders,
+                       maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
+                                              : DEFAULT_MAX_FORWARDS);
 }
 
-bool SipEndpoint::startInvite(std::string const& uri, unsigned int maxForwards)
+bool SipEndpoint::startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards)
 {
     std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
     std::string const hops = std::to_string(maxForwards);
@@ -86,6 +100,7 @@ bool SipEndpoint::startInvite(std::string const& uri, unsigned int maxForwards)
     m_invite = nta_outgoing_tcreate(m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE,
                                     URL_STRING_MAKE(uri.c_str()), SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
                                     SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
+                                    TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
                                     TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                                     TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
     if (m_invite == nullptr)
@@ -114,9 +129,13 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     m_hasRung = m_hasRung || status == 180;
     trace("<- " + std::to_string(status));
     CC_PropertyContainer own;
-    ADD_SESSION(own, SESSION_OF(response));
+    std::string const session = SESSION_OF(response);
+    if (m_hasOffer)
+        m_quality.noteAnswer(session);
+    ADD_CONNECTED(own, response);
+    ADD_SESSION(own, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
-        std::ignore = own.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
+        ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
     ADD_STATE(own, m_hasRung ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
     std::ignore = writeOwn(own); // what memory refuses the other side does not hear; the next answer may fit
 }
@@ -147,7 +166,10 @@ void SipEndpoint::onAnswer(sip_t const* response)
         acknowledge({});
     m_dialog = Dialog::UP;
     m_wasAnswered = true;
+    if (m_hasOffer)
+        m_quality.noteAnswer(session);
     CC_PropertyContainer own;
+    ADD_CONNECTED(own, response);
     ADD_SESSION(own, session);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
     if (!writeOwn(own).isOk())
@@ -208,8 +230,11 @@ void SipEndpoint::acknowledge(std::string const& sessionDescription)
 /// The other side's answer to the offer that came with our 200 is here.
 void SipEndpoint::acknowledgeLate()
 {
-    if (std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION); !session.empty())
-        acknowledge(session);
+    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
+    if (session.empty())
+        return;
+    m_quality.noteAnswer(session);
+    acknowledge(session);
 }
 
 void SipEndpoint::cancel(SipCause const& cause)

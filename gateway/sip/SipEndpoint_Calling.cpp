@@ -4,45 +4,28 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
-#include "sip/SipAddress.h"
+#include "sip/SipDiversion.h"
+#include "sip/SipIdentity.h"
 #include "sip/SipInterface.h"
+#include "sip/SipProperty.h"
 #include "sip/SipPropertyId.h"
-#include "sip/SipReason.h"
 
 #include <tuple>
+
+using namespace SipProperty;
 
 namespace
 {
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
-
-std::string CALLER_OF(sip_t const* request)
-{
-    char const* const user = request->sip_from->a_url->url_user;
-    return user != nullptr ? SipAddress::UNESCAPE_USER(user) : std::string();
-}
-
-std::string CALLER_NAME_OF(sip_t const* request)
-{
-    char const* const display = request->sip_from->a_display;
-    return display != nullptr ? SipReason::UNQUOTE(display) : std::string();
-}
-
-/// Without memory for one of them the call goes on without it.
-void ADD_TEXT(CC_PropertyContainer& properties, unsigned int id, std::string const& text)
-{
-    if (!text.empty())
-        std::ignore = properties.set(CC_PropertyString(id, String(std::string_view(text))));
-}
 } // namespace
 
 int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                               std::string const& number)
+                               SipParty const& called)
 {
     m_isCalling = true;
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
-    trace("<- INVITE to " + number + " from " + CALLER_OF(request));
+    trace("<- INVITE to " + called.getUser());
     m_isInCall = true;
     if (!makeServerDialog(transaction, request))
     {
@@ -53,7 +36,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
     trace("-> 100");
     // the stack still holds the transaction, which must not end under it: a failure waits until it has let go
-    if (!dial(request, provider, number).isOk() && !m_timer.start(0))
+    if (!dial(request, provider, called).isOk() && !m_timer.start(0))
         onDialFailed();
     return 0;
 }
@@ -74,29 +57,37 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     return true;
 }
 
-XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, std::string const& number)
+XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipParty const& called)
 {
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    SipIdentity const caller = SipIdentity::READ_CALLER(request);
+    SipDiversion const diversion = SipDiversion::READ(request);
     CC_PropertyContainer own;
-    ADD_TEXT(own, CC_PropertyId::E164_NUMBER, CALLER_OF(request));
-    ADD_TEXT(own, CC_PropertyId::NAME, CALLER_NAME_OF(request));
-    ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-    std::ignore = own.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, m_hasOffer)); // else a new leg's: none
+    if (!caller.second.number.empty())
+        caller.second.addAsSecondTo(own);
+    diversion.addTo(own);
+    if (m_hasOffer)
+        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, m_hasOffer)); // else a new leg's: none
     CC_PropertyContainer offer;
     unsigned long const maxForwards =
         request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;
-    std::ignore = offer.set(CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, maxForwards - 1)); // else the default
+    ADD(offer, CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, maxForwards - 1)); // else the default
     CC_PropertyContainer call;
-    std::ignore = call.set(CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
+    ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
     if (isTraced())
-        trace("did  dial " + provider + " (" + number + "), State=CONNECTED, " + TEXT_OF(own));
+        trace("did  dial " + provider + " (" + called.getUser() + ") as " + caller.party.getText() +
+              ", State=CONNECTED, " + TEXT_OF(own));
     String name;
     name.format("%u", m_callNumber);
     if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
         return bound;
-    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), number.c_str(), own, offer, call,
-                          nullptr);
+    SipParty const& party = caller.party;
+    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), STRING(called.getUser()),
+                          STRING(party.number), party.type, party.plan, party.presentation, party.screening,
+                          STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
+                          true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
 }
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
@@ -119,6 +110,7 @@ void SipEndpoint::onAck(sip_t const* request)
     m_dialog = Dialog::UP;
     if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
     {
+        m_quality.noteAnswer(session);
         CC_PropertyContainer own;
         ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
         std::ignore = writeOwn(own); // without memory the called side gives up in its time
@@ -169,22 +161,28 @@ void SipEndpoint::followPeer()
 
 void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
 {
-    std::string const session = hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string();
     m_hasEarlyMedia = m_hasEarlyMedia || hasData;
-    trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
-    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
-                        TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                        TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+    answerFromPeer(status, phrase, hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string());
 }
 
 void SipEndpoint::answer()
 {
-    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
-    trace(std::string("-> 200") + (session.empty() ? "" : " with a session description"));
     m_dialog = Dialog::ANSWERED;
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
-    nta_incoming_treply(m_transaction, SIP_200_OK, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
+}
+
+/// With the called party's identity, as far as the network vouches for it.
+void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string const& session)
+{
+    std::string const identity =
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+    if (m_hasOffer)
+        m_quality.noteAnswer(session);
+    trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
+    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+                        TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
                         TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                         TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
 }

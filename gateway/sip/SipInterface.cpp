@@ -7,6 +7,7 @@
 #include "sip/SipAddress.h"
 #include "sip/SipCause.h"
 #include "sip/SipEndpoint.h"
+#include "sip/SipIdentity.h"
 #include "sip/SipListener.h"
 #include "sip/SipPropertyId.h"
 #include "sip/SipStack.h"
@@ -21,11 +22,6 @@ namespace
 {
 constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
-
-std::string USER_OF(url_t const* url)
-{
-    return url != nullptr && url->url_user != nullptr ? SipAddress::UNESCAPE_USER(url->url_user) : std::string();
-}
 } // namespace
 
 SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration)
@@ -105,7 +101,8 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         return refused;
     unsigned int const callNumber = ++m_environment.lastCallNumber;
     ++m_environment.counters.placed;
-    std::string const number = USER_OF(request->sip_request->rq_url);
+    SipParty const called = SipIdentity::READ_CALLED(request);
+    std::string const number = called.getUser();
     std::string const* const to = m_environment.routing.find(m_configuration.name, number);
     if (to == nullptr)
     {
@@ -117,7 +114,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
                             TAG_END());
         return 404;
     }
-    return makeEndpoint(callNumber).receiveInvite(transaction, request, *to, number);
+    return makeEndpoint(callNumber).receiveInvite(transaction, request, *to, called);
 }
 
 /// What keeps an INVITE from being a call, whatever it asks for.

@@ -1,56 +1,10 @@
 #include "SipReason.h"
 
-#include <algorithm>
-#include <cctype>
-#include <charconv>
+#include "sip/SipText.h"
 
 namespace
 {
-constexpr bool IS_BLANK(char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
-
-std::string_view TRIM(std::string_view text)
-{
-    while (!text.empty() && IS_BLANK(text.front()))
-        text.remove_prefix(1);
-    while (!text.empty() && IS_BLANK(text.back()))
-        text.remove_suffix(1);
-    return text;
-}
-
-bool EQUALS_IGNORING_CASE(std::string_view left, std::string_view right)
-{
-    return std::equal(left.begin(), left.end(), right.begin(), right.end(),
-                      [](unsigned char a, unsigned char b) { return std::tolower(a) == std::tolower(b); });
-}
-
-/// Cuts the text up to `separator` off `rest`; a separator inside quotes does not count.
-std::string_view CUT(std::string_view& rest, char separator)
-{
-    bool isQuoted = false;
-    std::size_t i = 0;
-    for (; i < rest.size(); ++i)
-    {
-        if (isQuoted && rest[i] == '\\')
-            ++i;
-        else if (i < rest.size() && rest[i] == '"')
-            isQuoted = !isQuoted;
-        else if (!isQuoted && rest[i] == separator)
-            break;
-    }
-    std::size_t const length = std::min(i, rest.size());
-    std::string_view const piece = rest.substr(0, length);
-    rest.remove_prefix(std::min(length + 1, rest.size()));
-    return TRIM(piece);
-}
-
-/// 0 for what is no number of that range.
-unsigned int NUMBER(std::string_view text, unsigned int least, unsigned int most)
-{
-    unsigned int value = 0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
-    bool const isNumber = error == std::errc() && end == text.data() + text.size();
-    return isNumber && value >= least && value <= most ? value : 0;
-}
+using namespace SipText;
 
 /// One reason value: "protocol;cause=...;text=...".
 void READ_VALUE(std::string_view value, SipReason& reason)

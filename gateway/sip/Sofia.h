@@ -17,6 +17,7 @@ class SipTimer;
 #include <sofia-sip/nta.h>
 #include <sofia-sip/nta_tag.h>
 #include <sofia-sip/sip_header.h>
+#include <sofia-sip/sip_parser.h>
 #include <sofia-sip/sip_protos.h>
 #include <sofia-sip/sip_status.h>
 #include <sofia-sip/sip_tag.h>

@@ -71,10 +71,10 @@ to = "a"
 END
 }
 
-# start_gateway [ARGUMENT]...: with the configuration written before; the first call is traced.
+# start_gateway [ARGUMENT]...: with the configuration written before; the first call, or as many as TRACED says, is traced.
 start_gateway() {
     [[ -f $WORK/gateway.toml ]] || write_configuration
-    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls 1 "$@" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls "${TRACED:-1}" "$@" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
     gateway_pid=$!
     local port
     for port in $PORT_A $PORT_B; do

@@ -6,6 +6,7 @@
 
 SDP_OF_CALLER=$'v=0\no=caller 1 1 IN IP4 [local_ip]\ns=-\nc=IN IP4 [local_ip]\nt=0 0\nm=audio 40000 RTP/AVP 8\na=rtpmap:8 PCMA/8000'
 SDP_OF_CALLEE=$'v=0\no=callee 1 1 IN IP4 [local_ip]\ns=-\nc=IN IP4 [local_ip]\nt=0 0\nm=audio 50000 RTP/AVP 8\na=rtpmap:8 PCMA/8000'
+ALICE='"Alice \"A\"" <sip:4420@[local_ip]:[local_port]>'
 
 # write_scenario FILE FUNCTION
 write_scenario() {
@@ -21,7 +22,8 @@ write_scenario() {
     } >"$1"
 }
 
-# checks PART REGEXP...: that each part (a header's name with its colon, "body", or "msg" for all) of the received message matches.
+# checks PART REGEXP...: that each part (a header's name with its colon, "body", or "msg" for all) of the received message
+# matches; part "nowhere": that nothing in the message does.
 checks() {
     (($# > 0)) || return 0
     echo '<action>'
@@ -29,6 +31,8 @@ checks() {
         variable=$((variable + 1))
         if [[ $1 == body || $1 == msg ]]; then
             echo "<ereg regexp=\"$2\" search_in=\"$1\" check_it=\"true\" assign_to=\"$variable\"/>"
+        elif [[ $1 == nowhere ]]; then
+            echo "<ereg regexp=\"$2\" search_in=\"msg\" check_it_inverse=\"true\" assign_to=\"$variable\"/>"
         else
             echo "<ereg regexp=\"$2\" search_in=\"hdr\" header=\"$1\" check_it=\"true\" assign_to=\"$variable\"/>"
         fi
@@ -77,11 +81,11 @@ send_text() {
     step=$((step + 1))
 }
 
-# request_text METHOD SEQUENCE BRANCH TO-PARAMETER [HEADER]...
+# request_text METHOD SEQUENCE BRANCH TO-PARAMETER [HEADER]...: from the address in FROM, if that is set
 request_text() {
     echo "$1 sip:[service]@[remote_ip]:[remote_port] SIP/2.0
 Via: SIP/2.0/[transport] [local_ip]:[local_port];branch=$3
-From: \"Alice \\\"A\\\"\" <sip:4420@[local_ip]:[local_port]>;tag=[pid]caller[call_number]
+From: ${FROM:-$ALICE};tag=[pid]caller[call_number]
 To: <sip:[service]@[remote_ip]:[remote_port]>$4
 Call-ID: [call_id]
 CSeq: $2 $1
