@@ -60,7 +60,6 @@ TEST(CallControlFixture, OneFollowsAnother)
 
 TEST(CallControlFixtureDeathTest, ASecondOneAtATimeIsRefusedClearly)
 {
-    GTEST_FLAG_SET(death_test_style, "threadsafe");
     CallControlFixture const callControl;
     EXPECT_DEATH(CallControlFixture(), "is another fixture alive");
 }
