@@ -19,7 +19,7 @@ TYEvent::TYEvent(TYEventLoop& loop, EventPrio::Type priority, Callback callback,
 
 TYEvent::~TYEvent() { s_numberOfInstances.fetch_sub(1, std::memory_order_relaxed); }
 
-XCode TYEvent::setIfNotPending() { return m_loop.post(*this); }
+XCode TYEvent::setIfNotPending() { return m_isPending.exchange(true) ? XCode::OK : m_loop.post(*this); }
 
 void TYEvent::destroy()
 {
@@ -27,7 +27,7 @@ void TYEvent::destroy()
     removeReference();
 }
 
-bool TYEvent::isPending() const { return m_loop.isPending(*this); }
+bool TYEvent::isPending() const { return m_isPending.load(); }
 
 void TYEvent::addReference() { m_references.fetch_add(1, std::memory_order_relaxed); }
 

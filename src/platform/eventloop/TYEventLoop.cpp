@@ -42,7 +42,9 @@ void TYEventLoop::run()
     {
         {
             std::unique_lock lock(m_mutex);
+            m_isSleeping = true;
             m_wakeUp.wait(lock, [this] { return m_isStopped || hasPending(); });
+            m_isSleeping = false;
             if (m_isStopped)
             {
                 m_isStopped = false;
@@ -65,7 +67,29 @@ bool TYEventLoop::runTurn()
     TY_ASSERT(!m_isInTurn, "a turn inside a turn");
     m_thread.store(std::this_thread::get_id(), std::memory_order_relaxed);
 
-    std::unique_lock lock(m_mutex);
+    takeTurn();
+    bool const hadWork = !m_turn.isEmpty();
+    m_isInTurn = true;
+    while (!m_turn.isEmpty())
+    {
+        TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
+        m_turn.unlink(event);
+        event.m_isInTurn = false;
+        event.m_isPending.exchange(false);
+        event.addReference();
+        event.handle();
+        event.removeReference();
+    }
+    m_isInTurn = false;
+    return hadWork;
+}
+
+void TYEventLoop::takeTurn()
+{
+    if (!m_wasPosted.load(std::memory_order_acquire))
+        return; // without the lock: a host's loop asks often
+    std::lock_guard const lock(m_mutex);
+    m_wasPosted.store(false, std::memory_order_relaxed);
     resetPollFd();
     for (LinkedListManager_Untyped& queue : m_pending)
     {
@@ -74,22 +98,6 @@ bool TYEventLoop::runTurn()
             static_cast<TYEvent&>(*element).m_isInTurn = true;
         m_turn.takeAll(queue);
     }
-    bool const hadWork = !m_turn.isEmpty();
-    m_isInTurn = true;
-    while (!m_turn.isEmpty())
-    {
-        TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
-        m_turn.unlink(event);
-        event.m_isPending = false;
-        event.m_isInTurn = false;
-        event.addReference();
-        lock.unlock();
-        event.handle();
-        event.removeReference();
-        lock.lock();
-    }
-    m_isInTurn = false;
-    return hadWork;
 }
 
 int TYEventLoop::getPollFd()
@@ -110,15 +118,17 @@ TYSyncEvent& TYEventLoop::getSyncEvent(EventPrio::Type priority)
     return m_syncEvents[std::min<unsigned int>(priority, EventPrio::COUNT - 1)];
 }
 
+/// For the one who made the event pending.
 XCode TYEventLoop::post(TYEvent& event)
 {
     std::lock_guard const lock(m_mutex);
     if (event.m_isDestroyed)
+    {
+        event.m_isPending = false;
         return XCode::REFUSED;
-    if (event.m_isPending)
-        return XCode::OK;
-    std::ignore = m_pending[event.m_priority].append(event); // not pending, so in no list: cannot be refused
-    event.m_isPending = true;
+    }
+    std::ignore = m_pending[event.m_priority].append(event); // it was not pending, so it is in no list
+    m_wasPosted.store(true, std::memory_order_release);
     wake();
     return XCode::OK;
 }
@@ -127,18 +137,12 @@ void TYEventLoop::withdraw(TYEvent& event)
 {
     std::lock_guard const lock(m_mutex);
     event.m_isDestroyed = true;
-    if (event.m_isPending)
+    if (event.isLinked())
         (event.m_isInTurn ? m_turn : m_pending[event.m_priority]).unlink(event);
     event.m_isPending = false;
     event.m_isInTurn = false;
     if (!hasPending())
         resetPollFd();
-}
-
-bool TYEventLoop::isPending(TYEvent const& event) const
-{
-    std::lock_guard const lock(m_mutex);
-    return event.m_isPending;
 }
 
 bool TYEventLoop::hasPending() const
@@ -149,7 +153,8 @@ bool TYEventLoop::hasPending() const
 // This and the next two with the lock held. A loop whose descriptor nobody asked for pays for no system call.
 void TYEventLoop::wake()
 {
-    m_wakeUp.notify_one();
+    if (m_isSleeping)
+        m_wakeUp.notify_one();
     setPollFd();
 }
 

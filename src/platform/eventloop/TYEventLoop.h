@@ -51,9 +51,9 @@ private:
     friend class TYEvent;
     friend class TYSyncEvent;
 
+    void takeTurn();
     XCode post(TYEvent& event);
     void withdraw(TYEvent& event);
-    bool isPending(TYEvent const& event) const;
     bool hasPending() const;
     void wake();
     void setPollFd();
@@ -63,11 +63,13 @@ private:
     std::condition_variable m_wakeUp;    // of run()
     std::condition_variable m_syncEnded; // of the callers of synchronisation events
     std::array<LinkedListManager_Untyped, EventPrio::COUNT> m_pending;
-    LinkedListManager_Untyped m_turn; // what the running turn has taken and not yet run
+    LinkedListManager_Untyped m_turn; // what the running turn has taken and not yet run; the loop's thread
     TYSyncEvent m_syncEvents[EventPrio::COUNT];
+    std::atomic<bool> m_wasPosted{false}; // since a turn last took what was pending
     std::atomic<std::thread::id> m_thread;
     int m_pollFd = -1;
     unsigned int m_waiting = 0; // callers inside a synchronisation event
+    bool m_isSleeping = false;  // run() waits for work
     bool m_isPollFdSet = false;
     bool m_isStopped = false;
     bool m_isEnded = false;

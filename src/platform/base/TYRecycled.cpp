@@ -1,0 +1,132 @@
+#include "platform/base/TYRecycled.h"
+
+#include <atomic>
+#include <utility>
+
+namespace
+{
+struct Block
+{
+    Block* next;
+};
+
+struct List
+{
+    Block* first = nullptr;
+    unsigned int count = 0;
+};
+
+constexpr std::size_t UNIT = sizeof(void*);
+constexpr std::size_t MAX_SIZE = 512;
+
+/// The blocks that a thread keeps, a list for each size up to the largest.
+struct Cache
+{
+    List lists[MAX_SIZE / UNIT];
+};
+
+#ifdef NDEBUG
+constexpr unsigned int BLOCKS_AT_FIRST = TYRecycled::DEFAULT_BLOCKS;
+#else
+constexpr unsigned int BLOCKS_AT_FIRST = 0;
+#endif
+std::atomic<unsigned int> s_limit{BLOCKS_AT_FIRST};
+
+// A pointer, since room for thread-local objects that is reached this quickly is scarce. What ends after the thread's
+// cache finds it null and ended.
+thread_local Cache* t_cache __attribute__((tls_model("initial-exec"))) = nullptr;
+thread_local bool t_isEnded __attribute__((tls_model("initial-exec"))) = false;
+
+std::size_t INDEX_OF(std::size_t size) { return (size + UNIT - 1) / UNIT - 1; }
+
+void TRIM(Cache& cache, unsigned int limit)
+{
+    for (List& list : cache.lists)
+        while (list.count > limit)
+        {
+            ::operator delete(std::exchange(list.first, list.first->next));
+            --list.count;
+        }
+}
+
+struct CacheEnd
+{
+    ~CacheEnd()
+    {
+        TRIM(*t_cache, 0);
+        delete t_cache;
+        t_cache = nullptr;
+        t_isEnded = true;
+    }
+    void isReached() {}
+};
+thread_local CacheEnd t_end;
+
+/// Makes the thread's cache, unless there is no memory for it or the thread's objects are at their end.
+[[gnu::noinline]] Cache* MAKE_CACHE()
+{
+    if (!t_isEnded)
+        t_cache = new (std::nothrow) Cache;
+    if (t_cache != nullptr)
+        t_end.isReached(); // from now on it has to be
+    return t_cache;
+}
+
+void* TAKE(std::size_t size)
+{
+    Cache* const cache = t_cache;
+    if (cache == nullptr || size > MAX_SIZE)
+        return nullptr;
+    List& list = cache->lists[INDEX_OF(size)];
+    Block* const block = list.first;
+    if (block != nullptr)
+    {
+        list.first = block->next;
+        --list.count;
+    }
+    return block;
+}
+
+bool KEEP(void* memory, std::size_t size)
+{
+    unsigned int const limit = s_limit.load(std::memory_order_relaxed);
+    if (limit == 0 || size > MAX_SIZE)
+        return false;
+    Cache* const cache = t_cache != nullptr ? t_cache : MAKE_CACHE();
+    if (cache == nullptr)
+        return false;
+    List& list = cache->lists[INDEX_OF(size)];
+    if (list.count >= limit)
+        return false;
+    list.first = new (memory) Block{list.first};
+    ++list.count;
+    return true;
+}
+} // namespace
+
+void* TYRecycled::operator new(std::size_t size)
+{
+    void* const block = TAKE(size);
+    return block != nullptr ? block : ::operator new(size);
+}
+
+void* TYRecycled::operator new(std::size_t size, std::nothrow_t const&) noexcept
+{
+    void* const block = TAKE(size);
+    return block != nullptr ? block : ::operator new(size, std::nothrow);
+}
+
+void TYRecycled::operator delete(void* block, std::size_t size) noexcept
+{
+    if (block == nullptr || !KEEP(block, size))
+        ::operator delete(block);
+}
+
+void TYRecycled::operator delete(void* block, std::nothrow_t const&) noexcept { ::operator delete(block); }
+
+void TYRecycled::KEEP_BLOCKS(unsigned int ofEachSize)
+{
+    s_limit.store(ofEachSize, std::memory_order_relaxed);
+    if (t_cache != nullptr)
+        TRIM(*t_cache, ofEachSize);
+}
