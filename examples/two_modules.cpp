@@ -27,7 +27,7 @@ struct Module : CC_Provider, CC_Endpoint, CC_CallAdapterObserver // one line onl
     XCode handleOffer(CC_Call& call, String const&, Properties const&) override { return m_adapter.accept(call, {}); }
     void notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const&) override
     {
-        if (auto const* peer = dynamic_cast<State const*>(adapter.getPeerProperty(CC_PropertyId::STATE)))
+        if (auto const* peer = State::FROM(adapter.getPeerProperty(CC_PropertyId::STATE)))
             std::printf("%s: peer %s\n", m_name.c_str(), State::STATE_NAME(peer->getState()));
     }
     void notifyPeerSynchronousService(CC_CallAdapter&, CC_Service&) override {}

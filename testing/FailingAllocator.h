@@ -15,6 +15,7 @@
 ///             break;                             // fewer than n allocations: all were tried
 ///     }
 ///
+/// Memory that TYRecycled keeps for reuse is no allocation: `TYRecycled::KEEP_BLOCKS(0)` first, as the test main does.
 /// The fakes and recorders of the kit do not count: they work in a Pause. A program with a main of its own has nothing
 /// failing unless its operator new asks `isToFail()`.
 class FailingAllocator

@@ -8,7 +8,7 @@ RecordingCallLegObserver::~RecordingCallLegObserver() = default;
 
 void RecordingCallLegObserver::onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& ended = dynamic_cast<CC_EvCallLegObservationEnded const&>(event);
+    auto const& ended = CC_EvCallLegObservationEnded::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(ended.getSource()) + " ended");
@@ -18,7 +18,7 @@ void RecordingCallLegObserver::onCallLegObservationEnded(CC_Event<CC_CallLeg> co
 
 void RecordingCallLegObserver::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& relinked = dynamic_cast<CC_EvCallLegCallRelinked const&>(event);
+    auto const& relinked = CC_EvCallLegCallRelinked::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(relinked.getSource()) + " moved from " + textOf(relinked.getOldCall()) + " to " +
@@ -29,7 +29,7 @@ void RecordingCallLegObserver::onCallLegCallRelinked(CC_Event<CC_CallLeg> const&
 
 void RecordingCallLegObserver::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& changed = dynamic_cast<CC_EvCallLegPropertyChanged const&>(event);
+    auto const& changed = CC_EvCallLegPropertyChanged::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(changed.getSource()) + " changed (" + PROPERTY_NAMES(changed.getFlags()) + ")");
@@ -39,7 +39,7 @@ void RecordingCallLegObserver::onCallLegPropertyChanged(CC_Event<CC_CallLeg> con
 
 void RecordingCallLegObserver::onCallLegSynchronousService(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& asked = dynamic_cast<CC_EvCallLegSynchronousService const&>(event);
+    auto const& asked = CC_EvCallLegSynchronousService::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         String const text = asked.getService()->getInfo();

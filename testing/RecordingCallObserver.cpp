@@ -7,7 +7,7 @@ RecordingCallObserver::~RecordingCallObserver() = default;
 
 void RecordingCallObserver::onCallObservationEnded(CC_Event<CC_Call> const& event)
 {
-    auto const& ended = dynamic_cast<CC_EvCallObservationEnded const&>(event);
+    auto const& ended = CC_EvCallObservationEnded::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(ended.getSource()) + " ended");
@@ -17,7 +17,7 @@ void RecordingCallObserver::onCallObservationEnded(CC_Event<CC_Call> const& even
 
 void RecordingCallObserver::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 {
-    auto const& added = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    auto const& added = CC_EvCallCallLegModified::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(added.getCallLeg()) + " joined " + textOf(added.getSource()));
@@ -27,7 +27,7 @@ void RecordingCallObserver::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 
 void RecordingCallObserver::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
 {
-    auto const& removed = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    auto const& removed = CC_EvCallCallLegModified::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(removed.getCallLeg()) + " left " + textOf(removed.getSource()));
@@ -37,7 +37,7 @@ void RecordingCallObserver::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
 
 void RecordingCallObserver::onCallPropertyChanged(CC_Event<CC_Call> const& event)
 {
-    auto const& changed = dynamic_cast<CC_EvCallPropertyChanged const&>(event);
+    auto const& changed = CC_EvCallPropertyChanged::FROM(event);
     {
         FailingAllocator::Pause const unseen;
         record(textOf(changed.getSource()) + " changed (" + PROPERTY_NAMES(changed.getFlags()) + ")");

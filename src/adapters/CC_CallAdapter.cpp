@@ -134,9 +134,9 @@ InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLeve
         return info;
     if (m_endpoint != nullptr)
         m_endpoint->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
-    m_ownProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
-    m_peerProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
-    m_callProperties.getInfo(info, maxLevel, level + 1, maxDetail, detail, CALL);
+    m_ownView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
+    m_peerView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
+    m_callView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, CALL);
     if (m_ownCallLeg != nullptr)
         m_ownCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
     if (m_peerCallLeg != nullptr)

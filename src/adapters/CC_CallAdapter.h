@@ -8,7 +8,7 @@
 #include "platform/base/TYLifeline.h"
 #include "platform/base/XCode.h"
 #include "platform/signalling/QCause.h"
-#include "properties/CC_PropertyContainer.h"
+#include "properties/CC_PropertyView.h"
 
 class CC_CallAdapterObserver;
 class CC_Endpoint;
@@ -192,16 +192,16 @@ private:
     CC_PropertyContainer const* filterInput(CC_PropertyContainer const& properties,
                                             CC_PropertyContainer& filtered) const;
     template <class Target, class Written>
-    XCode writeFiltered(CC_PropertyContainer& view, Target* target, Written const& written);
+    XCode writeFiltered(CC_PropertyView& view, Target* target, Written const& written);
     template <class Target, class Written>
-    XCode writeUnfiltered(CC_PropertyContainer& view, Target* target, Written const& written);
+    XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
 
     void observeCall(CC_Call& call);
     void unobserveCall();
-    void updateOwnCallLeg();
-    void updatePeerCallLeg();
+    void updateOwnCallLeg(CC_Flags const& changed);
+    void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
-    void updateView(CC_PropertyContainer& view, CC_PropertyContainer const& source);
+    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_Flags const* changed);
     void mark(unsigned int id);
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();
@@ -212,12 +212,12 @@ private:
     String m_name;
     CC_Endpoint* m_endpoint = nullptr;
     CC_CallLeg* m_ownCallLeg = nullptr;
-    CC_PropertyContainer m_ownProperties;
+    CC_PropertyView m_ownView;
     Event* m_peerChangeEvent = nullptr;
     Event* m_secondEvent = nullptr; // made and destroyed with the first; nothing posts it
     CC_CallLeg* m_peerCallLeg = nullptr;
-    CC_PropertyContainer m_peerProperties;
-    CC_PropertyContainer m_callProperties;
+    CC_PropertyView m_peerView;
+    CC_PropertyView m_callView;
     CC_Call* m_observedCall = nullptr; // the call with which we are registered
     bool m_isCallObserver = false;     // of m_observedCall: which of the two registrations it took
     bool m_isCallLegObserver = false;  // of all its legs

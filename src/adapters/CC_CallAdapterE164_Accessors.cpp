@@ -43,7 +43,7 @@ XCode SET_OWN(CC_CallAdapter& adapter, unsigned int id, Values const&... values)
 /// With the counter that tells the peer that a message is a new one, though it may read like the one before.
 XCode SET_OWN_UPDATE(CC_CallAdapter& adapter, unsigned int id, ParametrizedString const& content)
 {
-    auto const* const current = AS<CC_PropertyParametrizedString>(adapter.getOwnProperty(id));
+    auto const* const current = CC_PropertyParametrizedString::FROM(adapter.getOwnProperty(id));
     try
     {
         CC_PropertyParametrizedString update(id);

@@ -219,7 +219,7 @@ TEST_F(CC_CallAdapterE164_OverlapDisruption_Test, ADialThatCannotBeRememberedWho
     CC_PropertyContainer own;
     ASSERT_EQ(own.set(CC_PropertyString(NAME, "a name too long to be kept without memory")), XCode::OK);
     unsigned int refused = 0;
-    for (unsigned long n = 1; n <= 4; ++n) // a copy of each property at least, before the base is asked
+    for (unsigned long n = 1; refused + 1 == n; ++n) // until the whole dial is remembered
     {
         a.renew();
         numbers.clear();
@@ -235,5 +235,5 @@ TEST_F(CC_CallAdapterE164_OverlapDisruption_Test, ADialThatCannotBeRememberedWho
         a.key("8");
         EXPECT_EQ(numbers.size(), result == XCode::FAILURE ? 1U : 2U) << "no mixture of two dials, allocation " << n;
     }
-    EXPECT_EQ(refused, 4U);
+    EXPECT_GE(refused, 2U) << "each text at least, before the base is asked";
 }

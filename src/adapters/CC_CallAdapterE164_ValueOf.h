@@ -5,13 +5,6 @@
 #include <functional>
 #include <type_traits>
 
-/// The property as one of that class, null when it is absent or of another.
-template <class Property>
-Property const* AS(CC_Property const* property)
-{
-    return dynamic_cast<Property const*>(property);
-}
-
 /// What a class's getter gives: a value, or a reference into the property.
 template <class Property, auto GETTER>
 using GivenBy = std::invoke_result_t<decltype(GETTER), Property const&>;
@@ -22,7 +15,7 @@ using GivenBy = std::invoke_result_t<decltype(GETTER), Property const&>;
 template <class Property, auto GETTER = &Property::getValue>
 GivenBy<Property, GETTER> VALUE_OF(CC_Property const* property, std::type_identity_t<GivenBy<Property, GETTER>> absent)
 {
-    Property const* const typed = AS<Property>(property);
+    Property const* const typed = Property::FROM(property);
     return typed != nullptr ? std::invoke(GETTER, *typed) : absent;
 }
 
@@ -41,8 +34,8 @@ requires std::is_scalar_v<GivenBy<Property, GETTER>> GivenBy<Property, GETTER> V
 
 /// The value of a property of that class where it stands; null when it is absent or of another class.
 template <class Property>
-auto POINTER_TO(CC_Property const* property) -> decltype(&AS<Property>(property)->getValue())
+auto POINTER_TO(CC_Property const* property) -> decltype(&Property::FROM(property)->getValue())
 {
-    Property const* const typed = AS<Property>(property);
+    Property const* const typed = Property::FROM(property);
     return typed != nullptr ? &typed->getValue() : nullptr;
 }

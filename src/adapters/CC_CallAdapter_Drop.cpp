@@ -58,8 +58,8 @@ void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
 void CC_CallAdapter::letGoOfTheRest()
 {
     Attempt const attempt(*this);
-    m_ownProperties.clear();
-    m_peerProperties.clear();
+    m_ownView.clear();
+    m_peerView.clear();
     if (CC_CallLeg* const peer = std::exchange(m_peerCallLeg, nullptr))
         peer->removeReference();
     if (attempt.isOver())
@@ -67,7 +67,7 @@ void CC_CallAdapter::letGoOfTheRest()
     for (Event** const event : {&m_secondEvent, &m_peerChangeEvent})
         if (*event != nullptr)
             std::exchange(*event, nullptr)->destroy();
-    m_callProperties.clear();
+    m_callView.clear();
     ++m_attempt;
 }
 

@@ -14,21 +14,21 @@
 
 void CC_CallAdapter::onCallObservationEnded(CC_Event<CC_Call> const& event)
 {
-    auto const& ended = dynamic_cast<CC_EvCallObservationEnded const&>(event);
+    auto const& ended = CC_EvCallObservationEnded::FROM(event);
     if (ended.getSource() == m_observedCall)
         m_observedCall = nullptr; // nothing is left to unregister from
 }
 
 void CC_CallAdapter::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 {
-    auto const& added = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    auto const& added = CC_EvCallCallLegModified::FROM(event);
     if (m_ownCallLeg != nullptr && added.getSource() == m_ownCallLeg->getCall() && added.getCallLeg() != m_ownCallLeg)
         linkPeerCallLeg();
 }
 
 void CC_CallAdapter::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
 {
-    auto const& removed = dynamic_cast<CC_EvCallCallLegModified const&>(event);
+    auto const& removed = CC_EvCallCallLegModified::FROM(event);
     if (m_ownCallLeg != nullptr && removed.getSource() == m_ownCallLeg->getCall() &&
         removed.getCallLeg() != m_ownCallLeg && removed.getCallLeg() == m_peerCallLeg)
         linkPeerCallLeg();
@@ -36,19 +36,19 @@ void CC_CallAdapter::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
 
 void CC_CallAdapter::onCallPropertyChanged(CC_Event<CC_Call> const& event)
 {
-    auto const& changed = dynamic_cast<CC_EvCallPropertyChanged const&>(event);
+    auto const& changed = CC_EvCallPropertyChanged::FROM(event);
     if (m_ownCallLeg != nullptr && changed.getSource() == m_ownCallLeg->getCall())
         updateCall();
 }
 
 void CC_CallAdapter::onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event)
 {
-    std::ignore = dynamic_cast<CC_EvCallLegObservationEnded const&>(event);
+    std::ignore = CC_EvCallLegObservationEnded::FROM(event);
 }
 
 void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& relinked = dynamic_cast<CC_EvCallLegCallRelinked const&>(event);
+    auto const& relinked = CC_EvCallLegCallRelinked::FROM(event);
     if (m_ownCallLeg == nullptr || relinked.getSource() != m_ownCallLeg)
         return;
     unobserveCall();
@@ -62,11 +62,11 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
 
 void CC_CallAdapter::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& changed = dynamic_cast<CC_EvCallLegPropertyChanged const&>(event);
+    auto const& changed = CC_EvCallLegPropertyChanged::FROM(event);
     if (m_ownCallLeg == nullptr)
         return;
     if (changed.getSource() == m_ownCallLeg)
-        updateOwnCallLeg();
+        updateOwnCallLeg(changed.getFlags());
     else if (changed.getSource() == m_peerCallLeg)
         onPeerPropertyChanged(changed.getFlags());
     else
@@ -75,7 +75,7 @@ void CC_CallAdapter::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
 
 void CC_CallAdapter::onCallLegSynchronousService(CC_Event<CC_CallLeg> const& event)
 {
-    auto const& service = dynamic_cast<CC_EvCallLegSynchronousService const&>(event);
+    auto const& service = CC_EvCallLegSynchronousService::FROM(event);
     if (m_ownCallLeg == nullptr || service.getSource() == m_ownCallLeg)
         return;
     if (m_observer != nullptr)
@@ -90,11 +90,11 @@ void CC_CallAdapter::onPeerPropertyChanged(CC_Flags const& flags)
     if (flags.get(CC_PropertyId::STATE))
     {
         auto const* const lastSeen =
-            dynamic_cast<CC_PropertyCallLegState const*>(m_peerProperties.get(CC_PropertyId::STATE));
+            CC_PropertyCallLegState::FROM(m_peerView.getProperties().get(CC_PropertyId::STATE));
         if ((lastSeen == nullptr || m_peerCallLeg->getActivityLevel() < lastSeen->getState()) && linkPeerCallLeg())
             return;
     }
-    updatePeerCallLeg();
+    updatePeerCallLeg(&flags);
 }
 
 /// A leg that becomes more active than the peer as the module last saw it takes over.
@@ -102,8 +102,7 @@ void CC_CallAdapter::onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags cons
 {
     if (!flags.get(CC_PropertyId::STATE))
         return;
-    auto const* const lastSeen =
-        dynamic_cast<CC_PropertyCallLegState const*>(m_peerProperties.get(CC_PropertyId::STATE));
+    auto const* const lastSeen = CC_PropertyCallLegState::FROM(m_peerView.getProperties().get(CC_PropertyId::STATE));
     if (lastSeen != nullptr && leg.getActivityLevel() > lastSeen->getState())
         linkPeerCallLeg();
 }
@@ -129,63 +128,57 @@ void CC_CallAdapter::unobserveCall()
     }
 }
 
-void CC_CallAdapter::updateOwnCallLeg()
+namespace
 {
+/// The ids that can have changed in the leg's properties since they were last told; null when they all can.
+CC_Flags const* TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
+{
+    return leg.mayChangeUntold() ? nullptr : changed;
+}
+} // namespace
+
+void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
+{
+    CC_CallLeg const& leg = *m_ownCallLeg;
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
     {
-        m_ownProperties = m_ownCallLeg->getProperties();
+        m_ownView.assign(leg.getProperties(), TOLD(leg, &changed));
         return;
     }
-    CC_PropertyContainer filtered(m_ownCallLeg->getProperties());
+    CC_PropertyContainer filtered(leg.getProperties());
     if (filters->applyFilters(filtered).isOk())
-        m_ownProperties = filtered;
+        m_ownView.assign(filtered, nullptr);
 }
 
-void CC_CallAdapter::updatePeerCallLeg()
+/// `changed`: the ids of which the leg tells; null when the leg itself is another.
+void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 {
-    if (m_peerCallLeg != nullptr)
-        updateView(m_peerProperties, m_peerCallLeg->getProperties());
+    if (CC_CallLeg const* const leg = m_peerCallLeg)
+        updateView(m_peerView, leg->getProperties(), TOLD(*leg, changed));
 }
 
 void CC_CallAdapter::updateCall()
 {
     if (CC_Call const* const call = getCall())
-        updateView(m_callProperties, call->getProperties());
+        updateView(m_callView, call->getProperties(), nullptr);
 }
 
 /// Brings a view up to date with its source and marks the ids that differ.
-void CC_CallAdapter::updateView(CC_PropertyContainer& view, CC_PropertyContainer const& source)
+void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_Flags const* changed)
 {
+    auto const onDifference = [this](unsigned int id) { mark(id); };
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
-    CC_PropertyContainer filtered;
-    if (filters != nullptr)
+    if (filters == nullptr)
     {
-        filtered = source;
-        if (filtered.getNumberOfProperties() != source.getNumberOfProperties())
-            return; // memory is out: better the view of before than one that calls what is there gone
-        std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
+        view.follow(source, changed, onDifference);
+        return;
     }
-    CC_PropertyContainer const& current = filters != nullptr ? filtered : source;
-    for (CC_Property const& property : current)
-    {
-        CC_Property const* const seen = std::as_const(view).get(property.getId());
-        if (seen != nullptr && property.isEqual(*seen))
-            continue;
-        std::ignore = view.set(property); // what memory refuses is not seen; the module still hears of the change
-        mark(property.getId());
-    }
-    for (unsigned int i = 0; i < view.getNumberOfProperties();)
-    {
-        unsigned int const id = view.getByIndex(i)->getId();
-        if (current.get(id) != nullptr)
-        {
-            ++i;
-            continue;
-        }
-        view.removeByIndex(i);
-        mark(id);
-    }
+    CC_PropertyContainer filtered(source);
+    if (filtered.getNumberOfProperties() != source.getNumberOfProperties())
+        return; // memory is out: better the view of before than one that calls what is there gone
+    std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
+    view.follow(filtered, nullptr, onDifference);
 }
 
 void CC_CallAdapter::mark(unsigned int id)
@@ -212,7 +205,7 @@ bool CC_CallAdapter::linkPeerCallLeg()
     if (CC_CallLeg* const previous = std::exchange(m_peerCallLeg, chosen))
         previous->removeReference();
     if (!attempt.isOver())
-        updatePeerCallLeg();
+        updatePeerCallLeg(nullptr);
     return true;
 }
 
@@ -225,7 +218,7 @@ void CC_CallAdapter::unlinkPeerCallLeg()
     peer->removeReference();
     if (attempt.isOver())
         return;
-    for (CC_Property const& property : std::as_const(m_peerProperties))
+    for (CC_Property const& property : m_peerView.getProperties())
         mark(property.getId());
-    m_peerProperties.clear();
+    m_peerView.clear();
 }

@@ -46,25 +46,25 @@ CC_PropertyContainer const* CC_CallAdapter::filterInput(CC_PropertyContainer con
 
 /// Writes one property or several to our view and through the input filters to the leg or call.
 template <class Target, class Written>
-XCode CC_CallAdapter::writeFiltered(CC_PropertyContainer& view, Target* target, Written const& written)
+XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Written const& written)
 {
     if (target == nullptr)
         return XCode::ABSENT;
-    if (!view.set(written).isOk())
+    if (!view.write(written).isOk())
         return XCode::FAILURE;
     if (getInputFilters() == nullptr)
         return WRITE(*target, written);
     CC_PropertyContainer filtered;
-    CC_PropertyContainer const* const all = filterInput(view, filtered);
+    CC_PropertyContainer const* const all = filterInput(view.getProperties(), filtered);
     return all != nullptr ? WRITE(*target, *all) : XCode::FAILURE;
 }
 
 template <class Target, class Written>
-XCode CC_CallAdapter::writeUnfiltered(CC_PropertyContainer& view, Target* target, Written const& written)
+XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written)
 {
     if (target == nullptr)
         return XCode::ABSENT;
-    return view.set(written).isOk() ? WRITE(*target, written) : XCode::FAILURE;
+    return view.write(written).isOk() ? WRITE(*target, written) : XCode::FAILURE;
 }
 
 CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
@@ -79,7 +79,7 @@ CC_PropertyFilterContainer* CC_CallAdapter::getOutputFilters() const
 
 // --- own leg ---------------------------------------------------------------------------------------------------------
 
-CC_Property const* CC_CallAdapter::getOwnProperty(unsigned int id) const { return m_ownProperties.get(id); }
+CC_Property const* CC_CallAdapter::getOwnProperty(unsigned int id) const { return m_ownView.getProperties().get(id); }
 
 CC_Property const* CC_CallAdapter::getOwnPropertyUnfiltered(unsigned int id) const
 {
@@ -88,37 +88,38 @@ CC_Property const* CC_CallAdapter::getOwnPropertyUnfiltered(unsigned int id) con
 
 XCode CC_CallAdapter::getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_ownProperties, mask);
+    return COPY(properties, m_ownView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_ownCallLeg != nullptr ? COPY(properties, m_ownCallLeg->getProperties(), mask) : XCode::ABSENT;
+    return m_ownCallLeg != nullptr ? COPY(properties, std::as_const(*m_ownCallLeg).getProperties(), mask)
+                                   : XCode::ABSENT;
 }
 
 XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
 {
-    return writeFiltered(m_ownProperties, m_ownCallLeg, property);
+    return writeFiltered(m_ownView, m_ownCallLeg, property);
 }
 
 XCode CC_CallAdapter::setOwnProperties(CC_PropertyContainer const& properties)
 {
-    return writeFiltered(m_ownProperties, m_ownCallLeg, properties);
+    return writeFiltered(m_ownView, m_ownCallLeg, properties);
 }
 
 XCode CC_CallAdapter::setOwnPropertyUnfiltered(CC_Property const& property)
 {
-    return writeUnfiltered(m_ownProperties, m_ownCallLeg, property);
+    return writeUnfiltered(m_ownView, m_ownCallLeg, property);
 }
 
 XCode CC_CallAdapter::setOwnPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_ownProperties, m_ownCallLeg, properties);
+    return writeUnfiltered(m_ownView, m_ownCallLeg, properties);
 }
 
 // --- peer leg --------------------------------------------------------------------------------------------------------
 
-CC_Property const* CC_CallAdapter::getPeerProperty(unsigned int id) const { return m_peerProperties.get(id); }
+CC_Property const* CC_CallAdapter::getPeerProperty(unsigned int id) const { return m_peerView.getProperties().get(id); }
 
 CC_Property const* CC_CallAdapter::getPeerPropertyUnfiltered(unsigned int id) const
 {
@@ -127,37 +128,38 @@ CC_Property const* CC_CallAdapter::getPeerPropertyUnfiltered(unsigned int id) co
 
 XCode CC_CallAdapter::getPeerProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_peerProperties, mask);
+    return COPY(properties, m_peerView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getPeerPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_peerCallLeg != nullptr ? COPY(properties, m_peerCallLeg->getProperties(), mask) : XCode::ABSENT;
+    return m_peerCallLeg != nullptr ? COPY(properties, std::as_const(*m_peerCallLeg).getProperties(), mask)
+                                    : XCode::ABSENT;
 }
 
 XCode CC_CallAdapter::setPeerProperty(CC_Property const& property)
 {
-    return writeFiltered(m_peerProperties, m_peerCallLeg, property);
+    return writeFiltered(m_peerView, m_peerCallLeg, property);
 }
 
 XCode CC_CallAdapter::setPeerProperties(CC_PropertyContainer const& properties)
 {
-    return writeFiltered(m_peerProperties, m_peerCallLeg, properties);
+    return writeFiltered(m_peerView, m_peerCallLeg, properties);
 }
 
 XCode CC_CallAdapter::setPeerPropertyUnfiltered(CC_Property const& property)
 {
-    return writeUnfiltered(m_peerProperties, m_peerCallLeg, property);
+    return writeUnfiltered(m_peerView, m_peerCallLeg, property);
 }
 
 XCode CC_CallAdapter::setPeerPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_peerProperties, m_peerCallLeg, properties);
+    return writeUnfiltered(m_peerView, m_peerCallLeg, properties);
 }
 
 // --- call ------------------------------------------------------------------------------------------------------------
 
-CC_Property const* CC_CallAdapter::getCallProperty(unsigned int id) const { return m_callProperties.get(id); }
+CC_Property const* CC_CallAdapter::getCallProperty(unsigned int id) const { return m_callView.getProperties().get(id); }
 
 CC_Property const* CC_CallAdapter::getCallPropertyUnfiltered(unsigned int id) const
 {
@@ -167,7 +169,7 @@ CC_Property const* CC_CallAdapter::getCallPropertyUnfiltered(unsigned int id) co
 
 XCode CC_CallAdapter::getCallProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_callProperties, mask);
+    return COPY(properties, m_callView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getCallPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
@@ -178,22 +180,22 @@ XCode CC_CallAdapter::getCallPropertiesUnfiltered(CC_PropertyContainer& properti
 
 XCode CC_CallAdapter::setCallProperty(CC_Property const& property)
 {
-    return writeFiltered(m_callProperties, getCall(), property);
+    return writeFiltered(m_callView, getCall(), property);
 }
 
 XCode CC_CallAdapter::setCallProperties(CC_PropertyContainer const& properties)
 {
-    return writeFiltered(m_callProperties, getCall(), properties);
+    return writeFiltered(m_callView, getCall(), properties);
 }
 
 XCode CC_CallAdapter::setCallPropertyUnfiltered(CC_Property const& property)
 {
-    return writeUnfiltered(m_callProperties, getCall(), property);
+    return writeUnfiltered(m_callView, getCall(), property);
 }
 
 XCode CC_CallAdapter::setCallPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_callProperties, getCall(), properties);
+    return writeUnfiltered(m_callView, getCall(), properties);
 }
 
 // --- media context ---------------------------------------------------------------------------------------------------
@@ -210,7 +212,6 @@ MG_IContext* CC_CallAdapter::getDatapathContext()
 
 MG_IContext const* CC_CallAdapter::getDatapathContext() const
 {
-    auto const* const context =
-        dynamic_cast<CC_PropertyContextId const*>(getCallPropertyUnfiltered(CC_PropertyId::CONTEXT));
+    auto const* const context = CC_PropertyContextId::FROM(getCallPropertyUnfiltered(CC_PropertyId::CONTEXT));
     return context != nullptr ? context->getContext() : nullptr;
 }

@@ -3,6 +3,7 @@
 #include "calls/CC_CountedObservers.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
+#include "platform/base/TYLifeline.h"
 
 /// The observers of a context, provider or endpoint (Owner); see CC_CountedObservers for the rules of registration and
 /// delivery. Each notification goes through a static function of the owner that takes the observer, the owner and a
@@ -20,9 +21,12 @@ public:
     void removeObserver(Observer const& observer) { m_observers.remove(&observer); }
     void silence() { m_observers.silence(); }
 
+    /// The owner may end inside a notification; the walk then ends with it.
     void notifyObservers(Trampoline trampoline, Owner& owner, void* data) const
     {
-        m_observers.forEach([&](Observer& observer) { trampoline(observer, owner, data); });
+        TYLifeline::Watch const self(m_lifeline);
+        m_observers.forEachWhile([&] { return self.isAlive(); },
+                                 [&](Observer& observer) { trampoline(observer, owner, data); });
     }
 
     /// Diagnostic dump; observers whose count has fallen to 0 are still numbered.
@@ -37,4 +41,5 @@ public:
 
 private:
     CC_CountedObservers<Observer, int, 2> m_observers;
+    TYLifeline m_lifeline;
 };

@@ -176,6 +176,23 @@ TEST_F(CC_ObserverContainerOld_Test, TheListMayEndInsideItsOwnNotification)
     EXPECT_EQ(m_heard, "a") << "the walk ends with its list";
 }
 
+TEST_F(CC_ObserverContainerOld_Test, TheListMayEndInsideANestedNotification)
+{
+    add(m_a);
+    add(m_b);
+    Listener& first = m_a;
+    int depth = 0;
+    first.then = [&]
+    {
+        if (++depth == 2)
+            m_container.reset();
+        else
+            m_container->notifyObservers(NOTIFY, m_owner, nullptr);
+    };
+    m_container->notifyObservers(NOTIFY, m_owner, nullptr);
+    EXPECT_EQ(m_heard, "aa") << "both walks end with it";
+}
+
 TEST_F(CC_ObserverContainerOld_Test, TheDatumReachesTheTrampoline)
 {
     struct Probe

@@ -233,7 +233,7 @@ void CC_Call::onCallLegCallRelinked(CC_Event<CC_CallLeg> const&) {}
 
 void CC_Call::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
 {
-    CC_Flags const& flags = dynamic_cast<CC_EvCallLegPropertyChanged const&>(event).getFlags();
+    CC_Flags const& flags = CC_EvCallLegPropertyChanged::FROM(event).getFlags();
     if (flags.get(CC_PropertyId::STATE) || flags.get(CC_PropertyId::NETWORK))
         defer();
 }

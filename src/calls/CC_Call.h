@@ -7,6 +7,7 @@
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
 #include "platform/base/TYList.h"
+#include "platform/base/TYRecycled.h"
 #include "platform/base/TYSmallVector.h"
 #include "platform/base/XCode.h"
 #include "platform/eventloop/TYEvent.h"
@@ -29,7 +30,7 @@ class CC_CallPool;
 ///
 /// Any observer may do anything inside a notification. A call that is released there lives on until the operation that
 /// notified has ended.
-class CC_EXPORT CC_Call : public CC_CallLegObserver
+class CC_EXPORT CC_Call : public CC_CallLegObserver, public TYRecycled
 {
 public:
     /// Derived from the legs at each request: fewer than two active, two, or more.

@@ -46,7 +46,7 @@ void LOG_PROPERTY(String const& legName, CC_Property const& property)
 /// Whether the property may become a leg's State: never IDLE again, and never another class.
 bool IS_STATE_ACCEPTED(CC_Property const& property)
 {
-    auto const* const state = dynamic_cast<CC_PropertyCallLegState const*>(&property);
+    auto const* const state = CC_PropertyCallLegState::FROM(&property);
     return state != nullptr && state->getState() != CC_PropertyCallLegState::IDLE;
 }
 } // namespace
@@ -104,11 +104,17 @@ void CC_CallLeg::removeCallLegObserver(CC_CallLegObserver const* observer) { m_o
 
 int CC_CallLeg::getState() const
 {
-    auto const* const state = dynamic_cast<CC_PropertyCallLegState const*>(m_properties.get(CC_PropertyId::STATE));
+    auto const* const state = CC_PropertyCallLegState::FROM(m_properties.get(CC_PropertyId::STATE));
     return state != nullptr ? state->getState() : CC_PropertyCallLegState::RELEASED;
 }
 
 XCode CC_CallLeg::setPropertyNoNotification(CC_Property const& property, bool& changed)
+{
+    m_mayChangeUntold = true;
+    return store(property, changed);
+}
+
+XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
 {
     changed = false;
     CC_Property const* const stored = m_properties.get(property.getId());
@@ -127,7 +133,7 @@ XCode CC_CallLeg::setProperty(CC_Property const& property)
 {
     CC_Flags flags;
     bool changed = false;
-    if (!store(property, flags, changed).isOk())
+    if (!storeAndMark(property, flags, changed).isOk())
         return XCode::FAILURE;
     if (changed)
         notifyPropertyChange(flags);
@@ -142,7 +148,7 @@ XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
     auto const storeNext = [&](CC_Property const& property)
     {
         bool changed = false;
-        if (XCode const stored = store(property, flags, changed); result.isOk())
+        if (XCode const stored = storeAndMark(property, flags, changed); result.isOk())
             result = stored;
     };
     for (CC_Property const& property : properties)
@@ -159,11 +165,16 @@ XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
 }
 
 /// Stores one property and marks it in the flags if it changed.
-XCode CC_CallLeg::store(CC_Property const& property, CC_Flags& flags, bool& changed)
+XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed)
 {
-    XCode const result = setPropertyNoNotification(property, changed);
+    XCode const result = store(property, changed);
+    if (!changed)
+        return result;
+    bool const isTold = flags.set(property.getId(), true).isOk();
+    if (!isTold)
+        m_mayChangeUntold = true;
     // a change that memory keeps from being told must not keep the call from being cleaned up
-    if (changed && (!flags.set(property.getId(), true).isOk() || m_isMissedByCall) && m_call != nullptr)
+    if ((!isTold || m_isMissedByCall) && m_call != nullptr)
         m_call->defer();
     return result;
 }
@@ -172,6 +183,7 @@ XCode CC_CallLeg::store(CC_Property const& property, CC_Flags& flags, bool& chan
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
     Reference const self(*this);
+    NestingGuard const notification(m_notifications);
     m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
                                &CC_CallLegObserver::onCallLegPropertyChanged);
 }

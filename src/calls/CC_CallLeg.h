@@ -5,6 +5,7 @@
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
+#include "platform/base/TYRecycled.h"
 #include "platform/base/XCode.h"
 #include "properties/CC_PropertyContainer.h"
 
@@ -25,7 +26,7 @@ class CC_Service;
 ///     std::ignore = call.addCallLeg(*leg);
 ///     std::ignore = leg->setProperty(CC_PropertyCallLegState(CC_PropertyId::STATE,
 ///     CC_PropertyCallLegState::ALERTING)); leg->removeReference();
-class CC_EXPORT CC_CallLeg
+class CC_EXPORT CC_CallLeg : public TYRecycled
 {
 public:
     /// In no call, without a name, with the properties State (IDLE), Provides Data (false) and Cause (none).
@@ -56,7 +57,16 @@ public:
     int getActivityLevel() const { return getState(); }
 
     CC_PropertyContainer const& getProperties() const { return m_properties; }
-    CC_PropertyContainer& getProperties() { return m_properties; }
+    /// For who writes to the properties without telling anybody.
+    CC_PropertyContainer& getProperties()
+    {
+        m_mayChangeUntold = true;
+        return m_properties;
+    }
+    /// Whether the properties may differ from what was told of them: somebody has had them to write, has stored one
+    /// without notification, or changes them inside another notification, which some have yet to hear. Who keeps a copy
+    /// of them need otherwise look only at what an event names.
+    bool mayChangeUntold() const { return m_mayChangeUntold || m_notifications > 1; }
 
     /// Stores the property unless it equals the stored one, and tells nobody; `changed` says whether it was stored.
     /// OK; REFUSED for a State that is IDLE or of another class (a leg never goes back to IDLE), or when memory is out.
@@ -96,7 +106,8 @@ private:
     struct Move;
 
     ~CC_CallLeg();
-    XCode store(CC_Property const& property, CC_Flags& flags, bool& changed);
+    XCode store(CC_Property const& property, bool& changed);
+    XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
     void notifyPropertyChange(CC_Flags& flags);
 
     std::atomic<int> m_referenceCount{1};
@@ -108,5 +119,7 @@ private:
     Move* m_move = nullptr;                // the move between calls that is under way
     bool m_isMissedByCall = false;         // our call is not among our observers: memory was out
     bool m_isEnding = false;               // in the destructor: goes into no call any more
+    bool m_mayChangeUntold = false;        // for good
+    unsigned int m_notifications = 0;      // of changed properties, under way inside each other
     unsigned long long m_lastWalk = 0;     // the last of a call's walks over its legs that handled this one
 };

@@ -56,6 +56,46 @@ TEST_F(CC_CallLegTest, ANewOneIsIdleInNoCallAndHasThreeProperties)
     leg->removeReference();
 }
 
+TEST_F(CC_CallLegTest, AsLongAsEveryChangeIsToldNothingChangesUntold)
+{
+    CC_CallLeg& leg = newObservedLeg();
+    EXPECT_EQ(leg.setProperty(NAME("Anna")), XCode::OK);
+    CC_PropertyContainer many;
+    ASSERT_EQ(many.set(NETWORK("isdn")), XCode::OK);
+    EXPECT_EQ(leg.setProperties(many), XCode::OK);
+    EXPECT_NE(std::as_const(leg).getProperties().get(CC_PropertyId::NAME), nullptr);
+    EXPECT_FALSE(leg.mayChangeUntold());
+}
+
+TEST_F(CC_CallLegTest, WhoHasHadThePropertiesToWriteMayChangeThemUntold)
+{
+    CC_CallLeg& leg = newObservedLeg();
+    std::ignore = leg.getProperties().get(CC_PropertyId::NAME);
+    EXPECT_TRUE(leg.mayChangeUntold());
+}
+
+TEST_F(CC_CallLegTest, APropertyStoredWithoutNotificationIsAnUntoldChange)
+{
+    CC_CallLeg& leg = newObservedLeg();
+    bool changed = false;
+    EXPECT_EQ(leg.setPropertyNoNotification(NAME("Anna"), changed), XCode::OK);
+    EXPECT_TRUE(leg.mayChangeUntold());
+}
+
+TEST_F(CC_CallLegTest, AChangeInsideANotificationIsUntoldToThoseWhoStillWait)
+{
+    CC_CallLeg& leg = newObservedLeg();
+    std::vector<bool> seen;
+    m_observer.m_onChanged = [&](CC_EvCallLegPropertyChanged const&)
+    {
+        seen.push_back(leg.mayChangeUntold());
+        std::ignore = leg.setProperty(NAME("Anna")); // told once: it then is equal
+    };
+    EXPECT_EQ(leg.setProperty(NETWORK("isdn")), XCode::OK);
+    EXPECT_EQ(seen, (std::vector<bool>{false, true}));
+    EXPECT_FALSE(leg.mayChangeUntold());
+}
+
 TEST_F(CC_CallLegTest, IsCountedWhileItLives)
 {
     unsigned int const before = CC_CallLeg::s_numberOfInstances;

@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <tuple>
+#include <utility>
 
 void CC_Call::defer()
 {
@@ -58,9 +59,10 @@ void CC_Call::pushBackOnLoop()
     CC_CallLeg* const target = findPushBackTarget();
     if (target == nullptr)
         return;
-    auto const& network =
-        static_cast<CC_PropertyString const&>(*m_callLegs[0]->getProperties().get(CC_PropertyId::NETWORK));
-    auto const& id = static_cast<CC_PropertyUnsigned const&>(*target->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+    auto const& network = static_cast<CC_PropertyString const&>(
+        *std::as_const(*m_callLegs[0]).getProperties().get(CC_PropertyId::NETWORK));
+    auto const& id = static_cast<CC_PropertyUnsigned const&>(
+        *std::as_const(*target).getProperties().get(CC_PropertyId::CALL_LEG_ID));
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[Call %s] Internal loop detected; push-back to %s", m_name.c_str(), network.getValue().c_str());
     CC_ServicePushBack pushBack(id.getValue());
@@ -77,8 +79,9 @@ CC_CallLeg* CC_Call::findPushBackTarget() const
     CC_PropertyUnsigned const* ids[2];
     for (unsigned int i = 0; i < 2; ++i)
     {
-        networks[i] = dynamic_cast<CC_PropertyString const*>(legs[i]->getProperties().get(CC_PropertyId::NETWORK));
-        ids[i] = dynamic_cast<CC_PropertyUnsigned const*>(legs[i]->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+        CC_PropertyContainer const& properties = std::as_const(*legs[i]).getProperties();
+        networks[i] = CC_PropertyString::FROM(properties.get(CC_PropertyId::NETWORK));
+        ids[i] = CC_PropertyUnsigned::FROM(properties.get(CC_PropertyId::CALL_LEG_ID));
         if (networks[i] == nullptr || ids[i] == nullptr)
             return nullptr;
     }

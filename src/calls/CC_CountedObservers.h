@@ -1,6 +1,5 @@
 #pragma once
 
-#include "platform/base/TYLifeline.h"
 #include "platform/base/TYSmallVector.h"
 #include "platform/base/XCode.h"
 
@@ -9,8 +8,7 @@
 ///
 /// An entry is never taken out: at count 0 it keeps its place and is skipped. So an observer may be added or removed
 /// inside a notification; one that is added is told in the same walk. Removing has no floor, on purpose: once more
-/// removed than added, the count is not 0 and the observer is told again, so callers pair the two exactly. The list
-/// may be destroyed inside its own walk, which then ends.
+/// removed than added, the count is not 0 and the observer is told again, so callers pair the two exactly.
 ///
 /// It does not own the observers. `Count` is the type of the counts, `INLINE` the number of entries that need no
 /// memory.
@@ -50,11 +48,18 @@ public:
     }
 
     /// Calls `tell(observer)` for every entry whose count is not 0, those appended meanwhile included.
+    /// REQUIRES: the list outlives the walk, as that of a call or leg does, which holds itself meanwhile. (Watching
+    /// over the list would double the cost of telling one observer.)
     template <class Tell>
     void forEach(Tell&& tell) const
     {
-        TYLifeline::Watch const self(m_lifeline);
-        for (unsigned int i = 0; self.isAlive() && i < m_entries.getSize(); ++i)
+        forEachWhile([] { return true; }, tell);
+    }
+    /// The same as long as `isAlive()`, which is asked before the list is looked at: it may end inside the walk.
+    template <class IsAlive, class Tell>
+    void forEachWhile(IsAlive&& isAlive, Tell&& tell) const
+    {
+        for (unsigned int i = 0; isAlive() && i < m_entries.getSize(); ++i)
             if (m_entries[i].m_count != 0)
                 tell(*m_entries[i].m_observer);
     }
@@ -72,5 +77,4 @@ private:
     }
 
     TYSmallVector<CountedObserver, INLINE> m_entries;
-    TYLifeline m_lifeline;
 };

@@ -4,6 +4,7 @@
 #include "platform/base/String.h"
 
 #include <new>
+#include <typeinfo>
 
 class CC_Call;
 class CC_CallLeg;
@@ -16,7 +17,7 @@ class CC_CallLeg;
 ///
 ///     void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event) override
 ///     {
-///         auto const& changed = dynamic_cast<CC_EvCallLegPropertyChanged const&>(event);
+///         auto const& changed = CC_EvCallLegPropertyChanged::FROM(event);
 ///         if (changed.getFlags().get(CC_PropertyId::STATE))
 ///             ...
 ///     }
@@ -45,11 +46,19 @@ private:
 extern template class CC_EXPORT CC_Event<CC_Call>;
 extern template class CC_EXPORT CC_Event<CC_CallLeg>;
 
-/// Gives an event class its `clone` and `getInfo`; the class states its name as `CLASS_NAME`.
+/// Gives an event class its `clone`, `getInfo` and `FROM`; the class states its name as `CLASS_NAME`.
 template <class Derived, class Source>
 class CC_EventClass : public CC_Event<Source>
 {
 public:
+    /// The event as one of this class; any other throws std::bad_cast.
+    static Derived const& FROM(CC_Event<Source> const& event)
+    {
+        if (typeid(event) == typeid(Derived)) // always but for a programming error, and much cheaper than the cast
+            return static_cast<Derived const&>(event);
+        return dynamic_cast<Derived const&>(event);
+    }
+
     CC_Event<Source>* clone() const override
     {
         try

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <bit>
 #include <new>
+#include <utility>
 
 namespace
 {
@@ -11,6 +12,14 @@ constexpr unsigned int BITS_PER_WORD = 32;
 constexpr unsigned int WORD_OF(unsigned int bit) { return bit / BITS_PER_WORD; }
 constexpr unsigned int MASK_OF(unsigned int bit) { return 1U << (bit % BITS_PER_WORD); }
 } // namespace
+
+CC_Flags::CC_Flags(CC_Flags&& other) noexcept
+    : m_capacity(std::exchange(other.m_capacity, 0)), m_count(std::exchange(other.m_count, 0))
+{
+    std::copy_n(other.m_inline, INLINE, m_inline);
+    if (other.m_entries != other.m_inline)
+        m_entries = std::exchange(other.m_entries, other.m_inline);
+}
 
 CC_Flags& CC_Flags::operator=(CC_Flags const& other)
 {
@@ -40,22 +49,25 @@ bool CC_Flags::get(unsigned int bit) const
 XCode CC_Flags::set(unsigned int bit, bool value)
 {
     unsigned int const word = WORD_OF(bit);
-    unsigned int position = 0;
-    while (position < m_count && m_entries[position].wordIndex < word)
+    Entry* position = m_entries;
+    Entry* const end = m_entries + m_count;
+    while (position != end && position->wordIndex < word)
         ++position;
-    if (position < m_count && m_entries[position].wordIndex == word)
+    if (position != end && position->wordIndex == word)
     {
-        unsigned int& bits = m_entries[position].bits;
-        bits = value ? bits | MASK_OF(bit) : bits & ~MASK_OF(bit);
+        position->bits = value ? position->bits | MASK_OF(bit) : position->bits & ~MASK_OF(bit);
         return XCode::OK;
     }
-    if (!value)
-        return XCode::OK;
+    return value ? insert(static_cast<unsigned int>(position - m_entries), {word, MASK_OF(bit)}) : XCode::OK;
+}
+
+XCode CC_Flags::insert(unsigned int index, Entry entry)
+{
     if (m_count == m_capacity)
         if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: a set holds only a few words
             return enlarged;
-    std::copy_backward(m_entries + position, m_entries + m_count, m_entries + m_count + 1);
-    m_entries[position] = {word, MASK_OF(bit)};
+    std::copy_backward(m_entries + index, m_entries + m_count, m_entries + m_count + 1);
+    m_entries[index] = entry;
     ++m_count;
     return XCode::OK;
 }
@@ -90,11 +102,16 @@ XCode CC_Flags::enlarge(unsigned int newCapacity)
 {
     if (newCapacity < m_count)
         return XCode::REFUSED;
-    Entry* const entries = new (std::nothrow) Entry[newCapacity]();
+    if (newCapacity <= INLINE && m_entries == m_inline)
+    {
+        m_capacity = newCapacity;
+        return XCode::OK;
+    }
+    Entry* const entries = newCapacity <= INLINE ? m_inline : new (std::nothrow) Entry[newCapacity]();
     if (entries == nullptr)
         return XCode::NO_ELEMENT;
     std::copy_n(m_entries, m_count, entries);
-    delete[] m_entries;
+    release();
     m_entries = entries;
     m_capacity = newCapacity;
     return XCode::OK;

@@ -3,12 +3,13 @@
 #include "platform/base/Export.h"
 #include "platform/base/XCode.h"
 
-#include <utility>
+#include <bit>
 
 /// A set of property ids, as bits of which only the 32-bit words that hold any are stored: which properties changed.
 /// A value; not locked.
 ///
-/// Ids crowd around 0x400000, so a set is one to a few words and grows by exactly one at a time.
+/// Ids crowd around 0x400000, so a set is one to a few words and grows by exactly one at a time. The first two lie in
+/// the object itself: a set that travels with an event needs no memory.
 ///
 ///     CC_Flags changed;
 ///     if (changed.set(CC_PropertyId::STATE, true).isOk() && changed.get(CC_PropertyId::STATE))
@@ -27,16 +28,11 @@ public:
     /// What getFirstSet returns when there is none.
     static constexpr unsigned int NONE = 0xffffffff;
 
-    CC_Flags() = default; ///< empty, without memory
+    CC_Flags() = default; ///< empty, with room for nothing
     CC_Flags(CC_Flags const& other) { *this = other; }
     /// Leaves `other` empty; needs no memory.
-    CC_Flags(CC_Flags&& other) noexcept
-        : m_capacity(std::exchange(other.m_capacity, 0))
-        , m_count(std::exchange(other.m_count, 0))
-        , m_entries(std::exchange(other.m_entries, nullptr))
-    {
-    }
-    ~CC_Flags() { delete[] m_entries; }
+    CC_Flags(CC_Flags&& other) noexcept;
+    ~CC_Flags() { release(); }
     /// The capacity never shrinks, which is why an assignment never takes the other's memory over. When memory is out,
     /// as many words as fit are copied and the rest is missing; nothing tells so.
     CC_Flags& operator=(CC_Flags const& other);
@@ -48,6 +44,17 @@ public:
     /// The lowest number in the set that is not below `from`, or NONE.
     unsigned int getFirstSet(unsigned int from) const;
 
+    /// Calls `handle(number)` for each number in the set, upward, as long as that returns true; whether it always did.
+    template <class Handle>
+    bool forEachSet(Handle&& handle) const
+    {
+        for (Entry const* entry = m_entries; entry != m_entries + m_count; ++entry)
+            for (unsigned int bits = entry->bits; bits != 0; bits &= bits - 1)
+                if (!handle(entry->wordIndex * 32 + static_cast<unsigned int>(std::countr_zero(bits))))
+                    return false;
+        return true;
+    }
+
     /// Whether nothing was set since the set was made or cleared.
     ///
     /// It looks at the first word alone. If that word's bits were all taken back by `set(bit, false)`, the operation
@@ -57,7 +64,7 @@ public:
     void clear() { m_count = 0; }
 
     /// Makes room for exactly `newCapacity` words. OK; REFUSED below the number of words in use; NO_ELEMENT when memory
-    /// is out. The set is unchanged unless OK.
+    /// is needed and out. The set is unchanged unless OK.
     XCode enlarge(unsigned int newCapacity);
 
     unsigned int getCapacity() const { return m_capacity; } ///< words there is room for
@@ -66,7 +73,17 @@ public:
     Entry const& getEntry(unsigned int index) const { return m_entries[index]; }
 
 private:
+    static constexpr unsigned int INLINE = 2;
+
+    XCode insert(unsigned int index, Entry entry);
+    void release()
+    {
+        if (m_entries != m_inline)
+            delete[] m_entries;
+    }
+
     unsigned int m_capacity = 0;
     unsigned int m_count = 0;
-    Entry* m_entries = nullptr;
+    Entry m_inline[INLINE] = {};
+    Entry* m_entries = m_inline;
 };

@@ -177,16 +177,44 @@ TEST(CC_Flags, ACopyNeverShrinksTheCapacity)
 
 TEST(CC_Flags, MovingASetTakesItsMemoryAndLeavesItEmpty)
 {
-    CC_Flags flags = FLAGS_OF({5, 64});
+    for (std::vector<unsigned int> const& bits : {std::vector<unsigned int>{5, 64}, {5, 64, 128}})
+    {
+        CC_Flags flags = FLAGS_OF(bits);
+        FailingAllocator::failNth(1);
+        CC_Flags const taken(std::move(flags));
+        FailingAllocator::stop();
+        EXPECT_FALSE(FailingAllocator::hasFailed());
+        EXPECT_EQ(bits, BITS_OF(taken));
+        EXPECT_EQ(bits.size(), taken.getCapacity());
+        EXPECT_TRUE(flags.isEmpty());
+        EXPECT_EQ(0U, flags.getCapacity());
+        ASSERT_TRUE(flags.set(7, true).isOk());
+        EXPECT_EQ((std::vector<unsigned int>{7}), BITS_OF(flags));
+        EXPECT_EQ(bits, BITS_OF(taken));
+    }
+}
+
+TEST(CC_Flags, TheFirstTwoWordsNeedNoMemory)
+{
+    CC_Flags flags;
     FailingAllocator::failNth(1);
-    CC_Flags const taken(std::move(flags));
+    XCode const first = flags.set(5, true);
+    XCode const second = flags.set(64, true);
+    CC_Flags const copy(flags);
     FailingAllocator::stop();
     EXPECT_FALSE(FailingAllocator::hasFailed());
-    EXPECT_EQ((std::vector<unsigned int>{5, 64}), BITS_OF(taken));
-    EXPECT_TRUE(flags.isEmpty());
-    EXPECT_EQ(0U, flags.getCapacity());
-    ASSERT_TRUE(flags.set(7, true).isOk());
-    EXPECT_EQ((std::vector<unsigned int>{7}), BITS_OF(flags));
+    EXPECT_EQ(XCode::OK, first);
+    EXPECT_EQ(XCode::OK, second);
+    EXPECT_EQ((std::vector<unsigned int>{5, 64}), BITS_OF(copy));
+}
+
+TEST(CC_Flags, BackToTwoWordsItLetsGoOfItsMemory)
+{
+    CC_Flags flags = FLAGS_OF({5, 64});
+    ASSERT_EQ(XCode::OK, flags.enlarge(10));
+    EXPECT_EQ(XCode::OK, flags.enlarge(2));
+    EXPECT_EQ(2U, flags.getCapacity());
+    EXPECT_EQ((std::vector<unsigned int>{5, 64}), BITS_OF(flags));
 }
 
 TEST(CC_Flags, AssigningASetToItselfChangesNothing)
@@ -212,16 +240,16 @@ TEST(CC_Flags, EnlargingIsRefusedBelowTheWordsInUse)
 
 TEST(CC_Flags, WithoutMemoryASetStaysAsItWas)
 {
-    CC_Flags flags = FLAGS_OF({5});
+    CC_Flags flags = FLAGS_OF({5, 64});
     FailingAllocator::failNth(1);
-    XCode const set = flags.set(64, true);
+    XCode const set = flags.set(128, true);
     FailingAllocator::failNth(1);
     XCode const enlarged = flags.enlarge(8);
     FailingAllocator::stop();
     EXPECT_EQ(XCode::NO_ELEMENT, set);
     EXPECT_EQ(XCode::NO_ELEMENT, enlarged);
-    EXPECT_EQ(1U, flags.getCapacity());
-    EXPECT_EQ((std::vector<unsigned int>{5}), BITS_OF(flags));
+    EXPECT_EQ(2U, flags.getCapacity());
+    EXPECT_EQ((std::vector<unsigned int>{5, 64}), BITS_OF(flags));
 }
 
 TEST(CC_Flags, WithoutMemoryACopyIsCutOffSilently)

@@ -4,6 +4,7 @@
 #include "platform/base/InfoContainer.h"
 #include "platform/base/LinkedListManager.h"
 #include "platform/base/String.h"
+#include "platform/base/TYRecycled.h"
 #include "platform/base/XCode.h"
 
 /// One value that the two sides of a call exchange: a number, an indicator, a state, a cause. The base of every value
@@ -23,7 +24,7 @@
 ///     CC_PropertyBoolean dataProvided(CC_PropertyId::PROVIDES_DATA, true);
 ///     String text;
 ///     dataProvided.getValueString(text); // "true"
-class CC_EXPORT CC_Property : public LinkedListElement<CC_Property>
+class CC_EXPORT CC_Property : public LinkedListElement<CC_Property>, public TYRecycled
 {
 public:
     /// The value of a class's type number as long as none was assigned.
@@ -31,7 +32,7 @@ public:
 
     explicit CC_Property(unsigned int id) noexcept : m_id(id) { ++s_numberOfInstances; }
     /// The copy is in no list.
-    CC_Property(CC_Property const& other) noexcept : LinkedListElement(other), m_id(other.m_id)
+    CC_Property(CC_Property const& other) noexcept : LinkedListElement(other), TYRecycled(), m_id(other.m_id)
     {
         ++s_numberOfInstances;
     }

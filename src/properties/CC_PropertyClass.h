@@ -49,6 +49,19 @@ public:
         return CC_Property::ASSIGN_TYPE_ID(Derived::s_typeId);
     }
 
+    /// The property as one of this class, or of one that derives from it; null when it is null or of another class.
+    ///
+    ///     if (auto const* number = CC_PropertyString::FROM(adapter.getPeerProperty(CC_PropertyId::E164_NUMBER)))
+    ///         display(number->getValue());
+    static Derived const* FROM(CC_Property const* property)
+    {
+        return property != nullptr ? SAME_CLASS(*property) : nullptr;
+    }
+    static Derived* FROM(CC_Property* property)
+    {
+        return const_cast<Derived*>(FROM(static_cast<CC_Property const*>(property)));
+    }
+
     CC_Property& assign(CC_Property const& other) override
     {
         Derived const* const same = SAME_CLASS(other);
@@ -92,17 +105,25 @@ private:
     {
         if constexpr (std::is_nothrow_copy_assignable_v<Derived>)
             self() = other;
-        else
+        else if (other.getId() != Base::getId() || !self().hasSameValue(other)) // comparing is cheaper than copying
         {
             try
             {
-                Derived copy(other); // what lacks memory half-way leaves the value as it was
-                self() = std::move(copy);
+                self().takeWhole(other);
             }
             catch (std::bad_alloc const&)
             {
                 ++CC_Property::s_numberOfFailedAssignments;
             }
         }
+    }
+
+protected:
+    /// Takes id and value over, or throws and leaves both as they were. A class that can do so without a copy has one
+    /// of its own.
+    void takeWhole(Derived const& other)
+    {
+        Derived copy(other);
+        self() = std::move(copy);
     }
 };

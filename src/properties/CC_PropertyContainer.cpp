@@ -2,6 +2,8 @@
 
 #include "platform/base/NestingGuard.h"
 
+#include <typeinfo>
+
 namespace
 {
 unsigned int s_infoDepth = 0; // of all containers' dumps
@@ -13,16 +15,32 @@ bool ASSIGN(CC_Property& stored, CC_Property const& property)
     stored.assign(property);
     return CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() == failedBefore;
 }
+
+bool IS_OF_SAME_KIND(CC_Property const& left, CC_Property const& right)
+{
+    return left.getId() == right.getId() && typeid(left) == typeid(right);
+}
 } // namespace
 
 CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const& other)
 {
     if (this == &other)
         return *this;
-    clear();
-    for (CC_Property const& property : other)
+    unsigned int const failedBefore = CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS();
+    Iterator stored = m_properties.begin();
+    ConstIterator source = other.begin();
+    for (; stored != m_properties.end() && source != other.end() && IS_OF_SAME_KIND(*stored, *source);
+         ++stored, ++source)
+        stored->assign(*source);
+    if (CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() != failedBefore)
     {
-        CC_Property* const copy = property.clone();
+        stored = m_properties.begin(); // memory is short: begin again, with as many copies as it allows
+        source = other.begin();
+    }
+    removeFrom(stored);
+    for (; source != other.end(); ++source)
+    {
+        CC_Property* const copy = source->clone();
         if (copy != nullptr && !m_properties.append(copy).isOk())
             delete copy;
     }
@@ -37,9 +55,11 @@ CC_Property* CC_PropertyContainer::getByIndex(unsigned int index) { return findB
 
 CC_Property const* CC_PropertyContainer::getByIndex(unsigned int index) const { return findByIndex(index); }
 
-XCode CC_PropertyContainer::set(CC_Property const& property)
+XCode CC_PropertyContainer::set(CC_Property const& property) { return replace(find(property.getId()), property); }
+
+XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& property)
 {
-    if (CC_Property* const stored = find(property.getId()))
+    if (stored != nullptr)
         return ASSIGN(*stored, property) ? XCode::OK : XCode::NO_ELEMENT;
     CC_Property* const copy = property.clone();
     if (copy == nullptr)
@@ -89,6 +109,28 @@ CC_PropertyContainer const& CC_PropertyContainer::EMPTY()
 {
     static CC_PropertyContainer const empty;
     return empty;
+}
+
+CC_Property* CC_PropertyContainer::Cursor::findElsewhere(unsigned int id)
+{
+    Iterator position = m_container.m_properties.begin();
+    while (position != m_container.m_properties.end() && position->getId() != id)
+        ++position;
+    if (position == m_container.m_properties.end())
+        return nullptr;
+    CC_Property& found = *position;
+    m_next = ++position;
+    return &found;
+}
+
+void CC_PropertyContainer::removeFrom(Iterator position)
+{
+    while (position != m_properties.end())
+    {
+        CC_Property& removed = *position;
+        ++position;
+        m_properties.remove(removed);
+    }
 }
 
 CC_Property* CC_PropertyContainer::find(unsigned int id) const

@@ -40,11 +40,43 @@ public:
         LinkedListManager<CC_Property>::Iterator m_position;
     };
 
+    /// Finds properties that are asked for in nearly the order in which they are stored, as they are in two containers
+    /// of which one follows the other: the property behind the one found last is looked at first.
+    ///
+    ///     CC_PropertyContainer::Cursor seen(view);
+    ///     for (CC_Property const& property : leg.getProperties())
+    ///         if (CC_Property* const former = seen.find(property.getId()))
+    ///             ...
+    class CC_EXPORT Cursor
+    {
+    public:
+        /// Removing properties disturbs it, adding does not.
+        explicit Cursor(CC_PropertyContainer& container)
+            : m_container(container), m_next(container.m_properties.begin())
+        {
+        }
+        /// The property of that id, null if there is none.
+        CC_Property* find(unsigned int id)
+        {
+            if (m_next == m_container.m_properties.end() || m_next->getId() != id)
+                return findElsewhere(id);
+            CC_Property& found = *m_next;
+            ++m_next;
+            return &found;
+        }
+
+    private:
+        CC_Property* findElsewhere(unsigned int id);
+
+        CC_PropertyContainer& m_container;
+        LinkedListManager<CC_Property>::Iterator m_next;
+    };
+
     CC_PropertyContainer() = default;
     CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
     ~CC_PropertyContainer() = default;
     /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
-    /// tells so.
+    /// tells so. As far as both begin with the same ids and classes, the values are taken over where they stand.
     CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
 
     /// The property of that id, null if there is none. It stays the container's; removing it ends it.
@@ -64,6 +96,8 @@ public:
     /// OK, also when the stored property is of another class and keeps its value: intended, an id's class is fixed by
     /// its first owner. NO_ELEMENT when memory is out, FAILURE when the list refuses; the container is then unchanged.
     XCode set(CC_Property const& property);
+    /// The same for who has looked the property up: `stored` is what `get` gave for its id, null included.
+    XCode replace(CC_Property* stored, CC_Property const& property);
     /// Stores the other's properties whose id has a bit in common with `mask`, in order: 0x100 takes the 0x4001xx ids,
     /// 0x200 the 0x4002xx ids, 0x400 and 0x800 likewise, 0x1000 and above the 0x401xxx ids. OK, or FAILURE at the
     /// first one that is refused; those before it stay stored.
@@ -86,8 +120,12 @@ public:
     static CC_PropertyContainer const& EMPTY();
 
 private:
+    using Iterator = LinkedListManager<CC_Property>::Iterator;
+
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
+
+    void removeFrom(Iterator position);
 
     LinkedListManager<CC_Property> m_properties;
 };

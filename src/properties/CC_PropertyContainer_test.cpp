@@ -246,6 +246,7 @@ TEST(CC_PropertyContainer, WithoutMemoryNothingIsAddedNorChanged)
                                                }));
     EXPECT_EQ(XCode::OK, result);
 
+    properties.clear();
     ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NAME, "Anna")).isOk());
     EXPECT_EQ(1U, WITH_EACH_ALLOCATION_FAILING(set,
                                                [&]

@@ -16,4 +16,12 @@ public:
     String& getValueString(String& out) const override;
     /// OK; FAILURE only when memory is out.
     XCode setValueString(String& error, String const& text) override;
+
+private:
+    friend CC_PropertyClass<CC_PropertyString>;
+    void takeWhole(CC_PropertyString const& other)
+    {
+        setValue(other.getValue()); // throws before it changes anything
+        CC_Property::operator=(other);
+    }
 };

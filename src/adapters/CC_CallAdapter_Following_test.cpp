@@ -1,0 +1,189 @@
+// The views look only at what they are told of, as long as that is enough: nobody may see a difference to views that
+// compare everything with every change.
+#include "adapters/TestLine.h"
+#include "properties/CC_PropertyBoolean.h"
+
+#include <algorithm>
+#include <random>
+#include <set>
+#include <vector>
+
+namespace
+{
+using namespace CC_PropertyId;
+
+/// What the two adapters of a call know of one leg, brought up to date by comparing everything.
+class ReferenceViews : public CC_CallLegObserver
+{
+public:
+    explicit ReferenceViews(CC_CallLeg const& leg) : m_leg(leg) {}
+
+    void onCallLegObservationEnded(CC_Event<CC_CallLeg> const&) override {}
+    void onCallLegCallRelinked(CC_Event<CC_CallLeg> const&) override {}
+    void onCallLegSynchronousService(CC_Event<CC_CallLeg> const&) override {}
+    void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const&) override
+    {
+        CC_PropertyContainer const& current = m_leg.getProperties();
+        own = current;
+        for (CC_Property const& property : current)
+        {
+            CC_Property const* const seen = std::as_const(peer).get(property.getId());
+            if (seen != nullptr && property.isEqual(*seen))
+                continue;
+            EXPECT_TRUE(peer.set(property).isOk());
+            marked.insert(property.getId());
+        }
+        for (unsigned int i = 0; i < peer.getNumberOfProperties();)
+        {
+            unsigned int const id = peer.getByIndex(i)->getId();
+            if (current.get(id) != nullptr)
+                ++i;
+            else
+            {
+                peer.removeByIndex(i);
+                marked.insert(id);
+            }
+        }
+    }
+
+    CC_PropertyContainer own;
+    CC_PropertyContainer peer;
+    std::set<unsigned int> marked;
+
+private:
+    CC_CallLeg const& m_leg;
+};
+
+class CC_CallAdapter_Following_Test : public TestLines
+{
+protected:
+    static constexpr unsigned int IDS[] = {E164_NUMBER, NAME, ALERT_INFO, DISPLAY, PROVIDES_DATA};
+
+    static std::string TEXT_OF(CC_PropertyContainer const& properties)
+    {
+        std::string text;
+        for (CC_Property const& property : properties)
+            text += std::string(property.getPropertyName()) + "=" + TestLine::TEXT(&property) + " ";
+        return text;
+    }
+    /// All that the adapter shows, in its order; `get` is one of its getters of several.
+    static std::string SHOWN(CC_CallAdapter const& adapter,
+                             XCode (CC_CallAdapter::*get)(CC_PropertyContainer&, unsigned int) const)
+    {
+        CC_PropertyContainer shown;
+        EXPECT_TRUE((adapter.*get)(shown, CC_PropertyContainer::ALL_GROUPS).isOk());
+        return TEXT_OF(shown);
+    }
+
+    unsigned int random(unsigned int below) { return static_cast<unsigned int>(m_random() % below); }
+    CC_PropertyString randomText()
+    {
+        return {IDS[random(4)], random(2) == 0 ? "x" : "a text too long to be kept inline"};
+    }
+    CC_PropertyContainer several()
+    {
+        CC_PropertyContainer properties;
+        for (unsigned int i = 0; i < 3; ++i)
+            EXPECT_TRUE(properties.set(randomText()).isOk());
+        EXPECT_TRUE(properties.set(State(STATE, State::ALERTING)).isOk());
+        return properties;
+    }
+
+    /// One of the ways in which b's leg and the views of it change. The last ones tell nobody.
+    void change(CC_CallLeg& leg, ReferenceViews& reference, bool alsoUntold)
+    {
+        CC_PropertyString const text = randomText();
+        CC_PropertyBoolean const data(PROVIDES_DATA, random(2) == 0);
+        CC_PropertyBoolean const ofAnotherClass(NAME, true);
+        CC_PropertyContainer const many = several();
+        bool changed = false;
+        switch (random(alsoUntold ? 11 : 8))
+        {
+        case 0:
+        case 1:
+            EXPECT_TRUE(reference.own.set(text).isOk());
+            EXPECT_TRUE(b.adapter.setOwnProperty(text).isOk());
+            break;
+        case 2:
+            EXPECT_TRUE(reference.own.set(data).isOk());
+            EXPECT_TRUE(b.adapter.setOwnPropertyUnfiltered(data).isOk());
+            break;
+        case 3:
+            EXPECT_TRUE(reference.own.set(many).isOk());
+            EXPECT_TRUE(b.adapter.setOwnProperties(many).isOk());
+            break;
+        case 4:
+            EXPECT_TRUE(reference.peer.set(text).isOk());
+            EXPECT_TRUE(a.adapter.setPeerProperty(text).isOk());
+            break;
+        case 5:
+            EXPECT_TRUE(reference.peer.set(ofAnotherClass).isOk());
+            EXPECT_TRUE(a.adapter.setPeerProperty(ofAnotherClass).isOk());
+            break;
+        case 6: // refused by the leg: the module sees it until the next change
+            EXPECT_TRUE(reference.own.set(State(STATE, State::IDLE)).isOk());
+            EXPECT_FALSE(b.adapter.setOwnProperty(State(STATE, State::IDLE)).isOk());
+            break;
+        case 7:
+            EXPECT_TRUE(leg.setProperty(text).isOk());
+            break;
+        case 8:
+            std::ignore = leg.setPropertyNoNotification(text, changed);
+            break;
+        case 9:
+            leg.getProperties().remove(text.getId());
+            break;
+        default:
+            leg.getProperties().removeByIndex(leg.getProperties().getNumberOfProperties() - 1);
+            break;
+        }
+    }
+
+    void expectSame(ReferenceViews& reference)
+    {
+        EXPECT_EQ(SHOWN(b.adapter, &CC_CallAdapter::getOwnProperties), TEXT_OF(reference.own));
+        EXPECT_EQ(SHOWN(a.adapter, &CC_CallAdapter::getPeerProperties), TEXT_OF(reference.peer));
+    }
+    void expectSameHeard(ReferenceViews& reference)
+    {
+        std::size_t const before = a.module.getFlagSets().size();
+        settle();
+        std::vector<unsigned int> const expected(reference.marked.begin(), reference.marked.end());
+        reference.marked.clear();
+        if (expected.empty())
+            EXPECT_EQ(a.module.getFlagSets().size(), before);
+        else
+            EXPECT_EQ(a.module.getFlagSets().back(), expected);
+    }
+
+    std::minstd_rand m_random;
+};
+} // namespace
+
+TEST_F(CC_CallAdapter_Following_Test, HoweverALegChangesItsViewsAreThoseOfAFullComparison)
+{
+    for (unsigned int round = 0; round < 400 && !HasFailure(); ++round)
+    {
+        SCOPED_TRACE("round " + std::to_string(round));
+        connect(State::ALERTING);
+        CC_CallLeg& leg = *theCall().getCallLeg(1);
+        ReferenceViews reference(leg);
+        reference.own = std::as_const(leg).getProperties();
+        reference.peer = reference.own;
+        ASSERT_TRUE(leg.addCallLegObserver(&reference).isOk());
+        b.become(State::CONNECTED); // from here on all views are in step
+        expectSameHeard(reference);
+        for (unsigned int i = 0; i < 30 && !HasFailure(); ++i)
+        {
+            SCOPED_TRACE("change " + std::to_string(i));
+            change(leg, reference, round % 4 == 3 && i > 10);
+            expectSame(reference);
+            if (random(3) == 0)
+                expectSameHeard(reference);
+        }
+        leg.removeCallLegObserver(&reference);
+        a.drop();
+        b.drop();
+        settle();
+    }
+}

@@ -1,0 +1,107 @@
+#pragma once
+
+#include "properties/CC_Flags.h"
+#include "properties/CC_PropertyContainer.h"
+
+#include <utility>
+
+/// A copy of somebody's properties that follows them: what an adapter knows of a leg or call.
+///
+/// Once it has been compared with its source, what is told of a change is all that can differ, besides what was written
+/// to the view itself. So it looks at no more than that, as long as the source tells of every change and neither gains
+/// nor loses a property; otherwise at everything. Of a property change between two legs of twelve properties this saves
+/// a third of the instructions, and most of the memory that is touched when many calls are up.
+///
+///     m_peer.follow(leg.getProperties(), &flags, [&](unsigned int id) { mark(id); });
+class CC_EXPORT CC_PropertyView
+{
+public:
+    CC_PropertyContainer const& getProperties() const { return m_properties; }
+    void clear();
+
+    /// Stores into the view alone, as the container's `set` does; the source may or may not follow.
+    XCode write(CC_Property const& property);
+    XCode write(CC_PropertyContainer const& properties);
+
+    /// Makes the view a copy of the source. `changed`: the ids that were told; null when anything may differ.
+    void assign(CC_PropertyContainer const& source, CC_Flags const* changed);
+
+    /// Takes over what differs from the source and calls `onDifference(id)` for each id that does, in the source's
+    /// order, and after these for what the source no longer has. Properties that stay keep their place.
+    template <class OnDifference>
+    void follow(CC_PropertyContainer const& source, CC_Flags const* changed, OnDifference&& onDifference)
+    {
+        auto const take = [&](CC_Property& former, CC_Property const& current)
+        {
+            if (current.isEqual(former))
+                return true;
+            former.assign(current);
+            onDifference(current.getId());
+            if (!current.isEqual(former)) // memory is out, or the classes differ
+                m_inStepWith = nullptr;
+            return true;
+        };
+        if (!takeChanged(source, changed, take))
+            followAll(source, take, onDifference);
+    }
+
+private:
+    static constexpr unsigned int NONE = CC_Flags::NONE;
+
+    /// Whether all that can differ is known, in both, and was taken by `take(former, current)`.
+    template <class Take>
+    bool takeChanged(CC_PropertyContainer const& source, CC_Flags const* changed, Take const& take)
+    {
+        if (changed == nullptr || m_inStepWith != &source)
+            return false;
+        auto const takeOne = [&](unsigned int id)
+        {
+            CC_Property* const former = m_properties.get(id);
+            CC_Property const* const current = source.get(id);
+            return former != nullptr && current != nullptr && take(*former, *current);
+        };
+        if (!changed->forEachSet(takeOne))
+            return false;
+        unsigned int const written = std::exchange(m_written, NONE);
+        return written == NONE || changed->get(written) || takeOne(written);
+    }
+
+    template <class Take, class OnDifference>
+    void followAll(CC_PropertyContainer const& source, Take const& take, OnDifference const& onDifference)
+    {
+        m_inStepWith = &source;
+        m_written = NONE;
+        unsigned int kept = 0;
+        CC_PropertyContainer::Cursor formers(m_properties);
+        for (CC_Property const& current : source)
+        {
+            if (CC_Property* const former = formers.find(current.getId()))
+            {
+                ++kept;
+                take(*former, current);
+                continue;
+            }
+            if (m_properties.set(current).isOk())
+                ++kept;
+            else
+                m_inStepWith = nullptr; // without memory it is not seen; that it differs is told all the same
+            onDifference(current.getId());
+        }
+        for (unsigned int i = 0;
+             i < m_properties.getNumberOfProperties() && kept < m_properties.getNumberOfProperties();)
+        {
+            unsigned int const id = m_properties.getByIndex(i)->getId();
+            if (source.get(id) != nullptr)
+            {
+                ++i;
+                continue;
+            }
+            m_properties.removeByIndex(i);
+            onDifference(id);
+        }
+    }
+
+    CC_PropertyContainer m_properties;
+    CC_PropertyContainer const* m_inStepWith = nullptr; // null or gone: everything may differ
+    unsigned int m_written = NONE;                      // but for this id, what was told is all that does
+};
