@@ -1,32 +1,41 @@
 #include "SipAddress.h"
 
 #include "sip/SipReason.h"
+#include "sip/SipText.h"
 
 #include <cctype>
 #include <charconv>
+#include <optional>
 
 namespace
 {
 constexpr char const* HEXADECIMAL = "0123456789ABCDEF";
 constexpr std::string_view ALLOWED_IN_USER = "-_.!~*'()&=+$,;?/";
+
+/// What "%41" at that place stands for; nothing where no such escape is, or one of a control character.
+std::optional<char> ESCAPED_AT(std::string_view text, std::size_t at)
+{
+    unsigned char octet = 0;
+    std::string_view const digits = text.substr(at).substr(0, 3);
+    if (digits.size() < 3 || digits[0] != '%')
+        return std::nullopt;
+    bool const isNumber = std::from_chars(digits.data() + 1, digits.data() + 3, octet, 16).ptr == digits.data() + 3;
+    auto const c = static_cast<char>(octet);
+    return isNumber && !SipText::IS_CONTROL(c) ? std::optional(c) : std::nullopt;
+}
 } // namespace
 
 std::string SipAddress::UNESCAPE_USER(std::string_view user)
 {
     std::string plain;
     for (std::size_t i = 0; i < user.size(); ++i)
-    {
-        unsigned char octet = 0;
-        if (user[i] == '%' && i + 2 < user.size() && std::isxdigit(static_cast<unsigned char>(user[i + 1])) != 0 &&
-            std::isxdigit(static_cast<unsigned char>(user[i + 2])) != 0)
+        if (std::optional<char> const escaped = ESCAPED_AT(user, i))
         {
-            std::from_chars(user.data() + i + 1, user.data() + i + 3, octet, 16);
-            plain += static_cast<char>(octet);
+            plain += *escaped;
             i += 2;
         }
         else
             plain += user[i];
-    }
     return plain;
 }
 

@@ -9,7 +9,8 @@
 /// out of it still escaped.
 namespace SipAddress
 {
-/// The user part with "%41" and its kin replaced by what they stand for; a malformed escape stays as it is.
+/// The user part with "%41" and its kin replaced by what they stand for. A malformed escape stays as it is, and so does
+/// one of a control character: a number has none, and a line break would reach traces and logs.
 std::string UNESCAPE_USER(std::string_view user);
 /// The text as a user part: what the grammar of RFC 3261 does not allow there is escaped.
 std::string ESCAPE_USER(std::string_view user);

@@ -118,7 +118,7 @@ SipCause SipCause::FROM_RESPONSE(unsigned int status, std::string_view phrase, s
     if (status < 400 && reason.q850Cause == 0)
         result.cause = QCause::REDIRECTION_TO_NEW_DESTINATION; // redirections are not followed
     result.sipCode = status;
-    result.text = reason.text.empty() ? phrase : reason.text;
+    result.text = reason.text.empty() ? SipReason::UNQUOTE(phrase) : reason.text;
     return result;
 }
 

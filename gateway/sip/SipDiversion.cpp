@@ -43,7 +43,7 @@ constexpr ReasonRow REASONS[] = {
     {Reason::OUT_OF_ORDER, 503, "unavailable"},
 };
 
-constexpr unsigned int MOST_REDIRECTIONS = 100; // a counter above is nonsense
+constexpr unsigned int MOST_REDIRECTIONS = 100; // a counter above is nonsense, nor do we send one
 
 template <class Matches>
 ReasonRow const* FIND(Matches matches)
@@ -52,12 +52,11 @@ ReasonRow const* FIND(Matches matches)
     return found != std::end(REASONS) ? found : nullptr;
 }
 
-bool HOLDS_ONE_OF(std::string_view list, std::initializer_list<char const*> words)
+/// Whatever asks for privacy withholds, also for the name alone and in words that we do not know.
+bool IS_WITHHELD(SipNameAddr const& address)
 {
-    while (!list.empty())
-        if (IS_ONE_OF(SipText::CUT(list, ';'), words))
-            return true;
-    return false;
+    return IS_ANONYMOUS(address) || !IS_ONE_OF(address.getParameter("privacy"), {"", "off"}) ||
+           !IS_ONE_OF(address.getUriHeader("Privacy"), {"", "none"});
 }
 
 Redirection REDIRECTION_BY(SipNameAddr const& address, Reason reason)
@@ -73,7 +72,7 @@ SipDiversion READ_DIVERSION(sip_t const* invite)
     for (auto address = addresses.rbegin(); address != addresses.rend(); ++address) // the latest stands first
         diversion.add(REDIRECTION_BY(*address, SipDiversion::REASON_OF_TEXT(address->getParameter("reason"))),
                       std::max(1u, SipText::NUMBER(address->getParameter("counter"), 1, MOST_REDIRECTIONS)),
-                      IS_ANONYMOUS(*address) || IS_ONE_OF(address->getParameter("privacy"), {"full", "uri"}));
+                      IS_WITHHELD(*address));
     if (!addresses.empty() && IS_ONE_OF(addresses.front().getParameter("screen"), {"yes"}))
         diversion.screening = QScreeningIndicator::USER_PROVIDED_PASSED;
     return diversion;
@@ -89,13 +88,11 @@ Reason REASON_BETWEEN(SipNameAddr const& from, SipNameAddr const& to)
 SipDiversion READ_HISTORY(sip_t const* invite)
 {
     SipDiversion history;
-    bool const isPrivate = SipPrivacy::HOLDS(invite, {"history"});
+    bool const isPrivate = SipPrivacy::RESTRICTS_HISTORY(invite);
     std::vector<SipNameAddr> const addresses = SipNameAddr::READ(invite, "History-Info");
     for (std::size_t i = 0; i + 1 < addresses.size(); ++i)
         if (Reason const reason = REASON_BETWEEN(addresses[i], addresses[i + 1]); reason != Reason::UNSPECIFIED)
-            history.add(REDIRECTION_BY(addresses[i], reason), 1,
-                        isPrivate || IS_ANONYMOUS(addresses[i]) ||
-                            HOLDS_ONE_OF(addresses[i].getUriHeader("Privacy"), {"history", "id", "user", "header"}));
+            history.add(REDIRECTION_BY(addresses[i], reason), 1, isPrivate || IS_WITHHELD(addresses[i]));
     return history;
 }
 
@@ -154,7 +151,7 @@ void SipDiversion::add(Redirection const& next, unsigned int times, bool isWithh
     if (count == 0)
         first = next;
     last = next;
-    count += times;
+    count = std::min(count + times, MOST_REDIRECTIONS);
     if (isWithheld)
         presentation = QPresentationIndicator::RESTRICTED;
 }
@@ -217,7 +214,8 @@ SipDiversion SipDiversion::OF_PEER(CC_CallAdapterE164 const& adapter)
     diversion.presentation = adapter.getPeerDiversionPresentationIndicator();
     diversion.screening = adapter.getPeerDiversionScreeningIndicator();
     // a module that counts nothing but names a number has redirected once
-    unsigned int const least = diversion.last.number.empty() ? 0 : 1;
-    diversion.count = std::max(least, static_cast<unsigned int>(adapter.getPeerRedirectingCounter()));
+    unsigned long long const least = diversion.last.number.empty() ? 0 : 1;
+    diversion.count = static_cast<unsigned int>(
+        std::clamp<unsigned long long>(adapter.getPeerRedirectingCounter(), least, MOST_REDIRECTIONS));
     return diversion;
 }

@@ -15,9 +15,9 @@ class CC_PropertyContainer;
 /// Who redirected a call before it came here, and why: the headers Diversion (RFC 5806) and History-Info (RFC 7044)
 /// to redirecting properties, and back. A plain value.
 ///
-/// Call control knows the first and the last redirection, how many there were, and one indicator for all: those between
-/// are lost, and one that is withheld withholds all. It has no type for these numbers, so an international one keeps
-/// its "+".
+/// Call control knows the first and the last redirection, how many there were (up to 100 count), and one indicator for
+/// all: those between are lost, and one that is withheld, be it the name alone, withholds all. It has no type for these
+/// numbers, so an international one keeps its "+".
 ///
 /// In History-Info an address was redirected if the cause (RFC 4458) in the URI of the next, or the Reason in its own
 /// URI, is one of the table below. Where both headers are there, History-Info says who and why, if it tells of a

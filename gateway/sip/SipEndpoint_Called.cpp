@@ -10,6 +10,7 @@
 #include "sip/SipDiversion.h"
 #include "sip/SipIdentity.h"
 #include "sip/SipInterface.h"
+#include "sip/SipPrivacy.h"
 #include "sip/SipProperty.h"
 #include "sip/SipPropertyId.h"
 
@@ -41,7 +42,8 @@ void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
 {
     if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response))
         connected->addTo(properties);
-    else if (std::string const name = SipIdentity::READ_NAME_OF_TO(response); !name.empty())
+    else if (std::string const name = SipIdentity::READ_NAME_OF_TO(response);
+             !name.empty() && !SipPrivacy::RESTRICTS_SENDER(response))
         ADD_TEXT(properties, CC_PropertyId::NAME, name); // most often the one that our INVITE had
 }
 } // namespace

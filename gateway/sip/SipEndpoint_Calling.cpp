@@ -18,6 +18,17 @@ using namespace SipProperty;
 namespace
 {
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
+
+/// What the INVITE tells of its side beyond the party that calls.
+void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, std::string const& session)
+{
+    if (!second.number.empty())
+        second.addAsSecondTo(own);
+    SipDiversion::READ(request).addTo(own);
+    if (!session.empty())
+        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, !session.empty())); // else a new leg's: none
+}
 } // namespace
 
 int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
@@ -62,14 +73,8 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
     SipIdentity const caller = SipIdentity::READ_CALLER(request);
-    SipDiversion const diversion = SipDiversion::READ(request);
     CC_PropertyContainer own;
-    if (!caller.second.number.empty())
-        caller.second.addAsSecondTo(own);
-    diversion.addTo(own);
-    if (m_hasOffer)
-        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, m_hasOffer)); // else a new leg's: none
+    ADD_CALLING(own, caller.second, request, session);
     CC_PropertyContainer offer;
     unsigned long const maxForwards =
         request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;

@@ -3,21 +3,11 @@
 #include "sip/SipAddress.h"
 #include "sip/SipPrivacy.h"
 
-#include <spdlog/spdlog.h>
-
 namespace
 {
-bool ASKS_FOR_PRIVACY(sip_t const* message)
-{
-    if (!SipPrivacy::IS_MALFORMED(message))
-        return SipPrivacy::HOLDS(message, {"id", "user", "header"});
-    spdlog::info("Privacy is malformed and counts as \"id\"");
-    return true;
-}
-
 QPresentationIndicator PRESENTATION_OF(SipParty const& party, sip_t const* message, bool isAnonymous)
 {
-    if (ASKS_FOR_PRIVACY(message) || (isAnonymous && !SipPrivacy::HOLDS(message, {"none"})))
+    if (SipPrivacy::RESTRICTS_SENDER(message) || (isAnonymous && !SipPrivacy::IS_NONE(message)))
         return QPresentationIndicator::RESTRICTED;
     return party.number.empty() ? QPresentationIndicator::NOT_AVAILABLE : QPresentationIndicator::ALLOWED;
 }

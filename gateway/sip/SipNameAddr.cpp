@@ -11,8 +11,6 @@
 
 namespace
 {
-constexpr std::size_t LONGEST_IN_LOG = 200; // characters of a header
-
 std::string TEXT_OF(char const* text) { return text != nullptr ? text : ""; }
 
 bool NAMES_A_PARTY(url_t const& url)
@@ -69,10 +67,12 @@ SipNameAddr SipNameAddr::OF(char const* display, url_t const& url, msg_param_t c
 std::vector<SipNameAddr> SipNameAddr::READ(sip_t const* message, char const* header)
 {
     std::vector<SipNameAddr> all;
+    bool isSound = true;
     for (sip_unknown_t const* line = message->sip_unknown; line != nullptr; line = line->un_next)
-        if (strcasecmp(line->un_name, header) == 0 && !READ_LINE(line->un_value, all))
-            spdlog::info("{} is passed over where it is malformed: {}", header,
-                         SipReason::ESCAPE(std::string_view(line->un_value).substr(0, LONGEST_IN_LOG)));
+        if (strcasecmp(line->un_name, header) == 0)
+            isSound = READ_LINE(line->un_value, all) && isSound;
+    if (!isSound) // one line for all, and without the text: it may be withheld
+        spdlog::info("{} is passed over where it is malformed", header);
     return all;
 }
 

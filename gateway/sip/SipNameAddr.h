@@ -22,8 +22,7 @@ struct SipNameAddr
     /// The parts as the stack has parsed them; `display` and `parameters` may be null.
     static SipNameAddr OF(char const* display, url_t const& url, msg_param_t const* parameters);
     /// Every address with a sip, sips or tel URI in the headers of that name, which must be one that the stack does not
-    /// parse by itself. From a malformed one on a header is passed over, and so is any other URI, with a line in the
-    /// log.
+    /// parse by itself. From a malformed one on a line is passed over, and so is any other URI, which the log tells.
     static std::vector<SipNameAddr> READ(sip_t const* message, char const* header);
 
     /// Unquoted or unescaped; empty when absent.

@@ -2,9 +2,15 @@
 
 #include "sip/SipText.h"
 
+#include <spdlog/spdlog.h>
+
+#include <initializer_list>
+
 namespace
 {
-bool HOLDS(sip_privacy_t const* header, std::initializer_list<char const*> values)
+using Values = std::initializer_list<char const*>;
+
+bool HOLDS(sip_privacy_t const* header, Values values)
 {
     if (header == nullptr)
         return false;
@@ -13,21 +19,20 @@ bool HOLDS(sip_privacy_t const* header, std::initializer_list<char const*> value
             return true;
     return false;
 }
-} // namespace
 
-bool SipPrivacy::HOLDS(sip_t const* message, std::initializer_list<char const*> values)
+bool HOLDS(sip_t const* message, Values values)
 {
-    if (::HOLDS(message->sip_privacy, values))
+    if (HOLDS(message->sip_privacy, values))
         return true;
     // the stack puts the second header of a kind that it knows but once among those in error, as what it is
     for (sip_error_t const* other = message->sip_error; other != nullptr; other = other->er_next)
         if (other->er_common->h_class == sip_privacy_class &&
-            ::HOLDS(reinterpret_cast<sip_privacy_t const*>(other), values))
+            HOLDS(reinterpret_cast<sip_privacy_t const*>(other), values))
             return true;
     return false;
 }
 
-bool SipPrivacy::IS_MALFORMED(sip_t const* message)
+bool IS_MALFORMED(sip_t const* message)
 {
     for (sip_error_t const* error = message->sip_error; error != nullptr; error = error->er_next)
         if (error->er_common->h_class == sip_error_class && error->er_name != nullptr &&
@@ -35,3 +40,19 @@ bool SipPrivacy::IS_MALFORMED(sip_t const* message)
             return true;
     return false;
 }
+} // namespace
+
+bool SipPrivacy::RESTRICTS_SENDER(sip_t const* message)
+{
+    if (!IS_MALFORMED(message))
+        return HOLDS(message, {"id", "user", "header"});
+    spdlog::info("Privacy is malformed and counts as \"id\"");
+    return true;
+}
+
+bool SipPrivacy::RESTRICTS_HISTORY(sip_t const* message)
+{
+    return IS_MALFORMED(message) || HOLDS(message, {"history", "header", "session"});
+}
+
+bool SipPrivacy::IS_NONE(sip_t const* message) { return HOLDS(message, {"none"}); }

@@ -17,6 +17,7 @@ constexpr Codec::Type CODECS[] = {Codec::PCMU,    Codec::GSM,     Codec::G723, C
                                   Codec::G726_32, Codec::G726_40, Codec::ILBC, Codec::OPUS};
 
 constexpr unsigned int LONGEST_PERIOD = 1000; // milliseconds
+constexpr unsigned int MOST_COMPANIONS = 16;  // before the codec; each is searched for in the whole description
 constexpr std::string_view MEDIA = "\nm=";
 
 /// What follows the first line break and `beginning`, up to the end of that line.
@@ -87,7 +88,8 @@ Codec::Type CODEC_OF(std::string_view payloadType, std::string_view name)
 std::optional<MG_Rtp::MediaType> SipQuality::MEDIA_OF(std::string_view sessionDescription)
 {
     std::string_view const stream = FIND_VOICE(sessionDescription);
-    for (std::string_view rest = PAYLOAD_TYPES_OF(stream); !rest.empty();)
+    std::string_view rest = PAYLOAD_TYPES_OF(stream);
+    for (unsigned int companions = 0; companions <= MOST_COMPANIONS && !rest.empty(); ++companions)
     {
         std::string_view const payloadType = SipText::CUT(rest, ' ');
         std::string_view const name = NAME_OF(stream, payloadType);

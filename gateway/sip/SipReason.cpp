@@ -48,25 +48,24 @@ std::string SipReason::ESCAPE(std::string_view text)
     escaped.reserve(text.size());
     for (char const c : text)
     {
-        auto const octet = static_cast<unsigned char>(c);
         if (c == '"' || c == '\\')
             escaped += '\\';
-        escaped += octet < 0x20 || octet == 0x7f ? ' ' : c;
+        escaped += IS_CONTROL(c) ? ' ' : c;
     }
     return escaped;
 }
 
 std::string SipReason::UNQUOTE(std::string_view text)
 {
-    if (text.size() < 2 || text.front() != '"' || text.back() != '"')
-        return std::string(text);
-    text = text.substr(1, text.size() - 2);
+    bool const isQuoted = text.size() >= 2 && text.front() == '"' && text.back() == '"';
+    if (isQuoted)
+        text = text.substr(1, text.size() - 2);
     std::string plain;
     for (std::size_t i = 0; i < text.size(); ++i)
     {
-        if (text[i] == '\\' && i + 1 < text.size())
+        if (isQuoted && text[i] == '\\' && i + 1 < text.size())
             ++i;
-        plain += text[i];
+        plain += IS_CONTROL(text[i]) ? ' ' : text[i];
     }
     return plain;
 }

@@ -19,6 +19,6 @@ struct SipReason
     /// The text as it may stand between the quotes of a quoted string: quotes and backslashes escaped, control
     /// characters (a line break would end the header) as blanks.
     static std::string ESCAPE(std::string_view text);
-    /// A quoted string without its quotes and escapes; any other text as it is.
+    /// A quoted string without its quotes and escapes, any other text as it is; control characters as blanks.
     static std::string UNQUOTE(std::string_view text);
 };

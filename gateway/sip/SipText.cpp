@@ -9,6 +9,12 @@ namespace
 constexpr bool IS_BLANK(char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
 } // namespace
 
+bool SipText::IS_CONTROL(char c)
+{
+    auto const octet = static_cast<unsigned char>(c);
+    return octet < 0x20 || octet == 0x7f;
+}
+
 std::string_view SipText::TRIM(std::string_view text)
 {
     while (!text.empty() && IS_BLANK(text.front()))

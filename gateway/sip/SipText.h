@@ -6,6 +6,8 @@
 /// Reading the small grammars of header values: lists and parameters.
 namespace SipText
 {
+/// No character to be shown: a line break among them, which would end a header or a line of the log.
+bool IS_CONTROL(char c);
 /// Without blanks and line breaks at its ends.
 std::string_view TRIM(std::string_view text);
 bool EQUALS_IGNORING_CASE(std::string_view left, std::string_view right);

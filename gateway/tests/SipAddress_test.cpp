@@ -15,6 +15,12 @@ TEST(SipAddress, EscapesAreReadAndMalformedOnesKept)
     EXPECT_EQ(SipAddress::UNESCAPE_USER("%4"), "%4");
     EXPECT_EQ(SipAddress::UNESCAPE_USER("%zz%41"), "%zzA");
     EXPECT_EQ(SipAddress::UNESCAPE_USER("%41"), "A");
+    EXPECT_EQ(SipAddress::UNESCAPE_USER("%4%31"), "%41");
+}
+
+TEST(SipAddress, EscapedControlCharactersAreKeptAsTheyAre)
+{
+    EXPECT_EQ(SipAddress::UNESCAPE_USER("44%0d%0AX%20y%00%7F"), "44%0d%0AX y%00%7F");
 }
 
 TEST(SipAddress, UrisNameUserAddressAndTransport)

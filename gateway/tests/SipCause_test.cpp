@@ -51,6 +51,7 @@ TEST(SipCause, TheCauseOfAResponsesReasonWinsOverThatOfItsStatus)
     SipCause const plain = SipCause::FROM_RESPONSE(486, "Busy Here", "");
     EXPECT_EQ(plain.cause, QCause::USER_BUSY);
     EXPECT_EQ(plain.text, "Busy Here");
+    EXPECT_EQ(SipCause::FROM_RESPONSE(486, "Busy\x1b[31m", "").text, "Busy [31m");
 }
 
 TEST(SipCause, ARedirectionIsNotFollowed)

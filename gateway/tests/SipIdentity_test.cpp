@@ -96,6 +96,9 @@ Row const CALLERS[] = {
     {"a name with quotes", "From: \"Al \\\"A\\\"\" <sip:4420@host>;tag=a\r\n",
      "\"Al \"A\"\" 4420 (Presentation allowed, User-provided, not screened)", "",
      "\"Al \\\"A\\\"\" <sip:4420@192.0.2.1:5060>", ""},
+    {"a name and a number with line breaks", "From: \"Al\r\n ice\" <sip:44%0d%0aX-Own%3a%201@host>;tag=a\r\n",
+     "\"Al   ice\" 44%0D%0AX-Own: 1 (Presentation allowed, User-provided, not screened)", "",
+     "\"Al   ice\" <sip:44%250D%250AX-Own%3A%201@192.0.2.1:5060>", ""},
 };
 
 Row const ANSWERS[] = {

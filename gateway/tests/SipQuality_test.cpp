@@ -69,6 +69,19 @@ TEST(SipQuality, WhatIsNoSessionDescriptionHasNoMedia)
     EXPECT_FALSE(SipQuality::MEDIA_OF("m=audio 4000 RTP/AVP 8"));
 }
 
+TEST(SipQuality, ACodecBehindMoreCompanionsThanAnybodyHasIsNotSearchedFor)
+{
+    auto const behind = [](unsigned int companions)
+    {
+        std::string types;
+        for (unsigned int i = 0; i < companions; ++i)
+            types += "13 ";
+        return SESSION("m=audio 4000 RTP/AVP " + types + "8\r\n");
+    };
+    EXPECT_TRUE(SipQuality::MEDIA_OF(behind(16)));
+    EXPECT_FALSE(SipQuality::MEDIA_OF(behind(17)));
+}
+
 TEST(SipQuality, ACallWithoutAnAnswerHasNoRecord)
 {
     SipQuality quality;

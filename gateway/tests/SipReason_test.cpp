@@ -61,3 +61,11 @@ TEST(SipReason, WhatWasEscapedIsReadBack)
     EXPECT_EQ(SipReason::UNQUOTE("plain"), "plain");
     EXPECT_EQ(SipReason::UNQUOTE("\""), "\"");
 }
+
+TEST(SipReason, ControlCharactersAreReadAsBlanks)
+{
+    EXPECT_EQ(SipReason::UNQUOTE("\"a\r\n b\\\x1b\""), "a   b ");
+    EXPECT_EQ(SipReason::UNQUOTE("a\r\n\x7f"
+                                 "b"),
+              "a   b");
+}

@@ -39,7 +39,17 @@ nobody() {
     respond_in_dialog "200 OK"
 }
 
-TRACED=2
+private_nobody() {
+    expect_invite
+    send_text '' $'SIP/2.0 180 Ringing\n[last_Via:]\n[last_From:]\nTo: "Hidden" <sip:4989123@[local_ip]>;tag=x\n[last_Call-ID:]\n[last_CSeq:]\nPrivacy: user' ''
+    pause 100
+    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
+    expect_request ACK
+    expect_request BYE
+    respond_in_dialog "200 OK"
+}
+
+TRACED=3
 start_gateway
 start_callee callee
 expect_caller caller +4989123
@@ -52,5 +62,9 @@ expect_caller caller_of_nobody 4989123
 expect_callee
 expect_trace "told peer Name=Desk 4"
 expect_log "P-Asserted-Identity is passed over where it is malformed"
-stop_gateway "2 calls placed, 2 answered, 2 cleared, 0 failed"
+start_callee private_nobody
+expect_caller caller_of_nobody 4989123
+expect_callee
+stop_gateway "3 calls placed, 3 answered, 3 cleared, 0 failed"
+grep -q Hidden "$WORK/gateway.out" && fail "a name that is withheld becomes a property"
 finish
