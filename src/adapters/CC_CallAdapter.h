@@ -185,6 +185,7 @@ private:
     static XCode setInitialProperties(CC_PropertyContainer& properties, int state);
     XCode createOwnCallLeg();
     XCode startOwnCallLeg(CC_PropertyContainer& properties);
+    XCode writeFirstProperties(CC_PropertyContainer& properties);
     void writeFinalProperties(QCause cause, unsigned int causeValue);
     void letGoOfTheRest();
     XCode tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg);
@@ -201,7 +202,7 @@ private:
     void updateOwnCallLeg(CC_Flags const& changed);
     void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
-    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_Flags const* changed);
+    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told);
     void mark(unsigned int id);
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();

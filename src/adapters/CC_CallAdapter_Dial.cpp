@@ -192,8 +192,20 @@ XCode CC_CallAdapter::startOwnCallLeg(CC_PropertyContainer& properties)
     if (properties.get(CC_PropertyId::CALL_LEG_ID) == nullptr &&
         !properties.set(CC_PropertyUnsigned(CC_PropertyId::CALL_LEG_ID, id)).isOk())
         return XCode::FAILURE;
-    if (!setOwnProperties(properties).isOk() || !m_ownCallLeg->addCallLegObserver(this).isOk())
+    if (!writeFirstProperties(properties).isOk() || !m_ownCallLeg->addCallLegObserver(this).isOk())
         return XCode::FAILURE;
     m_observesOwnCallLeg = true;
+    return XCode::OK;
+}
+
+/// As `setOwnProperties`. Without filters nobody needs the properties afterwards nor hears of the new leg's, so our
+/// view takes them instead of copies (3 % of a call's instructions).
+XCode CC_CallAdapter::writeFirstProperties(CC_PropertyContainer& properties)
+{
+    if (getInputFilters() != nullptr)
+        return setOwnProperties(properties);
+    if (!m_ownCallLeg->setProperties(properties).isOk())
+        return XCode::FAILURE;
+    m_ownView.take(properties);
     return XCode::OK;
 }

@@ -187,3 +187,42 @@ TEST_F(CC_CallAdapter_Following_Test, HoweverALegChangesItsViewsAreThoseOfAFullC
         settle();
     }
 }
+
+TEST_F(CC_CallAdapter_Following_Test, AChangeThatComesBeforeTheAdapterHearsOfTheLegIsSeenWithTheNext)
+{
+    struct Guest : CC_CallObserver
+    {
+        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
+        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
+        {
+            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
+            EXPECT_TRUE(leg->setProperty(CC_PropertyString(NAME, "by the guest")).isOk());
+        }
+    };
+    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
+    ASSERT_TRUE(a.dial().isOk());
+    Guest guest;
+    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter
+    ASSERT_TRUE(b.accept(theCall()).isOk());
+    listen();
+    b.say(DISPLAY, "B");
+    EXPECT_EQ(a.peer(NAME), "by the guest");
+    EXPECT_EQ(heardBy(a), Lines{"a: peer changed (Name, Display)"});
+    theCall().removeCallObserver(&guest);
+}
+
+TEST_F(CC_CallAdapter_Following_Test, WhatChangedBehindAFailingFilterIsSeenWithoutIt)
+{
+    connect();
+    b.say(NAME, "x");
+    bool isFailing = true;
+    b.filterOutput([&](CC_PropertyContainer&) { return isFailing ? XCode::FAILURE : XCode::OK; });
+    ASSERT_TRUE(theCall().getCallLeg(1)->setProperty(CC_PropertyString(NAME, "y")).isOk());
+    EXPECT_EQ(b.own(NAME), "x") << "the filter keeps the view as it was";
+    b.endpoint.setOutputFilterContainer(nullptr);
+    ASSERT_TRUE(theCall().getCallLeg(1)->setProperty(CC_PropertyString(DISPLAY, "z")).isOk());
+    EXPECT_EQ(b.own(NAME) + b.own(DISPLAY), "yz");
+    isFailing = false;
+}

@@ -130,10 +130,10 @@ void CC_CallAdapter::unobserveCall()
 
 namespace
 {
-/// The ids that can have changed in the leg's properties since they were last told; null when they all can.
-CC_Flags const* TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
+/// `changed`: the ids of which the leg tells; null when it is not telling.
+CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 {
-    return leg.mayChangeUntold() ? nullptr : changed;
+    return {leg.mayChangeUntold() ? nullptr : changed, leg.getNumberOfNotifications()};
 }
 } // namespace
 
@@ -148,10 +148,10 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
     }
     CC_PropertyContainer filtered(leg.getProperties());
     if (filters->applyFilters(filtered).isOk())
-        m_ownView.assign(filtered, nullptr);
+        m_ownView.assign(filtered, {});
 }
 
-/// `changed`: the ids of which the leg tells; null when the leg itself is another.
+/// `changed`: the ids of which the peer tells; null when the peer is another.
 void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 {
     if (CC_CallLeg const* const leg = m_peerCallLeg)
@@ -161,24 +161,25 @@ void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 void CC_CallAdapter::updateCall()
 {
     if (CC_Call const* const call = getCall())
-        updateView(m_callView, call->getProperties(), nullptr);
+        updateView(m_callView, call->getProperties(), {});
 }
 
 /// Brings a view up to date with its source and marks the ids that differ.
-void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_Flags const* changed)
+void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source,
+                                CC_PropertyView::Told const& told)
 {
     auto const onDifference = [this](unsigned int id) { mark(id); };
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
     {
-        view.follow(source, changed, onDifference);
+        view.follow(source, told, onDifference);
         return;
     }
     CC_PropertyContainer filtered(source);
     if (filtered.getNumberOfProperties() != source.getNumberOfProperties())
         return; // memory is out: better the view of before than one that calls what is there gone
     std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
-    view.follow(filtered, nullptr, onDifference);
+    view.follow(filtered, {}, onDifference);
 }
 
 void CC_CallAdapter::mark(unsigned int id)

@@ -19,13 +19,14 @@ namespace
 {
 unsigned int s_infoDepth = 0;
 
-void LOG_PROPERTY(String const& legName, CC_Property const& property)
+/// Whether somebody logs it.
+bool LOG_PROPERTY(String const& legName, CC_Property const& property)
 {
     // a quality record prints as many lines
     bool const isBulky = property.getId() == CC_PropertyId::QUALITY_OF_SERVICE;
     RTD::Monitor const* const monitor = CC_Monitor::FOR(isBulky ? RTD::LEVEL_BULK : RTD::LEVEL_CHANGE);
     if (monitor == nullptr)
-        return;
+        return false;
     try
     {
         String value;
@@ -41,6 +42,7 @@ void LOG_PROPERTY(String const& legName, CC_Property const& property)
     {
         // a log line is not worth a call
     }
+    return true;
 }
 
 /// Whether the property may become a leg's State: never IDLE again, and never another class.
@@ -117,13 +119,14 @@ XCode CC_CallLeg::setPropertyNoNotification(CC_Property const& property, bool& c
 XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
 {
     changed = false;
-    CC_Property const* const stored = m_properties.get(property.getId());
+    CC_Property* stored = m_properties.get(property.getId());
     if (stored != nullptr && stored->isEqual(property))
         return XCode::OK;
-    LOG_PROPERTY(m_name, property);
+    if (LOG_PROPERTY(m_name, property))
+        stored = m_properties.get(property.getId()); // a monitor is the host's code
     if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
         return XCode::REFUSED;
-    if (!m_properties.set(property).isOk())
+    if (!m_properties.replace(stored, property).isOk())
         return XCode::REFUSED;
     changed = true;
     return XCode::OK;
@@ -183,7 +186,7 @@ XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, boo
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
     Reference const self(*this);
-    NestingGuard const notification(m_notifications);
+    ++m_numberOfNotifications;
     m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
                                &CC_CallLegObserver::onCallLegPropertyChanged);
 }

@@ -63,10 +63,12 @@ public:
         m_mayChangeUntold = true;
         return m_properties;
     }
-    /// Whether the properties may differ from what was told of them: somebody has had them to write, has stored one
-    /// without notification, or changes them inside another notification, which some have yet to hear. Who keeps a copy
-    /// of them need otherwise look only at what an event names.
-    bool mayChangeUntold() const { return m_mayChangeUntold || m_notifications > 1; }
+    /// Whether the properties may differ from what was told of them: somebody has had them to write, or has stored one
+    /// without notification. Otherwise who keeps a copy of them and has heard every notification need look only at what
+    /// an event names.
+    bool mayChangeUntold() const { return m_mayChangeUntold; }
+    /// How often changed properties were told so far, the notification under way included.
+    unsigned int getNumberOfNotifications() const { return m_numberOfNotifications; }
 
     /// Stores the property unless it equals the stored one, and tells nobody; `changed` says whether it was stored.
     /// OK; REFUSED for a State that is IDLE or of another class (a leg never goes back to IDLE), or when memory is out.
@@ -120,6 +122,6 @@ private:
     bool m_isMissedByCall = false;         // our call is not among our observers: memory was out
     bool m_isEnding = false;               // in the destructor: goes into no call any more
     bool m_mayChangeUntold = false;        // for good
-    unsigned int m_notifications = 0;      // of changed properties, under way inside each other
+    unsigned int m_numberOfNotifications = 0;
     unsigned long long m_lastWalk = 0;     // the last of a call's walks over its legs that handled this one
 };

@@ -82,18 +82,22 @@ TEST_F(CC_CallLegTest, APropertyStoredWithoutNotificationIsAnUntoldChange)
     EXPECT_TRUE(leg.mayChangeUntold());
 }
 
-TEST_F(CC_CallLegTest, AChangeInsideANotificationIsUntoldToThoseWhoStillWait)
+TEST_F(CC_CallLegTest, NotificationsOfChangesAreNumbered)
 {
     CC_CallLeg& leg = newObservedLeg();
-    std::vector<bool> seen;
+    std::vector<unsigned int> seen;
     m_observer.m_onChanged = [&](CC_EvCallLegPropertyChanged const&)
     {
-        seen.push_back(leg.mayChangeUntold());
+        seen.push_back(leg.getNumberOfNotifications());
         std::ignore = leg.setProperty(NAME("Anna")); // told once: it then is equal
     };
+    EXPECT_EQ(leg.getNumberOfNotifications(), 0u);
     EXPECT_EQ(leg.setProperty(NETWORK("isdn")), XCode::OK);
-    EXPECT_EQ(seen, (std::vector<bool>{false, true}));
-    EXPECT_FALSE(leg.mayChangeUntold());
+    EXPECT_EQ(seen, (std::vector<unsigned int>{1, 2}));
+    EXPECT_EQ(leg.setProperty(NETWORK("isdn")), XCode::OK);
+    EXPECT_EQ(leg.getNumberOfNotifications(), 2u) << "nothing changed";
+    EXPECT_EQ(leg.setProperties(CC_PropertyContainer::EMPTY()), XCode::OK);
+    EXPECT_EQ(leg.getNumberOfNotifications(), 3u) << "told of none";
 }
 
 TEST_F(CC_CallLegTest, IsCountedWhileItLives)

@@ -64,8 +64,12 @@ XCode CC_Flags::set(unsigned int bit, bool value)
 XCode CC_Flags::insert(unsigned int index, Entry entry)
 {
     if (m_count == m_capacity)
-        if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: a set holds only a few words
+    {
+        if (m_capacity < INLINE)
+            ++m_capacity;
+        else if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: there are only a few words
             return enlarged;
+    }
     std::copy_backward(m_entries + index, m_entries + m_count, m_entries + m_count + 1);
     m_entries[index] = entry;
     ++m_count;
@@ -102,17 +106,15 @@ XCode CC_Flags::enlarge(unsigned int newCapacity)
 {
     if (newCapacity < m_count)
         return XCode::REFUSED;
-    if (newCapacity <= INLINE && m_entries == m_inline)
-    {
-        m_capacity = newCapacity;
-        return XCode::OK;
-    }
     Entry* const entries = newCapacity <= INLINE ? m_inline : new (std::nothrow) Entry[newCapacity]();
     if (entries == nullptr)
         return XCode::NO_ELEMENT;
-    std::copy_n(m_entries, m_count, entries);
-    release();
-    m_entries = entries;
+    if (entries != m_entries)
+    {
+        std::copy_n(m_entries, m_count, entries);
+        release();
+        m_entries = entries;
+    }
     m_capacity = newCapacity;
     return XCode::OK;
 }

@@ -85,5 +85,5 @@ private:
     unsigned int m_capacity = 0;
     unsigned int m_count = 0;
     Entry m_inline[INLINE] = {};
-    Entry* m_entries = m_inline;
+    Entry* m_entries = m_inline; // elsewhere if the capacity is more
 };

@@ -7,6 +7,7 @@
 unsigned int CC_Property::s_numberOfInstances = 0;
 unsigned int CC_Property::s_typeId = CC_Property::NO_TYPE_ID;
 unsigned int CC_Property::s_numberOfFailedAssignments = 0;
+unsigned int CC_Property::s_numberOfWholeAssignments = 0;
 unsigned int CC_Property::s_nextFreeTypeId = 0;
 
 namespace

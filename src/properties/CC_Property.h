@@ -83,6 +83,9 @@ public:
     /// How many times `assign` lacked memory. It has no result of its own, so a caller that must know compares the
     /// number before and after.
     static unsigned int NUMBER_OF_FAILED_ASSIGNMENTS() { return s_numberOfFailedAssignments; }
+    /// How many times `assign` left an object that is what a copy of the other would be: both of the very class that
+    /// wrote the `assign`. Of a class that inherits one, or writes its own, nobody knows.
+    static unsigned int NUMBER_OF_WHOLE_ASSIGNMENTS() { return s_numberOfWholeAssignments; }
 
     static unsigned int s_numberOfInstances; ///< live properties of all classes
     static unsigned int s_typeId;
@@ -92,6 +95,7 @@ protected:
     static XCode REFUSE(String& error, char const* message);
 
     static unsigned int s_numberOfFailedAssignments;
+    static unsigned int s_numberOfWholeAssignments;
 
 private:
     static unsigned int s_nextFreeTypeId;

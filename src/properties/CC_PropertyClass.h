@@ -55,7 +55,9 @@ public:
     ///         display(number->getValue());
     static Derived const* FROM(CC_Property const* property)
     {
-        return property != nullptr ? SAME_CLASS(*property) : nullptr;
+        if (property != nullptr && typeid(*property) == typeid(Derived)) // nearly always, and cheaper than the cast
+            return static_cast<Derived const*>(property);
+        return dynamic_cast<Derived const*>(property);
     }
     static Derived* FROM(CC_Property* property)
     {
@@ -96,7 +98,7 @@ private:
     /// `other` if it is of this class or derives from it, otherwise null.
     static Derived const* SAME_CLASS(CC_Property const& other)
     {
-        if (typeid(other) == typeid(Derived)) // nearly always, and much cheaper than the cast
+        if (typeid(other) == typeid(Derived)) // as above
             return static_cast<Derived const*>(&other);
         return other.isOfType(TYPE_ID()) ? dynamic_cast<Derived const*>(&other) : nullptr;
     }
@@ -114,8 +116,11 @@ private:
             catch (std::bad_alloc const&)
             {
                 ++CC_Property::s_numberOfFailedAssignments;
+                return;
             }
         }
+        if (typeid(*this) == typeid(Derived) && typeid(other) == typeid(Derived))
+            ++CC_Property::s_numberOfWholeAssignments;
     }
 
 protected:

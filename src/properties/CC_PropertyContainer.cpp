@@ -2,7 +2,6 @@
 
 #include "platform/base/NestingGuard.h"
 
-#include <typeinfo>
 
 namespace
 {
@@ -16,26 +15,26 @@ bool ASSIGN(CC_Property& stored, CC_Property const& property)
     return CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() == failedBefore;
 }
 
-bool IS_OF_SAME_KIND(CC_Property const& left, CC_Property const& right)
-{
-    return left.getId() == right.getId() && typeid(left) == typeid(right);
-}
 } // namespace
+
+bool CC_PropertyContainer::IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
+{
+    unsigned int const wholeBefore = CC_Property::NUMBER_OF_WHOLE_ASSIGNMENTS();
+    stored.assign(property);
+    return CC_Property::NUMBER_OF_WHOLE_ASSIGNMENTS() != wholeBefore;
+}
 
 CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const& other)
 {
     if (this == &other)
         return *this;
-    unsigned int const failedBefore = CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS();
     Iterator stored = m_properties.begin();
     ConstIterator source = other.begin();
-    for (; stored != m_properties.end() && source != other.end() && IS_OF_SAME_KIND(*stored, *source);
-         ++stored, ++source)
-        stored->assign(*source);
-    if (CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() != failedBefore)
+    while (stored != m_properties.end() && source != other.end() && stored->getId() == source->getId() &&
+           IS_MADE_A_COPY(*stored, *source))
     {
-        stored = m_properties.begin(); // memory is short: begin again, with as many copies as it allows
-        source = other.begin();
+        ++stored;
+        ++source;
     }
     removeFrom(stored);
     for (; source != other.end(); ++source)
@@ -76,6 +75,17 @@ XCode CC_PropertyContainer::set(CC_PropertyContainer const& other, unsigned int 
         if ((property.getId() & mask) != 0 && !set(property).isOk())
             return XCode::FAILURE;
     return XCode::OK;
+}
+
+void CC_PropertyContainer::take(CC_PropertyContainer& other)
+{
+    for (Iterator position = other.m_properties.begin(); position != other.m_properties.end();)
+    {
+        CC_Property& property = *position;
+        ++position;
+        if ((property.getId() & ALL_GROUPS) != 0)
+            other.m_properties.moveTo(m_properties, property);
+    }
 }
 
 bool CC_PropertyContainer::remove(unsigned int id)

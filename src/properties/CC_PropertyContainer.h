@@ -105,6 +105,9 @@ public:
     /// The same for all groups. A property whose id belongs to no group (bits 8 to 15 clear) is left out.
     XCode set(CC_PropertyContainer const& other) { return set(other, ALL_GROUPS); }
 
+    /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.
+    void take(CC_PropertyContainer& other);
+
     /// Deletes the property of that id; whether there was one.
     bool remove(unsigned int id);
     /// Deletes the property at that position; whether there was one.
@@ -118,6 +121,9 @@ public:
 
     /// A shared container without properties, for parameters that are not used.
     static CC_PropertyContainer const& EMPTY();
+
+    /// Assigns the property; whether `stored` is now what a copy of it would be.
+    static bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property);
 
 private:
     using Iterator = LinkedListManager<CC_Property>::Iterator;

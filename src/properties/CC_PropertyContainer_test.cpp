@@ -316,3 +316,34 @@ TEST(CC_PropertyContainer, TheSharedEmptyOneIsAlwaysTheSame)
     EXPECT_TRUE(CC_PropertyContainer::EMPTY().isEmpty());
     EXPECT_TRUE(CC_PropertyContainer::EMPTY().begin() == CC_PropertyContainer::EMPTY().end());
 }
+
+TEST(CC_PropertyContainer, AssigningCopiesAlsoWhatAClassAddsToTheOneThatItsAssignBelongsTo)
+{
+    struct Stamped : CC_PropertyString
+    {
+        Stamped(unsigned int id, String const& text, int newStamp) : CC_PropertyString(id, text), stamp(newStamp) {}
+        CC_Property* clone() const override { return new Stamped(*this); }
+        int stamp;
+    };
+    CC_PropertyContainer from;
+    CC_PropertyContainer to;
+    ASSERT_TRUE(to.set(Stamped(CC_PropertyId::NAME, "Anna", 1)).isOk());
+    ASSERT_TRUE(from.set(Stamped(CC_PropertyId::NAME, "Anna", 2)).isOk());
+    to = from;
+    auto const* const copy = dynamic_cast<Stamped const*>(to.get(CC_PropertyId::NAME));
+    ASSERT_NE(copy, nullptr);
+    EXPECT_EQ(copy->stamp, 2);
+}
+
+TEST(CC_PropertyContainer, AssigningTakesEqualKindsOverWhereTheyStand)
+{
+    CC_PropertyContainer from;
+    FILL(from);
+    CC_PropertyContainer to(from);
+    CC_Property const* const first = to.getByIndex(0);
+    ASSERT_TRUE(from.set(CC_PropertyUnsigned(CC_PropertyId::NAME, 7)).isOk());
+    to = from;
+    EXPECT_EQ(to.getByIndex(0), first);
+    EXPECT_TRUE(to.get(CC_PropertyId::NAME)->isEqual(CC_PropertyUnsigned(0, 7)));
+    EXPECT_EQ(IDS_OF(to), IDS_OF(from));
+}

@@ -1,7 +1,5 @@
 #include "properties/CC_PropertyView.h"
 
-#include <typeinfo>
-
 void CC_PropertyView::clear()
 {
     m_properties.clear();
@@ -22,19 +20,12 @@ XCode CC_PropertyView::write(CC_PropertyContainer const& properties)
     return m_properties.set(properties);
 }
 
-void CC_PropertyView::assign(CC_PropertyContainer const& source, CC_Flags const* changed)
+void CC_PropertyView::assign(CC_PropertyContainer const& source, Told const& told)
 {
-    auto const take = [](CC_Property& former, CC_Property const& current)
-    {
-        unsigned int const failedBefore = CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS();
-        if (typeid(former) != typeid(current))
-            return false;
-        former.assign(current);
-        return CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() == failedBefore;
-    };
-    if (takeChanged(source, changed, take))
+    if (takeChanged(source, told, CC_PropertyContainer::IS_MADE_A_COPY))
         return;
     m_properties = source;
+    m_lastHeard = told.number;
     m_written = NONE;
     m_inStepWith = m_properties.getNumberOfProperties() == source.getNumberOfProperties() ? &source : nullptr;
 }

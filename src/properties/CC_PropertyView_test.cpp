@@ -51,20 +51,23 @@ struct CC_PropertyView_Test : testing::Test
     void say(unsigned int id, String const& text) { EXPECT_TRUE(source.set(CC_PropertyString(id, text)).isOk()); }
     void follow(CC_Flags const* changed)
     {
-        view.follow(source, changed, [this](unsigned int id) { differences.push_back(id); });
+        view.follow(source, TELL(changed), [this](unsigned int id) { differences.push_back(id); });
     }
+    /// One notification after the other.
+    CC_PropertyView::Told TELL(CC_Flags const* changed) { return {changed, ++number}; }
     std::string seen() const { return TEXT_OF(view.getProperties()); }
 
     CC_PropertyContainer source;
     CC_PropertyView view;
     Ids differences;
+    unsigned int number = 0;
 };
 } // namespace
 
 TEST_F(CC_PropertyView_Test, ItBeginsWithAllOfItsSourceInItsOrder)
 {
     CC_PropertyView fresh;
-    fresh.follow(source, nullptr, [this](unsigned int id) { differences.push_back(id); });
+    fresh.follow(source, {}, [this](unsigned int id) { differences.push_back(id); });
     EXPECT_EQ(TEXT_OF(fresh.getProperties()), "Network=isdn Name=Anna Display=A");
     EXPECT_EQ(differences, (Ids{NETWORK, NAME, DISPLAY}));
 }
@@ -87,6 +90,16 @@ TEST_F(CC_PropertyView_Test, OnceInStepItLooksAtNothingElse)
     EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=A");
     follow(nullptr);
     EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=B") << "unless anything may differ";
+}
+
+TEST_F(CC_PropertyView_Test, ANotificationThatItMissedMakesItLookAtEverything)
+{
+    say(DISPLAY, "B");
+    ++number;
+    say(NAME, "Bert");
+    CC_Flags const told = FLAGS_OF({NAME});
+    follow(&told);
+    EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=B");
 }
 
 TEST_F(CC_PropertyView_Test, WhatIsNewOrGoneMakesItLookAtEverything)
@@ -132,7 +145,7 @@ TEST_F(CC_PropertyView_Test, AnotherSourceIsLookedAtWhole)
     CC_PropertyContainer other(source);
     EXPECT_TRUE(other.set(CC_PropertyString(DISPLAY, "B")).isOk());
     CC_Flags const told;
-    view.follow(other, &told, [this](unsigned int id) { differences.push_back(id); });
+    view.follow(other, TELL(&told), [this](unsigned int id) { differences.push_back(id); });
     EXPECT_EQ(differences, Ids{DISPLAY});
 }
 
@@ -161,9 +174,9 @@ TEST_F(CC_PropertyView_Test, WhatMemoryRefusesComesWithTheNextChange)
     say(NAME, LONG_TEXT);
     CC_Flags const told = FLAGS_OF({NAME});
     FailingAllocator::failNth(1);
-    view.follow(source, &told, [](unsigned int) {});
+    view.follow(source, TELL(&told), [](unsigned int) {});
     FailingAllocator::failNth(1);
-    view.follow(source, &told, [](unsigned int) {});
+    view.follow(source, TELL(&told), [](unsigned int) {});
     FailingAllocator::stop();
     EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=A");
     CC_Flags const nothing;
@@ -180,22 +193,22 @@ TEST_F(CC_PropertyView_Test, AssignedItIsACopyWhateverWasThere)
     say(ALERT_INFO, "ring");
     say(NETWORK, "sip");
     CC_Flags const told;
-    view.assign(source, &told);
+    view.assign(source, TELL(&told));
     EXPECT_EQ(seen(), "Name=Anna Display=A Alert-Info=ring Network=sip");
 }
 
 TEST_F(CC_PropertyView_Test, AssignedAgainItTakesWhatIsTold)
 {
-    view.assign(source, nullptr);
+    view.assign(source, TELL(nullptr));
     say(NAME, "Bert");
     EXPECT_TRUE(view.write(CC_PropertyString(NAME, "Bert")).isOk());
     CC_Flags const told = FLAGS_OF({NAME});
-    view.assign(source, &told);
+    view.assign(source, TELL(&told));
     EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=A");
     say(DISPLAY, "B");
-    view.assign(source, &told);
+    view.assign(source, TELL(&told));
     EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=A");
-    view.assign(source, nullptr);
+    view.assign(source, TELL(nullptr));
     EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=B");
 }
 
@@ -203,10 +216,10 @@ TEST_F(CC_PropertyView_Test, AssignedWithoutMemoryItLacksWhatWasRefusedUntilTheN
 {
     say(NAME, LONG_TEXT);
     FailingAllocator::failNth(1);
-    view.assign(source, nullptr);
+    view.assign(source, TELL(nullptr));
     FailingAllocator::stop();
     EXPECT_NE(seen().find("Network=isdn"), std::string::npos);
     CC_Flags const told;
-    view.assign(source, &told);
+    view.assign(source, TELL(&told));
     EXPECT_EQ(seen(), "Network=isdn Name=" + std::string(LONG_TEXT.c_str()) + " Display=A");
 }

@@ -2,6 +2,8 @@
 
 #include "platform/base/XCode.h"
 
+#include <tuple>
+
 /// The two links by which an object sits in an intrusive list; null while it is in none. Copying an object copies
 /// neither link.
 class LinkedListElement_Untyped
@@ -134,6 +136,12 @@ public:
 
     /// Takes the object over: OK, or REFUSED when it sits in a list already (it then stays the caller's).
     XCode append(T* object) { return m_list.append(UNTYPED(*object)); }
+    /// Takes the object, which is in this list, over to the end of `other`.
+    void moveTo(LinkedListManager& other, T& object)
+    {
+        m_list.unlink(UNTYPED(object));
+        std::ignore = other.append(&object); // it is in no list
+    }
     /// REQUIRES: the object is in this list. It is deleted.
     void remove(T& object)
     {

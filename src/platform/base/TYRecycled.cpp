@@ -25,7 +25,15 @@ struct Cache
     List lists[MAX_SIZE / UNIT];
 };
 
-#ifdef NDEBUG
+#if defined(__SANITIZE_ADDRESS__)
+#define CC_SEEKS_FAULTS 1
+#elif defined(__has_feature)
+#define CC_SEEKS_FAULTS __has_feature(address_sanitizer)
+#else
+#define CC_SEEKS_FAULTS 0
+#endif
+
+#if defined(NDEBUG) && !CC_SEEKS_FAULTS
 constexpr unsigned int BLOCKS_AT_FIRST = TYRecycled::DEFAULT_BLOCKS;
 #else
 constexpr unsigned int BLOCKS_AT_FIRST = 0;
@@ -37,7 +45,9 @@ std::atomic<unsigned int> s_limit{BLOCKS_AT_FIRST};
 thread_local Cache* t_cache __attribute__((tls_model("initial-exec"))) = nullptr;
 thread_local bool t_isEnded __attribute__((tls_model("initial-exec"))) = false;
 
+// All blocks of a list are of the same size, whatever the sizes of the objects.
 std::size_t INDEX_OF(std::size_t size) { return (size + UNIT - 1) / UNIT - 1; }
+std::size_t BLOCK_SIZE_OF(std::size_t size) { return (INDEX_OF(size) + 1) * UNIT; }
 
 void TRIM(Cache& cache, unsigned int limit)
 {
@@ -107,13 +117,13 @@ bool KEEP(void* memory, std::size_t size)
 void* TYRecycled::operator new(std::size_t size)
 {
     void* const block = TAKE(size);
-    return block != nullptr ? block : ::operator new(size);
+    return block != nullptr ? block : ::operator new(BLOCK_SIZE_OF(size));
 }
 
 void* TYRecycled::operator new(std::size_t size, std::nothrow_t const&) noexcept
 {
     void* const block = TAKE(size);
-    return block != nullptr ? block : ::operator new(size, std::nothrow);
+    return block != nullptr ? block : ::operator new(BLOCK_SIZE_OF(size), std::nothrow);
 }
 
 void TYRecycled::operator delete(void* block, std::size_t size) noexcept

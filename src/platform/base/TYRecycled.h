@@ -14,8 +14,8 @@
 ///
 ///     class CC_CallLeg : public TYRecycled { ... };
 ///
-/// For programs that look for faults of memory, every block may come and go by itself, which is also how a debug build
-/// begins:
+/// For programs that look for faults of memory, every block may come and go by itself, which is also how debug builds
+/// and those under the address sanitizer begin:
 ///
 ///     TYRecycled::KEEP_BLOCKS(0);
 class CC_EXPORT TYRecycled
@@ -29,8 +29,23 @@ public:
     static void operator delete(void* block, std::size_t size) noexcept;
     static void operator delete(void* block, std::nothrow_t const&) noexcept;
     static void operator delete(void*, void*) noexcept {}
+    // Objects of an alignment beyond the ordinary come and go by themselves.
+    static void* operator new(std::size_t size, std::align_val_t alignment) { return ::operator new(size, alignment); }
+    static void* operator new(std::size_t size, std::align_val_t alignment, std::nothrow_t const&) noexcept
+    {
+        return ::operator new(size, alignment, std::nothrow);
+    }
+    static void operator delete(void* block, std::align_val_t alignment) noexcept
+    {
+        ::operator delete(block, alignment);
+    }
+    static void operator delete(void* block, std::align_val_t alignment, std::nothrow_t const&) noexcept
+    {
+        ::operator delete(block, alignment);
+    }
 
-    /// How many blocks of each size a thread keeps, for all threads. What this thread has beyond it is given back now.
+    /// How many blocks of each size a thread keeps, for all threads. What this thread has beyond it is given back now;
+    /// other threads take what they have before they ask for more.
     static void KEEP_BLOCKS(unsigned int ofEachSize);
 
 protected:

@@ -2,6 +2,7 @@
 
 #include "testing/FailingAllocator.h"
 
+#include <cstdint>
 #include <cstring>
 #include <gtest/gtest.h>
 #include <memory>
@@ -19,6 +20,21 @@ struct Small : TYRecycled
 struct Larger : Small
 {
     char more[100] = {};
+};
+
+struct Odd : TYRecycled
+{
+    char octets[13];
+};
+
+struct Even : TYRecycled
+{
+    char octets[16];
+};
+
+struct alignas(64) Aligned : TYRecycled
+{
+    char octets[64];
 };
 
 struct TooLarge : TYRecycled
@@ -80,6 +96,28 @@ TEST_F(TYRecycled_Test, AnObjectThatEndsThroughItsBaseGoesBackUnderItsOwnSize)
     std::unique_ptr<Small> object = std::make_unique<Larger>();
     object.reset();
     EXPECT_EQ(allocationsOf<Larger>(1), 0u);
+}
+
+TEST_F(TYRecycled_Test, AnObjectOfAnOddSizeLeavesABlockThatHoldsALargerOne)
+{
+    EXPECT_EQ(allocationsOf<Odd>(1), 1u);
+    FailingAllocator::failNth(0);
+    std::unique_ptr<Even> const even(new Even);
+    FailingAllocator::stop();
+    EXPECT_EQ(FailingAllocator::count(), 0u);
+    std::memset(even->octets, 1, sizeof even->octets); // the address sanitizer would see it
+}
+
+TEST_F(TYRecycled_Test, ObjectsOfALargeAlignmentHaveIt)
+{
+    for (int i = 0; i < 10; ++i)
+    {
+        std::unique_ptr<Aligned> const object(new (std::nothrow) Aligned);
+        std::unique_ptr<Small> const between(new Small);
+        std::unique_ptr<Aligned> const other(new Aligned);
+        EXPECT_EQ(reinterpret_cast<std::uintptr_t>(object.get()) % alignof(Aligned), 0u);
+        EXPECT_EQ(reinterpret_cast<std::uintptr_t>(other.get()) % alignof(Aligned), 0u);
+    }
 }
 
 TEST_F(TYRecycled_Test, LargeObjectsComeAndGoByThemselves)

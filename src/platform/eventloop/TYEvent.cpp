@@ -19,7 +19,12 @@ TYEvent::TYEvent(TYEventLoop& loop, EventPrio::Type priority, Callback callback,
 
 TYEvent::~TYEvent() { s_numberOfInstances.fetch_sub(1, std::memory_order_relaxed); }
 
-XCode TYEvent::setIfNotPending() { return m_isPending.exchange(true) ? XCode::OK : m_loop.post(*this); }
+XCode TYEvent::setIfNotPending()
+{
+    if (!m_isPending.exchange(true))
+        return m_loop.post(*this);
+    return m_isDestroyed.load() ? XCode::REFUSED : XCode::OK;
+}
 
 void TYEvent::destroy()
 {

@@ -72,5 +72,5 @@ private:
     // the same way.
     std::atomic<bool> m_isPending{false};
     bool m_isInTurn = false;    // taken into the running turn; the loop's thread
-    bool m_isDestroyed = false; // under the loop's lock
+    std::atomic<bool> m_isDestroyed{false};
 };

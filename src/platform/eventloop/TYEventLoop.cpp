@@ -93,6 +93,8 @@ void TYEventLoop::takeTurn()
     resetPollFd();
     for (LinkedListManager_Untyped& queue : m_pending)
     {
+        if (queue.isEmpty())
+            continue;
         for (LinkedListElement_Untyped* element = queue.getFirst(); element != queue.getEnd();
              element = queue.getNext(*element))
             static_cast<TYEvent&>(*element).m_isInTurn = true;
