@@ -1,25 +1,22 @@
-// What calls and their parts cost in time, on the machine that it runs on: callcontrol_bench [GOOGLE BENCHMARK'S
-// OPTIONS]
+// What calls and their parts cost in time, on the machine that it runs on:
+// callcontrol_bench [GOOGLE BENCHMARK'S OPTIONS]
 //
 // A baseline runs in the same process and does the same work on the same values, so that a ratio to it says something
 // where the figure alone does not. What is measured is checked to have happened; a step that fails ends the program.
 //
 //   WholeCall/plain             dial, offer, accept, alert, connect, ten changes each way, drop, deferred clean-up;
-//   E.164
-//                               adapters on both sides, the loop run after every step
+//                               E.164 adapters on both sides, the loop run after every step
 //   WholeCall/filters           the same with two input and two output filters at each end
 //   WholeCall/transfer          two such calls, connected with each other before they are dropped
 //   WholeCall/conference        two such calls made one of three legs before they are dropped
 //   WholeCall/floor/1, /2       baseline: the memory work that one call and two calls cannot avoid (FloorCall)
 //
-//   Delivery/...                one event to 1, 4 and 16 observers. CC_ObserverContainer; baselines: vector (of
-//   pointers,
-//                               a virtual call each), signals2 (Boost, unlocked), sigc (libsigc++). Time is per event
+//   Delivery/...                one event to 1, 4 and 16 observers; time is per event. CC_ObserverContainer; baselines:
+//                               vector (of pointers, a virtual call each), signals2 (Boost, unlocked), sigc (libsigc++)
 //
 //   Event/PostAndRun/...        a thread-safe post and the turn that runs it. TYEvent; TYEventPollFd (a loop inside
-//   another
-//                               one, which it wakes through a descriptor); baselines: libuv (which always does), asio
-//                               (Boost, with a flag against posting twice)
+//                               another one, which it wakes through a descriptor); baselines: libuv (which always
+//                               does), asio (Boost, with a flag against posting twice)
 //   Event/PostPending/...       a post of what is pending already
 //   Event/EightPostsOneRun/...  eight posts and the turn that runs them as one
 //
@@ -30,23 +27,20 @@
 //   Container/Copy/...          all copied, and the copy freed
 //
 //   Log/...                     a log line whose level is off. Monitor; baselines: nothing (an empty turn of the
-//   measuring
-//                               loop), spdlog
+//                               measuring loop), spdlog
 //
 //   Scale/FurtherCall/N/C       a further call with N calls up, spread over C contexts; set-up, property change and
 //                               teardown are in the counters
 //   Scale/RandomCall/N/C        the same of calls picked from those N at random, which no cache holds when N is large;
-//   time
-//                               is per round of a tenth of them
+//                               time is per round of a tenth of them
 //   Scale/RandomFloor/N/1       baseline: the same with FloorCalls
 //   Scale/Join...               joining and leaving one conference. In the counters what a join costs in the first and
-//   in the
-//                               last tenth of them, and the bytes that all have left on the heap. JoinSettled: the same
-//                               three adapters in turn, the loop run after every step; JoinBatched: the loop run after
-//                               every hundredth; JoinNew: an adapter made for each join and deleted after it; JoinKept:
-//                               each time another adapter, all of which live on
+//                               in the last tenth of them, and the bytes that all have left on the heap. JoinSettled:
+//                               the same three adapters in turn, the loop run after every step; JoinBatched: the loop
+//                               run after every hundredth; JoinNew: an adapter made for each join and deleted after it;
+//                               JoinKept: each time another adapter, all of which live on
 //
-//   Records/Encode/..., Decode  one realistic Charge, Tariff and QoS record to DER and back
+//   Records/Encode, Decode      one realistic Charge, Tariff and QoS record to DER and back
 //
 // Of the repetitions the console shows the fastest, since whatever else the machine does only adds; a file written with
 // --benchmark_out has them all. On a busy machine --benchmark_enable_random_interleaving=true keeps a burst of other

@@ -123,5 +123,5 @@ private:
     bool m_isEnding = false;               // in the destructor: goes into no call any more
     bool m_mayChangeUntold = false;        // for good
     unsigned int m_numberOfNotifications = 0;
-    unsigned long long m_lastWalk = 0;     // the last of a call's walks over its legs that handled this one
+    unsigned long long m_lastWalk = 0; // the last of a call's walks over its legs that handled this one
 };

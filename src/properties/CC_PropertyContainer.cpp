@@ -2,7 +2,6 @@
 
 #include "platform/base/NestingGuard.h"
 
-
 namespace
 {
 unsigned int s_infoDepth = 0; // of all containers' dumps

@@ -71,6 +71,6 @@ private:
     // pending event costs (a fifth of the lock). What a poster wrote before it the handler sees, for the loop clears it
     // the same way.
     std::atomic<bool> m_isPending{false};
-    bool m_isInTurn = false;    // taken into the running turn; the loop's thread
+    bool m_isInTurn = false; // taken into the running turn; the loop's thread
     std::atomic<bool> m_isDestroyed{false};
 };
