@@ -75,7 +75,7 @@ bool TYEventLoop::runTurn()
         TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
         m_turn.unlink(event);
         event.m_isInTurn = false;
-        event.m_isPending.exchange(false);
+        event.m_isPending.exchange(false); // no plain store: it pairs with the exchange of whoever posts
         event.addReference();
         event.handle();
         event.removeReference();
