@@ -12,8 +12,8 @@
 /// neither gains nor loses a property; otherwise at everything. Of a property change between two legs of twelve
 /// properties this saves a third of the instructions, and most of the memory that is touched when many calls are up.
 ///
-///     m_peer.follow(leg.getProperties(), {&flags, leg.getNumberOfNotifications()}, [&](unsigned int id) { mark(id);
-///     });
+///     CC_PropertyView::Told const told{&event.getFlags(), leg.getNumberOfNotifications()};
+///     m_peerView.follow(leg.getProperties(), told, [this](unsigned int id) { mark(id); });
 class CC_EXPORT CC_PropertyView
 {
 public:
@@ -116,7 +116,7 @@ private:
     }
 
     CC_PropertyContainer m_properties;
-    CC_PropertyContainer const* m_inStepWith = nullptr; // null or gone: everything may differ
-    unsigned int m_lastHeard = 0;                       // the notification that was
-    unsigned int m_written = NONE;                      // what differs besides what the next one tells
+    CC_PropertyContainer const* m_inStepWith = nullptr; // null, or not the source: everything may differ
+    unsigned int m_lastHeard = 0;                       // the number of the notification heard last
+    unsigned int m_written = NONE;                      // what was written here since
 };
