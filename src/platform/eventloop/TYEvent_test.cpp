@@ -2,8 +2,10 @@
 
 #include "platform/eventloop/TYEventLoop.h"
 
+#include <atomic>
 #include <functional>
 #include <gtest/gtest.h>
+#include <thread>
 #include <tuple>
 #include <utility>
 
@@ -211,6 +213,26 @@ TEST_F(TYEventTest, APostAfterDestroyIsRefused)
     EXPECT_FALSE(m_loop.runTurn());
     EXPECT_EQ(0U, m_runs);
     EXPECT_EQ(m_alive + 1, TYEvent::s_numberOfInstances);
+    event->removeReference();
+}
+
+TEST_F(TYEventTest, ADestroyedEventIsRefusedToTwoThreadsThatMeetInPostingIt)
+{
+    TYEvent* const event = new TYEvent(
+        m_loop, EventPrio::HIGH, [](void*) {}, nullptr);
+    event->addReference();
+    event->destroy();
+    std::atomic<unsigned int> accepted{0};
+    auto const post = [&]
+    {
+        for (int i = 0; i < 20000; ++i)
+            accepted += event->setIfNotPending().isOk() ? 1 : 0;
+    };
+    std::thread other(post);
+    post();
+    other.join();
+    EXPECT_EQ(0U, accepted.load());
+    EXPECT_FALSE(m_loop.runTurn());
     event->removeReference();
 }
 
