@@ -1,8 +1,8 @@
 // Transfer and conference among three and four adapters, and the choice of the peer.
-#include "Party.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "services/CC_ServiceUserInput.h"
 #include "testing/CallControlFixture.h"
+#include "tests/support/Party.h"
 
 #include <gtest/gtest.h>
 

@@ -1,10 +1,10 @@
 // Inside each notification that exists, an observer does something drastic, once. The sanitizers watch; afterwards
 // every counter is back.
-#include "Party.h"
 #include "callcontrol/CC_Context.h"
 #include "services/CC_ServiceUserInput.h"
 #include "testing/CallControlFixture.h"
 #include "testing/LeakCheck.h"
+#include "tests/support/Party.h"
 
 #include <algorithm>
 #include <cctype>

@@ -1,8 +1,8 @@
 // A module in its own shared object, built with hidden symbols: type numbers, casts and observers agree with ours.
 #include "HiddenModule.h"
-#include "Party.h"
 #include "services/CC_ServiceUserInput.h"
 #include "testing/CallControlFixture.h"
+#include "tests/support/Party.h"
 
 #include <dlfcn.h>
 #include <gtest/gtest.h>

@@ -1,6 +1,5 @@
 // A whole call with the n-th allocation failing, for every n: an error comes back or the call completes, nothing leaks,
 // and the same adapters hold the next call.
-#include "Party.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "services/CC_ServiceUserInput.h"
 #include "testing/CallControlFixture.h"
@@ -8,6 +7,7 @@
 #include "testing/FakeRebootMgmt.h"
 #include "testing/LeakCheck.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/Party.h"
 
 #include <gtest/gtest.h>
 

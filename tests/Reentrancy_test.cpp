@@ -1,5 +1,4 @@
 // Sequences that a second reader of the code made up, each of which once left something dangling, stranded or looping.
-#include "Party.h"
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
 #include "properties/CC_Factory.h"
@@ -10,6 +9,7 @@
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingCallObserver.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/Party.h"
 
 #include <gtest/gtest.h>
 #include <new>

@@ -1,7 +1,7 @@
 // Many calls at once: what one costs does not depend on how many are up.
-#include "Party.h"
 #include "platform/base/TYRecycled.h"
 #include "testing/CallControlFixture.h"
+#include "tests/support/Party.h"
 
 #include <algorithm>
 #include <ctime>

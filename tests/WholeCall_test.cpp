@@ -1,5 +1,4 @@
 // Calls between two modules, from dial to the clean-up.
-#include "Party.h"
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
 #include "properties/CC_PropertyFilterContainer.h"
@@ -7,6 +6,7 @@
 #include "testing/CallControlFixture.h"
 #include "testing/FakeRebootMgmt.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/Party.h"
 
 #include <gtest/gtest.h>
 

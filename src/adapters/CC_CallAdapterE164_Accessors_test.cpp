@@ -1,11 +1,11 @@
 // Every typed accessor of the E.164 adapter, by tables.
-#include "adapters/TestAccessorE164.h"
 #include "properties/CC_PropertyInformationTransferCapability.h"
 #include "properties/CC_PropertyNumberingPlan.h"
 #include "properties/CC_PropertyPresentationIndicator.h"
 #include "properties/CC_PropertyRedirectingReason.h"
 #include "properties/CC_PropertyScreeningIndicator.h"
 #include "properties/CC_PropertyTypeOfNumber.h"
+#include "tests/support/TestAccessorE164.h"
 
 #include <cctype>
 #include <ostream>

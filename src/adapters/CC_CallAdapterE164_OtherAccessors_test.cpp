@@ -1,6 +1,6 @@
 // The typed accessors that are not simply one value of one property.
-#include "adapters/TestAccessorE164.h"
 #include "properties/CC_PropertyInformationTransferCapability.h"
+#include "tests/support/TestAccessorE164.h"
 
 namespace
 {

@@ -1,7 +1,7 @@
 // The re-dial of collected digits while modules drop, dial and destroy meanwhile, and while memory runs out.
-#include "adapters/TestOverlapE164.h"
 #include "testing/FailingAllocator.h"
 #include "testing/LeakCheck.h"
+#include "tests/support/TestOverlapE164.h"
 
 namespace
 {

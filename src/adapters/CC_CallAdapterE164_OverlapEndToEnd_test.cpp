@@ -1,7 +1,7 @@
 // Overlap sending from end to end: a telephone keys digit by digit, the other module's network takes numbers en bloc.
-#include "adapters/TestLineE164.h"
 #include "services/CC_ServiceUserInputUpdate.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLineE164.h"
 
 #include <memory>
 #include <vector>

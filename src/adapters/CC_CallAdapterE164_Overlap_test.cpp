@@ -1,7 +1,7 @@
 // Digits that arrive after the call was offered: collected, passed on, or sent en bloc with a new dial.
-#include "adapters/TestOverlapE164.h"
 #include "services/CC_ServicePushBack.h"
 #include "testing/FakeMediaContext.h"
+#include "tests/support/TestOverlapE164.h"
 
 #include <vector>
 

@@ -1,10 +1,10 @@
 #include "adapters/CC_CallAdapterE164.h"
 
-#include "adapters/TestLineE164.h"
 #include "testing/FailingAllocator.h"
 #include "testing/FakeMediaContext.h"
 #include "testing/LeakCheck.h"
 #include "testing/PropertyNames.h"
+#include "tests/support/TestLineE164.h"
 
 #include <functional>
 #include <vector>

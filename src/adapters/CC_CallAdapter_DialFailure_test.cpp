@@ -1,7 +1,7 @@
-#include "adapters/TestLine.h"
 #include "testing/FailingAllocator.h"
 #include "testing/RecordingContextObserver.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLine.h"
 
 namespace
 {

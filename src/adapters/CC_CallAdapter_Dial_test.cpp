@@ -1,4 +1,3 @@
-#include "adapters/TestLine.h"
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "testing/FakeMediaContext.h"
@@ -6,6 +5,7 @@
 #include "testing/RecordingCallObserver.h"
 #include "testing/RecordingContextObserver.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLine.h"
 
 #include <cstdint>
 #include <memory>

@@ -1,7 +1,7 @@
-#include "adapters/TestLine.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLine.h"
 
 namespace
 {

@@ -1,6 +1,6 @@
-#include "adapters/TestLine.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/TestLine.h"
 
 namespace
 {

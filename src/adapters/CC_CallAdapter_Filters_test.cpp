@@ -1,5 +1,5 @@
-#include "adapters/TestLine.h"
 #include "testing/RecordingCallLegObserver.h"
+#include "tests/support/TestLine.h"
 
 #include <new>
 

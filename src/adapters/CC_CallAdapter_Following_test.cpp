@@ -1,7 +1,7 @@
 // The views look only at what they are told of, as long as that is enough: nobody may see a difference to views that
 // compare everything with every change.
-#include "adapters/TestLine.h"
 #include "properties/CC_PropertyBoolean.h"
+#include "tests/support/TestLine.h"
 
 #include <algorithm>
 #include <random>

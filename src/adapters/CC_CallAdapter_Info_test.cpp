@@ -1,4 +1,4 @@
-#include "adapters/TestLine.h"
+#include "tests/support/TestLine.h"
 
 #include <functional>
 

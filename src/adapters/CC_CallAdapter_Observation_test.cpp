@@ -1,5 +1,5 @@
-#include "adapters/TestLine.h"
 #include "services/CC_ServiceUserInput.h"
+#include "tests/support/TestLine.h"
 
 #include <memory>
 #include <typeinfo>

@@ -1,9 +1,9 @@
-#include "adapters/TestLine.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingCallObserver.h"
+#include "tests/support/TestLine.h"
 
 #include <vector>
 

@@ -1,6 +1,6 @@
-#include "adapters/TestLine.h"
 #include "testing/FailingAllocator.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLine.h"
 
 namespace
 {

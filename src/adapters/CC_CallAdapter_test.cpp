@@ -1,11 +1,11 @@
 #include "adapters/CC_CallAdapter.h"
 
-#include "adapters/TestLine.h"
 #include "platform/base/NameOf.h"
 #include "properties/CC_PropertyContextId.h"
 #include "services/CC_ServiceUserInput.h"
 #include "testing/FakeMediaContext.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/TestLine.h"
 
 namespace
 {

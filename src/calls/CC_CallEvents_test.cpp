@@ -1,8 +1,8 @@
 #include "calls/CC_CallEvents.h"
 
-#include "calls/CallsTest.h"
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
+#include "tests/support/CallsTest.h"
 
 #include <memory>
 #include <typeinfo>

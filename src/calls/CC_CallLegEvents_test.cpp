@@ -1,9 +1,9 @@
 #include "calls/CC_CallLegEvents.h"
 
-#include "calls/CallsTest.h"
 #include "services/CC_ServicePushBack.h"
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
+#include "tests/support/CallsTest.h"
 
 #include <memory>
 #include <typeinfo>

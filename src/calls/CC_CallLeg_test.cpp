@@ -1,6 +1,5 @@
 #include "calls/CC_CallLeg.h"
 
-#include "calls/CallsTest.h"
 #include "platform/base/InfoContainer.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCause.h"
@@ -8,6 +7,7 @@
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/CallsTest.h"
 
 #include <string>
 #include <thread>

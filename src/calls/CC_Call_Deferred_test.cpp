@@ -1,8 +1,8 @@
 // What a call decides from the event loop: its clean-up, its end, and the push-back of an internal loop.
 #include "callcontrol/CC_CallPool.h"
-#include "calls/CallsTest.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/CallsTest.h"
 
 #include <string>
 #include <tuple>

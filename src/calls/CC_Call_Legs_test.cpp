@@ -1,7 +1,7 @@
 // Legs that enter, leave and change calls, and what observers may do meanwhile.
 #include "callcontrol/CC_CallPool.h"
-#include "calls/CallsTest.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/CallsTest.h"
 
 namespace
 {

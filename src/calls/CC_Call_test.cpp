@@ -1,12 +1,12 @@
 #include "calls/CC_Call.h"
 
 #include "callcontrol/CC_CallPool.h"
-#include "calls/CallsTest.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/NameOf.h"
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
 #include "testing/RecordingMonitor.h"
+#include "tests/support/CallsTest.h"
 
 #include <string>
 #include <typeinfo>

@@ -1,7 +1,7 @@
 #include "calls/CC_ObserverContainer.h"
 
-#include "calls/CallsTest.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/CallsTest.h"
 
 namespace
 {

@@ -4,7 +4,7 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyTable.h"
 #include "properties/CC_PropertyUnsigned.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <algorithm>
 #include <gtest/gtest.h>

@@ -1,7 +1,7 @@
 #include "properties/CC_PropertyCause.h"
 
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <string>

@@ -1,9 +1,9 @@
 #include "properties/CC_PropertyCharge.h"
 
-#include "platform/asn1/AsnTesting.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/AsnTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 

@@ -1,9 +1,9 @@
 #include "properties/CC_PropertyContextId.h"
 
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
 #include "testing/FakeMediaContext.h"
 #include "testing/FakeMediaContextRepository.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <memory>

@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 

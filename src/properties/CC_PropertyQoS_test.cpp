@@ -2,7 +2,7 @@
 
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <memory>

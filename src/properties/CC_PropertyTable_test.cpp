@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyTable.h"
 
-#include "properties/PropertyTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <iterator>

@@ -1,10 +1,10 @@
 #include "properties/CC_PropertyTariff.h"
 
-#include "platform/asn1/AsnTesting.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCharge.h"
 #include "properties/CC_PropertyId.h"
-#include "properties/PropertyTesting.h"
+#include "tests/support/AsnTesting.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <vector>

@@ -1,6 +1,6 @@
 #include "properties/CC_QoS.h"
 
-#include "platform/asn1/AsnTesting.h"
+#include "tests/support/AsnTesting.h"
 
 #include <gtest/gtest.h>
 #include <utility>

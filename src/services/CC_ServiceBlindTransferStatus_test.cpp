@@ -1,6 +1,6 @@
 #include "services/CC_ServiceBlindTransferStatus.h"
 
-#include "services/ServiceTesting.h"
+#include "tests/support/ServiceTesting.h"
 
 #include <gtest/gtest.h>
 

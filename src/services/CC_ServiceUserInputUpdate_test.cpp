@@ -1,7 +1,7 @@
 #include "services/CC_ServiceUserInputUpdate.h"
 
 #include "services/CC_ServiceUserInput.h"
-#include "services/ServiceTesting.h"
+#include "tests/support/ServiceTesting.h"
 
 #include <gtest/gtest.h>
 

@@ -6,7 +6,7 @@
 #include "services/CC_ServicePushBack.h"
 #include "services/CC_ServiceUserInput.h"
 #include "services/CC_ServiceUserInputUpdate.h"
-#include "services/ServiceTesting.h"
+#include "tests/support/ServiceTesting.h"
 
 #include <cstddef>
 #include <cstring>

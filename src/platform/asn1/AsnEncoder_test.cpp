@@ -1,7 +1,7 @@
 #include "platform/asn1/AsnEncoder.h"
 
 #include "platform/asn1/AsnPrimitive.h"
-#include "platform/asn1/AsnTesting.h"
+#include "tests/support/AsnTesting.h"
 
 #include <gtest/gtest.h>
 

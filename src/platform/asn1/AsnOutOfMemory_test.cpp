@@ -1,6 +1,6 @@
-#include "platform/asn1/AsnTesting.h"
 #include "platform/asn1/Q956.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/AsnTesting.h"
 
 #include <gtest/gtest.h>
 

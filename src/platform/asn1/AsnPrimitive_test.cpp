@@ -1,7 +1,7 @@
 #include "platform/asn1/AsnPrimitive.h"
 
-#include "platform/asn1/AsnTesting.h"
 #include "platform/asn1/Q956_Enumerations.h"
+#include "tests/support/AsnTesting.h"
 
 #include <climits>
 #include <gtest/gtest.h>

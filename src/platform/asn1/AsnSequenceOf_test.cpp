@@ -1,7 +1,7 @@
 #include "platform/asn1/AsnSequenceOf.h"
 
-#include "platform/asn1/AsnTesting.h"
 #include "platform/asn1/Q956.h"
+#include "tests/support/AsnTesting.h"
 
 #include <gtest/gtest.h>
 

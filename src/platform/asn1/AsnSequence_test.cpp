@@ -1,8 +1,8 @@
 #include "platform/asn1/AsnSequence.h"
 
 #include "platform/asn1/AsnPrimitive.h"
-#include "platform/asn1/AsnTesting.h"
 #include "platform/asn1/Q956.h"
+#include "tests/support/AsnTesting.h"
 
 #include <gtest/gtest.h>
 #include <type_traits>

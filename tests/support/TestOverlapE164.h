@@ -1,9 +1,9 @@
 #pragma once
 
-#include "adapters/TestLineE164.h"
 #include "properties/CC_Flags.h"
 #include "services/CC_ServiceUserInputUpdate.h"
 #include "testing/RecordingCallLegObserver.h"
+#include "tests/support/TestLineE164.h"
 
 #include <functional>
 #include <utility>

@@ -1,13 +1,13 @@
 #pragma once
 
 #include "adapters/CC_CallAdapterE164_ValueOf.h"
-#include "adapters/TestLineE164.h"
 #include "properties/CC_PropertyCodec.h"
 #include "properties/CC_PropertyCodecs.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "properties/CC_PropertyQoS.h"
 #include "testing/FailingAllocator.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/TestLineE164.h"
 
 #include <tuple>
 #include <type_traits>
