@@ -1,5 +1,6 @@
 #pragma once
 
+#include "calls/CC_CallOwner.h"
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
@@ -22,7 +23,7 @@ class MG_IContext;
 ///     CC_Call* const call = pool.acquireCall();
 ///     ...
 ///     pool.releaseCall(call);
-class CC_EXPORT CC_CallPool
+class CC_EXPORT CC_CallPool : public CC_CallOwner
 {
 public:
     /// Counts over all pools of the process since its start. Read them after `prepareGet()`.
@@ -61,7 +62,7 @@ public:
     CC_Call* acquireCall(MG_IContext* mgContext);
     /// Takes the call back and destroys it. Counts and destroys also a call that is not of this pool, so hand back only
     /// its own. Null is ignored.
-    void releaseCall(CC_Call* call);
+    void releaseCall(CC_Call* call) override;
 
     unsigned int getNumberOfAcquiredCalls() const { return m_calls.getCount(); }
     /// The call at that place in the order of acquisition; null past the end.
@@ -83,7 +84,7 @@ public:
     static TY::Time s_tLastUpdate;
 
 private:
-    void unlist(CC_Call& call);
+    void unlist(CC_Call& call) override;
 
     TYList<CC_Call*> m_calls;
     TYPPtr<IRebootMgmt> m_rebootMgmt;

@@ -35,7 +35,10 @@ CallControl::ContextObserver::~ContextObserver() = default;
 CallControl* CallControl::INSTANCE()
 {
     if (s_pInstance == nullptr)
+    {
         s_pInstance = new CallControl;
+        CC_Environment::s_current = &s_pInstance->m_environment;
+    }
     return s_pInstance;
 }
 
@@ -49,22 +52,24 @@ CallControl::~CallControl()
         std::unique_ptr<CC_Context> const context(entry->getValue());
         m_contextTable.remove(context->getName());
     }
-    m_ccEventLoop = nullptr;
-    m_dpEventLoop = nullptr;
-    m_mgContextRepository.set(nullptr);
-    m_mgTerminationRepository.set(nullptr);
-    if (s_pInstance == this)
-        s_pInstance = nullptr;
+    m_environment.m_ccEventLoop = nullptr;
+    m_environment.m_dpEventLoop = nullptr;
+    m_environment.m_mgContextRepository.set(nullptr);
+    m_environment.m_mgTerminationRepository.set(nullptr);
+    if (s_pInstance != this)
+        return;
+    s_pInstance = nullptr;
+    CC_Environment::s_current = nullptr;
 }
 
 TYSyncEvent& CallControl::getCcSyncEvent(EventPrio::Type priority) const
 {
-    return m_ccEventLoop->getSyncEvent(priority);
+    return m_environment.m_ccEventLoop->getSyncEvent(priority);
 }
 
 TYSyncEvent& CallControl::getDpSyncEvent(EventPrio::Type priority) const
 {
-    return m_dpEventLoop->getSyncEvent(priority);
+    return m_environment.m_dpEventLoop->getSyncEvent(priority);
 }
 
 CC_Property* CallControl::createProperty(unsigned int id) const

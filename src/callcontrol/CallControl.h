@@ -1,15 +1,13 @@
 #pragma once
 
+#include "environment/CC_Environment.h"
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
 #include "platform/base/TYHashTable.h"
 #include "platform/base/TYList.h"
-#include "platform/base/TYPtr.h"
 #include "platform/base/XCode.h"
 #include "platform/eventloop/TYEventLoop.h"
-#include "platform/media/MG_IContextRepository.h"
-#include "platform/media/MG_ITerminationRepository.h"
 
 class CC_Call;
 class CC_CallPool;
@@ -61,22 +59,28 @@ public:
     // --- environment, set by the application before the first call ---------------------------------------------------
 
     /// The loop on which all call-control work runs; null until set. It must outlive all calls.
-    TYEventLoop* getCcEventLoop() const { return m_ccEventLoop; }
-    void setCcEventLoop(TYEventLoop* loop) { m_ccEventLoop = loop; }
+    TYEventLoop* getCcEventLoop() const { return m_environment.m_ccEventLoop; }
+    void setCcEventLoop(TYEventLoop* loop) { m_environment.m_ccEventLoop = loop; }
     /// REQUIRES: the loop was set.
     TYSyncEvent& getCcSyncEvent(EventPrio::Type priority) const;
     /// The loop of the datapath; null until set.
-    TYEventLoop* getDpEventLoop() const { return m_dpEventLoop; }
-    void setDpEventLoop(TYEventLoop* loop) { m_dpEventLoop = loop; }
+    TYEventLoop* getDpEventLoop() const { return m_environment.m_dpEventLoop; }
+    void setDpEventLoop(TYEventLoop* loop) { m_environment.m_dpEventLoop = loop; }
     /// REQUIRES: the loop was set.
     TYSyncEvent& getDpSyncEvent(EventPrio::Type priority) const;
     /// The media layer's repositories; a counted reference is held. Null until set; null gives the held one up.
-    MG_IContextRepository* getMgContextRepository() const { return m_mgContextRepository.get(); }
-    void setMgContextRepository(MG_IContextRepository* repository) { m_mgContextRepository.set(repository); }
-    MG_ITerminationRepository* getMgTerminationRepository() const { return m_mgTerminationRepository.get(); }
+    MG_IContextRepository* getMgContextRepository() const { return m_environment.m_mgContextRepository.get(); }
+    void setMgContextRepository(MG_IContextRepository* repository)
+    {
+        m_environment.m_mgContextRepository.set(repository);
+    }
+    MG_ITerminationRepository* getMgTerminationRepository() const
+    {
+        return m_environment.m_mgTerminationRepository.get();
+    }
     void setMgTerminationRepository(MG_ITerminationRepository* repository)
     {
-        m_mgTerminationRepository.set(repository);
+        m_environment.m_mgTerminationRepository.set(repository);
     }
 
     static TYEventLoop* GET_CC_EVENT_LOOP();
@@ -184,10 +188,7 @@ private:
     template <class Tell>
     void tellContextObservers(Tell&& tell);
 
-    TYEventLoop* m_ccEventLoop = nullptr;
-    TYEventLoop* m_dpEventLoop = nullptr;
-    TYPtr<MG_IContextRepository> m_mgContextRepository;
-    TYPtr<MG_ITerminationRepository> m_mgTerminationRepository;
+    CC_Environment m_environment;
     TYUInt32HashTable<CC_PropertyFactory*> m_factoryTable;
     INStringHashTable<CC_Context*> m_contextTable;
     TYList<ContextObserver*> m_contextObservers;

@@ -1,9 +1,8 @@
 #include "calls/CC_Call.h"
 
-#include "callcontrol/CC_CallPool.h" // upward: a call gives itself back to its pool
-#include "callcontrol/CallControl.h" // upward: the event loop that runs the clean-up
 #include "calls/CC_CallLeg.h"
 #include "calls/CC_Monitor.h"
+#include "environment/CC_Environment.h"
 #include "platform/base/Assert.h"
 #include "platform/base/NameOf.h"
 #include "platform/base/NestingGuard.h"
@@ -44,7 +43,7 @@ void LOG_PROPERTY(String const& callName, CC_Property const& property)
 CC_Call::CC_Call() : m_name(String::addressOf(this)) // short enough to need no memory
 {
     ++s_numberOfInstances;
-    TYEventLoop* const loop = CallControl::GET_CC_EVENT_LOOP();
+    TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
     TY_ASSERT(loop != nullptr, "a call before CallControl::SET_CC_EVENT_LOOP");
     TY_ASSERT(loop->isLoopThread(), "a call made off the call-control loop's thread");
     if (loop != nullptr)

@@ -16,6 +16,7 @@
 #include <utility>
 
 class CC_CallLeg;
+class CC_CallOwner;
 class CC_CallPool;
 
 /// Joins the legs of one call.
@@ -57,8 +58,9 @@ public:
 
     /// The call's identity in logs and dumps: its address.
     String const& getName() const { return m_name; }
-    CC_CallPool* getCallPool() const { return m_callPool; }
-    void setCallPool(CC_CallPool* callPool) { m_callPool = callPool; }
+    /// The pool that handed the call out and takes it back; null: the call destroys itself when it is over.
+    CC_CallOwner* getCallPool() const { return m_callPool; }
+    void setCallPool(CC_CallOwner* callPool) { m_callPool = callPool; }
 
     /// OK, or NO_ELEMENT when memory is out. Registrations are counted (CC_CountedObservers).
     XCode addCallObserver(CC_CallObserver* observer);
@@ -159,13 +161,13 @@ private:
     CC_CallLeg* findPushBackTarget() const;
 
     String m_name;
-    CC_CallPool* m_callPool = nullptr;
+    CC_CallOwner* m_callPool = nullptr;
     CC_PropertyContainer m_properties;
     TYEvent* m_deferredEvent = nullptr;
     CC_ObserverContainer<CC_CallObserver, CC_Call> m_callObservers;
     CC_ObserverContainer<CC_CallLegObserver, CC_CallLeg> m_callLegObservers;
     TYSmallVector<CC_CallLeg*, 4> m_callLegs;
-    CC_CallPool const* m_listedIn = nullptr; // the pool whose list m_poolElement is in
+    CC_CallOwner* m_listedIn = nullptr; // the pool whose list m_poolElement is in
     TYList<CC_Call*>::Element* m_poolElement = nullptr;
     unsigned int m_holds = 0;
     bool m_isReleased = false; // delete when the last hold ends

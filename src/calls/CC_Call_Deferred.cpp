@@ -1,7 +1,7 @@
 // What a call decides from the event loop: its end, and whether two of its legs form an internal loop.
-#include "callcontrol/CC_CallPool.h" // upward: a call gives itself back to its pool
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "calls/CC_CallOwner.h"
 #include "calls/CC_Monitor.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"

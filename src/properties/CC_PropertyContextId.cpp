@@ -1,7 +1,6 @@
 #include "properties/CC_PropertyContextId.h"
 
-#include "callcontrol/CallControl.h" // upward: the repository of the media contexts is known to call control alone
-#include "platform/media/MG_IContextRepository.h"
+#include "environment/CC_Environment.h"
 
 #include <tuple>
 
@@ -23,6 +22,6 @@ void CC_PropertyContextId::setContext(MG_IContext* context)
 {
     if (context != nullptr)
         m_context.set(context);
-    else if (MG_IContextRepository* const repository = CallControl::GET_MG_CONTEXT_REPOSITORY())
+    else if (TYPtr<MG_IContextRepository> const repository(CC_Environment::MG_CONTEXT_REPOSITORY()); repository)
         std::ignore = repository->createContext(m_context); // a call without media is still a call
 }

@@ -1,6 +1,5 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 
-#include "adapters/CC_CallAdapter.h" // upward: a rejection goes through an adapter, like any other answer
 #include "properties/CC_PropertyContainer.h"
 #include "properties/CC_PropertyFilterContainer.h"
 
@@ -42,15 +41,6 @@ XCode CC_Endpoint::offer(CC_Call& call, String const& name, CC_PropertyContainer
         return XCode::FAILURE;                                     // memory is out
     std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
     return handleOffer(call, name, filtered);
-}
-
-void CC_Endpoint::actionRejectOfferedCall_WithCause(CC_Call& call, CC_PropertyContainer const& properties, QCause cause)
-{
-    // a failed step leaves the adapter idle, and dropping an idle adapter does nothing
-    CC_CallAdapter adapter;
-    std::ignore = adapter.setup("reject", *this, nullptr);
-    std::ignore = adapter.accept(call, properties);
-    adapter.drop(cause, 0);
 }
 
 void CC_Endpoint::NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void*)
