@@ -39,11 +39,11 @@ XCode CC_CallAdapter::setup(String const& name, CC_Endpoint& endpoint, CC_CallAd
     {
         return XCode::FAILURE;
     }
-    m_isResetting = true;
+    bool const wasResetting = std::exchange(m_isResetting, true);
     dropOwnCallLeg(QCause::UNSPECIFIED, 0);
     if (!self.isAlive())
         return XCode::FAILURE;
-    m_isResetting = false;
+    m_isResetting = wasResetting; // the outermost one ends it
     m_name = std::move(newName);
     m_observer = observer;
     m_endpoint = &endpoint;
@@ -53,14 +53,14 @@ XCode CC_CallAdapter::setup(String const& name, CC_Endpoint& endpoint, CC_CallAd
 void CC_CallAdapter::cleanup()
 {
     TYLifeline::Watch const self(m_lifeline);
-    m_isResetting = true;
+    bool const wasResetting = std::exchange(m_isResetting, true);
     dropOwnCallLeg(QCause::UNSPECIFIED, 0);
     if (!self.isAlive())
         return;
     letGoOfTheRest();
     if (!self.isAlive())
         return;
-    m_isResetting = false;
+    m_isResetting = wasResetting;
     m_endpoint = nullptr;
     m_name.clear();
     m_observer = nullptr;
@@ -78,8 +78,11 @@ void CC_CallAdapter::setName(String const& name)
         String newName = nameOrAddress(name);
         if (newName == m_name)
             return;
+        TYLifeline::Watch const self(m_lifeline);
         if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_NAMING))
             monitor->debug("[EP %s/%s] Set name: %s", getEndpointName(), m_name.c_str(), newName.c_str());
+        if (!self.isAlive())
+            return;
         m_name = std::move(newName);
         if (m_ownCallLeg != nullptr)
             std::ignore = m_ownCallLeg->setName(makeCallLegName()); // without memory the leg keeps its old name
@@ -108,6 +111,7 @@ void CC_CallAdapter::invokeSynchronousService(CC_Service& service)
 {
     if (m_ownCallLeg == nullptr)
         return;
+    Attempt const attempt(*this);
     try
     {
         if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
@@ -118,7 +122,8 @@ void CC_CallAdapter::invokeSynchronousService(CC_Service& service)
     {
         // a log line is not worth a service
     }
-    m_ownCallLeg->invokeSynchronousService(service);
+    if (!attempt.isOver())
+        m_ownCallLeg->invokeSynchronousService(service);
 }
 
 InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
@@ -142,6 +147,14 @@ InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLeve
     if (m_peerCallLeg != nullptr)
         m_peerCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
     return info;
+}
+
+XCode CC_CallAdapter::Attempt::fail(char const* reason, XCode result) const
+{
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE); monitor != nullptr && !isOver())
+        monitor->debug("[EP %s/%s] %s failed: %s", m_adapter.getEndpointName(), m_adapter.m_name.c_str(), m_operation,
+                       reason);
+    return result;
 }
 
 void CC_CallAdapter::notifyPeerPropertyChange(CC_Flags const&) {}

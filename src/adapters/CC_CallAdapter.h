@@ -176,10 +176,8 @@ private:
                   CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
     XCode joinAndOffer(CC_Provider& provider, CC_Call& call, String const& contextName, String const& providerName,
                        String const& destination, CC_PropertyContainer const& offerProperties,
-                       CC_PropertyContainer const& callProperties);
-    XCode joinNewCall(CC_Call& call, CC_PropertyContainer const& properties);
-    XCode offerToProvider(CC_Provider& provider, CC_Call& call, String const& providerName, String const& destination,
-                          CC_PropertyContainer const& properties);
+                       CC_PropertyContainer const& callProperties, CC_PropertyFilterContainer const* filters);
+    XCode joinNewCall(CC_Call& call, CC_PropertyContainer const& properties, CC_PropertyFilterContainer const* filters);
     XCode tryAccept(CC_Call& call, CC_PropertyContainer const& ownProperties);
     XCode createEvents();
     static XCode setInitialProperties(CC_PropertyContainer& properties, int state);
@@ -189,23 +187,33 @@ private:
     void writeFinalProperties(QCause cause, unsigned int causeValue);
     void letGoOfTheRest();
     XCode tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg);
+    char const* whyNotReady() const;
 
-    CC_PropertyContainer const* filterInput(CC_PropertyContainer const& properties,
-                                            CC_PropertyContainer& filtered) const;
+    static CC_PropertyContainer const* FILTER_INPUT(CC_PropertyFilterContainer const* filters,
+                                                    CC_PropertyContainer const& properties,
+                                                    CC_PropertyContainer& filtered);
     template <class Target, class Written>
     XCode writeFiltered(CC_PropertyView& view, Target* target, Written const& written);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
+    template <class Written>
+    XCode writePeer(Written const& written, bool isFiltered);
+    template <class Written>
+    XCode writeCall(Written const& written, bool isFiltered);
 
+    static void GIVE_UP(CC_CallLeg& leg);
     void observeCall(CC_Call& call);
     void unobserveCall();
     void updateOwnCallLeg(CC_Flags const& changed);
     void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
-    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told);
+    template <class OnDifference>
+    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
+                    OnDifference const& onDifference);
     void mark(unsigned int id);
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();
+    void catchUp();
     void onPeerPropertyChanged(CC_Flags const& flags);
     void onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags const& flags);
 
@@ -223,7 +231,9 @@ private:
     bool m_isCallObserver = false;     // of m_observedCall: which of the two registrations it took
     bool m_isCallLegObserver = false;  // of all its legs
     bool m_observesOwnCallLeg = false;
-    unsigned int m_attempt = 0; // counts the legs we have let go, to tell one attempt from the next
-    bool m_isResetting = false; // in setup or cleanup: who is told of the ending leg cannot begin another
+    unsigned int m_attempt = 0;      // counts the legs we have let go, to tell one attempt from the next
+    bool m_isResetting = false;      // in setup or cleanup: who is told of the ending leg cannot begin another
+    bool m_isPeerToBeChosen = false; // its fall did not show: choose anew before the module is told
+    unsigned int m_refreshes = 0;    // of views through filters, to tell whether one came inside another
     TYLifeline m_lifeline;
 };

@@ -1,4 +1,9 @@
 // How the own leg begins: dial and accept.
+//
+// Nearly every step calls out: the endpoint's name and network, filters, the media layer, whoever hears of the new call
+// and leg, the log, the destination. Any of them may drop or destroy this adapter, begin another attempt with it, or
+// release the call. So after each step an `Attempt` is asked whether this is still ours; when it is not, nothing is
+// touched any more, not even to say why. The new call is held until we return, and deferred if it got no leg.
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
 #include "adapters/CC_CallAdapter_Event.h"
@@ -20,6 +25,19 @@
 #include <new>
 #include <tuple>
 
+namespace
+{
+constexpr char const* NO_MEMORY = "out of memory";
+constexpr char const* LEG_TAKES_NOT_ALL = "the own leg takes not all properties";
+constexpr char const* CALL_TAKES_NO_LEG = "the call takes no leg";
+
+/// Copying tells nothing of what memory has refused.
+XCode WHOLE(CC_PropertyContainer const& copy, CC_PropertyContainer const& original)
+{
+    return copy.getNumberOfProperties() == original.getNumberOfProperties() ? XCode::OK : XCode::FAILURE;
+}
+} // namespace
+
 bool CC_CallAdapter::isReady() const
 {
     return m_endpoint != nullptr && !m_isResetting && m_ownCallLeg == nullptr && m_peerChangeEvent == nullptr &&
@@ -30,9 +48,9 @@ XCode CC_CallAdapter::dial(String const& contextName, String const& providerName
                            CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                            CC_PropertyContainer const& callProperties, MG_IContext* datapathContext)
 {
+    Attempt const attempt(*this, "Dial");
     if (!isReady())
-        return XCode::REFUSED;
-    Attempt const attempt(*this);
+        return attempt.fail(whyNotReady(), XCode::REFUSED);
     XCode result = XCode::FAILURE;
     try
     {
@@ -41,7 +59,7 @@ XCode CC_CallAdapter::dial(String const& contextName, String const& providerName
     }
     catch (std::bad_alloc const&)
     {
-        result = XCode::FAILURE;
+        result = attempt.fail(NO_MEMORY);
     }
     if (!result.isOk() && !attempt.isOver())
         dropOwnCallLeg(QCause::NETWORK_OUT_OF_ORDER, 0);
@@ -52,7 +70,8 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
                               CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                               CC_PropertyContainer const& callProperties, MG_IContext* datapathContext)
 {
-    Attempt const attempt(*this);
+    Attempt const attempt(*this, "Dial");
+    CC_PropertyFilterContainer const* const filters = getInputFilters(); // those of now, whatever is set meanwhile
     CC_Provider* const provider = CallControl::GET_PROVIDER(contextName, providerName);
     if (provider == nullptr)
     {
@@ -62,18 +81,17 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
         return XCode::FAILURE;
     }
     CC_PropertyContainer own(ownProperties);
-    if (own.getNumberOfProperties() != ownProperties.getNumberOfProperties()) // else memory is out
-        return XCode::FAILURE;
-    if (!createEvents().isOk() || !setInitialProperties(own, CC_PropertyCallLegState::CONNECTED).isOk() ||
-        !createOwnCallLeg().isOk() || !startOwnCallLeg(own).isOk() || attempt.isOver())
+    if (!attempt.survives(WHOLE(own, ownProperties), NO_MEMORY) || !attempt.survives(createEvents(), NO_MEMORY) ||
+        !attempt.survives(setInitialProperties(own, CC_PropertyCallLegState::CONNECTED), NO_MEMORY) ||
+        !attempt.survives(createOwnCallLeg(), NO_MEMORY) || !attempt.survives(startOwnCallLeg(own), LEG_TAKES_NOT_ALL))
         return XCode::FAILURE;
     CC_Call* const call = CallControl::ACQUIRE_CALL(contextName, datapathContext);
     if (call == nullptr)
-        return XCode::NO_ELEMENT;
+        return attempt.fail("no call could be had", XCode::NO_ELEMENT);
     CC_Call::Hold const keepCall(call);
     XCode const result = attempt.isOver() ? XCode::FAILURE
                                           : joinAndOffer(*provider, *call, contextName, providerName, destination,
-                                                         offerProperties, callProperties);
+                                                         offerProperties, callProperties, filters);
     if (!result.isOk() && (attempt.isOver() || m_ownCallLeg->getCall() == nullptr))
         call->defer(); // nobody else would hand it back to its pool
     return result;
@@ -83,46 +101,50 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
 XCode CC_CallAdapter::joinAndOffer(CC_Provider& provider, CC_Call& call, String const& contextName,
                                    String const& providerName, String const& destination,
                                    CC_PropertyContainer const& offerProperties,
-                                   CC_PropertyContainer const& callProperties)
+                                   CC_PropertyContainer const& callProperties,
+                                   CC_PropertyFilterContainer const* filters)
 {
-    Attempt const attempt(*this);
+    Attempt const attempt(*this, "Dial");
     CC_Call::Hold const keepCall(&call);
-    if (!joinNewCall(call, callProperties).isOk() || attempt.isOver() || keepCall.isReleased())
+    auto const isOver = [&] { return attempt.isOver() || keepCall.isReleased(); };
+    XCode const joined = joinNewCall(call, callProperties, filters);
+    if (!joined.isOk() || isOver())
         return XCode::FAILURE;
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[EP %s/%s] Dial to provider %s (%s) using call %s", getEndpointName(), m_name.c_str(),
                        providerName.c_str(), destination.c_str(), call.getName().c_str());
+    CC_PropertyContainer filtered;
+    CC_PropertyContainer const* const offered = FILTER_INPUT(filters, offerProperties, filtered);
+    if (isOver())
+        return XCode::FAILURE;
+    if (offered == nullptr)
+        return attempt.fail("the input filters refuse the offer's properties");
     if (CallControl::GET_PROVIDER(contextName, providerName) != &provider)
-        return XCode::FAILURE; // taken out by somebody who was told of the call
-    return offerToProvider(provider, call, providerName, destination, offerProperties);
+        return attempt.fail("somebody who was told meanwhile has taken the provider out");
+    return provider.dial(call, providerName, destination, *offered).isOk() ? XCode::OK
+                                                                           : attempt.fail("the provider refuses");
 }
 
 /// Gives a new call its properties and the own leg.
-XCode CC_CallAdapter::joinNewCall(CC_Call& call, CC_PropertyContainer const& properties)
+XCode CC_CallAdapter::joinNewCall(CC_Call& call, CC_PropertyContainer const& properties,
+                                  CC_PropertyFilterContainer const* filters)
 {
-    Attempt const attempt(*this);
+    Attempt const attempt(*this, "Dial");
     CC_PropertyContainer filtered;
-    CC_PropertyContainer const* const written = filterInput(properties, filtered);
-    if (written == nullptr || !call.setProperties(*written).isOk() || attempt.isOver())
-        return XCode::FAILURE;
-    return call.addCallLeg(*m_ownCallLeg);
-}
-
-XCode CC_CallAdapter::offerToProvider(CC_Provider& provider, CC_Call& call, String const& providerName,
-                                      String const& destination, CC_PropertyContainer const& properties)
-{
-    CC_PropertyContainer filtered;
-    CC_PropertyContainer const* const offered = filterInput(properties, filtered);
-    if (offered == nullptr || !provider.dial(call, providerName, destination, *offered).isOk())
+    CC_PropertyContainer const* const written = FILTER_INPUT(filters, properties, filtered);
+    if (!attempt.survives(written != nullptr ? XCode::OK : XCode::FAILURE, "the input filters refuse the call's "
+                                                                           "properties") ||
+        !attempt.survives(call.setProperties(*written), "the call takes not all properties") ||
+        !attempt.survives(call.addCallLeg(*m_ownCallLeg), CALL_TAKES_NO_LEG))
         return XCode::FAILURE;
     return XCode::OK;
 }
 
 XCode CC_CallAdapter::accept(CC_Call& call, CC_PropertyContainer const& ownProperties)
 {
+    Attempt const attempt(*this, "Accept");
     if (!isReady())
-        return XCode::REFUSED;
-    Attempt const attempt(*this);
+        return attempt.fail(whyNotReady(), XCode::REFUSED);
     CC_Call::Hold const keepCall(&call);
     XCode result = XCode::FAILURE;
     try
@@ -131,7 +153,7 @@ XCode CC_CallAdapter::accept(CC_Call& call, CC_PropertyContainer const& ownPrope
     }
     catch (std::bad_alloc const&)
     {
-        result = XCode::FAILURE;
+        result = attempt.fail(NO_MEMORY);
     }
     if (!result.isOk() && !attempt.isOver())
         dropOwnCallLeg(QCause::NETWORK_OUT_OF_ORDER, 0);
@@ -140,18 +162,26 @@ XCode CC_CallAdapter::accept(CC_Call& call, CC_PropertyContainer const& ownPrope
 
 XCode CC_CallAdapter::tryAccept(CC_Call& call, CC_PropertyContainer const& ownProperties)
 {
-    Attempt const attempt(*this);
-    if (!createEvents().isOk())
+    Attempt const attempt(*this, "Accept");
+    if (!attempt.survives(createEvents(), NO_MEMORY))
         return XCode::FAILURE;
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[EP %s/%s] Accept call %s", getEndpointName(), m_name.c_str(), call.getName().c_str());
     CC_PropertyContainer own(ownProperties);
-    bool const isComplete = own.getNumberOfProperties() == ownProperties.getNumberOfProperties(); // else memory is out
-    if (!createOwnCallLeg().isOk() || !isComplete ||
-        !setInitialProperties(own, CC_PropertyCallLegState::TRYING).isOk() || !startOwnCallLeg(own).isOk() ||
-        attempt.isOver())
+    XCode const isWhole = WHOLE(own, ownProperties);
+    if (attempt.isOver() || !attempt.survives(createOwnCallLeg(), NO_MEMORY) || !attempt.survives(isWhole, NO_MEMORY) ||
+        !attempt.survives(setInitialProperties(own, CC_PropertyCallLegState::TRYING), NO_MEMORY) ||
+        !attempt.survives(startOwnCallLeg(own), LEG_TAKES_NOT_ALL) ||
+        !attempt.survives(call.addCallLeg(*m_ownCallLeg), CALL_TAKES_NO_LEG))
         return XCode::FAILURE;
-    return call.addCallLeg(*m_ownCallLeg).isOk() ? XCode::OK : XCode::FAILURE;
+    return XCode::OK;
+}
+
+char const* CC_CallAdapter::whyNotReady() const
+{
+    return m_endpoint == nullptr ? "the adapter is not set up"
+           : m_isResetting       ? "the adapter is being set up or cleaned up"
+                                 : "the adapter has a leg or what is left of one";
 }
 
 XCode CC_CallAdapter::createEvents()
@@ -177,7 +207,10 @@ XCode CC_CallAdapter::setInitialProperties(CC_PropertyContainer& properties, int
 
 XCode CC_CallAdapter::createOwnCallLeg()
 {
+    Attempt const attempt(*this);
     String const name = makeCallLegName();
+    if (attempt.isOver())
+        return XCode::FAILURE;
     m_ownCallLeg = new (std::nothrow) CC_CallLeg;
     return m_ownCallLeg != nullptr ? m_ownCallLeg->setName(name) : XCode::FAILURE;
 }
@@ -185,14 +218,18 @@ XCode CC_CallAdapter::createOwnCallLeg()
 /// Completes the properties by what the caller has left out, writes them to the new leg and observes it.
 XCode CC_CallAdapter::startOwnCallLeg(CC_PropertyContainer& properties)
 {
+    Attempt const attempt(*this);
     if (properties.get(CC_PropertyId::NETWORK) == nullptr &&
         !properties.set(CC_PropertyString(CC_PropertyId::NETWORK, m_endpoint->getNetwork())).isOk())
+        return XCode::FAILURE;
+    if (attempt.isOver())
         return XCode::FAILURE;
     auto const id = static_cast<std::uint32_t>(reinterpret_cast<std::uintptr_t>(m_ownCallLeg));
     if (properties.get(CC_PropertyId::CALL_LEG_ID) == nullptr &&
         !properties.set(CC_PropertyUnsigned(CC_PropertyId::CALL_LEG_ID, id)).isOk())
         return XCode::FAILURE;
-    if (!writeFirstProperties(properties).isOk() || !m_ownCallLeg->addCallLegObserver(this).isOk())
+    XCode const written = writeFirstProperties(properties);
+    if (!written.isOk() || attempt.isOver() || !m_ownCallLeg->addCallLegObserver(this).isOk())
         return XCode::FAILURE;
     m_observesOwnCallLeg = true;
     return XCode::OK;
@@ -204,7 +241,9 @@ XCode CC_CallAdapter::writeFirstProperties(CC_PropertyContainer& properties)
 {
     if (getInputFilters() != nullptr)
         return setOwnProperties(properties);
-    if (!m_ownCallLeg->setProperties(properties).isOk())
+    Attempt const attempt(*this);
+    XCode const written = m_ownCallLeg->setProperties(properties);
+    if (!written.isOk() || attempt.isOver())
         return XCode::FAILURE;
     m_ownView.take(properties);
     return XCode::OK;

@@ -203,7 +203,10 @@ TEST_F(CC_CallAdapter_Dial_Test, AnActiveAdapterRefusesToDialOrAcceptAndItsCallG
     EXPECT_EQ(a.leg(STATE), "CONNECTED");
     EXPECT_EQ(call->getNumberOfCallLegs(), 2u);
     EXPECT_EQ(heardBy(b), Lines());
-    EXPECT_EQ(monitor.getLines().size(), 0u);
+    using Line = RecordingMonitor::Line;
+    Line const dial{1, "[EP a/line] Dial failed: the adapter has a leg or what is left of one"};
+    Line const accept{1, "[EP a/line] Accept failed: the adapter has a leg or what is left of one"};
+    EXPECT_EQ(monitor.getLines(), (std::vector<Line>{dial, dial, accept}));
     EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS(""), 1u);
 }
 

@@ -13,12 +13,19 @@
 #include <tuple>
 #include <utility>
 
+namespace
+{
+bool IS_RELEASED(CC_CallLeg const& leg) { return leg.getState() == CC_PropertyCallLegState::RELEASED; }
+} // namespace
+
 void CC_CallAdapter::drop(QCause cause, unsigned int causeValue)
 {
+    TYLifeline::Watch const self(m_lifeline);
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW);
         monitor != nullptr && getCall() != nullptr)
         monitor->debug("[EP %s/%s] Drop call %s", getEndpointName(), m_name.c_str(), getCall()->getName().c_str());
-    dropOwnCallLeg(cause, causeValue);
+    if (self.isAlive())
+        dropOwnCallLeg(cause, causeValue);
 }
 
 void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
@@ -33,9 +40,19 @@ void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
     writeFinalProperties(cause, causeValue);
     if (attempt.isOver())
         return;
-    std::exchange(m_ownCallLeg, nullptr)->removeReference();
+    GIVE_UP(*std::exchange(m_ownCallLeg, nullptr));
     if (!attempt.isOver())
         letGoOfTheRest();
+}
+
+/// Gives a reference up. A released leg may have kept its call waiting for that, or for the last live one: nobody else
+/// would have the call looked at, since no state changes.
+void CC_CallAdapter::GIVE_UP(CC_CallLeg& leg)
+{
+    CC_Call::Hold const call(IS_RELEASED(leg) ? leg.getCall() : nullptr);
+    leg.removeReference();
+    if (call.get() != nullptr)
+        call.get()->defer();
 }
 
 /// Tells the other legs that no data, why, and that it is over, while we are still in the call.
@@ -49,8 +66,11 @@ void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
     if (attempt.isOver())
         return;
     CC_PropertyCallLegState const released(CC_PropertyId::STATE, CC_PropertyCallLegState::RELEASED);
-    // a leg that memory keeps from being released would keep its call for ever: then past our copy and the filters
-    if (!setOwnProperty(released).isOk() && !attempt.isOver())
+    m_ownCallLeg->fixState(); // whatever the module or a peer writes when they hear of it
+    std::ignore = setOwnProperty(released);
+    // a leg that memory or a filter keeps from being released would keep its call for ever: then past our copy and the
+    // filters
+    if (!attempt.isOver() && !IS_RELEASED(*m_ownCallLeg))
         std::ignore = m_ownCallLeg->setProperty(released); // no State at all counts as released, too
 }
 
@@ -58,23 +78,27 @@ void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
 void CC_CallAdapter::letGoOfTheRest()
 {
     Attempt const attempt(*this);
+    m_isPeerToBeChosen = false;
     m_ownView.clear();
-    m_peerView.clear();
+    if (!attempt.isOver())
+        m_peerView.clear();
+    if (attempt.isOver())
+        return;
     if (CC_CallLeg* const peer = std::exchange(m_peerCallLeg, nullptr))
-        peer->removeReference();
+        GIVE_UP(*peer);
     if (attempt.isOver())
         return;
     for (Event** const event : {&m_secondEvent, &m_peerChangeEvent})
         if (*event != nullptr)
             std::exchange(*event, nullptr)->destroy();
-    m_callView.clear();
     ++m_attempt;
+    m_callView.clear();
 }
 
 XCode CC_CallAdapter::transfer(CC_CallAdapter const& other, bool removeOwnLeg)
 {
     TYLifeline::Watch const self(m_lifeline);
-    XCode const result = tryTransfer(other, removeOwnLeg);
+    XCode const result = tryTransfer(other, removeOwnLeg); // in which either adapter may go
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE);
         monitor != nullptr && !result.isOk() && self.isAlive())
         monitor->debug("[EP %s/%s] TRANSFER FAILED", getEndpointName(), m_name.c_str());
@@ -87,20 +111,24 @@ XCode CC_CallAdapter::tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg
     CC_Call* const from = other.getCall();
     if (to == nullptr || from == nullptr || to == from)
         return XCode::REFUSED;
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
-        monitor->debug("[EP %s/%s] Transfer call %s to %s%s", getEndpointName(), m_name.c_str(),
-                       from->getName().c_str(), to->getName().c_str(), removeOwnLeg ? "" : " ==> conference");
     CC_Call::Hold const keepTo(to);
     CC_Call::Hold const keepFrom(from);
     CC_CallLeg::Reference const keepStaying(*other.m_ownCallLeg);
+    CC_CallLeg::Reference const keepOwn(*m_ownCallLeg);
     CC_CallLeg const& staying = *other.m_ownCallLeg;
+    CC_CallLeg& own = *m_ownCallLeg;
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
+        monitor->debug("[EP %s/%s] Transfer call %s to %s%s", getEndpointName(), m_name.c_str(),
+                       from->getName().c_str(), to->getName().c_str(), removeOwnLeg ? "" : " ==> conference");
     if (removeOwnLeg)
-        to->removeCallLeg(*m_ownCallLeg);
-    // no more than there are now: an observer that always puts one back must not keep us here for ever
-    for (unsigned int left = from->getNumberOfOtherCallLegs(staying); left > 0; --left)
-        if (CC_CallLeg* const leg = from->getOtherCallLeg(0, staying); leg != nullptr && !to->addCallLeg(*leg).isOk())
+        to->removeCallLeg(own);
+    unsigned int index = 0; // above 0: of legs that are on a move of their own and go when that has ended
+    for (unsigned int left = CC_Call::MOST_MOVES; CC_CallLeg* const leg = from->getOtherCallLeg(index, staying); --left)
+    {
+        if (left == 0 || !to->addCallLeg(*leg).isOk())
             return XCode::FAILURE;
-    if (from->getNumberOfCallLegs() == 0)
-        from->defer(); // somebody who was told of a move took the staying leg away
+        if (from->getOtherCallLeg(index, staying) == leg)
+            ++index;
+    }
     return XCode::OK;
 }

@@ -1,6 +1,7 @@
 #include "adapters/CC_CallAdapter_Event.h"
 
 #include "adapters/CC_CallAdapterObserver.h"
+#include "adapters/CC_CallAdapter_Attempt.h"
 
 #include <utility>
 
@@ -16,6 +17,10 @@ XCode CC_CallAdapter::Event::setPeerPropertyChange(unsigned int id)
 
 void CC_CallAdapter::Event::handle()
 {
+    Attempt const attempt(m_adapter);
+    m_adapter.catchUp();
+    if (attempt.isOver())
+        return;
     CC_Flags const flags(std::move(m_flags)); // what changes inside the notification belongs to the next turn
     if (flags.isEmpty())
         return;

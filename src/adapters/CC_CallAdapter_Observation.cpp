@@ -1,4 +1,10 @@
 // What the adapter makes of the events of its call and legs: its views, its peer, and what the module is told.
+//
+// A view must neither show what is not there nor miss what is. Three things could make it: an output filter that drops
+// or destroys the adapter, or brings about a later refresh, while its copy is being filtered (then the copy is thrown
+// away); a change told inside the news of another one, so that the second arrives when it is no news any more; and a
+// leg whose changes we do not hear yet. For the last two the peer is looked at again before the module is told
+// (`catchUp`), which costs a comparison of two numbers when nothing was missed.
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
@@ -51,10 +57,13 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
     auto const& relinked = CC_EvCallLegCallRelinked::FROM(event);
     if (m_ownCallLeg == nullptr || relinked.getSource() != m_ownCallLeg)
         return;
+    Attempt const attempt(*this);
     unobserveCall();
     if (relinked.getNewCall() != nullptr)
     {
         updateCall();
+        if (attempt.isOver())
+            return;
         observeCall(*relinked.getNewCall());
     }
     linkPeerCallLeg();
@@ -146,46 +155,74 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
         m_ownView.assign(leg.getProperties(), TOLD(leg, &changed));
         return;
     }
+    Attempt const attempt(*this);
+    unsigned int const refresh = ++m_refreshes;
     CC_PropertyContainer filtered(leg.getProperties());
-    if (filters->applyFilters(filtered).isOk())
+    XCode const result = filters->applyFilters(filtered);
+    if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
         m_ownView.assign(filtered, {});
 }
 
 /// `changed`: the ids of which the peer tells; null when the peer is another.
 void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 {
-    if (CC_CallLeg const* const leg = m_peerCallLeg)
-        updateView(m_peerView, leg->getProperties(), TOLD(*leg, changed));
+    if (m_peerCallLeg == nullptr)
+        return;
+    CC_CallLeg::Reference const keepPeer(*m_peerCallLeg);
+    auto const onDifference = [this, changed](unsigned int id)
+    {
+        if (id == CC_PropertyId::STATE && changed != nullptr && !changed->get(id))
+            m_isPeerToBeChosen = true; // when the state itself is told, its fall does not show any more
+        mark(id);
+    };
+    updateView(m_peerView, m_peerCallLeg->getProperties(), TOLD(*m_peerCallLeg, changed), onDifference);
 }
 
 void CC_CallAdapter::updateCall()
 {
     if (CC_Call const* const call = getCall())
-        updateView(m_callView, call->getProperties(), {});
+        updateView(m_callView, call->getProperties(), {}, [this](unsigned int id) { mark(id); });
 }
 
-/// Brings a view up to date with its source and marks the ids that differ.
+/// Brings a view up to date with its source and tells the ids that differ. When a filter brings about another refresh,
+/// that one is the later.
+template <class OnDifference>
 void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source,
-                                CC_PropertyView::Told const& told)
+                                CC_PropertyView::Told const& told, OnDifference const& onDifference)
 {
-    auto const onDifference = [this](unsigned int id) { mark(id); };
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
     {
         view.follow(source, told, onDifference);
         return;
     }
+    Attempt const attempt(*this);
+    unsigned int const refresh = ++m_refreshes;
     CC_PropertyContainer filtered(source);
-    if (filtered.getNumberOfProperties() != source.getNumberOfProperties())
+    if (attempt.isOver() || filtered.getNumberOfProperties() != source.getNumberOfProperties())
         return; // memory is out: better the view of before than one that calls what is there gone
     std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
-    view.follow(filtered, {}, onDifference);
+    if (!attempt.isOver() && refresh == m_refreshes)
+        view.follow(filtered, {nullptr, told.number}, onDifference);
 }
 
 void CC_CallAdapter::mark(unsigned int id)
 {
     if (m_peerChangeEvent != nullptr)
         std::ignore = m_peerChangeEvent->setPeerPropertyChange(id); // without memory the module is not told
+}
+
+/// Before the module is told: the peer whose fall did not show, or whose news did not all reach us, is chosen and
+/// looked at anew. A leg that joins is our peer before it has us for an observer; what it changes until then is such
+/// news.
+void CC_CallAdapter::catchUp()
+{
+    bool const isToBeChosen = std::exchange(m_isPeerToBeChosen, false);
+    if (m_peerCallLeg == nullptr)
+        return;
+    bool const hasMissed = !m_peerView.hasHeard(m_peerCallLeg->getNumberOfNotifications());
+    if ((isToBeChosen || hasMissed) && !linkPeerCallLeg() && hasMissed)
+        updatePeerCallLeg(nullptr);
 }
 
 /// Chooses the peer among the other legs. Whether it changed, or there is none; the adapter may then be gone.
@@ -204,7 +241,7 @@ bool CC_CallAdapter::linkPeerCallLeg()
     Attempt const attempt(*this);
     chosen->addReference();
     if (CC_CallLeg* const previous = std::exchange(m_peerCallLeg, chosen))
-        previous->removeReference();
+        GIVE_UP(*previous);
     if (!attempt.isOver())
         updatePeerCallLeg(nullptr);
     return true;
@@ -216,7 +253,7 @@ void CC_CallAdapter::unlinkPeerCallLeg()
     if (peer == nullptr)
         return;
     Attempt const attempt(*this);
-    peer->removeReference();
+    GIVE_UP(*peer);
     if (attempt.isOver())
         return;
     for (CC_Property const& property : m_peerView.getProperties())

@@ -1,5 +1,7 @@
 // The module's access to the properties of the own leg, the peer leg and the call.
 #include "adapters/CC_CallAdapter.h"
+#include "adapters/CC_CallAdapter_Attempt.h"
+#include "adapters/CC_CallAdapter_Event.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
@@ -31,11 +33,12 @@ XCode WRITE(CC_Call& call, CC_Property const& property) { return OK_OR_FAILURE(c
 XCode WRITE(CC_Call& call, CC_PropertyContainer const& many) { return OK_OR_FAILURE(call.setProperties(many)); }
 } // namespace
 
-/// The properties as the input filters leave them, in `filtered` if there are filters; null when one of them failed.
-CC_PropertyContainer const* CC_CallAdapter::filterInput(CC_PropertyContainer const& properties,
-                                                        CC_PropertyContainer& filtered) const
+/// The properties as the input filters leave them, in `filtered` if there are filters; null when one of them failed. A
+/// filter may have dropped or destroyed the adapter.
+CC_PropertyContainer const* CC_CallAdapter::FILTER_INPUT(CC_PropertyFilterContainer const* filters,
+                                                         CC_PropertyContainer const& properties,
+                                                         CC_PropertyContainer& filtered)
 {
-    CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return &properties;
     filtered = properties;
@@ -44,19 +47,23 @@ CC_PropertyContainer const* CC_CallAdapter::filterInput(CC_PropertyContainer con
     return isComplete && filters->applyFilters(filtered).isOk() ? &filtered : nullptr;
 }
 
-/// Writes one property or several to our view and through the input filters to the leg or call.
+/// Writes one property or several to our view and through the input filters to the leg or call. What filters and
+/// foreign properties do meanwhile may end the attempt; the caller keeps a target that could go without that.
 template <class Target, class Written>
 XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Written const& written)
 {
     if (target == nullptr)
         return XCode::ABSENT;
-    if (!view.write(written).isOk())
+    Attempt const attempt(*this);
+    XCode const seen = view.write(written);
+    if (!seen.isOk() || attempt.isOver())
         return XCode::FAILURE;
-    if (getInputFilters() == nullptr)
+    CC_PropertyFilterContainer const* const filters = getInputFilters();
+    if (filters == nullptr)
         return WRITE(*target, written);
     CC_PropertyContainer filtered;
-    CC_PropertyContainer const* const all = filterInput(view.getProperties(), filtered);
-    return all != nullptr ? WRITE(*target, *all) : XCode::FAILURE;
+    CC_PropertyContainer const* const all = FILTER_INPUT(filters, view.getProperties(), filtered);
+    return all != nullptr && !attempt.isOver() ? WRITE(*target, *all) : XCode::FAILURE;
 }
 
 template <class Target, class Written>
@@ -64,7 +71,9 @@ XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Wri
 {
     if (target == nullptr)
         return XCode::ABSENT;
-    return view.write(written).isOk() ? WRITE(*target, written) : XCode::FAILURE;
+    Attempt const attempt(*this);
+    XCode const seen = view.write(written);
+    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
 }
 
 CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
@@ -83,7 +92,7 @@ CC_Property const* CC_CallAdapter::getOwnProperty(unsigned int id) const { retur
 
 CC_Property const* CC_CallAdapter::getOwnPropertyUnfiltered(unsigned int id) const
 {
-    return m_ownCallLeg != nullptr ? std::as_const(*m_ownCallLeg).getProperties().get(id) : nullptr;
+    return m_ownCallLeg != nullptr ? m_ownCallLeg->getProperties().get(id) : nullptr;
 }
 
 XCode CC_CallAdapter::getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const
@@ -93,8 +102,7 @@ XCode CC_CallAdapter::getOwnProperties(CC_PropertyContainer& properties, unsigne
 
 XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_ownCallLeg != nullptr ? COPY(properties, std::as_const(*m_ownCallLeg).getProperties(), mask)
-                                   : XCode::ABSENT;
+    return m_ownCallLeg != nullptr ? COPY(properties, m_ownCallLeg->getProperties(), mask) : XCode::ABSENT;
 }
 
 XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
@@ -123,7 +131,7 @@ CC_Property const* CC_CallAdapter::getPeerProperty(unsigned int id) const { retu
 
 CC_Property const* CC_CallAdapter::getPeerPropertyUnfiltered(unsigned int id) const
 {
-    return m_peerCallLeg != nullptr ? std::as_const(*m_peerCallLeg).getProperties().get(id) : nullptr;
+    return m_peerCallLeg != nullptr ? m_peerCallLeg->getProperties().get(id) : nullptr;
 }
 
 XCode CC_CallAdapter::getPeerProperties(CC_PropertyContainer& properties, unsigned int mask) const
@@ -133,28 +141,41 @@ XCode CC_CallAdapter::getPeerProperties(CC_PropertyContainer& properties, unsign
 
 XCode CC_CallAdapter::getPeerPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_peerCallLeg != nullptr ? COPY(properties, std::as_const(*m_peerCallLeg).getProperties(), mask)
-                                    : XCode::ABSENT;
+    return m_peerCallLeg != nullptr ? COPY(properties, m_peerCallLeg->getProperties(), mask) : XCode::ABSENT;
 }
 
-XCode CC_CallAdapter::setPeerProperty(CC_Property const& property)
+namespace
 {
-    return writeFiltered(m_peerView, m_peerCallLeg, property);
+bool HAS_STATE(CC_Property const& property) { return property.getId() == CC_PropertyId::STATE; }
+bool HAS_STATE(CC_PropertyContainer const& properties) { return properties.get(CC_PropertyId::STATE) != nullptr; }
+} // namespace
+
+/// A State that is written to our view of the peer is what the peer was last seen in, so that its fall does not show
+/// when the leg tells it.
+template <class Written>
+XCode CC_CallAdapter::writePeer(Written const& written, bool isFiltered)
+{
+    if (m_peerCallLeg == nullptr)
+        return XCode::ABSENT;
+    CC_CallLeg::Reference const keepPeer(*m_peerCallLeg);
+    if (HAS_STATE(written))
+    {
+        m_isPeerToBeChosen = true;
+        std::ignore = m_peerChangeEvent->setIfNotPending(); // fails only for an event that was destroyed
+    }
+    return isFiltered ? writeFiltered(m_peerView, m_peerCallLeg, written)
+                      : writeUnfiltered(m_peerView, m_peerCallLeg, written);
 }
 
-XCode CC_CallAdapter::setPeerProperties(CC_PropertyContainer const& properties)
-{
-    return writeFiltered(m_peerView, m_peerCallLeg, properties);
-}
+XCode CC_CallAdapter::setPeerProperty(CC_Property const& property) { return writePeer(property, true); }
 
-XCode CC_CallAdapter::setPeerPropertyUnfiltered(CC_Property const& property)
-{
-    return writeUnfiltered(m_peerView, m_peerCallLeg, property);
-}
+XCode CC_CallAdapter::setPeerProperties(CC_PropertyContainer const& properties) { return writePeer(properties, true); }
+
+XCode CC_CallAdapter::setPeerPropertyUnfiltered(CC_Property const& property) { return writePeer(property, false); }
 
 XCode CC_CallAdapter::setPeerPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_peerView, m_peerCallLeg, properties);
+    return writePeer(properties, false);
 }
 
 // --- call ------------------------------------------------------------------------------------------------------------
@@ -178,31 +199,33 @@ XCode CC_CallAdapter::getCallPropertiesUnfiltered(CC_PropertyContainer& properti
     return call != nullptr ? COPY(properties, call->getProperties(), mask) : XCode::ABSENT;
 }
 
-XCode CC_CallAdapter::setCallProperty(CC_Property const& property)
+template <class Written>
+XCode CC_CallAdapter::writeCall(Written const& written, bool isFiltered)
 {
-    return writeFiltered(m_callView, getCall(), property);
+    CC_Call::Hold const keepCall(getCall());
+    return isFiltered ? writeFiltered(m_callView, keepCall.get(), written)
+                      : writeUnfiltered(m_callView, keepCall.get(), written);
 }
 
-XCode CC_CallAdapter::setCallProperties(CC_PropertyContainer const& properties)
-{
-    return writeFiltered(m_callView, getCall(), properties);
-}
+XCode CC_CallAdapter::setCallProperty(CC_Property const& property) { return writeCall(property, true); }
 
-XCode CC_CallAdapter::setCallPropertyUnfiltered(CC_Property const& property)
-{
-    return writeUnfiltered(m_callView, getCall(), property);
-}
+XCode CC_CallAdapter::setCallProperties(CC_PropertyContainer const& properties) { return writeCall(properties, true); }
+
+XCode CC_CallAdapter::setCallPropertyUnfiltered(CC_Property const& property) { return writeCall(property, false); }
 
 XCode CC_CallAdapter::setCallPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_callView, getCall(), properties);
+    return writeCall(properties, false);
 }
 
 // --- media context ---------------------------------------------------------------------------------------------------
 
 void CC_CallAdapter::setDatapathContext(MG_IContext* context)
 {
-    std::ignore = setCallProperty(CC_PropertyContextId(CC_PropertyId::CONTEXT, context)); // reports nothing
+    TYLifeline::Watch const self(m_lifeline);
+    CC_PropertyContextId const property(CC_PropertyId::CONTEXT, context); // null asks the media layer for one
+    if (self.isAlive())
+        std::ignore = setCallProperty(property); // reports nothing
 }
 
 MG_IContext* CC_CallAdapter::getDatapathContext()

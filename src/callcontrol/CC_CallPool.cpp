@@ -2,6 +2,7 @@
 
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "calls/CC_Monitor.h"
 #include "platform/base/NestingGuard.h"
 #include "platform/driver/DRIVER.h"
 #include "properties/CC_PropertyContextId.h"
@@ -22,21 +23,22 @@ String const LOCK_OWNER("Call-Control");
 String const LOCK_REASON("Calls are ongoing");
 unsigned int s_infoDepth = 0;
 
-void RELEASE_LOCK(TYPPtr<IRebootMgmt>& holder)
+/// The reboot management may destroy the pool that asks it, so it is asked through a holder of our own.
+template <class Ask>
+void ASK(TYPPtr<IRebootMgmt> const& holder, Ask&& ask)
 {
-    if (holder.isEmpty())
+    TYPPtr<IRebootMgmt> own(holder);
+    if (own.isEmpty())
         return;
-    TYLockPtr<IRebootMgmt> rebootMgmt(holder);
-    std::ignore = rebootMgmt.lock()->releaseGracefulLock(LOCK_OWNER); // nothing could be done about a refusal
+    TYLockPtr<IRebootMgmt> rebootMgmt(own);
+    ask(*rebootMgmt.lock());
     rebootMgmt.unlock();
 }
 
-void REMOVE_CALL_LEGS(CC_Call& call)
+void RELEASE_LOCK(TYPPtr<IRebootMgmt> const& holder)
 {
-    // no more than there are now: an observer that always puts one back must not keep us here for ever
-    for (unsigned int left = call.getNumberOfCallLegs(); left > 0; --left)
-        if (CC_CallLeg* const leg = call.getCallLeg(0))
-            call.removeCallLeg(*leg);
+    ASK(holder, [](IRebootMgmt& rebootMgmt)
+        { std::ignore = rebootMgmt.releaseGracefulLock(LOCK_OWNER); }); // nothing could be done about a refusal
 }
 } // namespace
 
@@ -53,40 +55,89 @@ CC_CallPool::~CC_CallPool()
 
 CC_Call* CC_CallPool::acquireCall(MG_IContext* mgContext)
 {
+    TYLifeline::Watch const self(m_lifeline);
     CC_Call* const call = new (std::nothrow) CC_Call;
     if (call == nullptr)
         return nullptr;
-    call->setCallPool(this);
+    CC_Call::Hold const keepCall(call);
     if (m_calls.isEmpty())
-        addReloadGracefulLock();
-    call->m_poolElement = m_calls.append(call);
-    call->m_listedIn = call->m_poolElement != nullptr ? this : nullptr;
-    if (call->m_listedIn == nullptr || call->m_deferredEvent == nullptr) // could not be kept, or never be cleaned up
+        addReloadGracefulLock(); // the reboot management may destroy us
+    if (!self.isAlive() || !list(*call))
     {
-        unlist(*call);
         call->destroy();
-        if (m_calls.isEmpty())
+        if (self.isAlive() && m_calls.isEmpty())
             releaseReloadGracefulLock();
         return nullptr;
     }
     s_statistics.onCallAdded();
-    std::ignore = call->setProperty(CC_PropertyContextId(CC_PropertyId::CONTEXT, mgContext)); // without it: no media
-    return call;
+    giveContext(*call, mgContext); // the media layer may, too, or release the call
+    if (self.isAlive() && !keepCall.isReleased())
+        return call;
+    call->defer(); // nobody else would look at it
+    return nullptr;
 }
+
+/// Puts the call into our list. Not without its clean-up event: it would never end.
+bool CC_CallPool::list(CC_Call& call)
+{
+    if (call.m_deferredEvent == nullptr)
+        return false;
+    call.m_poolElement = m_calls.append(&call);
+    if (call.m_poolElement == nullptr)
+        return false;
+    call.m_listedIn = this;
+    call.setCallPool(this);
+    return true;
+}
+
+/// Making the property asks the media layer for a context when there is none: a call out, though it looks like a value.
+void CC_CallPool::giveContext(CC_Call& call, MG_IContext* mgContext)
+{
+    CC_PropertyContextId const context(CC_PropertyId::CONTEXT, mgContext);
+    std::ignore = call.setProperty(context); // without it: no media
+}
+
+/// The lock of a pool that a call is leaving: given back after the call's end, which may destroy the pool or bring it
+/// another call.
+class CC_CallPool::Lock
+{
+public:
+    explicit Lock(CC_CallPool const& pool)
+        : m_pool(pool), m_watch(pool.m_lifeline), m_rebootMgmt(pool.m_rebootMgmt), m_wasLast(pool.m_calls.isEmpty())
+    {
+    }
+    void giveBackIfUnused() const
+    {
+        if (m_watch.isAlive() ? m_pool.m_calls.isEmpty() : m_wasLast)
+            RELEASE_LOCK(m_rebootMgmt);
+    }
+
+private:
+    CC_CallPool const& m_pool;
+    TYLifeline::Watch m_watch;
+    TYPPtr<IRebootMgmt> m_rebootMgmt;
+    bool m_wasLast;
+};
 
 void CC_CallPool::releaseCall(CC_Call* call)
 {
     if (call == nullptr)
         return;
-    // the call's observers may destroy us; the lock is given back all the same when this was the last call
-    TYLifeline::Watch const self(m_lifeline);
-    TYPPtr<IRebootMgmt> rebootMgmt(m_rebootMgmt);
-    unlist(*call);
-    bool const wasLast = m_calls.isEmpty();
+    CC_CallPool& lister = call->m_listedIn != nullptr ? *call->m_listedIn : *this;
+    lister.unlist(*call);
+    if (&lister == this)
+        return end(*call);
+    Lock const ofTheLister(lister); // the call is another pool's
+    end(*call);
+    ofTheLister.giveBackIfUnused();
+}
+
+void CC_CallPool::end(CC_Call& call)
+{
+    Lock const lock(*this);
     s_statistics.onCallRemoved();
-    call->destroy();
-    if (self.isAlive() ? m_calls.isEmpty() : wasLast)
-        RELEASE_LOCK(self.isAlive() ? m_rebootMgmt : rebootMgmt);
+    call.destroy();
+    lock.giveBackIfUnused();
 }
 
 /// Takes the call out of our list if it is there, in constant time.
@@ -124,13 +175,22 @@ void CC_CallPool::dropCalls(String const&, String const& callName)
         CC_Call::Hold const keepCall(&call);
         CC_Call::Hold const keepNext(element->getNext() != nullptr ? element->getNext()->getValue() : nullptr);
         if (name.isEmpty() || name == call.getName())
-            REMOVE_CALL_LEGS(call);
+            dropCall(call);
         if (!self.isAlive())
             return;
         // an observer may have released the next call: begin again, the calls before have no legs any more
         CC_Call const* const next = keepNext.get();
         element = next == nullptr ? nullptr : next->m_listedIn == this ? next->m_poolElement : m_calls.getFirst();
     }
+}
+
+void CC_CallPool::dropCall(CC_Call& call)
+{
+    CC_Call::Hold const keepCall(&call);
+    if (call.removeAllCallLegs())
+        return;
+    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE))
+        monitor->debug("[Call %s] Legs come back for ever: some stay", call.getName().c_str());
 }
 
 void CC_CallPool::addReloadGracefulLock()
@@ -145,9 +205,8 @@ void CC_CallPool::addReloadGracefulLock()
         if (m_rebootMgmt.isEmpty())
             return;
     }
-    TYLockPtr<IRebootMgmt> rebootMgmt(m_rebootMgmt);
-    std::ignore = rebootMgmt.lock()->addGracefulLock(LOCK_OWNER, LOCK_REASON, 0); // a refusal stops no call
-    rebootMgmt.unlock();
+    ASK(m_rebootMgmt, [](IRebootMgmt& rebootMgmt)
+        { std::ignore = rebootMgmt.addGracefulLock(LOCK_OWNER, LOCK_REASON, 0); }); // a refusal stops no call
 }
 
 void CC_CallPool::releaseReloadGracefulLock() { RELEASE_LOCK(m_rebootMgmt); }

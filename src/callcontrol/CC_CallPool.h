@@ -84,7 +84,13 @@ public:
     static TY::Time s_tLastUpdate;
 
 private:
-    void unlist(CC_Call& call) override;
+    bool list(CC_Call& call);
+    class Lock;
+
+    void unlist(CC_Call& call);
+    void end(CC_Call& call);
+    static void giveContext(CC_Call& call, MG_IContext* mgContext);
+    static void dropCall(CC_Call& call);
 
     TYList<CC_Call*> m_calls;
     TYPPtr<IRebootMgmt> m_rebootMgmt;

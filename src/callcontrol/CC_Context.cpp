@@ -98,7 +98,7 @@ CC_Call* CC_Context::acquireCall(MG_IContext* mgContext)
     if (m_callPool == nullptr)
         return nullptr;
     CC_Call* const call = m_callPool->acquireCall(mgContext);
-    if (call == nullptr)
+    if (call == nullptr) // none could be had, or whoever was asked for it has destroyed us
         return nullptr;
     CC_Call::Hold const keepCall(call);
     m_observers.notifyObservers(NOTIFY_OBSERVER_ABOUT_CREATE_CALL, *this, call);

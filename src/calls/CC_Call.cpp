@@ -20,6 +20,7 @@ unsigned int CC_Call::s_numberOfInstances = 0;
 namespace
 {
 unsigned int s_infoDepth = 0;
+unsigned long long s_lastSerial = 0;
 
 void LOG_PROPERTY(String const& callName, CC_Property const& property)
 {
@@ -40,7 +41,9 @@ void LOG_PROPERTY(String const& callName, CC_Property const& property)
 }
 } // namespace
 
-CC_Call::CC_Call() : m_name(String::addressOf(this)) // short enough to need no memory
+CC_Call::CC_Call()
+    : m_name(String::addressOf(this)) // short enough to need no memory
+    , m_serial(++s_lastSerial)
 {
     ++s_numberOfInstances;
     TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
@@ -99,13 +102,11 @@ XCode CC_Call::addCallLegObserver(CC_CallLegObserver* observer)
         return result;
     for (unsigned int i = 0; i < m_callLegs.getSize(); ++i)
     {
-        // a leg that is still on its way in gets all our observers at the end of its move
-        if (m_callLegs[i]->m_observedBy != this || m_callLegs[i]->addCallLegObserver(observer).isOk())
+        if (addLegObserver(*m_callLegs[i], observer).isOk())
             continue;
         // whoever is refused does not unregister, so nothing may stay
         while (i-- > 0)
-            if (m_callLegs[i]->m_observedBy == this)
-                m_callLegs[i]->removeCallLegObserver(observer);
+            removeLegObserver(*m_callLegs[i], observer);
         m_callLegObservers.removeObserver(observer);
         return XCode::NO_ELEMENT;
     }
@@ -116,12 +117,12 @@ void CC_Call::removeCallLegObserver(CC_CallLegObserver const* observer)
 {
     m_callLegObservers.removeObserver(observer);
     for (CC_CallLeg* const leg : m_callLegs)
-        if (leg->m_observedBy == this)
-            leg->removeCallLegObserver(observer);
+        removeLegObserver(*leg, observer);
 }
 
 XCode CC_Call::setPropertyNoNotification(CC_Property const& property, bool& changed)
 {
+    Hold const self(this); // the property and whoever logs it are others' code
     changed = false;
     CC_Property const* const stored = m_properties.get(property.getId());
     if (stored != nullptr && stored->isEqual(property))
@@ -135,6 +136,7 @@ XCode CC_Call::setPropertyNoNotification(CC_Property const& property, bool& chan
 
 XCode CC_Call::setProperty(CC_Property const& property)
 {
+    Hold const self(this);
     bool changed = false;
     if (!setPropertyNoNotification(property, changed).isOk())
         return XCode::FAILURE;
@@ -142,7 +144,6 @@ XCode CC_Call::setProperty(CC_Property const& property)
     {
         CC_Flags flags;
         std::ignore = flags.set(property.getId(), true); // without memory the observers hear of a change, not of which
-        Hold const self(this);
         m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
                                        &CC_CallObserver::onCallPropertyChanged);
     }
@@ -151,6 +152,7 @@ XCode CC_Call::setProperty(CC_Property const& property)
 
 XCode CC_Call::setProperties(CC_PropertyContainer const& properties)
 {
+    Hold const self(this);
     XCode result = XCode::OK;
     CC_Flags flags;
     for (CC_Property const& property : properties)
@@ -161,7 +163,6 @@ XCode CC_Call::setProperties(CC_PropertyContainer const& properties)
         if (changed)
             std::ignore = flags.set(property.getId(), true); // as in setProperty
     }
-    Hold const self(this);
     m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
                                    &CC_CallObserver::onCallPropertyChanged);
     return result;

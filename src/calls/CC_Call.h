@@ -56,8 +56,10 @@ public:
     /// Deletes the call, or, when one of its operations is under way, sees to it that the call is deleted as that ends.
     void destroy();
 
-    /// The call's identity in logs and dumps: its address.
+    /// The call's identity in logs and dumps: its address, which another call may get once this one has ended.
     String const& getName() const { return m_name; }
+    /// The call's number in this process, from 1 on in the order of their making; never used again.
+    unsigned long long getSerial() const { return m_serial; }
     /// The pool that handed the call out and takes it back; null: the call destroys itself when it is over.
     CC_CallOwner* getCallPool() const { return m_callPool; }
     void setCallPool(CC_CallOwner* callPool) { m_callPool = callPool; }
@@ -94,14 +96,15 @@ public:
     State getState() const;
 
     /// Moves the leg out of its call (if any) into `to` (null: into none) and tells, in this order, the old call's
-    /// observers, the new call's, and the leg's. OK, or NO_ELEMENT when memory is out; nothing has moved then.
-    /// A move asked for inside a move of the same leg is OK and made when that one has ended.
+    /// observers, the new call's, and the leg's. OK; NO_ELEMENT when memory is out, or `to` or the leg is ending;
+    /// nothing has moved then.
+    /// A move asked for inside a move of the same leg is OK and made when that one has ended, unless `to` ends before.
     static XCode TRANSFER_CALL_LEG(CC_Call* to, CC_CallLeg& leg);
     /// Moves the leg here and defers. OK, or FAILURE.
     XCode addCallLeg(CC_CallLeg& leg);
     /// Takes the leg out of the call that it is in, and defers this one.
     void removeCallLeg(CC_CallLeg& leg);
-    /// Takes every leg out.
+    /// Takes every leg out, each once: one that an observer puts back stays.
     void destroyParticipatingCallLegs();
 
     /// Asks for `deferred()` in the loop's next turn, once however often it is asked.
@@ -127,6 +130,10 @@ public:
     /// The number of calls alive.
     static unsigned int s_numberOfInstances;
 
+    /// How many legs an operation that takes out "all" takes at most: far beyond any honest use, it ends what an
+    /// observer that always brings one back would keep going for ever.
+    static constexpr unsigned int MOST_MOVES = 100000;
+
     /// Keeps a call from being deleted while an operation that uses it is under way. Holding null is allowed.
     class CC_EXPORT Hold
     {
@@ -147,15 +154,22 @@ public:
 private:
     friend class CC_CallPool;
 
+    /// Whether the call takes part in nothing any more: it is in its destructor, or will be when the last hold ends.
+    bool isOver() const { return m_isEnding || m_isReleased; }
     static XCode MOVE(CC_Call* to, CC_CallLeg& leg);
+    XCode addLegObserver(CC_CallLeg& leg, CC_CallLegObserver* observer);
+    void removeLegObserver(CC_CallLeg& leg, CC_CallLegObserver const* observer);
     void giveObserversTo(CC_CallLeg& leg);
     void takeObserversFrom(CC_CallLeg& leg);
     void unlist(CC_CallLeg const& leg);
     bool isListed(CC_CallLeg const& leg) const;
     void removeReleasedCallLegs();
+    bool removeAllCallLegs();
+    CC_CallLeg* findCallLegAtRest() const;
+    void deferIfAbandoned();
     bool hasLiveCallLeg() const;
-    template <class Handle>
-    void forEachCallLeg(Handle&& handle);
+    template <class IsToGo>
+    void takeOutCallLegs(IsToGo&& isToGo);
     void giveBack();
     void pushBackOnLoop();
     CC_CallLeg* findPushBackTarget() const;
@@ -167,9 +181,11 @@ private:
     CC_ObserverContainer<CC_CallObserver, CC_Call> m_callObservers;
     CC_ObserverContainer<CC_CallLegObserver, CC_CallLeg> m_callLegObservers;
     TYSmallVector<CC_CallLeg*, 4> m_callLegs;
-    CC_CallOwner* m_listedIn = nullptr; // the pool whose list m_poolElement is in
+    CC_CallPool* m_listedIn = nullptr; // the pool whose list m_poolElement is in
     TYList<CC_Call*>::Element* m_poolElement = nullptr;
     unsigned int m_holds = 0;
-    bool m_isReleased = false; // delete when the last hold ends
-    bool m_isEnding = false;   // in the destructor: takes no leg any more
+    bool m_isReleased = false;   // delete when the last hold ends
+    bool m_isEnding = false;     // in the destructor: takes no leg any more
+    bool m_isCleaningUp = false; // looks itself whether a live leg is left
+    unsigned long long const m_serial;
 };

@@ -18,6 +18,7 @@ unsigned int CC_CallLeg::s_numberOfInstances = 0;
 namespace
 {
 unsigned int s_infoDepth = 0;
+unsigned long long s_lastSerial = 0;
 
 /// Whether somebody logs it.
 bool LOG_PROPERTY(String const& legName, CC_Property const& property)
@@ -45,15 +46,23 @@ bool LOG_PROPERTY(String const& legName, CC_Property const& property)
     return true;
 }
 
+using State = CC_PropertyCallLegState;
+
 /// Whether the property may become a leg's State: never IDLE again, and never another class.
 bool IS_STATE_ACCEPTED(CC_Property const& property)
 {
-    auto const* const state = CC_PropertyCallLegState::FROM(&property);
-    return state != nullptr && state->getState() != CC_PropertyCallLegState::IDLE;
+    auto const* const state = State::FROM(&property);
+    return state != nullptr && state->getState() != State::IDLE;
+}
+
+bool IS_RELEASED(CC_Property const& property)
+{
+    auto const* const state = State::FROM(&property);
+    return state != nullptr && state->getState() == State::RELEASED;
 }
 } // namespace
 
-CC_CallLeg::CC_CallLeg()
+CC_CallLeg::CC_CallLeg() : m_serial(++s_lastSerial)
 {
     ++s_numberOfInstances;
     // straight into the container: this is the one time that the state is IDLE. What memory refuses is absent, and a
@@ -112,6 +121,7 @@ int CC_CallLeg::getState() const
 
 XCode CC_CallLeg::setPropertyNoNotification(CC_Property const& property, bool& changed)
 {
+    Reference const self(*this);
     m_mayChangeUntold = true;
     return store(property, changed);
 }
@@ -121,6 +131,8 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
     changed = false;
     CC_Property* stored = m_properties.get(property.getId());
     if (stored != nullptr && stored->isEqual(property))
+        return XCode::OK;
+    if (m_isStateFixed && property.getId() == CC_PropertyId::STATE && !IS_RELEASED(property))
         return XCode::OK;
     if (LOG_PROPERTY(m_name, property))
         stored = m_properties.get(property.getId()); // a monitor is the host's code
@@ -134,6 +146,7 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
 
 XCode CC_CallLeg::setProperty(CC_Property const& property)
 {
+    Reference const self(*this); // the property and whoever logs it are others' code, as observers are
     CC_Flags flags;
     bool changed = false;
     if (!storeAndMark(property, flags, changed).isOk())
@@ -145,6 +158,7 @@ XCode CC_CallLeg::setProperty(CC_Property const& property)
 
 XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
 {
+    Reference const self(*this);
     XCode result = XCode::OK;
     CC_Flags flags;
     CC_Property const* state = nullptr;
@@ -185,7 +199,6 @@ XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, boo
 /// Hands the flags over: a copy could lack memory, and the call must hear of a State.
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
-    Reference const self(*this);
     ++m_numberOfNotifications;
     m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
                                &CC_CallLegObserver::onCallLegPropertyChanged);

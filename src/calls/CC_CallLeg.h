@@ -21,11 +21,12 @@ class CC_Service;
 /// active leg and the call's end rest. Belongs to the call-control loop's thread; only references may be given up
 /// elsewhere.
 ///
+///     using State = CC_PropertyCallLegState;
 ///     CC_CallLeg* const leg = new CC_CallLeg;
-///     leg->setName("sip/7");
+///     std::ignore = leg->setName("sip/7");
 ///     std::ignore = call.addCallLeg(*leg);
-///     std::ignore = leg->setProperty(CC_PropertyCallLegState(CC_PropertyId::STATE,
-///     CC_PropertyCallLegState::ALERTING)); leg->removeReference();
+///     std::ignore = leg->setProperty(State(CC_PropertyId::STATE, State::ALERTING));
+///     leg->removeReference();
 class CC_EXPORT CC_CallLeg : public TYRecycled
 {
 public:
@@ -43,6 +44,8 @@ public:
     /// Sets the pointer alone: a leg is put into a call by `CC_Call::addCallLeg`.
     void setCall(CC_Call* call) { m_call = call; }
 
+    /// The leg's number in this process, from 1 on in the order of their making; never used again.
+    unsigned long long getSerial() const { return m_serial; }
     String const& getName() const { return m_name; }
     /// The text after "EP" in the leg's log lines. OK, or FAILURE when memory is out.
     XCode setName(String const& name);
@@ -57,8 +60,9 @@ public:
     int getActivityLevel() const { return getState(); }
 
     CC_PropertyContainer const& getProperties() const { return m_properties; }
-    /// For who writes to the properties without telling anybody.
-    CC_PropertyContainer& getProperties()
+    /// For who writes to the properties without telling anybody. Whoever keeps a copy of them compares everything from
+    /// then on (`mayChangeUntold`), so read through the other.
+    CC_PropertyContainer& getPropertiesToWrite()
     {
         m_mayChangeUntold = true;
         return m_properties;
@@ -79,6 +83,10 @@ public:
     /// several States the last counts. The observers are always told once, of the ids that changed, even of none.
     /// OK, or the first failure (REFUSED); the others are stored all the same.
     XCode setProperties(CC_PropertyContainer const& properties);
+
+    /// Its owner is letting the leg go: from now on it takes no State but RELEASED. Any other is left out, as if it
+    /// equalled the stored one, so that who writes back a stale copy of the properties does not bring the leg to life.
+    void fixState() { m_isStateFixed = true; }
 
     /// Hands the service to the leg's observers at once. The adapters of the call's other legs are among them.
     void invokeSynchronousService(CC_Service& service);
@@ -122,6 +130,8 @@ private:
     bool m_isMissedByCall = false;         // our call is not among our observers: memory was out
     bool m_isEnding = false;               // in the destructor: goes into no call any more
     bool m_mayChangeUntold = false;        // for good
+    bool m_isStateFixed = false;           // at RELEASED, for good
     unsigned int m_numberOfNotifications = 0;
-    unsigned long long m_lastWalk = 0; // the last of a call's walks over its legs that handled this one
+    unsigned long long m_lastWalk = 0; // the last of a call's walks over its legs that took this one out
+    unsigned long long const m_serial;
 };

@@ -10,8 +10,6 @@ class CC_EXPORT CC_CallOwner
 public:
     /// Takes the call back and destroys it. Null is ignored.
     virtual void releaseCall(CC_Call* call) = 0;
-    /// The call is going, whoever it was given back to: it must not be listed any more. Nothing happens when it is not.
-    virtual void unlist(CC_Call& call) = 0;
 
 protected:
     ~CC_CallOwner() = default; // nobody destroys an owner through this

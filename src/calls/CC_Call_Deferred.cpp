@@ -23,16 +23,19 @@ void CC_Call::DEFERRED(void* call) { static_cast<CC_Call*>(call)->deferred(); }
 
 void CC_Call::deferred()
 {
-    if (m_isEnding || m_isReleased)
+    if (isOver())
         return; // asked for from inside its end
     Hold const self(this);
+    bool const wasCleaningUp = std::exchange(m_isCleaningUp, true);
     removeReleasedCallLegs();
     if (self.isReleased())
         return; // an observer was faster
-    if (hasLiveCallLeg())
-        pushBackOnLoop();
-    else
+    bool const isLive = hasLiveCallLeg();
+    if (!isLive)
         giveBack();
+    m_isCleaningUp = wasCleaningUp;
+    if (isLive)
+        pushBackOnLoop();
 }
 
 bool CC_Call::hasLiveCallLeg() const
@@ -59,10 +62,9 @@ void CC_Call::pushBackOnLoop()
     CC_CallLeg* const target = findPushBackTarget();
     if (target == nullptr)
         return;
-    auto const& network = static_cast<CC_PropertyString const&>(
-        *std::as_const(*m_callLegs[0]).getProperties().get(CC_PropertyId::NETWORK));
-    auto const& id = static_cast<CC_PropertyUnsigned const&>(
-        *std::as_const(*target).getProperties().get(CC_PropertyId::CALL_LEG_ID));
+    auto const& network =
+        static_cast<CC_PropertyString const&>(*m_callLegs[0]->getProperties().get(CC_PropertyId::NETWORK));
+    auto const& id = static_cast<CC_PropertyUnsigned const&>(*target->getProperties().get(CC_PropertyId::CALL_LEG_ID));
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[Call %s] Internal loop detected; push-back to %s", m_name.c_str(), network.getValue().c_str());
     CC_ServicePushBack pushBack(id.getValue());
@@ -79,7 +81,7 @@ CC_CallLeg* CC_Call::findPushBackTarget() const
     CC_PropertyUnsigned const* ids[2];
     for (unsigned int i = 0; i < 2; ++i)
     {
-        CC_PropertyContainer const& properties = std::as_const(*legs[i]).getProperties();
+        CC_PropertyContainer const& properties = legs[i]->getProperties();
         networks[i] = CC_PropertyString::FROM(properties.get(CC_PropertyId::NETWORK));
         ids[i] = CC_PropertyUnsigned::FROM(properties.get(CC_PropertyId::CALL_LEG_ID));
         if (networks[i] == nullptr || ids[i] == nullptr)

@@ -1,13 +1,29 @@
 // How legs enter, leave and change calls.
+//
+// A move tells three circles of observers: the old call's that the leg has left, the new call's that it has joined, the
+// leg's that it was relinked. Any of them may drop or move the very leg, end either call, or join. What keeps it whole:
+// - The outermost move of a leg holds the leg and both calls. A move of the same leg asked for inside it waits (`Move`,
+//   on the outermost one's stack) and is made when it has ended; of several the last one counts. A call that ends or
+//   was released takes part in none, also when it does so while the move waits.
+// - The leg is in the new call's list from the start, but gets the new call's leg observers only after the news
+//   (`m_observedBy`). Who is added to the call's in between is added to the leg at once and not again (`given`).
+// - A call whose last live leg has left has itself looked at: nobody else would.
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "properties/CC_PropertyCallLegState.h"
 
+#include <algorithm>
 #include <tuple>
 
 namespace
 {
 unsigned long long s_walks = 0; // of calls over their legs
+
+template <class List, class Value>
+bool CONTAINS(List const& list, Value const* value)
+{
+    return std::find(list.begin(), list.end(), value) != list.end();
+}
 } // namespace
 
 /// A leg's move between calls, while it is under way; on the stack of the outermost one.
@@ -15,10 +31,15 @@ struct CC_CallLeg::Move
 {
     CC_Call::Hold target; // of the move that was asked for meanwhile
     bool isAskedAgain = false;
+    TYSmallVector<CC_CallLegObserver const*, 4> given; // the leg observers of the new call that it has already
 };
 
 XCode CC_Call::TRANSFER_CALL_LEG(CC_Call* to, CC_CallLeg& leg)
 {
+    if (to == leg.m_call && leg.m_move == nullptr)
+        return XCode::OK;
+    if (to != nullptr && to->isOver())
+        return XCode::NO_ELEMENT;
     if (leg.m_move != nullptr)
     {
         Hold target(to);
@@ -26,8 +47,6 @@ XCode CC_Call::TRANSFER_CALL_LEG(CC_Call* to, CC_CallLeg& leg)
         leg.m_move->isAskedAgain = true;
         return XCode::OK;
     }
-    if (to == leg.m_call)
-        return XCode::OK;
 
     CC_CallLeg::Reference const keepLeg(leg);
     Hold target(to);
@@ -55,7 +74,7 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         return XCode::OK;
     if (to != nullptr)
     {
-        if (to->m_isEnding || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
+        if (to->isOver() || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
             return XCode::NO_ELEMENT;
         leg.addReference(); // the new call's
     }
@@ -74,7 +93,10 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
     }
     leg.m_observers.broadcastEvent(CC_EvCallLegCallRelinked(leg, to, from), &CC_CallLegObserver::onCallLegCallRelinked);
     if (from != nullptr)
+    {
         leg.removeReference(); // the old call's
+        from->deferIfAbandoned();
+    }
     return XCode::OK;
 }
 
@@ -85,9 +107,36 @@ void CC_Call::giveObserversTo(CC_CallLeg& leg)
     m_callLegObservers.forEach(
         [&](CC_CallLegObserver& observer)
         {
-            if (!leg.addCallLegObserver(&observer).isOk() && &observer == this)
+            bool const isGiven = CONTAINS(leg.m_move->given, &observer);
+            if (!isGiven && !leg.addCallLegObserver(&observer).isOk() && &observer == this)
                 leg.m_isMissedByCall = true;
         });
+}
+
+/// One more observer of all legs, for this one. A leg that is still on its way in gets the others later, and this one
+/// not again.
+XCode CC_Call::addLegObserver(CC_CallLeg& leg, CC_CallLegObserver* observer)
+{
+    bool const isOnItsWay = leg.m_observedBy != this;
+    if (isOnItsWay && !leg.m_move->given.append(observer).isOk())
+        return XCode::NO_ELEMENT;
+    XCode const result = leg.addCallLegObserver(observer);
+    if (!result.isOk() && isOnItsWay)
+        leg.m_move->given.remove(leg.m_move->given.getSize() - 1);
+    return result;
+}
+
+void CC_Call::removeLegObserver(CC_CallLeg& leg, CC_CallLegObserver const* observer)
+{
+    if (leg.m_observedBy != this)
+    {
+        auto& given = leg.m_move->given;
+        auto const* const found = std::find(given.begin(), given.end(), observer);
+        if (found == given.end())
+            return; // it has not got this one yet
+        given.remove(static_cast<unsigned int>(found - given.begin()));
+    }
+    leg.removeCallLegObserver(observer);
 }
 
 void CC_Call::takeObserversFrom(CC_CallLeg& leg)
@@ -104,13 +153,7 @@ void CC_Call::unlist(CC_CallLeg const& leg)
             m_callLegs.remove(i);
 }
 
-bool CC_Call::isListed(CC_CallLeg const& leg) const
-{
-    for (CC_CallLeg const* const other : m_callLegs)
-        if (other == &leg)
-            return true;
-    return false;
-}
+bool CC_Call::isListed(CC_CallLeg const& leg) const { return CONTAINS(m_callLegs, &leg); }
 
 XCode CC_Call::addCallLeg(CC_CallLeg& leg)
 {
@@ -128,21 +171,22 @@ void CC_Call::removeCallLeg(CC_CallLeg& leg)
     defer();
 }
 
-/// Calls `handle(leg)` once for each leg in order, those that join meanwhile included, whatever it and the observers
-/// behind it do to the list. A leg that comes back is not handled again, or an observer that always puts it back would
-/// keep us here for ever.
-template <class Handle>
-void CC_Call::forEachCallLeg(Handle&& handle)
+/// Takes out each leg of which `isToGo(leg)`, in order, those that join meanwhile included, whatever the observers do
+/// to the list. A leg that comes back stays, or an observer that always puts it back would keep us here for ever.
+template <class IsToGo>
+void CC_Call::takeOutCallLegs(IsToGo&& isToGo)
 {
     unsigned long long const walk = ++s_walks;
-    for (unsigned int i = 0; i < m_callLegs.getSize();)
+    unsigned int left = MOST_MOVES;
+    for (unsigned int i = 0; i < m_callLegs.getSize() && left > 0;)
     {
         CC_CallLeg* const leg = m_callLegs[i];
         CC_CallLeg* const next = getCallLeg(i + 1);
-        if (leg->m_lastWalk < walk) // else by this walk, or by one inside it
+        if (leg->m_lastWalk < walk && isToGo(*leg)) // else taken out by this walk, or by one inside it, and back
         {
+            --left;
             leg->m_lastWalk = walk;
-            handle(*leg);
+            std::ignore = TRANSFER_CALL_LEG(nullptr, *leg); // needs no memory
         }
         if (getCallLeg(i) == leg)
             ++i;
@@ -154,17 +198,43 @@ void CC_Call::forEachCallLeg(Handle&& handle)
 void CC_Call::destroyParticipatingCallLegs()
 {
     Hold const self(this);
-    forEachCallLeg([](CC_CallLeg& leg) { std::ignore = TRANSFER_CALL_LEG(nullptr, leg); }); // needs no memory
+    takeOutCallLegs([](CC_CallLeg const&) { return true; });
 }
 
 /// Takes out the released legs that nobody but the call holds. One that an adapter still holds stays until it is let
 /// go.
 void CC_Call::removeReleasedCallLegs()
 {
-    forEachCallLeg(
-        [](CC_CallLeg& leg)
-        {
-            if (leg.getState() == CC_PropertyCallLegState::RELEASED && leg.m_referenceCount.load() == 1)
-                std::ignore = TRANSFER_CALL_LEG(nullptr, leg); // needs no memory
-        });
+    takeOutCallLegs(
+        [](CC_CallLeg const& leg)
+        { return leg.getState() == CC_PropertyCallLegState::RELEASED && leg.m_referenceCount.load() == 1; });
+}
+
+/// Takes legs out as long as there are any, those that come back included. Whether that came to an end.
+bool CC_Call::removeAllCallLegs()
+{
+    Hold const self(this);
+    for (unsigned int left = MOST_MOVES; CC_CallLeg* const leg = findCallLegAtRest(); --left)
+    {
+        if (left == 0)
+            return false;
+        removeCallLeg(*leg);
+    }
+    destroyParticipatingCallLegs(); // those on their move go when that has ended
+    return true;
+}
+
+CC_CallLeg* CC_Call::findCallLegAtRest() const
+{
+    for (CC_CallLeg* const leg : m_callLegs)
+        if (leg->m_move == nullptr)
+            return leg;
+    return nullptr;
+}
+
+/// A call without a live leg ends in its clean-up; who has left it does not ask for that.
+void CC_Call::deferIfAbandoned()
+{
+    if (!isOver() && !m_isCleaningUp && !hasLiveCallLeg())
+        defer();
 }

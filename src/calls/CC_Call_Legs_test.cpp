@@ -98,11 +98,11 @@ TEST_F(CC_Call_LegsTest, TheCallsObserveTheirOwnLegsAlone)
     settle();
     EXPECT_EQ(y.addCallLeg(leg), XCode::OK);
     settle();
-    EXPECT_EQ(numberOfCalls(), 2u) << "nobody has told X to look after itself";
+    EXPECT_EQ(numberOfCalls(), 1u) << "X is over: its last leg has left";
+    EXPECT_EQ(CallControl::GET_CALL("SWITCH", 0), &y);
     setState(leg, LegState::RELEASED);
     settle();
-    EXPECT_EQ(numberOfCalls(), 1u);
-    EXPECT_EQ(CallControl::GET_CALL("SWITCH", 0), &x);
+    EXPECT_EQ(numberOfCalls(), 0u);
 }
 
 TEST_F(CC_Call_LegsTest, LegsKeepTheOrderOfJoining)
@@ -126,8 +126,7 @@ TEST_F(CC_Call_LegsTest, RemovingALegOfAnotherCallTakesItFromItsOwnAndDefersThis
     EXPECT_EQ(m_journal.take(), Lines{"x: L left X"});
     EXPECT_EQ(leg.getCall(), nullptr);
     settle();
-    EXPECT_EQ(numberOfCalls(), 1u);
-    EXPECT_EQ(CallControl::GET_CALL("SWITCH", 0), &x) << "Y was deferred and had no leg";
+    EXPECT_EQ(numberOfCalls(), 0u) << "Y was deferred and had no leg, X has lost its last one";
 }
 
 TEST_F(CC_Call_LegsTest, DestroyParticipatingCallLegsTakesEveryLegOutInOrder)

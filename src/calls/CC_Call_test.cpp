@@ -71,7 +71,7 @@ TEST_F(CC_CallTest, ItsStateCountsTheActiveLegsDisconnectingOnesIncluded)
     EXPECT_EQ(m_call.getState(), CC_Call::CONFERENCE);
     setState(third, LegState::RELEASED);
     EXPECT_EQ(m_call.getState(), CC_Call::ACTIVE);
-    second.getProperties().remove(CC_PropertyId::STATE);
+    second.getPropertiesToWrite().remove(CC_PropertyId::STATE);
     EXPECT_EQ(m_call.getState(), CC_Call::INACTIVE);
 }
 
@@ -346,7 +346,7 @@ TEST_F(CC_CallTest, AnObserverThatAlwaysPutsALegBackCannotKeepTheCallFromEnding)
     unsigned int refused = 0;
     observe(m_call, "o").m_onLegRemoved = [&](CC_EvCallCallLegModified const& event)
     {
-        EXPECT_EQ(event.getSource()->addCallLeg(*event.getCallLeg()), XCode::OK) << "noted, and refused at its turn";
+        EXPECT_EQ(event.getSource()->addCallLeg(*event.getCallLeg()), XCode::FAILURE) << "it takes no leg any more";
         ++refused;
     };
     CallControl::RELEASE_CALL("SWITCH", &m_call);

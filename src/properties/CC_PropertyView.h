@@ -25,6 +25,8 @@ public:
     };
 
     CC_PropertyContainer const& getProperties() const { return m_properties; }
+    /// Whether that notification of the source is the last that was heard, or looked at with everything else.
+    bool hasHeard(unsigned int number) const { return m_lastHeard == number; }
     void clear();
 
     /// Stores into the view alone, as the container's `set` does; the source may or may not follow.
