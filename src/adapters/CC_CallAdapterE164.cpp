@@ -1,7 +1,13 @@
+// Dialling by number, and the re-dial that bridges overlap sending.
+//
+// A dial is remembered whole or not at all, as a record that nobody changes while a dial uses it: the digits that are
+// collected meanwhile go into a copy. So whoever is told of a dial may destroy the adapter or dial elsewhere.
 #include "adapters/CC_CallAdapterE164.h"
 
 #include "adapters/CC_CallAdapterE164_ValueOf.h"
 #include "callcontrol/CallControl.h"
+#include "platform/base/TYCounted.h"
+#include "platform/base/TYRecycled.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
@@ -54,10 +60,9 @@ void MERGE(CC_PropertyContainer& container, CC_PropertyContainer const* extra)
 }
 
 /// Copying a container tells nothing of what memory has refused.
-bool COPY(CC_PropertyContainer& to, CC_PropertyContainer const& from)
+bool IS_WHOLE(CC_PropertyContainer const& copy, CC_PropertyContainer const& original)
 {
-    to = from;
-    return to.getNumberOfProperties() == from.getNumberOfProperties();
+    return copy.getNumberOfProperties() == original.getNumberOfProperties();
 }
 
 XCode OK_OR_FAILURE(XCode result) { return result.isOk() ? XCode::OK : XCode::FAILURE; }
@@ -68,6 +73,47 @@ bool IS_COLLECTING(CC_PropertyCallLegState::State state)
     return state >= CC_PropertyCallLegState::TRYING && state <= CC_PropertyCallLegState::ALERTING;
 }
 } // namespace
+
+/// All arguments of a dial. Counted: a dial that uses them goes on, and does not see them change, when the adapter ends
+/// or dials elsewhere meanwhile.
+struct CC_CallAdapterE164::LastDial : TYCounted, TYRecycled
+{
+    /// Throws std::bad_alloc when memory is out.
+    LastDial(String const& theContextName, String const& theProviderName, String const& theDestination,
+             MG_IContext* theDatapathContext)
+        : contextName(theContextName)
+        , providerName(theProviderName)
+        , destination(theDestination)
+        , datapathContext(theDatapathContext)
+    {
+    }
+
+    /// Whether the arguments are these very objects.
+    bool isMadeOf(String const& aContextName, String const& aProviderName, String const& aDestination,
+                  CC_PropertyContainer const& own, CC_PropertyContainer const& offer, CC_PropertyContainer const& call,
+                  MG_IContext const* aDatapathContext) const
+    {
+        return &aContextName == &contextName && &aProviderName == &providerName && &aDestination == &destination &&
+               &own == &ownProperties && &offer == &offerProperties && &call == &callProperties &&
+               aDatapathContext == datapathContext.get();
+    }
+    /// Whether memory sufficed.
+    bool copy(CC_PropertyContainer const& own, CC_PropertyContainer const& offer, CC_PropertyContainer const& call)
+    {
+        ownProperties = own;
+        offerProperties = offer;
+        callProperties = call;
+        return IS_WHOLE(ownProperties, own) && IS_WHOLE(offerProperties, offer) && IS_WHOLE(callProperties, call);
+    }
+
+    String contextName;
+    String providerName;
+    String destination;
+    TYPtr<MG_IContext> datapathContext;
+    CC_PropertyContainer ownProperties;
+    CC_PropertyContainer offerProperties;
+    CC_PropertyContainer callProperties;
+};
 
 CC_CallAdapterE164::CC_CallAdapterE164() = default;
 
@@ -83,31 +129,10 @@ XCode CC_CallAdapterE164::setup(String const& name, CC_Endpoint& endpoint, CC_Ca
 
 void CC_CallAdapterE164::cleanup() { CC_CallAdapter::cleanup(); }
 
-XCode CC_CallAdapterE164::Dial::store(String const& newContextName, String const& newProviderName,
-                                      String const& newDestination, CC_PropertyContainer const& newOwnProperties,
-                                      CC_PropertyContainer const& newOfferProperties,
-                                      CC_PropertyContainer const& newCallProperties, MG_IContext* newDatapathContext)
-{
-    try
-    {
-        contextName = newContextName;
-        providerName = newProviderName;
-        destination = newDestination;
-    }
-    catch (std::bad_alloc const&)
-    {
-        return forget();
-    }
-    datapathContext.set(newDatapathContext);
-    bool const isWhole = COPY(ownProperties, newOwnProperties) && COPY(offerProperties, newOfferProperties) &&
-                         COPY(callProperties, newCallProperties);
-    return isWhole ? XCode::OK : forget();
-}
-
 /// Half of one dial and half of another would be a call to nobody knows where.
-XCode CC_CallAdapterE164::Dial::forget()
+XCode CC_CallAdapterE164::forgetLastDial()
 {
-    *this = Dial();
+    m_lastDial.set(nullptr);
     return XCode::FAILURE;
 }
 
@@ -115,12 +140,26 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
                                CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                                CC_PropertyContainer const& callProperties, MG_IContext* datapathContext)
 {
-    ++m_numberOfDials;
-    if (!m_lastDial
-             .store(contextName, providerName, destination, ownProperties, offerProperties, callProperties,
-                    datapathContext)
-             .isOk())
-        return XCode::FAILURE;
+    TYLifeline::Watch const self(getLifeline());
+    TYPtr<LastDial> last = m_lastDial;
+    if (!last || !last->isMadeOf(contextName, providerName, destination, ownProperties, offerProperties, callProperties,
+                                 datapathContext))
+    {
+        try
+        {
+            last = TYPtr<LastDial>(new LastDial(contextName, providerName, destination, datapathContext));
+        }
+        catch (std::bad_alloc const&)
+        {
+            return forgetLastDial();
+        }
+        bool const isWhole = last->copy(ownProperties, offerProperties, callProperties);
+        if (!self.isAlive()) // a property's clone is a module's code
+            return XCode::FAILURE;
+        if (!isWhole)
+            return forgetLastDial();
+        m_lastDial = last;
+    }
     return CC_CallAdapter::dial(contextName, providerName, destination, ownProperties, offerProperties, callProperties,
                                 datapathContext);
 }
@@ -141,11 +180,14 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
                                CC_PropertyContainer const* extraOfferProperties,
                                CC_PropertyContainer const* extraCallProperties)
 {
-    CC_PropertyContainer own;
-    CC_PropertyContainer offer;
-    CC_PropertyContainer call;
+    TYLifeline::Watch const self(getLifeline());
+    TYPtr<LastDial> last;
     try
     {
+        last = TYPtr<LastDial>(new LastDial(contextName, providerName, destination, datapathContext));
+        CC_PropertyContainer& own = last->ownProperties;
+        CC_PropertyContainer& offer = last->offerProperties;
+        CC_PropertyContainer& call = last->callProperties;
         bool const isSet = SET_NUMBER(own, callingNumber, callingTypeOfNumber, callingNumberingPlan) &&
                            SET_INDICATORS(own, callingPresentation, callingScreening) && SET_NAME(own, callingName) &&
                            SET(own, CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_SENDING, !sendingComplete)) &&
@@ -156,16 +198,37 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
                                                                         informationTransferCapability),
                                CC_PropertyUnsigned(CC_PropertyId::HOPS, CallControl::GET_MAX_HOPS(contextName)));
         if (!isSet)
-            return XCode::FAILURE;
+            return forgetLastDial();
     }
     catch (std::bad_alloc const&)
     {
-        return XCode::FAILURE;
+        return forgetLastDial();
     }
-    MERGE(own, extraOwnProperties);
-    MERGE(offer, extraOfferProperties);
-    MERGE(call, extraCallProperties);
-    return OK_OR_FAILURE(dial(contextName, providerName, destination, own, offer, call, datapathContext));
+    MERGE(last->ownProperties, extraOwnProperties);
+    MERGE(last->offerProperties, extraOfferProperties);
+    MERGE(last->callProperties, extraCallProperties);
+    if (!self.isAlive()) // an extra property's clone is a module's code
+        return XCode::FAILURE;
+    m_lastDial = last;
+    return OK_OR_FAILURE(dial(last->contextName, last->providerName, last->destination, last->ownProperties,
+                              last->offerProperties, last->callProperties, last->datapathContext.get()));
+}
+
+XCode CC_CallAdapterE164::dial(DialForm const& form)
+{
+    Party const& calling = form.calling;
+    Party const& called = form.called;
+    return dial(form.contextName, form.providerName, form.destination, calling.number, calling.typeOfNumber,
+                calling.numberingPlan, calling.presentation, calling.screening, calling.name, called.number,
+                called.typeOfNumber, called.numberingPlan, called.name, form.sendingComplete,
+                form.informationTransferCapability, form.datapathContext, form.extraOwnProperties,
+                form.extraOfferProperties, form.extraCallProperties);
+}
+
+XCode CC_CallAdapterE164::acceptAs(CC_Call& call, Party const& answering)
+{
+    return accept(call, answering.number, answering.typeOfNumber, answering.numberingPlan, answering.presentation,
+                  answering.screening, answering.name);
 }
 
 XCode CC_CallAdapterE164::accept(CC_Call& call, String const& number, QTypeOfNumber typeOfNumber,
@@ -202,12 +265,31 @@ void CC_CallAdapterE164::invokeSynchronousService(CC_Service& service)
         redial();
 }
 
+/// The last dial, made if there is none, and a copy while a dial that uses it is under way; null when memory is out.
+TYPtr<CC_CallAdapterE164::LastDial> CC_CallAdapterE164::lastDialToChange()
+{
+    if (m_lastDial && !m_lastDial->isShared())
+        return m_lastDial;
+    String const& none = String::s_empty;
+    TYPtr<LastDial> changed(m_lastDial ? new LastDial(m_lastDial->contextName, m_lastDial->providerName,
+                                                      m_lastDial->destination, m_lastDial->datapathContext.get())
+                                       : new LastDial(none, none, none, nullptr));
+    if (m_lastDial &&
+        !changed->copy(m_lastDial->ownProperties, m_lastDial->offerProperties, m_lastDial->callProperties))
+        return TYPtr<LastDial>();
+    m_lastDial = changed;
+    return changed;
+}
+
 /// Appends the digits to the called number that is remembered.
 XCode CC_CallAdapterE164::collect(String const& digits)
 {
-    CC_PropertyContainer& offer = m_lastDial.offerProperties;
     try
     {
+        TYPtr<LastDial> const last = lastDialToChange();
+        if (!last)
+            return XCode::FAILURE;
+        CC_PropertyContainer& offer = last->offerProperties;
         String const& collected = VALUE_OF<CC_PropertyString>(offer.get(CC_PropertyId::E164_NUMBER), String::s_empty);
         return offer.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, collected + digits));
     }
@@ -217,32 +299,25 @@ XCode CC_CallAdapterE164::collect(String const& digits)
     }
 }
 
-/// Clears the attempt and dials again, with all digits so far.
+/// Clears the attempt and dials again, with all digits so far, those that come while it ends included. A module that
+/// has dialled elsewhere meanwhile has that dial made again, or refused.
 void CC_CallAdapterE164::redial()
 {
-    if (!m_lastDial.datapathContext)
-        m_lastDial.datapathContext.set(getDatapathContext());
-    Dial again; // a copy: the dial stores over what is remembered, and a module may dial elsewhere meanwhile
-    if (!again
-             .store(m_lastDial.contextName, m_lastDial.providerName, m_lastDial.destination, m_lastDial.ownProperties,
-                    m_lastDial.offerProperties, m_lastDial.callProperties, m_lastDial.datapathContext.get())
-             .isOk())
-        return; // better the present attempt than none: the next digit tries again
     TYLifeline::Watch const self(getLifeline());
-    auto const isOver = [this, &self, number = m_numberOfDials]
-    { return !self.isAlive() || !isReady() || m_numberOfDials != number; };
-
+    if (!m_lastDial->datapathContext)
+        m_lastDial->datapathContext.set(getDatapathContext());
     drop(QCause::NORMAL_CALL_CLEARING, 0);
-    if (isOver())
+    if (!self.isAlive())
         return;
     CC_Flags changed;
-    if (!again.datapathContext && changed.set(CC_PropertyId::CONTEXT, true).isOk())
+    if (m_lastDial && !m_lastDial->datapathContext && changed.set(CC_PropertyId::CONTEXT, true).isOk())
     {
         notifyPeerPropertyChange(changed); // not to the observer: intended, the adapter's own class reacts to this one
-        if (isOver())
+        if (!self.isAlive())
             return;
     }
-    // a destination that refuses the longer number leaves the adapter idle, as after any dial
-    std::ignore = dial(again.contextName, again.providerName, again.destination, again.ownProperties,
-                       again.offerProperties, again.callProperties, again.datapathContext.get());
+    // what the dial comes to shows in the leg and the peer; a destination that refuses the longer number leaves us idle
+    if (TYPtr<LastDial> const last = m_lastDial; last)
+        std::ignore = dial(last->contextName, last->providerName, last->destination, last->ownProperties,
+                           last->offerProperties, last->callProperties, last->datapathContext.get());
 }

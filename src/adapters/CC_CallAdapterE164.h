@@ -29,10 +29,9 @@ class VoipCodecListSet;
 ///
 ///     CC_CallAdapterE164 adapter;
 ///     std::ignore = adapter.setup("line 7", endpoint, &observer);
-///     if (!adapter.dial("SWITCH", "sip", "trunk", "4420791234", QTypeOfNumber::INTERNATIONAL, QNumberingPlan::ISDN,
-///                       QPresentationIndicator::ALLOWED, QScreeningIndicator::NETWORK_PROVIDED, "Ada", "4989",
-///                       QTypeOfNumber::INTERNATIONAL, QNumberingPlan::ISDN, "", false,
-///                       QInformationTransferCapability::SPEECH, nullptr, nullptr, nullptr, nullptr).isOk())
+///     if (!adapter.dial({.providerName = "sip", .destination = "trunk", .calling = {.number = "4420791234", .name =
+///     "Ada"},
+///                        .called = {.number = "4989"}}).isOk())
 ///         ...
 ///     CC_ServiceUserInput digit("1"); // the user keys on
 ///     adapter.invokeSynchronousService(digit);
@@ -41,6 +40,32 @@ class VoipCodecListSet;
 class CC_EXPORT CC_CallAdapterE164 : public CC_CallAdapter
 {
 public:
+    /// What a party tells of itself in a dial or accept that is written like a form.
+    struct Party
+    {
+        String number{};
+        QTypeOfNumber typeOfNumber = QTypeOfNumber::UNKNOWN;
+        QNumberingPlan numberingPlan = QNumberingPlan::ISDN;
+        QPresentationIndicator presentation = QPresentationIndicator::ALLOWED;
+        QScreeningIndicator screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED;
+        String name{};
+    };
+    /// A dial, by names. The called party's presentation and screening are not used: it has not spoken yet.
+    struct DialForm
+    {
+        String contextName{}; ///< empty: "SWITCH"
+        String providerName{};
+        String destination{}; ///< in the provider's own notation
+        Party calling{};
+        Party called{};
+        bool sendingComplete = false; ///< no digits will follow
+        QInformationTransferCapability informationTransferCapability = QInformationTransferCapability::SPEECH;
+        MG_IContext* datapathContext = nullptr; ///< null: the media layer is asked for a new one
+        CC_PropertyContainer const* extraOwnProperties = nullptr;
+        CC_PropertyContainer const* extraOfferProperties = nullptr;
+        CC_PropertyContainer const* extraCallProperties = nullptr;
+    };
+
     CC_CallAdapterE164();
     ~CC_CallAdapterE164() override; ///< `cleanup()`; also forgets the last dial, which nothing else does
 
@@ -58,6 +83,9 @@ public:
     void invokeSynchronousService(CC_Service& service) override;
     /// Remembers the dial, then dials as the base does; remembered is also what the base refuses. FAILURE as well when
     /// memory does not suffice to remember it: nothing is dialled then, and the dial before is forgotten, too.
+    ///
+    /// A class that overrides this one goes on with CC_CallAdapterE164::dial, not with CC_CallAdapter's: what it has
+    /// changed is remembered only here.
     XCode dial(String const& contextName, String const& providerName, String const& destination,
                CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                CC_PropertyContainer const& callProperties, MG_IContext* datapathContext) override;
@@ -77,9 +105,18 @@ public:
                        MG_IContext* datapathContext, CC_PropertyContainer const* extraOwnProperties,
                        CC_PropertyContainer const* extraOfferProperties,
                        CC_PropertyContainer const* extraCallProperties);
+    /// The same, with the arguments in a form. Making it needs memory, so it may throw std::bad_alloc where it stands.
+    ///
+    ///     XCode const result = adapter.dial({.providerName = "isdn",
+    ///                                        .destination = "trunk",
+    ///                                        .calling = {.number = "4420791234", .name = "Ada"},
+    ///                                        .called = {.number = "4989"}});
+    XCode dial(DialForm const& form);
     /// Joins an offered call, with the answering party's data as own properties. OK, or FAILURE.
     virtual XCode accept(CC_Call& call, String const& number, QTypeOfNumber typeOfNumber, QNumberingPlan numberingPlan,
                          QPresentationIndicator presentation, QScreeningIndicator screening, String const& name);
+    /// The same, with the arguments in a form: `adapter.acceptAs(call, {.number = "4989123", .name = "Bob"})`.
+    XCode acceptAs(CC_Call& call, Party const& answering);
 
     // --- typed accessors ---------------------------------------------------------------------------------------------
     // By the ids of CC_PropertyId, in their order. `getOwn...` reads the own view, `getPeer...` the peer view; a
@@ -259,26 +296,12 @@ public:
     XCode setOwnQoS(CC_QoS const& qos);
 
 private:
-    /// All arguments of a dial.
-    struct Dial
-    {
-        XCode store(String const& newContextName, String const& newProviderName, String const& newDestination,
-                    CC_PropertyContainer const& newOwnProperties, CC_PropertyContainer const& newOfferProperties,
-                    CC_PropertyContainer const& newCallProperties, MG_IContext* newDatapathContext);
-        XCode forget();
+    struct LastDial;
 
-        String contextName;
-        String providerName;
-        String destination;
-        TYPtr<MG_IContext> datapathContext;
-        CC_PropertyContainer ownProperties;
-        CC_PropertyContainer offerProperties;
-        CC_PropertyContainer callProperties;
-    };
-
+    TYPtr<LastDial> lastDialToChange();
+    XCode forgetLastDial();
     XCode collect(String const& digits);
     void redial();
 
-    Dial m_lastDial;
-    unsigned int m_numberOfDials = 0; // to see whether somebody has dialled while a module was told of something
+    TYPtr<LastDial> m_lastDial; // null: none, or forgotten
 };

@@ -275,3 +275,76 @@ TEST_F(CC_CallAdapterE164_Overlap_Test, WithoutAnyMediaContextTheAdapterItselfIs
     EXPECT_EQ(a.module.take(), Lines()) << "not the observer";
     EXPECT_EQ(numbers, (Lines{"49", "498"}));
 }
+
+// --- classes that override -------------------------------------------------------------------------------------------
+
+namespace
+{
+/// Counts its dials, and may keep a drop from happening or go past the E.164 adapter.
+class OverridingAdapter : public CC_CallAdapterE164
+{
+public:
+    using CC_CallAdapterE164::dial;
+    XCode dial(String const& contextName, String const& providerName, String const& destination,
+               CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
+               CC_PropertyContainer const& callProperties, MG_IContext* datapathContext) override
+    {
+        XCode const result = goesPastTheE164Adapter
+                                 ? CC_CallAdapter::dial(contextName, providerName, destination, ownProperties,
+                                                        offerProperties, callProperties, datapathContext)
+                                 : CC_CallAdapterE164::dial(contextName, providerName, destination, ownProperties,
+                                                            offerProperties, callProperties, datapathContext);
+        results.push_back(result);
+        return result;
+    }
+    void drop(QCause cause, unsigned int causeValue) override
+    {
+        if (!keepsItsLeg)
+            CC_CallAdapterE164::drop(cause, causeValue);
+    }
+
+    bool goesPastTheE164Adapter = false;
+    bool keepsItsLeg = false;
+    std::vector<XCode> results;
+};
+
+class OverridingAdapterTest : public TestLinesE164<OverridingAdapter>
+{
+protected:
+    OverridingAdapterTest()
+    {
+        onOffer = [this](CC_Call& call)
+        {
+            b.renew();
+            XCode const result = b.accept(call);
+            std::ignore = b.adapter->setOwnSupportsOverlapReceiving(false);
+            b.become(State::ADDRESS_INCOMPLETE);
+            return result;
+        };
+    }
+    XCode dialByNumber()
+    {
+        return a.adapter->dial({.providerName = "isdn", .destination = "trunk", .called = {.number = "49"}});
+    }
+};
+} // namespace
+
+TEST_F(OverridingAdapterTest, ADialByNumberIsRememberedThoughTheOverrideGoesPastIt)
+{
+    a.adapter->goesPastTheE164Adapter = true;
+    ASSERT_EQ(dialByNumber(), XCode::OK);
+    a.key("8");
+    EXPECT_EQ(numbers, (Lines{"49", "498"}));
+    EXPECT_EQ(a.adapter->results, (std::vector<XCode>{XCode::OK, XCode::OK})) << "through the override both times";
+}
+
+TEST_F(OverridingAdapterTest, TheDialIsMadeThoughADropLeftTheLegAndItsRefusalIgnored)
+{
+    ASSERT_EQ(dialByNumber(), XCode::OK);
+    CC_Call const* const call = a.adapter->getCall();
+    a.adapter->keepsItsLeg = true;
+    a.key("8");
+    EXPECT_EQ(a.adapter->results, (std::vector<XCode>{XCode::OK, XCode::REFUSED}));
+    EXPECT_EQ(a.adapter->getCall(), call);
+    EXPECT_EQ(numbers, (Lines{"49"}));
+}

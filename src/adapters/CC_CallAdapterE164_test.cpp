@@ -192,7 +192,51 @@ TEST_F(CC_CallAdapterE164_Test, ArgumentsMayComeFromTheAdaptersOwnViews)
     EXPECT_EQ(a.peer(E164_NUMBER), "4420791234");
 }
 
+TEST_F(CC_CallAdapterE164_Test, ADialReadsLikeAForm)
+{
+    CC_PropertyContainer extra;
+    ASSERT_EQ(extra.set(CC_PropertyString(DISPLAY, "extra")), XCode::OK);
+    ASSERT_EQ(CallControl::SET_MAX_HOPS("SWITCH", 7), XCode::OK);
+    XCode const result = a.adapter->dial({.providerName = "isdn",
+                                          .destination = "trunk 2",
+                                          .calling = {.number = "4420791234",
+                                                      .typeOfNumber = QTypeOfNumber::INTERNATIONAL,
+                                                      .presentation = QPresentationIndicator::RESTRICTED,
+                                                      .screening = QScreeningIndicator::NETWORK_PROVIDED,
+                                                      .name = "Ada"},
+                                          .called = {.number = "4989", .name = "Bob"},
+                                          .sendingComplete = true,
+                                          .extraOwnProperties = &extra});
+    ASSERT_EQ(result, XCode::OK);
+    EXPECT_EQ(destinations, Lines{"trunk 2"});
+    EXPECT_EQ(a.leg(E164_NUMBER) + a.leg(NAME) + a.leg(DISPLAY), "4420791234Adaextra");
+    EXPECT_EQ(a.adapter->getOwnTypeOfNumber(), QTypeOfNumber::INTERNATIONAL);
+    EXPECT_EQ(a.adapter->getOwnNumberingPlan(), QNumberingPlan::ISDN);
+    EXPECT_EQ(a.adapter->getOwnPresentationIndicator(), QPresentationIndicator::RESTRICTED);
+    EXPECT_EQ(a.adapter->getOwnScreeningIndicator(), QScreeningIndicator::NETWORK_PROVIDED);
+    EXPECT_FALSE(a.adapter->getOwnSupportsOverlapSending());
+    EXPECT_EQ(TestLineE164<>::TEXT(offered.get(E164_NUMBER)) + TestLineE164<>::TEXT(offered.get(NAME)), "4989Bob");
+    EXPECT_EQ(a.call(HOPS), "0x00000007");
+}
+
 // --- accept ----------------------------------------------------------------------------------------------------------
+
+TEST_F(CC_CallAdapterE164_Test, AnAcceptReadsLikeAForm)
+{
+    onOffer = [this](CC_Call& call)
+    {
+        return b.adapter->acceptAs(call, {.number = "89123",
+                                          .typeOfNumber = QTypeOfNumber::NATIONAL,
+                                          .numberingPlan = QNumberingPlan::PRIVATE,
+                                          .name = "Bob"});
+    };
+    ASSERT_EQ(dial(), XCode::OK);
+    EXPECT_EQ(a.peer(E164_NUMBER) + a.peer(NAME), "89123Bob");
+    EXPECT_EQ(a.adapter->getPeerTypeOfNumber(), QTypeOfNumber::NATIONAL);
+    EXPECT_EQ(a.adapter->getPeerNumberingPlan(), QNumberingPlan::PRIVATE);
+    EXPECT_EQ(a.adapter->getPeerPresentationIndicator(QPresentationIndicator::RESERVED),
+              QPresentationIndicator::ALLOWED);
+}
 
 TEST_F(CC_CallAdapterE164_Test, AnAcceptByNumberDescribesTheAnsweringParty)
 {

@@ -52,7 +52,7 @@ public:
     };
 
     CC_CallPool() = default;
-    ~CC_CallPool();
+    ~CC_CallPool() override;
     CC_CallPool(CC_CallPool const&) = delete;
     CC_CallPool& operator=(CC_CallPool const&) = delete;
 

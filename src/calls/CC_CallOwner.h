@@ -12,5 +12,5 @@ public:
     virtual void releaseCall(CC_Call* call) = 0;
 
 protected:
-    ~CC_CallOwner() = default; // nobody destroys an owner through this
+    virtual ~CC_CallOwner() = default; // nobody destroys an owner through this
 };

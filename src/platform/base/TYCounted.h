@@ -20,6 +20,9 @@ public:
             delete this;
     }
 
+    /// Whether somebody besides the caller, who holds a reference, holds one, too.
+    bool isShared() const { return m_references.load(std::memory_order_acquire) > 1; }
+
 protected:
     virtual ~TYCounted() = default;
 
