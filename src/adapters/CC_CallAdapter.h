@@ -24,6 +24,19 @@ class MG_IContext;
 /// peer and call reach the module once per turn of the call-control loop, services at once. Belongs to that loop's
 /// thread. After `drop` it is idle and may dial or accept again.
 ///
+/// The peer changes when another leg becomes more active than the peer was last seen, when the peer falls below that or
+/// leaves, and when there is none. Last seen is the State in the view of the peer: a refresh inside the news of its
+/// fall, or a State that the module itself writes there, hides the fall. Then the peer is chosen anew when the pending
+/// notification is delivered, in the next turn at the latest.
+///
+/// When somebody takes the leg out of its call (`CC_CallPool::dropCalls`, `CallControl::RELEASE_CALL`, a transfer), the
+/// adapter keeps its leg, but there is no peer and no call any more: the module is told that every peer property
+/// changed and finds them absent, the State too, and no cause. What is left to do is to clear its own side and `drop`.
+///
+/// States of the own leg are the module's to write: DISCONNECTING says that the wire is being cleared and still counts
+/// as live, so that tones and announcements reach the other side; RELEASED ends the leg's part in the call, and `drop`
+/// writes it. Having written it by itself the module still drops, to give the leg up.
+///
 ///     CC_CallAdapter adapter;
 ///     std::ignore = adapter.setup("line 7", endpoint, &observer);
 ///     CC_PropertyContainer own;
@@ -64,7 +77,10 @@ public:
     /// `callProperties` belong to the call; `datapathContext` (null: a new one) becomes the call's Context.
     /// OK; REFUSED when the adapter is not idle or not set up, nothing has changed then; NO_ELEMENT when no call could
     /// be had; FAILURE for an unknown provider, one that refuses, and all else. After these two the own leg was dropped
-    /// with cause 38.
+    /// with cause 38. A log line of level 1 says which it was.
+    ///
+    /// The endpoint's input filters of the beginning filter the call's and the offer's properties, whatever is set
+    /// meanwhile. Whoever hears of the new call may drop or destroy this adapter: then FAILURE.
     virtual XCode dial(String const& contextName, String const& providerName, String const& destination,
                        CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                        CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
@@ -102,6 +118,10 @@ public:
     void setName(String const& name);
     CC_Endpoint* getEndpoint() const { return m_endpoint; }
     CC_CallAdapterObserver* getObserver() const { return m_observer; }
+    /// The leg that the adapter drives, and the one of the others that it takes for its peer; null without. They are
+    /// the adapter's as long as it says so: keep one longer through a CC_CallLeg::Reference.
+    CC_CallLeg const* getOwnCallLeg() const { return m_ownCallLeg; }
+    CC_CallLeg const* getPeerCallLeg() const { return m_peerCallLeg; }
     /// Empty without an own leg.
     String const& getCallLegName() const;
     /// The own leg's call; null without.
@@ -112,9 +132,14 @@ public:
     // write it and then the leg or call through the input filters (the whole copy, since a filter may derive one
     // property from several). Unfiltered: the leg or call itself.
     // Getters of one property: null when it, the leg or the call is absent. Getters of several copy those whose id has
-    // a bit in common with `mask` (its group: 0x100, 0x200, 0x400, 0x800, 0x1000): OK, ABSENT without the leg or call,
-    // or the first failure, the others are copied all the same. Setters: OK; ABSENT without the leg or call, nothing
-    // has changed then; FAILURE for anything else.
+    // a bit in common with `mask` (its group: 0x100, 0x200, 0x400, 0x800, 0x1000): OK, or the first failure, the others
+    // are copied all the same. Those of a view are OK also on an idle adapter, whose views are empty; the unfiltered
+    // ones are ABSENT without the leg or call. Setters: OK; ABSENT without the leg or call, nothing has changed then;
+    // FAILURE for anything else, also when a filter drops or destroys the adapter meanwhile: nothing is written then.
+    //
+    // Where the calling number is before `accept`: among the properties that the endpoint was offered the call with are
+    // the called party's alone; the caller's are those of the call's first leg, `call.getCallLeg(0)->getProperties()`,
+    // and from `accept` on those of the peer.
 
     CC_Property const* getOwnProperty(unsigned int id) const;
     CC_Property const* getOwnPropertyUnfiltered(unsigned int id) const;

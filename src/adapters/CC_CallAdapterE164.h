@@ -118,6 +118,10 @@ public:
     /// The same, with the arguments in a form: `adapter.acceptAs(call, {.number = "4989123", .name = "Bob"})`.
     XCode acceptAs(CC_Call& call, Party const& answering);
 
+    // The called side of a call that may be dialled overlap says with `setOwnSupportsOverlapReceiving` whether it takes
+    // digits one by one (true when it says nothing), and becomes ADDRESS_INCOMPLETE when it needs more of them; the
+    // calling side says with Supports Overlap-Sending whether more may come, and sends them as CC_ServiceUserInput.
+
     // --- typed accessors ---------------------------------------------------------------------------------------------
     // By the ids of CC_PropertyId, in their order. `getOwn...` reads the own view, `getPeer...` the peer view; a
     // property that is absent or of another class counts as the empty text, 0, false, nothing or null, where nothing

@@ -57,18 +57,20 @@ public:
     CC_CallPool& operator=(CC_CallPool const&) = delete;
 
     /// A new call of this pool with the property Context (0x400400) for `mgContext`; null: the media layer is asked for
-    /// a new one. Null when memory is out.
+    /// a new one. Null when memory is out, and when the media layer or the reboot management, asked meanwhile, have
+    /// destroyed the pool or released the call.
     CC_Call* acquireCall() { return acquireCall(nullptr); }
     CC_Call* acquireCall(MG_IContext* mgContext);
-    /// Takes the call back and destroys it. Counts and destroys also a call that is not of this pool, so hand back only
-    /// its own. Null is ignored.
+    /// Takes the call back and destroys it. Counts and destroys also a call of another pool, which then forgets it, so
+    /// hand back only its own. Null is ignored.
     void releaseCall(CC_Call* call) override;
 
     unsigned int getNumberOfAcquiredCalls() const { return m_calls.getCount(); }
     /// The call at that place in the order of acquisition; null past the end.
     CC_Call* getAcquiredCall(unsigned int index);
-    /// Takes the legs out of every call, or of the calls of that name; the calls then end by themselves. The first text
-    /// is not used.
+    /// Takes the legs out of every call, or of the calls of that name, those that join meanwhile included; the calls
+    /// then end by themselves. The first text is not used. The modules find themselves without peer and call, and drop.
+    /// Where an observer brings legs back for ever, some stay in the end; the log says so (level 1).
     void dropCalls(String const& unused, String const& callName);
 
     /// Takes and gives back the lock on reloads, "Call-Control" / "Calls are ongoing"; without a reboot management

@@ -91,6 +91,8 @@ public:
     InfoContainer& getCallInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                                unsigned int detail, String const& prefix) const;
 
+    /// What the observers are called through. `data` is what the notification passes: null, a `String const*` with the
+    /// provider's name, or the CC_Call*. It is lent for the call: nothing of it is to be kept, changed or deleted.
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_ADD_PROVIDER(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_REMOVE_PROVIDER(Observer& observer, CC_Context& context, void* data);

@@ -68,7 +68,8 @@ public:
     XCode addCallObserver(CC_CallObserver* observer);
     void removeCallObserver(CC_CallObserver const* observer);
     /// Adds the observer to every leg of the call, those that join later included. OK, or NO_ELEMENT when memory is
-    /// out; it is registered nowhere then.
+    /// out; it is registered nowhere then. A leg that is just joining tells it from now on; the observers that were
+    /// there before hear that leg only from the end of its move, after `onCallCallLegAdded`.
     XCode addCallLegObserver(CC_CallLegObserver* observer);
     void removeCallLegObserver(CC_CallLegObserver const* observer);
 

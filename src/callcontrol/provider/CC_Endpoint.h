@@ -64,11 +64,14 @@ public:
     /// the call and is dropped at once.
     virtual void actionRejectOfferedCall_WithCause(CC_Call& call, CC_PropertyContainer const& properties, QCause cause);
 
+    /// May be null. A dial under way goes on with the input filters that it began with, so they have to stay until it
+    /// has returned.
     void setInputFilterContainer(CC_PropertyFilterContainer* filters) { m_inputFilterContainer = filters; }
     void setOutputFilterContainer(CC_PropertyFilterContainer* filters) { m_outputFilterContainer = filters; }
     CC_PropertyFilterContainer* getInputFilterContainer() const { return m_inputFilterContainer; }
     CC_PropertyFilterContainer* getOutputFilterContainer() const { return m_outputFilterContainer; }
 
+    /// What the observers are called through; call control passes null for `data` and nothing reads it.
     static void NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void* data);
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Endpoint& endpoint, void* data);
 

@@ -61,6 +61,13 @@ public:
     /// Carry the call to `destination` (in the provider's own notation): offer it to an endpoint. `providerName` is the
     /// name under which the provider was found. OK when the call was offered, also when the endpoint then rejects it
     /// (`CC_Endpoint::actionRejectOfferedCall_WithCause`): a failure makes the caller drop with its own cause, 38.
+    /// A provider that has no endpoint for the destination rejects with a cause of its own through a leg that it drops:
+    ///
+    ///     CC_CallAdapter adapter; // set up with any endpoint of the module
+    ///     std::ignore = adapter.setup("reject", m_anyEndpoint, nullptr);
+    ///     std::ignore = adapter.accept(call, CC_PropertyContainer::EMPTY());
+    ///     adapter.drop(QCause::UNALLOCATED_NUMBER, 0);
+    ///
     virtual XCode dial(CC_Call& call, String const& providerName, String const& destination,
                        CC_PropertyContainer const& offerProperties) = 0;
     virtual ProviderType getProviderType() const = 0;
@@ -68,6 +75,7 @@ public:
     virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const = 0;
 
+    /// What the observers are called through; call control passes null for `data` and nothing reads it.
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Provider& provider, void* data);
     /// ERROR::INVALID for other values; the type 6 has a short name and no long one, on purpose: it is not shown.
     static char const* PROVIDER_TYPE_NAME(ProviderType type);
