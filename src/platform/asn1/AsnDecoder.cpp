@@ -58,20 +58,29 @@ bool AsnDecoder::readTag(std::size_t& position, std::size_t end, AsnElement& ele
     unsigned int const first = m_octets[position++];
     element.isConstructed = (first & AsnWire::CONSTRUCTED) != 0;
     unsigned int number = first & AsnWire::LONG_TAG;
-    if (number == AsnWire::LONG_TAG)
-    {
-        unsigned int octet = AsnWire::MORE;
-        for (number = 0; (octet & AsnWire::MORE) != 0; ++position)
-        {
-            if (position >= end)
-                return fail("the input ends within a tag, octet %zu", position);
-            octet = m_octets[position];
-            if (number > AsnTag::MAX_NUMBER >> 7)
-                return fail("the tag number is too large, octet %zu", position);
-            number = number << 7 | (octet & 0x7f);
-        }
-    }
+    if (number == AsnWire::LONG_TAG && !readLongTagNumber(position, end, number))
+        return false;
     element.tag = AsnTag(AsnWire::FLAGS_OF(first), number);
+    return true;
+}
+
+bool AsnDecoder::readLongTagNumber(std::size_t& position, std::size_t end, unsigned int& number)
+{
+    std::size_t const offset = position;
+    unsigned int octet = AsnWire::MORE;
+    for (number = 0; (octet & AsnWire::MORE) != 0; ++position)
+    {
+        if (position >= end)
+            return fail("the input ends within a tag, octet %zu", position);
+        octet = m_octets[position];
+        if (position == offset && octet == AsnWire::MORE)
+            return fail("the tag number begins with zeros, octet %zu", offset);
+        if (number > AsnTag::MAX_NUMBER >> 7)
+            return fail("the tag number is too large, octet %zu", position);
+        number = number << 7 | (octet & 0x7f);
+    }
+    if (number < AsnWire::LONG_TAG) // a tag has one form only, unlike a length
+        return fail("the tag number %u must stand in the first octet, octet %zu", number, offset);
     return true;
 }
 

@@ -17,7 +17,8 @@ struct AsnElement
     std::size_t next = 0;   ///< behind the element; differs from `end` where the length is indefinite
 };
 
-/// Reads BER: definite lengths in any form, indefinite lengths, strings in segments.
+/// Reads BER: definite lengths in any form, indefinite lengths, strings in segments. A tag has a single form: numbers
+/// below 31 in one octet, others in as few as hold them.
 ///
 /// Made by AsnSyntax::decode; the types call it for their contents. It holds no memory of its own, looks at each octet
 /// once for each level of structure around it and refuses what is nested deeper than MAX_DEPTH, so an input costs time
@@ -61,6 +62,7 @@ private:
     };
     bool readHeader(std::size_t position, std::size_t end, Header& header);
     bool readTag(std::size_t& position, std::size_t end, AsnElement& element);
+    bool readLongTagNumber(std::size_t& position, std::size_t end, unsigned int& number);
     bool readLength(std::size_t& position, std::size_t end, std::size_t& length, bool& isIndefinite);
     bool findEndOfContents(std::size_t end, AsnElement& element);
 
