@@ -9,6 +9,7 @@
 ///     loop.turn();                  // deferred() runs
 ///     EXPECT_EQ(loop.settle(), 0u); // and asks for nothing more
 ///
+/// Its timers are due when the DrivenClock says so: `clock.advance(30000), loop.turn()` is half a minute later.
 /// Calls and adapters must be gone before it is.
 class DrivenLoop : public TYEventLoop
 {

@@ -2,6 +2,8 @@
 
 #include "callcontrol/CallControl.h"
 #include "platform/eventloop/TYEvent.h"
+#include "platform/eventloop/TYTimer.h"
+#include "testing/DrivenClock.h"
 
 #include <gtest/gtest.h>
 
@@ -89,4 +91,18 @@ TEST(DrivenLoop, SettlingGivesUpAtItsBound)
     EXPECT_EQ(loop.settle(5), 5u);
     EXPECT_EQ(loop.settle(), DrivenLoop::MANY_TURNS);
     EXPECT_EQ(work.runs, 5u + DrivenLoop::MANY_TURNS);
+}
+
+TEST(DrivenLoop, RunsTheTimersThatTheDrivenClockMakesDue)
+{
+    DrivenClock clock;
+    DrivenLoop loop;
+    unsigned int runs = 0;
+    TYTimer timer(
+        loop, EventPrio::HIGH, [](void* argument) { ++*static_cast<unsigned int*>(argument); }, &runs);
+    EXPECT_TRUE(timer.startPeriodic(30000).isOk());
+    EXPECT_EQ(loop.settle(), 0u);
+    clock.advance(30000);
+    EXPECT_EQ(loop.settle(), 1u); // a periodic timer does not keep the loop from settling
+    EXPECT_EQ(runs, 1u);
 }

@@ -3,12 +3,15 @@
 #include "platform/base/TYVector.h"
 #include "platform/driver/DRIVER.h"
 #include "platform/eventloop/TYEventLoop.h"
+#include "platform/eventloop/TYTimer.h"
 #include "platform/media/VoipCodecListSet.h"
 #include "platform/monitor/Monitor.h"
 #include "testing/FailingAllocator.h"
 
+#include <array>
 #include <gtest/gtest.h>
 #include <new>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <thread>
@@ -158,6 +161,31 @@ TEST(OutOfMemory, PostingAndRunningEventsNeedsNone)
     EXPECT_EQ(0UL, FailingAllocator::count());
     EXPECT_TRUE(isFirstPosted && hadWork && isSecondPosted);
     EXPECT_EQ(1U, runs);
+}
+
+TEST(OutOfMemory, StartingStoppingAndRunningTimersNeedsNone)
+{
+    TYEventLoop loop;
+    ASSERT_GE(loop.getPollFd(), 0);
+    unsigned int runs = 0;
+    bool isPeriodicTaken = false;
+    {
+        MemoryLimit const limit(0);
+        std::array<std::optional<TYTimer>, 100> timers;
+        for (std::optional<TYTimer>& timer : timers)
+            timer
+                .emplace(
+                    loop, EventPrio::HIGH, [](void* argument) { ++*static_cast<unsigned int*>(argument); }, &runs)
+                .start(0);
+        timers[10]->start(1000000);
+        timers[20]->stop();
+        isPeriodicTaken = timers[30]->startPeriodic(1000000).isOk();
+        loop.runTurn();
+        timers[40]->start(2000000);
+        EXPECT_EQ(0UL, FailingAllocator::count());
+    }
+    EXPECT_TRUE(isPeriodicTaken);
+    EXPECT_EQ(97U, runs);
 }
 
 TEST(OutOfMemory, ASynchronisationEventReportsItAndNeverRunsTheFunction)

@@ -1,13 +1,38 @@
 #include "platform/eventloop/TYEventLoop.h"
 
 #include "platform/base/Assert.h"
+#include "platform/base/TYTime.h"
+#include "platform/eventloop/TYTimer.h"
 
 #include <algorithm>
+#include <chrono>
+#include <climits>
 #include <cstdint>
 #include <new>
+#include <sys/epoll.h>
 #include <sys/eventfd.h>
+#include <sys/timerfd.h>
 #include <tuple>
 #include <unistd.h>
+
+namespace
+{
+constexpr long long NANOSECONDS_IN_SECOND = 1000000000;
+constexpr long long NANOSECONDS_IN_MILLISECOND = 1000000;
+
+long long NOW()
+{
+    TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
+    return now.seconds * NANOSECONDS_IN_SECOND + now.nanoseconds;
+}
+
+bool WATCH(int epollFd, int fd)
+{
+    epoll_event event{};
+    event.events = EPOLLIN;
+    return epoll_ctl(epollFd, EPOLL_CTL_ADD, fd, &event) == 0;
+}
+} // namespace
 
 TYEventLoop::TYEventLoop() : m_thread(std::this_thread::get_id())
 {
@@ -31,8 +56,12 @@ TYEventLoop::~TYEventLoop()
             queue.unlink(event);
             event.m_isPending = false;
         }
-    if (m_pollFd >= 0)
-        close(m_pollFd);
+    while (TYTimer* const timer = m_timers.getFirst())
+    {
+        m_timers.remove(*timer);
+        timer->m_state = TYTimer::State::STOPPED;
+    }
+    closePollFd();
 }
 
 void TYEventLoop::run()
@@ -42,9 +71,7 @@ void TYEventLoop::run()
     {
         {
             std::unique_lock lock(m_mutex);
-            m_isSleeping = true;
-            m_wakeUp.wait(lock, [this] { return m_isStopped || hasPending(); });
-            m_isSleeping = false;
+            sleep(lock);
             if (m_isStopped)
             {
                 m_isStopped = false;
@@ -53,6 +80,17 @@ void TYEventLoop::run()
         }
         runTurn();
     }
+}
+
+void TYEventLoop::sleep(std::unique_lock<std::mutex>& lock)
+{
+    auto const hasReason = [this] { return m_isStopped || hasPending(); };
+    m_isSleeping = true;
+    if (m_timers.isEmpty())
+        m_wakeUp.wait(lock, hasReason);
+    else
+        m_wakeUp.wait_for(lock, std::chrono::nanoseconds(getNanosecondsToTimer()), hasReason);
+    m_isSleeping = false;
 }
 
 void TYEventLoop::stop()
@@ -68,20 +106,43 @@ bool TYEventLoop::runTurn()
     m_thread.store(std::this_thread::get_id(), std::memory_order_relaxed);
 
     takeTurn();
+    if (hasTimers())
+        return runTurnWithTimers();
     bool const hadWork = !m_turn.isEmpty();
     m_isInTurn = true;
     while (!m_turn.isEmpty())
-    {
-        TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
-        m_turn.unlink(event);
-        event.m_isInTurn = false;
-        event.m_isPending.exchange(false); // no plain store: it pairs with the exchange of whoever posts
-        event.addReference();
-        event.handle();
-        event.removeReference();
-    }
+        runFirstEvent();
     m_isInTurn = false;
     return hadWork;
+}
+
+/// A function of its own, so that turns without timers, which are most, pay one comparison for them.
+bool TYEventLoop::runTurnWithTimers()
+{
+    takeDueTimers();
+    bool const hadWork = !m_turn.isEmpty() || m_numberOfDueTimers != 0;
+    m_isInTurn = true;
+    while (!m_turn.isEmpty())
+    {
+        unsigned int const priority = static_cast<TYEvent&>(*m_turn.getFirst()).m_priority;
+        if (m_numberOfDueTimers == 0 || !runDueTimers(priority)) // what ran may have destroyed the event
+            runFirstEvent();
+    }
+    runDueTimers(EventPrio::COUNT - 1);
+    settleTimers(hadWork);
+    m_isInTurn = false;
+    return hadWork;
+}
+
+void TYEventLoop::runFirstEvent()
+{
+    TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
+    m_turn.unlink(event);
+    event.m_isInTurn = false;
+    event.m_isPending.exchange(false); // no plain store: it pairs with the exchange of whoever posts
+    event.addReference();
+    event.handle();
+    event.removeReference();
 }
 
 void TYEventLoop::takeTurn()
@@ -90,6 +151,7 @@ void TYEventLoop::takeTurn()
         return; // without the lock: a host's loop asks often
     std::lock_guard const lock(m_mutex);
     m_wasPosted.store(false, std::memory_order_relaxed);
+    m_isTimerSignalled = false;
     resetPollFd();
     for (LinkedListManager_Untyped& queue : m_pending)
     {
@@ -104,14 +166,163 @@ void TYEventLoop::takeTurn()
 
 int TYEventLoop::getPollFd()
 {
-    std::lock_guard const lock(m_mutex);
     if (m_pollFd < 0)
-    {
-        m_pollFd = eventfd(0, EFD_NONBLOCK | EFD_CLOEXEC);
-        if (hasPending())
-            setPollFd();
-    }
+        openPollFd();
+    if (m_pollFd >= 0 && isTimerDue())
+        signalTimer();
     return m_pollFd;
+}
+
+void TYEventLoop::openPollFd()
+{
+    std::lock_guard const lock(m_mutex);
+    m_pollFd = epoll_create1(EPOLL_CLOEXEC);
+    m_eventFd = eventfd(0, EFD_NONBLOCK | EFD_CLOEXEC);
+    m_timerFd = timerfd_create(CLOCK_MONOTONIC, TFD_NONBLOCK | TFD_CLOEXEC);
+    if (m_pollFd < 0 || !WATCH(m_pollFd, m_eventFd) || !WATCH(m_pollFd, m_timerFd))
+        return closePollFd();
+    if (hasPending())
+        setPollFd();
+    if (TYTimer const* const first = m_timers.getFirst())
+        armTimerFd(first->m_due);
+}
+
+void TYEventLoop::closePollFd()
+{
+    for (int* const fd : {&m_pollFd, &m_eventFd, &m_timerFd})
+    {
+        if (*fd >= 0)
+            close(*fd);
+        *fd = -1;
+    }
+}
+
+int TYEventLoop::getTimeout() const
+{
+    if (m_wasPosted.load(std::memory_order_acquire))
+    {
+        std::lock_guard const lock(m_mutex);
+        if (hasPending())
+            return 0;
+    }
+    if (m_timers.isEmpty())
+        return -1;
+    long long const milliseconds =
+        (getNanosecondsToTimer() + NANOSECONDS_IN_MILLISECOND - 1) / NANOSECONDS_IN_MILLISECOND;
+    return static_cast<int>(std::min<long long>(milliseconds, INT_MAX));
+}
+
+void TYEventLoop::startTimer(TYTimer& timer, long long nanoseconds)
+{
+    TY_ASSERT(isLoopThread(), "a timer started on another thread than its loop's");
+    timer.m_due = NOW() + nanoseconds;
+    timer.m_state = TYTimer::State::WAITING;
+    m_timers.add(timer);
+    if (m_pollFd < 0 || m_timers.getFirst() != &timer)
+        return;
+    if (nanoseconds == 0)
+        signalTimer();
+    else if (m_armed == NEVER || timer.m_due < m_armed)
+        armTimerFd(timer.m_due);
+}
+
+// Leaves the timer descriptor armed: a timer that guards something is stopped far more often than it runs, and the
+// next start needs the descriptor again.
+void TYEventLoop::stopTimer(TYTimer& timer)
+{
+    TY_ASSERT(isLoopThread(), "a timer stopped on another thread than its loop's");
+    if (timer.m_state == TYTimer::State::DUE)
+    {
+        m_dueTimers[timer.m_priority].unlink(timer);
+        --m_numberOfDueTimers;
+    }
+    else
+        m_timers.remove(timer);
+    timer.m_state = TYTimer::State::STOPPED;
+    if (m_isTimerSignalled && !isTimerDue())
+    {
+        std::lock_guard const lock(m_mutex);
+        m_isTimerSignalled = false;
+        if (!hasPending())
+            resetPollFd();
+    }
+}
+
+void TYEventLoop::takeDueTimers()
+{
+    long long const now = NOW();
+    for (TYTimer* timer = m_timers.getFirst(); timer != nullptr && timer->m_due <= now; timer = m_timers.getFirst())
+    {
+        m_timers.remove(*timer);
+        timer->m_state = TYTimer::State::DUE;
+        std::ignore = m_dueTimers[timer->m_priority].append(*timer); // it is in no list
+        ++m_numberOfDueTimers;
+        if (timer->m_period != 0)
+        {
+            timer->m_missed += static_cast<unsigned long long>((now - timer->m_due) / timer->m_period);
+            timer->m_due = now - (now - timer->m_due) % timer->m_period;
+        }
+    }
+}
+
+/// Runs those that are due, up to that priority: whether there was one.
+bool TYEventLoop::runDueTimers(unsigned int priority)
+{
+    bool hasRun = false;
+    for (unsigned int i = 0; i <= priority; ++i)
+        while (!m_dueTimers[i].isEmpty())
+        {
+            TYTimer& timer = static_cast<TYTimer&>(*m_dueTimers[i].getFirst());
+            m_dueTimers[i].unlink(timer);
+            --m_numberOfDueTimers;
+            timer.m_state = TYTimer::State::STOPPED;
+            if (timer.m_period != 0)
+            {
+                timer.m_due += timer.m_period;
+                timer.m_state = TYTimer::State::WAITING;
+                m_timers.add(timer);
+            }
+            timer.m_callback(timer.m_argument); // which may destroy it
+            hasRun = true;
+        }
+    return hasRun;
+}
+
+/// After a turn: lets the timer descriptor wait for the timer that is now the first.
+void TYEventLoop::settleTimers(bool hadWork)
+{
+    if (m_pollFd < 0 || m_isTimerSignalled)
+        return;
+    TYTimer const* const first = m_timers.getFirst();
+    bool const isArmedForNothing = m_armed != NEVER && (!hadWork || m_armed <= NOW());
+    if (isArmedForNothing || (first != nullptr && (m_armed == NEVER || first->m_due < m_armed)))
+        armTimerFd(first != nullptr ? first->m_due : NEVER);
+}
+
+bool TYEventLoop::isTimerDue() const { return !m_timers.isEmpty() && m_timers.getFirst()->m_due <= NOW(); }
+
+/// 0 when it is due. REQUIRES: a timer runs.
+long long TYEventLoop::getNanosecondsToTimer() const { return std::max(m_timers.getFirst()->m_due - NOW(), 0LL); }
+
+void TYEventLoop::armTimerFd(long long due)
+{
+    // by the time that is left and not by the moment: a replaced clock need not agree with the system's
+    long long const rest = due == NEVER ? 0 : std::max(due - NOW(), 1LL);
+    itimerspec setting{};
+    setting.it_value.tv_sec = static_cast<std::time_t>(rest / NANOSECONDS_IN_SECOND);
+    setting.it_value.tv_nsec = static_cast<long>(rest % NANOSECONDS_IN_SECOND);
+    std::ignore = timerfd_settime(m_timerFd, 0, &setting, nullptr); // no argument that it could refuse
+    m_armed = due;
+}
+
+/// A timer that is due already makes the descriptor readable at once, which the timer descriptor would do a moment
+/// later.
+void TYEventLoop::signalTimer()
+{
+    std::lock_guard const lock(m_mutex);
+    m_isTimerSignalled = true;
+    m_wasPosted.store(true, std::memory_order_release); // so that the next turn makes it unreadable
+    setPollFd();
 }
 
 TYSyncEvent& TYEventLoop::getSyncEvent(EventPrio::Type priority)
@@ -143,7 +354,7 @@ void TYEventLoop::withdraw(TYEvent& event)
         (event.m_isInTurn ? m_turn : m_pending[event.m_priority]).unlink(event);
     event.m_isPending = false;
     event.m_isInTurn = false;
-    if (!hasPending())
+    if (!hasPending() && !m_isTimerSignalled)
         resetPollFd();
 }
 
@@ -162,10 +373,10 @@ void TYEventLoop::wake()
 
 void TYEventLoop::setPollFd()
 {
-    if (m_pollFd >= 0 && !m_isPollFdSet)
+    if (m_eventFd >= 0 && !m_isPollFdSet)
     {
         std::uint64_t const one = 1;
-        std::ignore = write(m_pollFd, &one, sizeof one); // an eventfd at 0 takes a 1
+        std::ignore = write(m_eventFd, &one, sizeof one); // an eventfd at 0 takes a 1
         m_isPollFdSet = true;
     }
 }
@@ -175,7 +386,7 @@ void TYEventLoop::resetPollFd()
     if (m_isPollFdSet)
     {
         std::uint64_t count = 0;
-        std::ignore = read(m_pollFd, &count, sizeof count); // only to make it unreadable again
+        std::ignore = read(m_eventFd, &count, sizeof count); // only to make it unreadable again
         m_isPollFdSet = false;
     }
 }

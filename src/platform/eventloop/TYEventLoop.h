@@ -5,6 +5,7 @@
 #include "platform/base/XCode.h"
 #include "platform/eventloop/TYEvent.h"
 #include "platform/eventloop/TYSyncEvent.h"
+#include "platform/eventloop/TYTimerQueue.h"
 
 #include <array>
 #include <atomic>
@@ -12,11 +13,12 @@
 #include <mutex>
 #include <thread>
 
-/// One thread's queue of events.
+/// One thread's queue of events and timers.
 ///
-/// A turn takes the events that are pending when it begins, those of a lower priority value first and in posting order
-/// within a priority; what is posted during a turn runs in the next one. Posting and synchronisation events may be used
-/// from any thread; everything else belongs to the loop's thread: the one that created it, or the last one to run it.
+/// A turn takes the events that are pending and the timers that are due when it begins, those of a lower priority value
+/// first; within a priority the timers in the order of their times, then the events in the order of posting. What is
+/// posted or started during a turn runs in a later one. Posting and synchronisation events may be used from any thread;
+/// everything else belongs to the loop's thread: the one that created it, or the last one to run it.
 ///
 /// On its own:                          Inside another loop (epoll, a protocol stack's):
 ///
@@ -27,21 +29,27 @@ class CC_EXPORT TYEventLoop
 {
 public:
     TYEventLoop();
-    /// Callers that wait on a synchronisation event get their FAILURE; pending events do not run.
+    /// Callers that wait on a synchronisation event get their FAILURE; pending events do not run, timers are stopped.
     ~TYEventLoop();
     TYEventLoop(TYEventLoop const&) = delete;
     TYEventLoop& operator=(TYEventLoop const&) = delete;
 
-    /// Runs turns, sleeping while nothing is pending, until `stop()`.
+    /// Runs turns, sleeping while nothing is pending and no timer due, until `stop()`.
     void run();
     /// Ends `run()` after the turn that is under way. From any thread; also before `run()`, which then ends at once.
     void stop();
     /// Runs one turn without waiting: whether there was anything to do. Not from inside a handler.
     bool runTurn();
-    /// A descriptor that is readable exactly while work is pending, for poll() and its kin; -1 when the system has none
-    /// left. Do not read from it: `runTurn()` does.
-    /// Call it once before other threads post; it lives as long as the loop.
+    /// A descriptor that is readable exactly while work is pending or a timer due, for poll() and its kin; -1 when the
+    /// system has none left (it takes three). Do not read from it: `runTurn()` does. A timer that was stopped may make
+    /// it readable once more, for a turn without work.
+    /// Call it once before other threads post; it lives as long as the loop. While a replaced clock is moved by hand
+    /// every call looks at it again, since the system cannot know that a timer has become due.
     int getPollFd();
+    /// For how many milliseconds the loop wants no turn, rounded up: 0 when work is pending or a timer due, -1 when
+    /// there is neither work nor a timer that runs. For hosts whose wait takes such a number (epoll_wait, poll); events
+    /// that other threads post meanwhile they learn from `getPollFd()` alone.
+    int getTimeout() const;
 
     /// The loop's synchronisation event of that priority; it lives as long as the loop.
     TYSyncEvent& getSyncEvent(EventPrio::Type priority);
@@ -50,12 +58,31 @@ public:
 private:
     friend class TYEvent;
     friend class TYSyncEvent;
+    friend class TYTimer;
+
+    static constexpr long long NEVER = -1; // no moment of the clock, in nanoseconds
 
     void takeTurn();
+    void runFirstEvent();
+    /// Whether timers run, or the descriptor is armed for one that did.
+    bool hasTimers() const { return !m_timers.isEmpty() || m_armed != NEVER; }
+    __attribute__((noinline)) bool runTurnWithTimers();
+    void sleep(std::unique_lock<std::mutex>& lock);
+    void startTimer(TYTimer& timer, long long nanoseconds);
+    void stopTimer(TYTimer& timer);
+    void takeDueTimers();
+    bool runDueTimers(unsigned int priority);
+    void settleTimers(bool hadWork);
+    bool isTimerDue() const;
+    long long getNanosecondsToTimer() const;
+    void armTimerFd(long long due);
+    void signalTimer();
     XCode post(TYEvent& event);
     void withdraw(TYEvent& event);
     bool hasPending() const;
     void wake();
+    void openPollFd();
+    void closePollFd();
     void setPollFd();
     void resetPollFd();
 
@@ -65,12 +92,19 @@ private:
     std::array<LinkedListManager_Untyped, EventPrio::COUNT> m_pending;
     LinkedListManager_Untyped m_turn; // what the running turn has taken and not yet run; the loop's thread
     TYSyncEvent m_syncEvents[EventPrio::COUNT];
+    TYTimerQueue m_timers;                                               // this and the next three: the loop's thread
+    std::array<LinkedListManager_Untyped, EventPrio::COUNT> m_dueTimers; // taken into the running turn
+    unsigned int m_numberOfDueTimers = 0;
+    long long m_armed = NEVER;            // when the timer descriptor becomes readable
     std::atomic<bool> m_wasPosted{false}; // since a turn last took what was pending
     std::atomic<std::thread::id> m_thread;
-    int m_pollFd = -1;
+    int m_pollFd = -1;  // an epoll descriptor that holds the next two
+    int m_eventFd = -1; // readable while m_isPollFdSet
+    int m_timerFd = -1;
     unsigned int m_waiting = 0; // callers inside a synchronisation event
     bool m_isSleeping = false;  // run() waits for work
     bool m_isPollFdSet = false;
+    bool m_isTimerSignalled = false; // the event descriptor tells of a timer that is due already
     bool m_isStopped = false;
     bool m_isEnded = false;
     bool m_isInTurn = false;
