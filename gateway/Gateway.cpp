@@ -77,7 +77,9 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
                     0,
                     false,
                     [this] { stopIfIdle(); }}
-    , m_clearTimer(m_stack.getRoot(), [this] { onClearTimer(); })
+    , m_clearTimer(
+          m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
+          this)
 {
     m_stack.attach(m_callControlLoop);
     m_stack.attach(m_datapathLoop);
@@ -127,8 +129,7 @@ void Gateway::end()
     m_environment.isEnding = true;
     spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
                  m_configuration.clearAfter);
-    if (!m_clearTimer.start(m_configuration.clearAfter * 1000))
-        clearCalls();
+    m_clearTimer.start(m_configuration.clearAfter * 1000);
     stopIfIdle();
 }
 
@@ -150,8 +151,7 @@ void Gateway::clearCalls()
         port->interface.clearCalls({QCause::TEMPORARY_FAILURE, 0, {}});
         wait = std::max(wait, port->interface.getConfiguration().t1x64);
     }
-    if (!m_clearTimer.start(wait))
-        m_stack.stop();
+    m_clearTimer.start(wait);
     stopIfIdle();
 }
 

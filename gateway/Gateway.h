@@ -3,10 +3,10 @@
 #include "CallControlHost.h"
 #include "Configuration.h"
 #include "platform/eventloop/TYEventLoop.h"
+#include "platform/eventloop/TYTimer.h"
 #include "sip/SipEnvironment.h"
 #include "sip/SipInterface.h"
 #include "sip/SipStack.h"
-#include "sip/SipTimer.h"
 
 #include <memory>
 #include <vector>
@@ -74,7 +74,7 @@ private:
     Signals m_signals;
     CallControlHost m_host;
     SipEnvironment m_environment;
-    SipTimer m_clearTimer;
+    TYTimer m_clearTimer;
     bool m_isClearing = false;
     std::vector<std::unique_ptr<Port>> m_ports;
 };

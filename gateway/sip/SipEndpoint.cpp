@@ -1,5 +1,6 @@
 #include "SipEndpoint.h"
 
+#include "callcontrol/CallControl.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"
@@ -9,7 +10,6 @@
 #include "properties/CC_PropertyString.h"
 #include "sip/SipInterface.h"
 #include "sip/SipPropertyId.h"
-#include "sip/SipStack.h"
 
 #include <spdlog/spdlog.h>
 
@@ -41,8 +41,14 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     : CC_Endpoint(nullptr, nullptr)
     , m_interface(interface)
     , m_callNumber(callNumber)
-    , m_timer(interface.getEnvironment().stack.getRoot(), [this] { m_isCalling ? onDialFailed() : onAnswerTimeout(); })
+    , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
 {
+}
+
+void SipEndpoint::ON_TIMER(void* endpoint)
+{
+    auto& self = *static_cast<SipEndpoint*>(endpoint);
+    self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout();
 }
 
 SipEndpoint::~SipEndpoint()

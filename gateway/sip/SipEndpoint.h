@@ -4,11 +4,11 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
+#include "platform/eventloop/TYTimer.h"
 #include "sip/SipCause.h"
 #include "sip/SipParty.h"
 #include "sip/SipQuality.h"
 #include "sip/SipRequestHandler.h"
-#include "sip/SipTimer.h"
 
 #include <spdlog/fmt/fmt.h>
 
@@ -99,6 +99,7 @@ private:
     void forgetInvite();
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
+    static void ON_TIMER(void* endpoint);
     int onBye(sip_t const* request);
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
@@ -136,7 +137,7 @@ private:
     nta_outgoing_t* m_ack = nullptr;
     nta_outgoing_t* m_bye = nullptr;
     unsigned int m_inviteSequence = 0;
-    SipTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
+    TYTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isAckLate = false;              // the ACK must carry the answer, which the other side does not have yet

@@ -109,7 +109,8 @@ bool SipEndpoint::startInvite(std::string const& uri, std::string const& identit
         return false;
     m_inviteSequence = nta_leg_get_seq(m_leg);
     m_dialog = Dialog::INVITE_SENT;
-    return m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
+    m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
+    return true;
 }
 
 int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)

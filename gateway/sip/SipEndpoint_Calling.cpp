@@ -47,8 +47,8 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
     trace("-> 100");
     // the stack still holds the transaction, which must not end under it: a failure waits until it has let go
-    if (!dial(request, provider, called).isOk() && !m_timer.start(0))
-        onDialFailed();
+    if (!dial(request, provider, called).isOk())
+        m_timer.start(0);
     return 0;
 }
 

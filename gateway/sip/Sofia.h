@@ -5,13 +5,11 @@
 class SipDescriptorHandler;
 class SipEndpoint;
 class SipRequestHandler;
-class SipTimer;
 
 #define NTA_LEG_MAGIC_T SipRequestHandler
 #define NTA_OUTGOING_MAGIC_T SipEndpoint
 #define NTA_INCOMING_MAGIC_T SipEndpoint
 #define SU_WAKEUP_ARG_T SipDescriptorHandler
-#define SU_TIMER_ARG_T SipTimer
 
 #include <sofia-sip/msg_header.h>
 #include <sofia-sip/nta.h>
