@@ -10,11 +10,11 @@ namespace
 {
 constexpr std::size_t PROVIDER_BUCKETS = 32;
 
-XCode ASSIGN(String& to, String const& text)
+XCode ASSIGN(String& to, std::string_view text)
 {
     try
     {
-        to = text;
+        to = String(text);
         return XCode::OK;
     }
     catch (std::bad_alloc const&)
@@ -73,6 +73,14 @@ void CC_Context::removeProvider(String const& name)
     m_providerTable.remove(name);
     // told for an unknown name too, on purpose: who waits for the name to be free hears that it is
     m_observers.notifyObservers(NOTIFY_OBSERVER_ABOUT_REMOVE_PROVIDER, *this, DATUM(name));
+}
+
+void CC_Context::removeProviderNamed(std::string_view name)
+{
+    String told;
+    if (!m_providerTable.remove(name, &told) && !ASSIGN(told, name).isOk())
+        return; // nothing was removed, and there is no memory to say so
+    m_observers.notifyObservers(NOTIFY_OBSERVER_ABOUT_REMOVE_PROVIDER, *this, DATUM(told));
 }
 
 CC_Provider* CC_Context::getProvider(unsigned int index) const

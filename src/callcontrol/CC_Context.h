@@ -100,6 +100,12 @@ public:
     static void NOTIFY_OBSERVER_ABOUT_DESTROY_CALL(Observer& observer, CC_Context& context, void* data);
 
 private:
+    friend class CallControl;
+
+    // by names of which nobody has made a String
+    CC_Provider* findProvider(std::string_view name) const { return m_providerTable.get(name); }
+    void removeProviderNamed(std::string_view name);
+
     String m_name;
     CC_ObserverContainerOld<Observer, CC_Context> m_observers;
     String m_nationalPrefix;

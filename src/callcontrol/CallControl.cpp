@@ -162,6 +162,31 @@ void CallControl::destroyContext(String const& name)
     m_contextTable.remove(*used);
 }
 
+XCode CallControl::createContextNamed(std::string_view name)
+{
+    if (m_contextTable.find(name) != nullptr)
+        return XCode::REFUSED;
+    String kept;
+    return kept.assign(name).isOk() ? createContext(kept) : XCode::FAILURE;
+}
+
+void CallControl::destroyContextNamed(std::string_view name)
+{
+    String kept;
+    if (kept.assign(name).isOk())
+        return destroyContext(kept);
+    auto const* entry = m_contextTable.find(name);
+    tellContextObservers(
+        [&](ContextObserver& observer)
+        {
+            if (entry != nullptr)
+                observer.contextDestroyed(entry->getKey());
+            entry = m_contextTable.find(name); // the observer may have been faster
+        });
+    std::unique_ptr<CC_Context> const context(m_contextTable.get(name));
+    m_contextTable.remove(name);
+}
+
 CC_Context* CallControl::getContext(String const& name) const { return m_contextTable.get(name); }
 
 void CallControl::registerContextObserver(ContextObserver& observer)

@@ -183,8 +183,223 @@ public:
                                         unsigned int level, unsigned int maxDetail, unsigned int detail,
                                         String const& prefix);
 
+    // --- the same by names that are no Strings: literals, pointers to texts, views, std::string ----------------------
+    // They make none, so a name of any length takes no memory of the caller's, and none at all where something is
+    // looked up. What keeps a name makes its own and tells by the result that memory is out, as told above; that a name
+    // which is not there was removed is then not announced.
+
+    template <TYText Name>
+    XCode createContext(Name const& name)
+    {
+        return createContextNamed(String::VIEW_OF(name));
+    }
+    template <TYText Name>
+    void destroyContext(Name const& name)
+    {
+        destroyContextNamed(String::VIEW_OF(name));
+    }
+    template <TYText Name>
+    CC_Context* getContext(Name const& name) const
+    {
+        return m_contextTable.get(String::VIEW_OF(name));
+    }
+    template <TYText Name>
+    String const& getNationalPrefix(Name const& contextName) const
+    {
+        return getNationalPrefix(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Context, TYText Name>
+    XCode setNationalPrefix(Context const& contextName, Name const& prefix)
+    {
+        return setNationalPrefixFrom(String::VIEW_OF(contextName), String::VIEW_OF(prefix));
+    }
+    template <TYText Name>
+    String const& getInternationalPrefix(Name const& contextName) const
+    {
+        return getInternationalPrefix(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Context, TYText Name>
+    XCode setInternationalPrefix(Context const& contextName, Name const& prefix)
+    {
+        return setInternationalPrefixFrom(String::VIEW_OF(contextName), String::VIEW_OF(prefix));
+    }
+    template <TYText Name>
+    unsigned int getMaxHops(Name const& contextName) const
+    {
+        return getMaxHops(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Name>
+    XCode setMaxHops(Name const& contextName, unsigned int maxHops)
+    {
+        return setMaxHops(keyOf(String::VIEW_OF(contextName)), maxHops);
+    }
+    template <TYText Context, TYText Name>
+    XCode addProvider(Context const& contextName, Name const& providerName, CC_Provider& provider)
+    {
+        return addProviderNamed(String::VIEW_OF(contextName), String::VIEW_OF(providerName), provider);
+    }
+    template <TYText Context, TYText Name>
+    void removeProvider(Context const& contextName, Name const& providerName)
+    {
+        removeProviderNamed(String::VIEW_OF(contextName), String::VIEW_OF(providerName));
+    }
+    template <TYText Name>
+    unsigned int getNumberOfProviders(Name const& contextName) const
+    {
+        return getNumberOfProviders(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Name>
+    CC_Provider* getProvider(Name const& contextName, unsigned int index) const
+    {
+        return getProvider(keyOf(String::VIEW_OF(contextName)), index);
+    }
+    template <TYText Context, TYText Name>
+    CC_Provider* getProvider(Context const& contextName, Name const& providerName) const
+    {
+        return findProvider(String::VIEW_OF(contextName), String::VIEW_OF(providerName));
+    }
+    template <TYText Name>
+    CC_CallPool* getCallPool(Name const& contextName) const
+    {
+        return getCallPool(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Name>
+    CC_Call* acquireCall(Name const& contextName)
+    {
+        return acquireCall(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Name>
+    CC_Call* acquireCall(Name const& contextName, MG_IContext* mgContext)
+    {
+        return acquireCall(keyOf(String::VIEW_OF(contextName)), mgContext);
+    }
+    template <TYText Name>
+    void releaseCall(Name const& contextName, CC_Call* call)
+    {
+        releaseCall(keyOf(String::VIEW_OF(contextName)), call);
+    }
+    template <TYText Name>
+    unsigned int getNumberOfCalls(Name const& contextName) const
+    {
+        return getNumberOfCalls(keyOf(String::VIEW_OF(contextName)));
+    }
+    template <TYText Name>
+    CC_Call* getCall(Name const& contextName, unsigned int index) const
+    {
+        return getCall(keyOf(String::VIEW_OF(contextName)), index);
+    }
+
+    template <TYText Name>
+    static XCode CREATE_CONTEXT(Name const& name)
+    {
+        return INSTANCE()->createContext(name);
+    }
+    template <TYText Name>
+    static void DESTROY_CONTEXT(Name const& name)
+    {
+        INSTANCE()->destroyContext(name);
+    }
+    template <TYText Name>
+    static CC_Context* GET_CONTEXT(Name const& name)
+    {
+        return INSTANCE()->getContext(name);
+    }
+    template <TYText Name>
+    static String const& GET_NATIONAL_PREFIX(Name const& contextName)
+    {
+        return INSTANCE()->getNationalPrefix(contextName);
+    }
+    template <TYText Context, TYText Name>
+    static XCode SET_NATIONAL_PREFIX(Context const& contextName, Name const& prefix)
+    {
+        return INSTANCE()->setNationalPrefix(contextName, prefix);
+    }
+    template <TYText Name>
+    static String const& GET_INTERNATIONAL_PREFIX(Name const& contextName)
+    {
+        return INSTANCE()->getInternationalPrefix(contextName);
+    }
+    template <TYText Context, TYText Name>
+    static XCode SET_INTERNATIONAL_PREFIX(Context const& contextName, Name const& prefix)
+    {
+        return INSTANCE()->setInternationalPrefix(contextName, prefix);
+    }
+    template <TYText Name>
+    static unsigned int GET_MAX_HOPS(Name const& contextName)
+    {
+        return INSTANCE()->getMaxHops(contextName);
+    }
+    template <TYText Name>
+    static XCode SET_MAX_HOPS(Name const& contextName, unsigned int maxHops)
+    {
+        return INSTANCE()->setMaxHops(contextName, maxHops);
+    }
+    template <TYText Context, TYText Name>
+    static XCode ADD_PROVIDER(Context const& contextName, Name const& providerName, CC_Provider& provider)
+    {
+        return INSTANCE()->addProvider(contextName, providerName, provider);
+    }
+    template <TYText Context, TYText Name>
+    static void REMOVE_PROVIDER(Context const& contextName, Name const& providerName)
+    {
+        INSTANCE()->removeProvider(contextName, providerName);
+    }
+    template <TYText Name>
+    static unsigned int GET_NUMBER_OF_PROVIDERS(Name const& contextName)
+    {
+        return INSTANCE()->getNumberOfProviders(contextName);
+    }
+    template <TYText Name>
+    static CC_Provider* GET_PROVIDER(Name const& contextName, unsigned int index)
+    {
+        return INSTANCE()->getProvider(contextName, index);
+    }
+    template <TYText Context, TYText Name>
+    static CC_Provider* GET_PROVIDER(Context const& contextName, Name const& providerName)
+    {
+        return INSTANCE()->getProvider(contextName, providerName);
+    }
+    template <TYText Name>
+    static CC_CallPool* GET_CALL_POOL(Name const& contextName)
+    {
+        return INSTANCE()->getCallPool(contextName);
+    }
+    template <TYText Name>
+    static CC_Call* ACQUIRE_CALL(Name const& contextName)
+    {
+        return INSTANCE()->acquireCall(contextName);
+    }
+    template <TYText Name>
+    static CC_Call* ACQUIRE_CALL(Name const& contextName, MG_IContext* mgContext)
+    {
+        return INSTANCE()->acquireCall(contextName, mgContext);
+    }
+    template <TYText Name>
+    static void RELEASE_CALL(Name const& contextName, CC_Call* call)
+    {
+        INSTANCE()->releaseCall(contextName, call);
+    }
+    template <TYText Name>
+    static unsigned int GET_NUMBER_OF_CALLS(Name const& contextName)
+    {
+        return INSTANCE()->getNumberOfCalls(contextName);
+    }
+    template <TYText Name>
+    static CC_Call* GET_CALL(Name const& contextName, unsigned int index)
+    {
+        return INSTANCE()->getCall(contextName, index);
+    }
+
 private:
     CC_Context* findContext(String const& name) const;
+    String const& keyOf(std::string_view contextName) const;
+    CC_Provider* findProvider(std::string_view contextName, std::string_view providerName) const;
+    XCode createContextNamed(std::string_view name);
+    void destroyContextNamed(std::string_view name);
+    XCode setNationalPrefixFrom(std::string_view contextName, std::string_view prefix);
+    XCode setInternationalPrefixFrom(std::string_view contextName, std::string_view prefix);
+    XCode addProviderNamed(std::string_view contextName, std::string_view providerName, CC_Provider& provider);
+    void removeProviderNamed(std::string_view contextName, std::string_view providerName);
     template <class Tell>
     void tellContextObservers(Tell&& tell);
 

@@ -4,18 +4,59 @@
 #include "callcontrol/CC_Context.h"
 
 #include <algorithm>
-#include <new>
 
 namespace
 {
 constexpr unsigned int COUNTED_CONTEXTS = 64;
 String const DEFAULT_NAME(CallControl::DEFAULT_CONTEXT_NAME);
+String const NO_CONTEXT; // stands for a name that no context has; known by its address
 } // namespace
 
 /// The context that an operation addresses; null when there is none.
 CC_Context* CallControl::findContext(String const& name) const
 {
+    if (&name == &NO_CONTEXT)
+        return nullptr;
     return m_contextTable.get(name.isEmpty() ? DEFAULT_NAME : name);
+}
+
+/// The name under which the context that an operation addresses stands in the table.
+String const& CallControl::keyOf(std::string_view contextName) const
+{
+    auto const* const entry = m_contextTable.find(contextName.empty() ? DEFAULT_NAME : contextName);
+    return entry != nullptr ? entry->getKey() : NO_CONTEXT;
+}
+
+CC_Provider* CallControl::findProvider(std::string_view contextName, std::string_view providerName) const
+{
+    CC_Context const* const context = findContext(keyOf(contextName));
+    return context != nullptr ? context->findProvider(providerName) : nullptr;
+}
+
+XCode CallControl::setNationalPrefixFrom(std::string_view contextName, std::string_view prefix)
+{
+    String kept;
+    return kept.assign(prefix).isOk() ? setNationalPrefix(keyOf(contextName), kept) : XCode::FAILURE;
+}
+
+XCode CallControl::setInternationalPrefixFrom(std::string_view contextName, std::string_view prefix)
+{
+    String kept;
+    return kept.assign(prefix).isOk() ? setInternationalPrefix(keyOf(contextName), kept) : XCode::FAILURE;
+}
+
+XCode CallControl::addProviderNamed(std::string_view contextName, std::string_view providerName, CC_Provider& provider)
+{
+    if (findProvider(contextName, providerName) != nullptr)
+        return XCode::REFUSED;
+    String kept;
+    return kept.assign(providerName).isOk() ? addProvider(keyOf(contextName), kept, provider) : XCode::FAILURE;
+}
+
+void CallControl::removeProviderNamed(std::string_view contextName, std::string_view providerName)
+{
+    if (CC_Context* const context = findContext(keyOf(contextName)))
+        context->removeProviderNamed(providerName);
 }
 
 String const& CallControl::getNationalPrefix(String const& contextName) const

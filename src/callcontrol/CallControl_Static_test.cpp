@@ -5,6 +5,7 @@
 #include "properties/CC_Property.h"
 #include "properties/CC_PropertyId.h"
 #include "testing/DrivenLoop.h"
+#include "testing/FailingAllocator.h"
 #include "testing/FakeMediaContext.h"
 #include "testing/FakeMediaContextRepository.h"
 #include "testing/FakeTerminationRepository.h"
@@ -14,6 +15,8 @@
 
 #include <gtest/gtest.h>
 #include <memory>
+#include <string>
+#include <string_view>
 
 TEST(CallControl_Static, TheEnvironmentIsThatOfTheOneObject)
 {
@@ -124,3 +127,119 @@ TEST(CallControl_Static, OperationsOnAContextReachIt)
 }
 
 TEST(CallControl_Static, TheDefaultContextIsSwitch) { EXPECT_STREQ(CallControl::DEFAULT_CONTEXT_NAME, "SWITCH"); }
+
+namespace
+{
+// longer than what a String holds inside its own object
+char const s_longContext[] = "a name of sixty octets, as a large site gives to its switches";
+char const s_longProvider[] = "a name of sixty octets, as a large site gives to its trunks..";
+
+/// Counts allocations while it lives, and lets the first fail.
+struct NoMemory
+{
+    NoMemory() { FailingAllocator::failNth(1); }
+    ~NoMemory() { FailingAllocator::stop(); }
+    NoMemory(NoMemory const&) = delete;
+    NoMemory& operator=(NoMemory const&) = delete;
+};
+} // namespace
+
+TEST(CallControl_Static, LookingUpLongNamesTakesNoMemory)
+{
+    RecordingProvider provider("provider");
+    ASSERT_TRUE(CallControl::CREATE_CONTEXT(s_longContext).isOk());
+    ASSERT_TRUE(CallControl::ADD_PROVIDER(s_longContext, s_longProvider, provider).isOk());
+    ASSERT_TRUE(CallControl::SET_NATIONAL_PREFIX(s_longContext, s_longProvider).isOk());
+    std::string_view const view(s_longContext);
+    CC_Context const* context = nullptr;
+    CC_Provider const* found[5] = {};
+    unsigned int numbers[4] = {};
+    XCode set = XCode::FAILURE;
+    XCode taken;
+    {
+        NoMemory const none;
+        context = CallControl::GET_CONTEXT(s_longContext);
+        found[0] = CallControl::GET_PROVIDER(s_longContext, s_longProvider);
+        found[1] = CallControl::GET_PROVIDER(view, 0U);
+        found[2] = CallControl::INSTANCE()->getProvider(view, s_longProvider);
+        found[3] = CallControl::GET_PROVIDER(s_longContext, s_longContext);
+        found[4] = CallControl::GET_PROVIDER(s_longProvider, s_longProvider);
+        numbers[0] = CallControl::GET_NUMBER_OF_PROVIDERS(s_longContext);
+        numbers[1] = static_cast<unsigned int>(CallControl::GET_NATIONAL_PREFIX(s_longContext).length());
+        numbers[2] = CallControl::GET_NUMBER_OF_CALLS(s_longContext) + CallControl::GET_MAX_HOPS(s_longContext);
+        numbers[3] = CallControl::GET_CALL_POOL(s_longContext) != nullptr ? 1 : 0;
+        set = CallControl::SET_MAX_HOPS(s_longContext, 3);
+        taken = CallControl::ADD_PROVIDER(s_longContext, s_longProvider, provider);
+        CallControl::RELEASE_CALL(s_longContext, nullptr);
+        CallControl::REMOVE_PROVIDER(s_longContext, s_longProvider);
+        CallControl::REMOVE_PROVIDER(s_longContext, s_longProvider);
+        EXPECT_EQ(FailingAllocator::count(), 1UL); // to tell that a name was removed which was not there
+    }
+    ASSERT_NE(context, nullptr);
+    EXPECT_EQ(found[0], &provider);
+    EXPECT_EQ(found[1], &provider);
+    EXPECT_EQ(found[2], &provider);
+    EXPECT_EQ(found[3], nullptr);
+    EXPECT_EQ(found[4], nullptr);
+    EXPECT_EQ(numbers[0], 1u);
+    EXPECT_EQ(numbers[1], sizeof s_longProvider - 1);
+    EXPECT_EQ(numbers[2], 0u);
+    EXPECT_EQ(numbers[3], 1u);
+    EXPECT_EQ(set, XCode::OK);
+    EXPECT_EQ(taken, XCode::REFUSED);
+    EXPECT_EQ(context->getMaxHops(), 3u);
+    EXPECT_EQ(context->getNumberOfProviders(), 0u);
+    CallControl::DESTROY_CONTEXT(s_longContext);
+    EXPECT_EQ(CallControl::GET_CONTEXT(s_longContext), nullptr);
+}
+
+TEST(CallControl_Static, KeepingALongNameWithoutMemoryIsAResult)
+{
+    RecordingProvider provider("provider");
+    ASSERT_TRUE(CallControl::CREATE_CONTEXT("lab").isOk());
+    XCode results[4];
+    {
+        NoMemory const none;
+        results[0] = CallControl::CREATE_CONTEXT(s_longContext);
+        FailingAllocator::failNth(1);
+        results[1] = CallControl::ADD_PROVIDER("lab", s_longProvider, provider);
+        FailingAllocator::failNth(1);
+        results[2] = CallControl::SET_NATIONAL_PREFIX("lab", s_longProvider);
+        FailingAllocator::failNth(1);
+        results[3] = CallControl::SET_INTERNATIONAL_PREFIX("lab", s_longProvider);
+    }
+    for (XCode const result : results)
+        EXPECT_EQ(result, XCode::FAILURE);
+    EXPECT_EQ(CallControl::GET_CONTEXT(s_longContext), nullptr);
+    EXPECT_EQ(CallControl::GET_NUMBER_OF_PROVIDERS("lab"), 0u);
+    CallControl::DESTROY_CONTEXT("lab");
+}
+
+TEST(CallControl_Static, AContextOfALongNameEndsWithoutMemory)
+{
+    RecordingContextsObserver observer("o");
+    CallControl::REGISTER_CONTEXT_OBSERVER(observer);
+    ASSERT_TRUE(CallControl::CREATE_CONTEXT(s_longContext).isOk());
+    {
+        NoMemory const none;
+        CallControl::DESTROY_CONTEXT(s_longContext);
+    }
+    CallControl::UNREGISTER_CONTEXT_OBSERVER(observer);
+    EXPECT_EQ(CallControl::GET_CONTEXT(s_longContext), nullptr);
+    std::string const name = s_longContext;
+    EXPECT_EQ(observer.take(), (Lines{"o: context " + name + " added", "o: context " + name + " destroyed"}));
+}
+
+TEST(CallControl_Static, AnEmptyNameOrNoneIsSwitch)
+{
+    ASSERT_TRUE(CallControl::CREATE_CONTEXT("SWITCH").isOk());
+    CC_CallPool* const pool = CallControl::GET_CALL_POOL("SWITCH");
+    char const* const null = nullptr;
+    EXPECT_NE(pool, nullptr);
+    EXPECT_EQ(CallControl::GET_CALL_POOL(""), pool);
+    EXPECT_EQ(CallControl::GET_CALL_POOL(null), pool);
+    EXPECT_EQ(CallControl::GET_CALL_POOL(std::string_view()), pool);
+    EXPECT_EQ(CallControl::GET_CALL_POOL(String()), pool);
+    EXPECT_EQ(CallControl::GET_CONTEXT(""), nullptr);
+    CallControl::DESTROY_CONTEXT("SWITCH");
+}

@@ -244,3 +244,19 @@ TEST(OutOfMemory, ReadingAnAddressNeedsNone)
     EXPECT_TRUE(result.isOk());
     EXPECT_TRUE(address.isNetType());
 }
+
+TEST(OutOfMemory, AStringThatCannotBeAssignedStaysAsItWas)
+{
+    String text("before");
+    XCode refused;
+    XCode taken = XCode::FAILURE;
+    {
+        MemoryLimit const limit(0);
+        refused = text.assign(s_longText);
+        EXPECT_EQ("before", text);
+        taken = text.assign("fits inside");
+    }
+    EXPECT_EQ(XCode::NO_ELEMENT, refused);
+    EXPECT_EQ(XCode::OK, taken);
+    EXPECT_EQ("fits inside", text);
+}

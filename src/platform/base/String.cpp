@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdarg>
 #include <cstdio>
+#include <new>
 
 // ready before the static initialisers of every other file, which may use it
 __attribute__((init_priority(101))) String const String::s_empty;
@@ -50,6 +51,19 @@ String& String::concatf(char const* format, ...)
     va_end(arguments);
     m_text += appended;
     return *this;
+}
+
+XCode String::assign(std::string_view text)
+{
+    try
+    {
+        m_text.assign(text);
+        return XCode::OK;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::NO_ELEMENT;
+    }
 }
 
 void String::deleteRegion(std::size_t position, std::size_t count)

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 #include <string>
+#include <string_view>
+#include <type_traits>
 
 namespace
 {
@@ -155,4 +157,42 @@ TEST(String, AViewBecomesAStringAndClearEmptiesIt)
     EXPECT_EQ("bc", text.view());
     text.clear();
     EXPECT_TRUE(text.isEmpty());
+}
+
+TEST(String, ComesFromAViewAndIsOneWithoutBeingAsked)
+{
+    static_assert(!std::is_convertible_v<std::string_view, String>); // may need memory
+    String const text(std::string_view("a\0b", 3));
+    std::string_view const view = text;
+    EXPECT_EQ(view.data(), text.c_str());
+    EXPECT_EQ(3U, view.size());
+    String line("x");
+    line += std::string_view("yz!", 2);
+    EXPECT_EQ("xyz", line);
+}
+
+TEST(String, ComparesWithAViewOfAPartOfAText)
+{
+    std::string_view const part = std::string_view("sipping").substr(0, 3);
+    EXPECT_TRUE(String("sip") == part);
+    EXPECT_TRUE(part == String("sip"));
+    EXPECT_TRUE(String("sipp") != part);
+    EXPECT_TRUE(String("sip") == std::string("sip"));
+    EXPECT_TRUE(String("a") < std::string_view("b"));
+    EXPECT_TRUE(std::string_view("b") > String("a"));
+    EXPECT_FALSE(String("a\0b", 3) == std::string_view("a"));
+    EXPECT_TRUE(String("a") < String("a\0b", 3));
+    EXPECT_TRUE(String("b") > String("a") && String("b") >= String("b"));
+    EXPECT_TRUE(String("a") < "b" && "b" > String("a"));
+    EXPECT_TRUE(String("\x7f") < "\x80"); // bytes have no sign
+}
+
+TEST(String, ATextIsWhateverNamesCanBeTakenFrom)
+{
+    static_assert(TYText<char[4]> && TYText<char const*> && TYText<std::string_view> && TYText<std::string>);
+    static_assert(TYText<String> && !TYText<int> && !TYText<char>);
+    char const* const null = nullptr;
+    EXPECT_EQ("", String::VIEW_OF(null));
+    EXPECT_EQ("sip", String::VIEW_OF("sip"));
+    EXPECT_EQ("sip", String::VIEW_OF(String("sip")));
 }

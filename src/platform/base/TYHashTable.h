@@ -7,18 +7,22 @@
 #include <functional>
 #include <new>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 /// How keys are spread over the buckets: numbers by their remainder, strings by a hash of their bytes.
+/// `Argument`: as what a key is looked up; for strings any text, so that looking up a literal needs no memory.
 template <class Key>
 struct TYHash
 {
+    using Argument = Key const&;
     std::size_t operator()(Key const& key) const { return static_cast<std::size_t>(key); }
 };
 template <>
 struct TYHash<String>
 {
-    std::size_t operator()(String const& key) const { return std::hash<std::string_view>()(key.view()); }
+    using Argument = std::string_view;
+    std::size_t operator()(std::string_view key) const { return std::hash<std::string_view>()(key); }
 };
 
 /// A table with a fixed number of buckets that also keeps its entries in the order in which they were added.
@@ -27,6 +31,8 @@ template <class Key, class Value>
 class TYHashTable
 {
 public:
+    using Argument = typename TYHash<Key>::Argument;
+
     class Entry
     {
     public:
@@ -53,7 +59,7 @@ public:
     unsigned int getCount() const { return m_count; }
     Entry const* getFirst() const { return m_first; }
 
-    Entry const* find(Key const& key) const
+    Entry const* find(Argument key) const
     {
         Entry const* entry = m_buckets[bucketOf(key)];
         while (entry != nullptr && !(entry->m_key == key))
@@ -61,7 +67,7 @@ public:
         return entry;
     }
     /// The value under `key`, or `Value()` (null for a table of pointers).
-    Value get(Key const& key) const
+    Value get(Argument key) const
     {
         Entry const* const entry = find(key);
         return entry == nullptr ? Value() : entry->m_value;
@@ -86,7 +92,9 @@ public:
     }
 
     /// Whether there was such an entry.
-    bool remove(Key const& key)
+    bool remove(Argument key) { return remove(key, nullptr); }
+    /// Moves the entry's key to `removed`, unless that is null.
+    bool remove(Argument key, Key* removed)
     {
         Entry** link = &m_buckets[bucketOf(key)];
         while (*link != nullptr && !((*link)->m_key == key))
@@ -98,6 +106,8 @@ public:
         (entry->m_previous != nullptr ? entry->m_previous->m_next : m_first) = entry->m_next;
         (entry->m_next != nullptr ? entry->m_next->m_previous : m_last) = entry->m_previous;
         --m_count;
+        if (removed != nullptr)
+            *removed = std::move(entry->m_key);
         delete entry;
         return true;
     }
@@ -117,7 +127,7 @@ public:
     }
 
 private:
-    std::size_t bucketOf(Key const& key) const { return TYHash<Key>()(key) % m_buckets.size(); }
+    std::size_t bucketOf(Argument key) const { return TYHash<Key>()(key) % m_buckets.size(); }
     static Entry* CREATE(Key const& key, Value const& value)
     {
         try

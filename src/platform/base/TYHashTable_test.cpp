@@ -1,11 +1,13 @@
 #include "platform/base/TYHashTable.h"
 
 #include "platform/base/RefusingValue.h"
+#include "testing/FailingAllocator.h"
 
 #include <algorithm>
 #include <gtest/gtest.h>
 #include <numeric>
 #include <random>
+#include <string>
 #include <vector>
 
 namespace
@@ -152,4 +154,30 @@ TEST(TYHashTable, ManyEntriesSurviveRemovalInARandomOrder)
             EXPECT_EQ(keys.size(), values.size());
         }
     }
+}
+
+TEST(TYHashTable, AStringIsFoundByAnyTextWithoutMakingAString)
+{
+    INStringHashTable<int> table(3);
+    std::string const name(60, 'n');
+    ASSERT_TRUE(table.add(String(name), 7).isOk());
+    FailingAllocator::failNth(1);
+    int const found = table.get(name);
+    int const ofPart = table.get(std::string_view(name).substr(1));
+    FailingAllocator::stop();
+    EXPECT_EQ(7, found);
+    EXPECT_EQ(0, ofPart);
+    EXPECT_EQ(0UL, FailingAllocator::count());
+}
+
+TEST(TYHashTable, ARemovedKeyCanBeKept)
+{
+    INStringHashTable<int> table(3);
+    ASSERT_TRUE(table.add("sip", 7).isOk());
+    String removed("before");
+    EXPECT_FALSE(table.remove("isdn", &removed));
+    EXPECT_EQ("before", removed);
+    EXPECT_TRUE(table.remove("sip", &removed));
+    EXPECT_EQ("sip", removed);
+    EXPECT_EQ(0U, table.getCount());
 }
