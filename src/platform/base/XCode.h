@@ -1,5 +1,9 @@
 #pragma once
 
+#include "platform/base/NameOf.h"
+
+#include <iosfwd>
+
 /// The result of an operation that can fail: a small value, returned and never thrown.
 ///
 /// Value 0 is success, any other value an error. Ask `isOk()`; compare with the named values below when the kind of
@@ -8,6 +12,8 @@
 ///     XCode const result = call.setProperty(property);
 ///     if (!result.isOk())
 ///         return result;
+///
+/// It says its name, to a log (`getName()`), to a stream and so in a test that fails: "REFUSED".
 class [[nodiscard]] XCode
 {
 public:
@@ -16,6 +22,9 @@ public:
 
     constexpr bool isOk() const { return m_value == 0; }
     constexpr unsigned int getValue() const { return m_value; }
+    /// The name of the constant below, or ERROR::INVALID for any other value.
+    constexpr char const* getName() const { return NAME(*this); }
+    static constexpr char const* NAME(XCode result);
     friend constexpr bool operator==(XCode, XCode) = default;
 
     static XCode const OK;         ///< 0: done
@@ -33,3 +42,18 @@ inline constexpr XCode XCode::NO_ELEMENT{0x40000001};
 inline constexpr XCode XCode::ABSENT{0x40000003};
 inline constexpr XCode XCode::REFUSED{0x40000004};
 inline constexpr XCode XCode::FAILURE{0x7fffffff};
+
+constexpr char const* XCode::NAME(XCode result)
+{
+    constexpr NamedValue<XCode> NAMES[] = {
+        {OK, "OK"}, {NO_ELEMENT, "NO_ELEMENT"}, {ABSENT, "ABSENT"}, {REFUSED, "REFUSED"}, {FAILURE, "FAILURE"}};
+    return NAME_OF(NAMES, result);
+}
+
+/// The name, with the value behind it where that is not one of the named ones: "(invalid) 5".
+template <class Traits>
+std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& stream, XCode result)
+{
+    stream << result.getName();
+    return result.getName() == ERROR::INVALID ? stream << ' ' << result.getValue() : stream;
+}

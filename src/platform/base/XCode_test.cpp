@@ -1,6 +1,8 @@
 #include "platform/base/XCode.h"
 
+#include <gtest/gtest-spi.h>
 #include <gtest/gtest.h>
+#include <sstream>
 
 TEST(XCode, TheNamedResultsHaveTheirNumbers)
 {
@@ -23,4 +25,27 @@ TEST(XCode, ResultsOfOneNumberAreEqual)
 {
     EXPECT_EQ(XCode(0x40000004), XCode::REFUSED);
     EXPECT_FALSE(XCode::REFUSED == XCode::ABSENT);
+}
+
+TEST(XCode, AResultSaysItsName)
+{
+    EXPECT_STREQ("OK", XCode().getName());
+    EXPECT_STREQ("NO_ELEMENT", XCode::NO_ELEMENT.getName());
+    EXPECT_STREQ("ABSENT", XCode::ABSENT.getName());
+    EXPECT_STREQ("REFUSED", XCode::REFUSED.getName());
+    EXPECT_STREQ("FAILURE", XCode::NAME(XCode(0x7fffffff)));
+    EXPECT_STREQ(ERROR::INVALID, XCode(5).getName());
+    static_assert(XCode::REFUSED.getName()[0] == 'R');
+}
+
+TEST(XCode, AStreamShowsNameOrNumber)
+{
+    std::ostringstream stream;
+    stream << XCode::ABSENT << ", " << XCode(5);
+    EXPECT_EQ("ABSENT, (invalid) 5", stream.str());
+}
+
+TEST(XCode, AFailingTestShowsTheNames)
+{
+    EXPECT_NONFATAL_FAILURE(EXPECT_EQ(XCode::OK, XCode::REFUSED), "Which is: REFUSED");
 }

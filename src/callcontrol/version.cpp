@@ -1,0 +1,5 @@
+#include "callcontrol/version.h"
+
+int CALLCONTROL_LIBRARY_VERSION() { return CALLCONTROL_VERSION; }
+
+char const* CALLCONTROL_LIBRARY_VERSION_STRING() { return CALLCONTROL_VERSION_STRING; }
