@@ -1,14 +1,22 @@
-# What `cmake --install` leaves for others: libraries, headers and a CMake package "callcontrol".
+# What `cmake --install` leaves for others: libraries, headers, the test kit, a CMake package and pkg-config files. The
+# folder may be moved afterwards.
 include(CMakePackageConfigHelpers)
-install(TARGETS ccplatform callcontrol callcontrol-testing EXPORT callcontrolTargets
+install(TARGETS ccplatform callcontrol callcontrol-testing callcontrol-testing-new-sources
+        callcontrol-testing-main-sources
+    EXPORT callcontrolTargets
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
     ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
 install(EXPORT callcontrolTargets NAMESPACE callcontrol:: DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/callcontrol)
-file(WRITE ${CMAKE_CURRENT_BINARY_DIR}/callcontrolConfig.cmake
-    "include(CMakeFindDependencyMacro)\nfind_dependency(Threads)\n"
-    "include(\${CMAKE_CURRENT_LIST_DIR}/callcontrolTargets.cmake)\n")
-write_basic_package_version_file(${CMAKE_CURRENT_BINARY_DIR}/callcontrolConfigVersion.cmake
+configure_package_config_file(packaging/callcontrolConfig.cmake.in callcontrolConfig.cmake
+    INSTALL_DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/callcontrol)
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/callcontrolConfigVersion.cmake
     COMPATIBILITY SameMajorVersion)
-install(FILES ${CMAKE_CURRENT_BINARY_DIR}/callcontrolConfig.cmake
-    ${CMAKE_CURRENT_BINARY_DIR}/callcontrolConfigVersion.cmake
+install(FILES ${PROJECT_BINARY_DIR}/callcontrolConfig.cmake ${PROJECT_BINARY_DIR}/callcontrolConfigVersion.cmake
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/cmake/callcontrol)
+
+file(RELATIVE_PATH PREFIX_FROM_PC /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
+string(REGEX REPLACE "/$" "" PREFIX_FROM_PC "${PREFIX_FROM_PC}")
+foreach(package callcontrol callcontrol-testing)
+    configure_file(packaging/${package}.pc.in ${package}.pc @ONLY)
+    install(FILES ${PROJECT_BINARY_DIR}/${package}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+endforeach()
