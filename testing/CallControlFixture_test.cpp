@@ -8,6 +8,7 @@
 #include "properties/CC_Property.h"
 #include "properties/CC_PropertyId.h"
 #include "testing/LeakCheck.h"
+#include "testing/RecordingContextObserver.h"
 
 #include <gtest/gtest.h>
 #include <memory>
@@ -56,6 +57,19 @@ TEST(CallControlFixture, OneFollowsAnother)
         CallControlFixture callControl;
         EXPECT_NE(callControl.getPool(), nullptr);
     }
+}
+
+TEST(CallControlFixture, ObserversOfItsContextMayEndBeforeIt)
+{
+    Journal journal;
+    {
+        CallControlFixture callControl;
+        RecordingContextObserver observer("o", &journal);
+        EXPECT_EQ(observer.observe(*callControl.getContext()), XCode::OK);
+        CallControl::RELEASE_CALL("SWITCH", CallControl::ACQUIRE_CALL("SWITCH"));
+        journal.add("the test ends");
+    }
+    EXPECT_EQ(journal.take(), (Lines{"o: SWITCH call created", "o: SWITCH call destroyed", "the test ends"}));
 }
 
 TEST(CallControlFixtureDeathTest, ASecondOneAtATimeIsRefusedClearly)

@@ -16,12 +16,13 @@
 ///     }
 ///
 /// Memory that TYRecycled keeps for reuse is no allocation: `TYRecycled::KEEP_BLOCKS(0)` first, as the test main does.
-/// The fakes and recorders of the kit do not count: they work in a Pause. A program with a main of its own has nothing
-/// failing unless its operator new asks `isToFail()`.
+/// The fakes and recorders of the kit do not count: they work in a Pause. A program with a main of its own links
+/// `callcontrol::testing-new`, or its own operator new asks `isToFail()`; in one that does neither `failNth` aborts.
 class FailingAllocator
 {
 public:
-    /// The n-th allocation from now on (1 is the next) fails, once; 0: none fails. The count begins again.
+    /// The n-th allocation from now on (1 is the next) fails, once; 0: none fails. The count begins again. Aborts with
+    /// a message when operator new does not ask.
     static void failNth(unsigned long n);
     /// Lets no further allocation fail, and ends the count.
     static void stop();

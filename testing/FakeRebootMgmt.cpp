@@ -53,11 +53,15 @@ FakeRebootMgmt::FakeRebootMgmt(std::string name, Journal* journal)
 {
     m_interface->addReference();
     // refused only when memory is out: the fake is then not found
-    std::ignore = DRIVER::INSTANCE().addDriverInterface(m_interface, TY::UUID::INVALID(), String::s_empty);
+    std::ignore = DRIVER::INSTANCE().addDriverInterface(m_interface, TY::UUID::INVALID(), getRecorderName().c_str());
 }
 
 FakeRebootMgmt::~FakeRebootMgmt()
 {
+    {
+        FailingAllocator::Pause const unseen;
+        record(m_locks == 0 ? "ended" : "ended (locks held: " + std::to_string(m_locks) + ")");
+    }
     m_interface->m_fake = nullptr;
     DRIVER::INSTANCE().removeDriverInterface(m_interface);
     m_interface->removeReference();

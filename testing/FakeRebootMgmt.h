@@ -5,7 +5,8 @@
 #include "testing/Recorder.h"
 
 /// The device's reboot management: records who takes and gives back graceful locks. Registered with DRIVER while it
-/// lives; a pool that has found it may outlive it and then records nothing more.
+/// lives, under its own name; a pool that has found it may outlive it and then records nothing more. Its end is a line,
+/// too: "reboot: ended", or "reboot: ended (locks held: 1)".
 ///
 ///     FakeRebootMgmt reboot;
 ///     CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");

@@ -24,6 +24,33 @@ TEST(FakeRebootMgmt, IsFoundWhileItLives)
     EXPECT_FALSE(FIND());
 }
 
+TEST(FakeRebootMgmt, IsFoundUnderItsName)
+{
+    FakeRebootMgmt const first("first");
+    FakeRebootMgmt second("second");
+    TYVector<TYPtr<IRebootMgmt>> found;
+    EXPECT_EQ(DRIVER::INSTANCE().getDriverInterfaces(found, TY::UUID::INVALID(), "second"), XCode::OK);
+    ASSERT_EQ(found.getSize(), 1u);
+    EXPECT_EQ(found[0]->addGracefulLock("me", "because", 0), XCode::OK);
+    EXPECT_EQ(second.take(), Lines{"second: add me (because, 0)"});
+}
+
+TEST(FakeRebootMgmt, RecordsItsEndAndTheLocksThatAreHeldThen)
+{
+    Journal journal;
+    {
+        FakeRebootMgmt const none("none", &journal);
+    }
+    TYPtr<IRebootMgmt> found;
+    {
+        FakeRebootMgmt const one("one", &journal);
+        found = FIND();
+        EXPECT_EQ(found->addGracefulLock("me", "because", 0), XCode::OK);
+    }
+    EXPECT_EQ(found->releaseGracefulLock("me"), XCode::FAILURE);
+    EXPECT_EQ(journal.take(), (Lines{"none: ended", "one: add me (because, 0)", "one: ended (locks held: 1)"}));
+}
+
 TEST(FakeRebootMgmt, RecordsLocksWithTheirTexts)
 {
     FakeRebootMgmt reboot;

@@ -4,13 +4,27 @@
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
 
-RecordingCallLegObserver::~RecordingCallLegObserver() = default;
+RecordingCallLegObserver::~RecordingCallLegObserver()
+{
+    for (CC_CallLeg* const leg : m_observed)
+        leg->removeCallLegObserver(this);
+}
+
+XCode RecordingCallLegObserver::observe(CC_CallLeg& leg)
+{
+    XCode const result = leg.addCallLegObserver(this);
+    FailingAllocator::Pause const unseen;
+    if (result.isOk())
+        m_observed.push_back(&leg);
+    return result;
+}
 
 void RecordingCallLegObserver::onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event)
 {
     auto const& ended = CC_EvCallLegObservationEnded::FROM(event);
     {
         FailingAllocator::Pause const unseen;
+        std::erase(m_observed, ended.getSource());
         record(textOf(ended.getSource()) + " ended");
     }
     m_onEnded(ended);

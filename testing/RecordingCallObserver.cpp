@@ -3,13 +3,27 @@
 #include "testing/FailingAllocator.h"
 #include "testing/PropertyNames.h"
 
-RecordingCallObserver::~RecordingCallObserver() = default;
+RecordingCallObserver::~RecordingCallObserver()
+{
+    for (CC_Call* const call : m_observed)
+        call->removeCallObserver(this);
+}
+
+XCode RecordingCallObserver::observe(CC_Call& call)
+{
+    XCode const result = call.addCallObserver(this);
+    FailingAllocator::Pause const unseen;
+    if (result.isOk())
+        m_observed.push_back(&call);
+    return result;
+}
 
 void RecordingCallObserver::onCallObservationEnded(CC_Event<CC_Call> const& event)
 {
     auto const& ended = CC_EvCallObservationEnded::FROM(event);
     {
         FailingAllocator::Pause const unseen;
+        std::erase(m_observed, ended.getSource());
         record(textOf(ended.getSource()) + " ended");
     }
     m_onEnded(ended);

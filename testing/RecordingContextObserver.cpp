@@ -2,7 +2,20 @@
 
 #include "testing/FailingAllocator.h"
 
-RecordingContextObserver::~RecordingContextObserver() = default;
+RecordingContextObserver::~RecordingContextObserver()
+{
+    for (CC_Context* const context : m_observed)
+        context->removeContextObserver(*this);
+}
+
+XCode RecordingContextObserver::observe(CC_Context& context)
+{
+    XCode const result = context.addContextObserver(*this);
+    FailingAllocator::Pause const unseen;
+    if (result.isOk())
+        m_observed.push_back(&context);
+    return result;
+}
 
 void RecordingContextObserver::recordOf(CC_Context const& context, std::string const& what)
 {
@@ -13,6 +26,7 @@ void RecordingContextObserver::aboutDestroy(CC_Context& context)
 {
     {
         FailingAllocator::Pause const unseen;
+        std::erase(m_observed, &context);
         recordOf(context, "destroyed");
     }
     m_onDestroy(context);

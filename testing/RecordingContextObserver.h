@@ -4,16 +4,22 @@
 #include "testing/Hook.h"
 #include "testing/Recorder.h"
 
+#include <vector>
+
 /// Hears of one context: the lines "o: SWITCH destroyed", "o: SWITCH provider sip added", "o: SWITCH provider sip
 /// removed", "o: SWITCH call created" and "o: SWITCH call destroyed", the call under the name that the journal knows.
 ///
 ///     RecordingContextObserver observer("o");
-///     std::ignore = CallControl::GET_CONTEXT("SWITCH")->addContextObserver(observer);
+///     std::ignore = observer.observe(*CallControl::GET_CONTEXT("SWITCH"));
 class RecordingContextObserver : public CC_Context::Observer, public Recorder
 {
 public:
     using Recorder::Recorder;
-    ~RecordingContextObserver() override;
+    ~RecordingContextObserver() override; ///< stops observing
+
+    /// Registers with the context until either ends, and gives the result of that. Whoever registers the observer
+    /// without this takes it out again without it, before the observer ends.
+    XCode observe(CC_Context& context);
 
     void aboutDestroy(CC_Context& context) override;
     void aboutAddProvider(CC_Context& context, String const& name) override;
@@ -30,4 +36,6 @@ public:
 
 private:
     void recordOf(CC_Context const& context, std::string const& what);
+
+    std::vector<CC_Context*> m_observed;
 };

@@ -2,7 +2,20 @@
 
 #include "testing/FailingAllocator.h"
 
-RecordingEndpointObserver::~RecordingEndpointObserver() = default;
+RecordingEndpointObserver::~RecordingEndpointObserver()
+{
+    for (CC_Endpoint* const endpoint : m_observed)
+        endpoint->removeEndpointObserver(*this);
+}
+
+XCode RecordingEndpointObserver::observe(CC_Endpoint& endpoint)
+{
+    XCode const result = endpoint.addEndpointObserver(*this);
+    FailingAllocator::Pause const unseen;
+    if (result.isOk())
+        m_observed.push_back(&endpoint);
+    return result;
+}
 
 void RecordingEndpointObserver::aboutFinished(CC_Endpoint& endpoint)
 {
@@ -17,6 +30,7 @@ void RecordingEndpointObserver::aboutDestroy(CC_Endpoint& endpoint)
 {
     {
         FailingAllocator::Pause const unseen;
+        std::erase(m_observed, &endpoint);
         record("endpoint destroyed");
     }
     m_onDestroy(endpoint);

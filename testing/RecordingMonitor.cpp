@@ -4,7 +4,8 @@
 
 #include <algorithm>
 
-RecordingMonitor::RecordingMonitor(unsigned int level, unsigned int monitorId) : m_monitorId(monitorId)
+RecordingMonitor::RecordingMonitor(unsigned int level, unsigned int monitorId, Journal* journal)
+    : m_monitorId(monitorId), m_journal(journal)
 {
     RTD::REPOSITORY::SET_WRITER(this);
     RTD::REPOSITORY::ENABLE(monitorId, level);
@@ -19,8 +20,11 @@ RecordingMonitor::~RecordingMonitor()
 void RecordingMonitor::write(unsigned int monitorId, unsigned int level, char const* text)
 {
     FailingAllocator::Pause const unseen;
-    if (monitorId == m_monitorId)
-        m_lines.push_back({level, text});
+    if (monitorId != m_monitorId)
+        return;
+    m_lines.push_back({level, text});
+    if (m_journal != nullptr)
+        m_journal->add(std::string("log: ") + text);
 }
 
 Lines RecordingMonitor::linesOfLevel(unsigned int level) const

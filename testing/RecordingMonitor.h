@@ -14,6 +14,8 @@
 ///     adapter.drop(QCause::NORMAL_CALL_CLEARING, 0);
 ///     EXPECT_TRUE(monitor.contains("[EP line/7] Drop"));
 ///     EXPECT_EQ(monitor.linesOfLevel(RTD::LEVEL_FAILURE), Lines());
+///
+/// Given a journal, it also writes each line there, as "log: [EP line/7] Drop", among those of the recorders.
 class RecordingMonitor : public RTD::Writer
 {
 public:
@@ -24,7 +26,10 @@ public:
         friend bool operator==(Line const&, Line const&) = default;
     };
 
-    explicit RecordingMonitor(unsigned int level = RTD::LEVEL_BULK, unsigned int monitorId = CC_Monitor::ID);
+    /// `journal` must outlive it; null: none.
+    explicit RecordingMonitor(unsigned int level = RTD::LEVEL_BULK, unsigned int monitorId = CC_Monitor::ID,
+                              Journal* journal = nullptr);
+    RecordingMonitor(unsigned int level, Journal& journal) : RecordingMonitor(level, CC_Monitor::ID, &journal) {}
     ~RecordingMonitor() override;
     RecordingMonitor(RecordingMonitor const&) = delete;
     RecordingMonitor& operator=(RecordingMonitor const&) = delete;
@@ -40,5 +45,6 @@ public:
 
 private:
     unsigned int m_monitorId;
+    Journal* m_journal;
     std::vector<Line> m_lines;
 };

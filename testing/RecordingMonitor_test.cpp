@@ -37,6 +37,21 @@ TEST(RecordingMonitor, HearsOfItsOwnMonitorAlone)
     EXPECT_TRUE(monitor.getLines().empty());
 }
 
+TEST(RecordingMonitor, WritesAmongTheRecordersOfAJournal)
+{
+    Journal journal;
+    journal.add("a: before");
+    {
+        RecordingMonitor const monitor(RTD::LEVEL_FLOW, journal);
+        LOG(CC_Monitor::ID, RTD::LEVEL_FLOW, "flowed");
+        LOG(CC_Monitor::ID, RTD::LEVEL_BULK, "bulky");
+        LOG(7, RTD::LEVEL_FLOW, "not ours");
+        EXPECT_EQ(monitor.linesOfLevel(RTD::LEVEL_FLOW), Lines{"flowed"});
+    }
+    journal.add("a: after");
+    EXPECT_EQ(journal.take(), (Lines{"a: before", "log: flowed", "a: after"}));
+}
+
 TEST(RecordingMonitor, SwitchesTheMonitorOffAgain)
 {
     {

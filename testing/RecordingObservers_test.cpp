@@ -8,11 +8,11 @@
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingCallObserver.h"
 #include "testing/RecordingContextObserver.h"
-#include "testing/RecordingContextsObserver.h"
 #include "testing/RecordingEndpoint.h"
 #include "testing/RecordingEndpointObserver.h"
 #include "testing/RecordingProvider.h"
 #include "testing/RecordingProviderObserver.h"
+#include "testing/RecordingRegistryObserver.h"
 
 #include <gtest/gtest.h>
 #include <optional>
@@ -83,7 +83,7 @@ TEST_F(RecordingObservers, AWrongEventIsFatalAsItIsForEveryObserver)
 TEST_F(RecordingObservers, AContextIsRecorded)
 {
     RecordingContextObserver context("o", &m_journal);
-    RecordingContextsObserver contexts("all", &m_journal);
+    RecordingRegistryObserver contexts("all", &m_journal);
     RecordingProvider provider("p", &m_journal);
     CallControl::REGISTER_CONTEXT_OBSERVER(contexts);
     int hooks = 0;
@@ -105,7 +105,63 @@ TEST_F(RecordingObservers, AContextIsRecorded)
                      "o: other call destroyed", "o: other provider sip removed", "all: context other destroyed",
                      "o: other destroyed"}));
     EXPECT_EQ(hooks, 7);
-    CallControl::UNREGISTER_CONTEXT_OBSERVER(contexts);
+}
+
+TEST_F(RecordingObservers, OneThatEndsFirstIsToldNothingMore)
+{
+    RecordingProvider provider("p");
+    RecordingEndpoint endpoint("e");
+    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+    CC_CallLeg* const leg = new CC_CallLeg;
+    {
+        RecordingContextObserver ofContext("context", &m_journal);
+        RecordingRegistryObserver ofRegistry("registry", &m_journal);
+        RecordingCallObserver ofCall("call", &m_journal);
+        RecordingCallLegObserver ofLeg("leg", &m_journal);
+        RecordingProviderObserver ofProvider("provider", &m_journal);
+        RecordingEndpointObserver ofEndpoint("endpoint", &m_journal);
+        EXPECT_EQ(ofContext.observe(*getContext()), XCode::OK);
+        CallControl::REGISTER_CONTEXT_OBSERVER(ofRegistry);
+        EXPECT_EQ(ofCall.observe(*call), XCode::OK);
+        EXPECT_EQ(ofLeg.observe(*leg), XCode::OK);
+        EXPECT_EQ(ofProvider.observe(provider), XCode::OK);
+        EXPECT_EQ(ofEndpoint.observe(endpoint), XCode::OK);
+        EXPECT_EQ(call->addCallLeg(*leg), XCode::OK);
+        EXPECT_EQ(CallControl::ADD_PROVIDER("SWITCH", "p", provider), XCode::OK);
+        EXPECT_EQ(m_journal.take(), (Lines{"call: leg joined call", "leg: leg moved from none to call",
+                                           "context: SWITCH provider p added"}));
+    }
+    CallControl::REMOVE_PROVIDER("SWITCH", "p");
+    call->removeCallLeg(*leg);
+    leg->removeReference();
+    CallControl::DESTROY_CONTEXT("SWITCH");
+    EXPECT_EQ(m_journal.take(), Lines());
+}
+
+TEST_F(RecordingObservers, OneThatEndsLastTouchesNothingMore)
+{
+    std::optional<RecordingProvider> provider(std::in_place, "p");
+    std::optional<RecordingEndpoint> endpoint(std::in_place, "e");
+    RecordingContextObserver ofContext("context", &m_journal);
+    RecordingCallObserver ofCall("call", &m_journal);
+    RecordingCallLegObserver ofLeg("leg", &m_journal);
+    RecordingProviderObserver ofProvider("provider", &m_journal);
+    RecordingEndpointObserver ofEndpoint("endpoint", &m_journal);
+    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+    CC_CallLeg* const leg = new CC_CallLeg;
+    EXPECT_EQ(ofCall.observe(*call), XCode::OK);
+    EXPECT_EQ(ofLeg.observe(*leg), XCode::OK);
+    EXPECT_EQ(ofProvider.observe(*provider), XCode::OK);
+    EXPECT_EQ(ofEndpoint.observe(*endpoint), XCode::OK);
+    EXPECT_EQ(ofContext.observe(*getContext()), XCode::OK);
+    leg->removeReference();
+    provider.reset();
+    endpoint.reset();
+    CallControl::RELEASE_CALL("SWITCH", call);
+    CallControl::DESTROY_CONTEXT("SWITCH");
+    EXPECT_EQ(m_journal.take(),
+              (Lines{"leg: leg ended", "provider: provider destroyed", "endpoint: endpoint destroyed",
+                     "context: SWITCH call destroyed", "call: call ended", "context: SWITCH destroyed"}));
 }
 
 TEST_F(RecordingObservers, TheEndsOfProvidersAndEndpointsAreRecorded)

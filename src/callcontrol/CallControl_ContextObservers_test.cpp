@@ -1,5 +1,5 @@
 #include "callcontrol/CallControl.h"
-#include "testing/RecordingContextsObserver.h"
+#include "testing/RecordingRegistryObserver.h"
 
 #include <gtest/gtest.h>
 
@@ -9,8 +9,8 @@ namespace
 class CallControl_ContextObservers_Test : public testing::Test
 {
 protected:
-    void add(RecordingContextsObserver& observer) { m_control.registerContextObserver(observer); }
-    void remove(RecordingContextsObserver& observer) { m_control.unregisterContextObserver(observer); }
+    void add(RecordingRegistryObserver& observer) { m_control.registerContextObserver(observer); }
+    void remove(RecordingRegistryObserver& observer) { m_control.unregisterContextObserver(observer); }
     /// The names of those who are told, in order.
     std::string tell()
     {
@@ -27,9 +27,9 @@ protected:
 
     CallControl m_control;
     Journal m_journal;
-    RecordingContextsObserver m_a{"a", &m_journal};
-    RecordingContextsObserver m_b{"b", &m_journal};
-    RecordingContextsObserver m_c{"c", &m_journal};
+    RecordingRegistryObserver m_a{"a", &m_journal};
+    RecordingRegistryObserver m_b{"b", &m_journal};
+    RecordingRegistryObserver m_c{"c", &m_journal};
 };
 } // namespace
 

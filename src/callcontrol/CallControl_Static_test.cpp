@@ -9,9 +9,9 @@
 #include "testing/FakeMediaContext.h"
 #include "testing/FakeMediaContextRepository.h"
 #include "testing/FakeTerminationRepository.h"
-#include "testing/RecordingContextsObserver.h"
 #include "testing/RecordingPropertyFactory.h"
 #include "testing/RecordingProvider.h"
+#include "testing/RecordingRegistryObserver.h"
 
 #include <gtest/gtest.h>
 #include <memory>
@@ -61,7 +61,7 @@ TEST(CallControl_Static, FactoriesAreThoseOfTheOneObject)
 
 TEST(CallControl_Static, ContextsAndTheirObserversAreThoseOfTheOneObject)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     CallControl::REGISTER_CONTEXT_OBSERVER(observer);
     EXPECT_EQ(CallControl::CREATE_CONTEXT("lab"), XCode::OK);
     EXPECT_EQ(CallControl::CREATE_CONTEXT("lab"), XCode::REFUSED);

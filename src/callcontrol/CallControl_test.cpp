@@ -8,8 +8,8 @@
 #include "testing/DrivenLoop.h"
 #include "testing/FailingAllocator.h"
 #include "testing/RecordingContextObserver.h"
-#include "testing/RecordingContextsObserver.h"
 #include "testing/RecordingPropertyFactory.h"
+#include "testing/RecordingRegistryObserver.h"
 
 #include <gtest/gtest.h>
 #include <memory>
@@ -159,7 +159,7 @@ TEST(CallControl, ItsEndGivesItsRepositoriesUp)
 TEST(CallControl, ItsEndTellsTheContextsObserversAndNotItsOwn)
 {
     Journal journal;
-    RecordingContextsObserver ofContexts("of contexts", &journal);
+    RecordingRegistryObserver ofContexts("of contexts", &journal);
     RecordingContextObserver ofOne("of one", &journal);
     CallControl const* duringEnd = nullptr;
     CC_Context const* found = nullptr;
@@ -287,7 +287,7 @@ TEST_F(CallControl_Test, TheBuiltInFactoryMakesItsProperties)
 
 TEST_F(CallControl_Test, AContextIsFoundWhenTheObserversHearOfIt)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     CC_Context const* then = nullptr;
     observer.m_onAdded = [&](String const& name) { then = m_control.getContext(name); };
     m_control.registerContextObserver(observer);
@@ -300,7 +300,7 @@ TEST_F(CallControl_Test, AContextIsFoundWhenTheObserversHearOfIt)
 
 TEST_F(CallControl_Test, ATakenContextNameIsRefusedAndNobodyIsTold)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     ASSERT_TRUE(m_control.createContext("lab").isOk());
     CC_Context const* const lab = m_control.getContext("lab");
     m_control.registerContextObserver(observer);
@@ -313,7 +313,7 @@ TEST_F(CallControl_Test, ATakenContextNameIsRefusedAndNobodyIsTold)
 TEST_F(CallControl_Test, ADestroyedContextIsStillThereWhenTheObserversHearOfIt)
 {
     Journal journal;
-    RecordingContextsObserver ofContexts("of contexts", &journal);
+    RecordingRegistryObserver ofContexts("of contexts", &journal);
     RecordingContextObserver ofOne("of one", &journal);
     ASSERT_TRUE(m_control.createContext("lab").isOk());
     m_control.registerContextObserver(ofContexts);
@@ -329,7 +329,7 @@ TEST_F(CallControl_Test, ADestroyedContextIsStillThereWhenTheObserversHearOfIt)
 
 TEST_F(CallControl_Test, DestroyingAnUnknownContextTellsEveryObserver)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     m_control.registerContextObserver(observer);
     m_control.destroyContext("nobody");
     EXPECT_EQ(observer.take(), Lines{"o: context nobody destroyed"});
@@ -337,7 +337,7 @@ TEST_F(CallControl_Test, DestroyingAnUnknownContextTellsEveryObserver)
 
 TEST_F(CallControl_Test, WithoutMemoryNoContextIsCreatedAndNobodyIsTold)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     m_control.registerContextObserver(observer);
     bool wasRefused = false;
     for (unsigned long n = 1; n < 100; ++n)

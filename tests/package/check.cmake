@@ -29,6 +29,7 @@ foreach(program two_modules property_user kit_user user_of_1_0 memory_user kit_t
 endforeach()
 fails_with("leaves counted objects behind: .*CC_CallLeg: 1 more"
     ${EMULATOR} ${WORK}/build/kit_tests --gtest_also_run_disabled_tests)
+fails_with("FailingAllocator: operator new does not ask it" ${EMULATOR} ${WORK}/build/memory_user_without_new)
 
 # with pkg-config
 find_program(PKG_CONFIG pkg-config)

@@ -21,7 +21,7 @@ using State = CC_PropertyCallLegState;
 
 /// One signalling module with a line: a provider under its own name in the context "SWITCH", an endpoint, and an
 /// adapter for one call. It accepts what it is offered, unless the test says otherwise through
-/// `endpoint.m_handleOffer`.
+/// `endpoint.m_handleOffer`. Unlike the kit's FakeModule it needs memory that may run out, and knows no numbers.
 ///
 ///     Party anna("anna"), bert("bert");
 ///     anna.dial(bert);

@@ -1,10 +1,14 @@
-#include "testing/RecordingContextsObserver.h"
+#include "testing/RecordingRegistryObserver.h"
 
 #include "testing/FailingAllocator.h"
 
-RecordingContextsObserver::~RecordingContextsObserver() = default;
+RecordingRegistryObserver::~RecordingRegistryObserver()
+{
+    FailingAllocator::Pause const unseen;
+    CallControl::UNREGISTER_CONTEXT_OBSERVER(*this);
+}
 
-void RecordingContextsObserver::contextAdded(String const& name)
+void RecordingRegistryObserver::contextAdded(String const& name)
 {
     {
         FailingAllocator::Pause const unseen;
@@ -13,7 +17,7 @@ void RecordingContextsObserver::contextAdded(String const& name)
     m_onAdded(name);
 }
 
-void RecordingContextsObserver::contextDestroyed(String const& name)
+void RecordingRegistryObserver::contextDestroyed(String const& name)
 {
     {
         FailingAllocator::Pause const unseen;

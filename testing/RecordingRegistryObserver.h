@@ -6,13 +6,13 @@
 
 /// Hears of the contexts that come and go: the lines "o: context SWITCH added" and "o: context SWITCH destroyed".
 ///
-///     RecordingContextsObserver observer("o");
-///     CallControl::REGISTER_CONTEXT_OBSERVER(observer);
-class RecordingContextsObserver : public CallControl::ContextObserver, public Recorder
+///     RecordingRegistryObserver observer("o");
+///     CallControl::REGISTER_CONTEXT_OBSERVER(observer); // at the latest its end takes it out
+class RecordingRegistryObserver : public CallControl::ContextObserver, public Recorder
 {
 public:
     using Recorder::Recorder;
-    ~RecordingContextsObserver() override;
+    ~RecordingRegistryObserver() override;
 
     void contextAdded(String const& name) override;
     void contextDestroyed(String const& name) override;
