@@ -45,7 +45,7 @@ public:
 
     virtual ~CC_Property() { --s_numberOfInstances; }
     /// Takes over id and value of `other` if that is of this class or derives from it. Otherwise, and when memory is
-    /// out, nothing changes (NUMBER_OF_FAILED_ASSIGNMENTS counts the latter). Returns this object.
+    /// out, nothing changes (ASSIGN tells the latter). Returns this object.
     virtual CC_Property& assign(CC_Property const& other) = 0;
     /// A copy of the same class, owned by the caller; null when memory is out.
     virtual CC_Property* clone() const = 0;
@@ -80,12 +80,9 @@ public:
             typeId = s_nextFreeTypeId++;
         return typeId;
     }
-    /// How many times `assign` lacked memory. It has no result of its own, so a caller that must know compares the
-    /// number before and after.
-    static unsigned int NUMBER_OF_FAILED_ASSIGNMENTS() { return s_numberOfFailedAssignments; }
-    /// How many times `assign` left an object that is what a copy of the other would be: both of the very class that
-    /// wrote the `assign`. Of a class that inherits one, or writes its own, nobody knows.
-    static unsigned int NUMBER_OF_WHOLE_ASSIGNMENTS() { return s_numberOfWholeAssignments; }
+    /// Has `property` take over `other`, as `assign` does, and tells what that has no result for: OK, also when the
+    /// classes differ; NO_ELEMENT when memory is out.
+    static XCode ASSIGN(CC_Property& property, CC_Property const& other);
 
     static unsigned int s_numberOfInstances; ///< live properties of all classes
     static unsigned int s_typeId;
@@ -94,8 +91,8 @@ protected:
     /// Sets `error`, as far as memory allows, and returns FAILURE.
     static XCode REFUSE(String& error, char const* message);
 
-    static unsigned int s_numberOfFailedAssignments;
-    static unsigned int s_numberOfWholeAssignments;
+    /// Tells the innermost ASSIGN to this object, if there is one, that its `assign` lacks memory.
+    void reportFailedAssignment() const noexcept;
 
 private:
     static unsigned int s_nextFreeTypeId;

@@ -67,8 +67,8 @@ public:
     CC_Property& assign(CC_Property const& other) override
     {
         Derived const* const same = SAME_CLASS(other);
-        if (same != nullptr && same != &self())
-            take(*same);
+        if (same != nullptr && same != &self() && !take(*same))
+            this->reportFailedAssignment();
         return *this;
     }
     CC_Property* clone() const override
@@ -92,6 +92,8 @@ public:
     }
 
 private:
+    friend class CC_PropertyKind;
+
     Derived& self() { return static_cast<Derived&>(*this); }
     Derived const& self() const { return static_cast<Derived const&>(*this); }
 
@@ -103,11 +105,13 @@ private:
         return other.isOfType(TYPE_ID()) ? dynamic_cast<Derived const*>(&other) : nullptr;
     }
 
-    void take(Derived const& other)
+    /// Whether memory sufficed. The whole object is copied, even when the values are the same: a class may hold more
+    /// than it compares.
+    bool take(Derived const& other)
     {
         if constexpr (std::is_nothrow_copy_assignable_v<Derived>)
             self() = other;
-        else if (other.getId() != Base::getId() || !self().hasSameValue(other)) // comparing is cheaper than copying
+        else
         {
             try
             {
@@ -115,17 +119,15 @@ private:
             }
             catch (std::bad_alloc const&)
             {
-                ++CC_Property::s_numberOfFailedAssignments;
-                return;
+                return false;
             }
         }
-        if (typeid(*this) == typeid(Derived) && typeid(other) == typeid(Derived))
-            ++CC_Property::s_numberOfWholeAssignments;
+        return true;
     }
 
 protected:
-    /// Takes id and value over, or throws and leaves both as they were. A class that can do so without a copy has one
-    /// of its own.
+    /// Takes id and value over, or throws std::bad_alloc and leaves both as they were. A class that can do so without a
+    /// copy has one of its own.
     void takeWhole(Derived const& other)
     {
         Derived copy(other);

@@ -101,23 +101,35 @@ TEST(CC_PropertyClass, ADerivedClassCountsAsItsBaseButNotTheOtherWayRound)
     EXPECT_EQ(typeid(Title), typeid(cloned));
 }
 
-TEST(CC_PropertyClass, AssigningWithoutMemoryChangesNothingAndIsCounted)
+TEST(CC_PropertyClass, AssigningWithoutMemoryChangesNothingAndCanBeLearned)
 {
     std::string const text(100, 'x');
     CC_PropertyString const longer(CC_PropertyId::DISPLAY, text.c_str());
-    CC_PropertyString stored(CC_PropertyId::NAME, "stored");
-    unsigned int const failedBefore = CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS();
-    unsigned long const failures =
-        WITH_EACH_ALLOCATION_FAILING([&] { stored.assign(longer); },
-                                     [&]
-                                     {
-                                         EXPECT_EQ("stored", VALUE_OF(stored));
-                                         EXPECT_EQ(CC_PropertyId::NAME, stored.getId());
-                                         EXPECT_EQ(failedBefore + 1, CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS());
-                                     });
-    EXPECT_EQ(1U, failures);
-    EXPECT_EQ(text, VALUE_OF(stored));
-    EXPECT_EQ(failedBefore + 1, CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS());
+    Title const title(CC_PropertyId::DISPLAY, text.c_str());
+    for (CC_Property const* const other :
+         {static_cast<CC_Property const*>(&longer), static_cast<CC_Property const*>(&title)})
+    {
+        CC_PropertyString stored(CC_PropertyId::NAME, "stored");
+        XCode result;
+        unsigned long const failures =
+            WITH_EACH_ALLOCATION_FAILING([&] { result = CC_Property::ASSIGN(stored, *other); },
+                                         [&]
+                                         {
+                                             EXPECT_EQ(XCode::NO_ELEMENT, result);
+                                             EXPECT_EQ("stored", VALUE_OF(stored));
+                                             EXPECT_EQ(CC_PropertyId::NAME, stored.getId());
+                                         });
+        EXPECT_EQ(1U, failures);
+        EXPECT_EQ(XCode::OK, result);
+        EXPECT_EQ(text, VALUE_OF(stored));
+    }
+}
+
+TEST(CC_PropertyClass, AnotherClassIsNoFailureOfMemory)
+{
+    CC_PropertyBoolean boolean(CC_PropertyId::PROVIDES_DATA, true);
+    EXPECT_EQ(XCode::OK, CC_Property::ASSIGN(boolean, CC_PropertyString(CC_PropertyId::NAME, "false")));
+    EXPECT_TRUE(boolean.getValue());
 }
 
 TEST(CC_PropertyClass, CloningALongTextWithoutMemoryGivesNull)

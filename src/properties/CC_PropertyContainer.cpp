@@ -1,48 +1,106 @@
 #include "properties/CC_PropertyContainer.h"
 
 #include "platform/base/NestingGuard.h"
+#include "properties/CC_PropertyKind.h"
+
+#include <tuple>
 
 namespace
 {
 unsigned int s_infoDepth = 0; // of all containers' dumps
 
-/// Whether memory sufficed; a value of another class is left out silently.
-bool ASSIGN(CC_Property& stored, CC_Property const& property)
+bool IS_SELF_CONTAINED(CC_Property const& property)
 {
-    unsigned int const failedBefore = CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS();
-    stored.assign(property);
-    return CC_Property::NUMBER_OF_FAILED_ASSIGNMENTS() == failedBefore;
+    CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
+    return kind != nullptr && kind->isSelfContained;
 }
 
+bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
+{
+    CC_PropertyKind const* const kind =
+        stored.getId() == property.getId() ? CC_PropertyKind::OF_BOTH(stored, property) : nullptr;
+    return kind != nullptr && kind->assign(stored, property);
+}
 } // namespace
 
-bool CC_PropertyContainer::IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
+/// A walk that goes on whatever the properties that it visits do to the container meanwhile.
+///
+/// It finds its place again by the visited one's address, which is compared and not followed. Should another property
+/// have come to that address, the walk goes on behind that one.
+class CC_PropertyContainer::Walk
 {
-    unsigned int const wholeBefore = CC_Property::NUMBER_OF_WHOLE_ASSIGNMENTS();
-    stored.assign(property);
-    return CC_Property::NUMBER_OF_WHOLE_ASSIGNMENTS() != wholeBefore;
-}
+public:
+    /// `isUndisturbed`: whether nobody is called meanwhile.
+    explicit Walk(CC_PropertyContainer const& container, bool isUndisturbed = false)
+        : m_container(container), m_isUndisturbed(isUndisturbed), m_position(container.m_properties.begin())
+    {
+        m_visited = isAtEnd() ? nullptr : &*m_position;
+    }
+    bool isAtEnd() const { return m_position == m_container.m_properties.end(); }
+    CC_Property& operator*() const { return *m_visited; }
+    CC_Property* operator->() const { return m_visited; }
+
+    /// Behind the visited one if it is still there, otherwise to what has taken its place.
+    void goOn()
+    {
+        if (m_isUndisturbed)
+        {
+            ++m_position;
+            m_visited = isAtEnd() ? nullptr : &*m_position;
+            return;
+        }
+        Iterator position = m_container.m_properties.begin();
+        unsigned int index = 0;
+        for (; position != m_container.m_properties.end() && &*position != m_visited; ++position)
+            ++index;
+        goTo(position != m_container.m_properties.end() ? index + 1 : m_index);
+    }
+
+private:
+    void goTo(unsigned int index)
+    {
+        m_position = m_container.m_properties.begin();
+        for (m_index = 0; m_index < index && !isAtEnd(); ++m_index)
+            ++m_position;
+        m_visited = isAtEnd() ? nullptr : &*m_position;
+    }
+
+    CC_PropertyContainer const& m_container;
+    bool m_isUndisturbed;
+    Iterator m_position;
+    CC_Property* m_visited;
+    unsigned int m_index = 0;
+};
 
 CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const& other)
 {
     if (this == &other)
         return *this;
+    if (m_isSelfContained && other.m_isSelfContained)
+    {
+        takeOver(other);
+        return *this;
+    }
+    clear();
+    for (Walk source(other); !source.isAtEnd(); source.goOn())
+        std::ignore = replace(nullptr, *source); // what memory refuses is missing
+    return *this;
+}
+
+/// The same where nobody is called, who could tell it from all being deleted and copied anew.
+void CC_PropertyContainer::takeOver(CC_PropertyContainer const& other)
+{
     Iterator stored = m_properties.begin();
-    ConstIterator source = other.begin();
-    while (stored != m_properties.end() && source != other.end() && stored->getId() == source->getId() &&
-           IS_MADE_A_COPY(*stored, *source))
+    Iterator source = other.m_properties.begin();
+    while (stored != m_properties.end() && source != other.m_properties.end() && IS_MADE_A_COPY(*stored, *source))
     {
         ++stored;
         ++source;
     }
     removeFrom(stored);
-    for (; source != other.end(); ++source)
-    {
-        CC_Property* const copy = source->clone();
-        if (copy != nullptr && !m_properties.append(copy).isOk())
-            delete copy;
-    }
-    return *this;
+    for (; source != other.m_properties.end(); ++source)
+        if (CC_Property* const copy = source->clone())
+            std::ignore = m_properties.append(copy); // it is in no list
 }
 
 CC_Property* CC_PropertyContainer::get(unsigned int id) { return find(id); }
@@ -58,20 +116,33 @@ XCode CC_PropertyContainer::set(CC_Property const& property) { return replace(fi
 XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& property)
 {
     if (stored != nullptr)
-        return ASSIGN(*stored, property) ? XCode::OK : XCode::NO_ELEMENT;
+        return CC_Property::ASSIGN(*stored, property);
     CC_Property* const copy = property.clone();
     if (copy == nullptr)
         return XCode::NO_ELEMENT;
-    if (m_properties.append(copy).isOk())
+    if (!IS_SELF_CONTAINED(*copy))
+        return appendOfAnyKind(copy);
+    std::ignore = m_properties.append(copy); // it is in no list
+    return XCode::OK;
+}
+
+/// Takes the copy over, also when it fails.
+XCode CC_PropertyContainer::appendOfAnyKind(CC_Property* copy)
+{
+    m_isSelfContained = false;
+    CC_Property* const stored = find(copy->getId()); // what the clone stored itself
+    if (stored == nullptr && m_properties.append(copy).isOk())
         return XCode::OK;
+    XCode const result = stored != nullptr ? CC_Property::ASSIGN(*stored, *copy) : XCode::FAILURE;
     delete copy;
-    return XCode::FAILURE;
+    return result;
 }
 
 XCode CC_PropertyContainer::set(CC_PropertyContainer const& other, unsigned int mask)
 {
-    for (CC_Property const& property : other)
-        if ((property.getId() & mask) != 0 && !set(property).isOk())
+    bool const isUndisturbed = m_isSelfContained && other.m_isSelfContained;
+    for (Walk source(other, isUndisturbed); !source.isAtEnd(); source.goOn())
+        if ((source->getId() & mask) != 0 && !set(*source).isOk())
             return XCode::FAILURE;
     return XCode::OK;
 }
@@ -85,6 +156,7 @@ void CC_PropertyContainer::take(CC_PropertyContainer& other)
         if ((property.getId() & ALL_GROUPS) != 0)
             other.m_properties.moveTo(m_properties, property);
     }
+    m_isSelfContained = m_isSelfContained && other.m_isSelfContained;
 }
 
 bool CC_PropertyContainer::remove(unsigned int id)
@@ -109,8 +181,8 @@ InfoContainer& CC_PropertyContainer::getInfo(InfoContainer& info, unsigned int m
     NestingGuard const nesting(s_infoDepth);
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Properties", String::s_empty);
     if (level + 1 <= maxLevel && detail <= maxDetail && nesting.isOutermost())
-        for (CC_Property const& property : *this)
-            property.getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
+        for (Walk walk(*this); !walk.isAtEnd(); walk.goOn())
+            walk->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
     return info;
 }
 
@@ -132,6 +204,7 @@ CC_Property* CC_PropertyContainer::Cursor::findElsewhere(unsigned int id)
     return &found;
 }
 
+/// REQUIRES: they are self-contained.
 void CC_PropertyContainer::removeFrom(Iterator position)
 {
     while (position != m_properties.end())

@@ -9,6 +9,9 @@
 /// The properties of a call, a leg, an adapter or an event: owned, in the order in which they were added, at most one
 /// per id. Lists are short, so look-up is a linear search. Not locked.
 ///
+/// The operations of a module's property class may change the very container that calls them, as long as it lives: what
+/// they remove is not visited any more, what they add is.
+///
 ///     CC_PropertyContainer properties;
 ///     if (!properties.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, "49891234")).isOk())
 ///         ...
@@ -76,7 +79,8 @@ public:
     CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
     ~CC_PropertyContainer() = default;
     /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
-    /// tells so. As far as both begin with the same ids and classes, the values are taken over where they stand.
+    /// tells so. As far as both begin with the same ids and classes of the library, and no others follow, the values
+    /// are taken over where they stand.
     CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
 
     /// The property of that id, null if there is none. It stays the container's; removing it ends it.
@@ -87,6 +91,8 @@ public:
     CC_Property const* getByIndex(unsigned int index) const;
     unsigned int getNumberOfProperties() const { return m_properties.getCount(); }
     bool isEmpty() const { return m_properties.isEmpty(); }
+    /// Whether no operation of any property calls anybody (CC_PropertyKind); also false once there was another.
+    bool isSelfContained() const { return m_isSelfContained; }
     /// In order. Adding properties does not disturb a walk, removing the one it stands on does.
     ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
     ConstIterator end() const { return ConstIterator(m_properties.end()); }
@@ -112,7 +118,11 @@ public:
     bool remove(unsigned int id);
     /// Deletes the property at that position; whether there was one.
     bool removeByIndex(unsigned int index);
-    void clear() { m_properties.clear(); }
+    void clear()
+    {
+        m_properties.clear();
+        m_isSelfContained = true;
+    }
 
     /// Adds the line "Properties" and, unless this dump is already part of a container's, the properties one level
     /// below it. Returns `info`.
@@ -122,16 +132,18 @@ public:
     /// A shared container without properties, for parameters that are not used.
     static CC_PropertyContainer const& EMPTY();
 
-    /// Assigns the property; whether `stored` is now what a copy of it would be.
-    static bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property);
-
 private:
     using Iterator = LinkedListManager<CC_Property>::Iterator;
 
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
 
+    class Walk;
+
+    void takeOver(CC_PropertyContainer const& other);
+    XCode appendOfAnyKind(CC_Property* copy);
     void removeFrom(Iterator position);
 
     LinkedListManager<CC_Property> m_properties;
+    bool m_isSelfContained = true;
 };

@@ -25,13 +25,34 @@ InfoContainer& CC_PropertyContainerContainer::getInfo(InfoContainer& info, unsig
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Property Containers", String::s_empty);
     if (level + 1 > maxLevel || detail > maxDetail || !nesting.isOutermost())
         return info;
-    for (auto const* entry = m_containers.getFirst(); entry != nullptr; entry = entry->getNext())
+    unsigned int index = 0;
+    for (auto const* entry = m_containers.getFirst(); entry != nullptr; entry = getNextAfterCall(entry, index))
     {
         char const* const side =
             CC_PROPERTY_CONTAINER_TYPE_NAME(static_cast<CC_PropertyContainerType>(entry->getKey()));
         entry->getValue()->getInfo(info, maxLevel, level + 1, maxDetail, detail, side);
     }
     return info;
+}
+
+/// The entry behind the one at `index` if that is still there, otherwise what has taken its place: a property may have
+/// changed the table while it was dumped. What is gone is compared by address and not touched.
+CC_PropertyContainerContainer::Entry const* CC_PropertyContainerContainer::getNextAfterCall(Entry const* visited,
+                                                                                            unsigned int& index) const
+{
+    unsigned int place = 0;
+    Entry const* entry = m_containers.getFirst();
+    for (; entry != nullptr && entry != visited; entry = entry->getNext())
+        ++place;
+    if (entry != nullptr)
+    {
+        index = place + 1;
+        return entry->getNext();
+    }
+    entry = m_containers.getFirst();
+    for (place = 0; place < index && entry != nullptr; ++place)
+        entry = entry->getNext();
+    return entry;
 }
 
 CC_PropertyContainerContainer const& CC_PropertyContainerContainer::EMPTY()

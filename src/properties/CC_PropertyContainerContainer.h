@@ -40,5 +40,8 @@ public:
     static CC_PropertyContainerContainer const& EMPTY();
 
 private:
+    using Entry = TYInt32HashTable<CC_PropertyContainer*>::Entry;
+    Entry const* getNextAfterCall(Entry const* visited, unsigned int& index) const;
+
     TYInt32HashTable<CC_PropertyContainer*> m_containers;
 };

@@ -5,6 +5,7 @@
 #include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
+#include <memory>
 
 namespace
 {
@@ -129,4 +130,31 @@ TEST(CC_PropertyContainerContainer, TheSharedEmptyOneIsAlwaysTheSame)
 {
     EXPECT_EQ(&CC_PropertyContainerContainer::EMPTY(), &CC_PropertyContainerContainer::EMPTY());
     EXPECT_EQ(0U, CC_PropertyContainerContainer::EMPTY().getNumberOfContainers());
+}
+
+TEST(CC_PropertyContainerContainer, ADumpedPropertyMayForgetContainers)
+{
+    auto const deeds = std::make_shared<ActingProperty::Deeds>();
+    CC_PropertyContainer calling;
+    CC_PropertyContainer called;
+    CC_PropertyContainer general;
+    ASSERT_TRUE(calling.set(ActingProperty(CC_PropertyId::NAME, 1, deeds)).isOk());
+    CC_PropertyContainerContainer sides;
+    auto const addAll = [&]
+    {
+        sides.clear();
+        ASSERT_TRUE(sides.add(CC_PCT_CALLING, &calling).isOk());
+        ASSERT_TRUE(sides.add(CC_PCT_CALLED, &called).isOk());
+        ASSERT_TRUE(sides.add(CC_PCT_GENERAL, &general).isOk());
+    };
+    addAll();
+    deeds->onText = [&] { sides.clear(); };
+    EXPECT_EQ("Property Containers\n  calling-Properties\n    Name: 1\n", DUMP(sides, 9, 0));
+    addAll();
+    deeds->onText = [&] { sides.remove(CC_PCT_CALLING); };
+    EXPECT_EQ("Property Containers\n  calling-Properties\n    Name: 1\n  called-Properties\n  Properties\n",
+              DUMP(sides, 9, 0));
+    addAll();
+    deeds->onText = [&] { sides.remove(CC_PCT_CALLED); };
+    EXPECT_EQ("Property Containers\n  calling-Properties\n    Name: 1\n  Properties\n", DUMP(sides, 9, 0));
 }

@@ -8,6 +8,7 @@
 
 #include <gtest/gtest.h>
 #include <iterator>
+#include <memory>
 #include <string>
 #include <utility>
 #include <vector>
@@ -346,4 +347,266 @@ TEST(CC_PropertyContainer, AssigningTakesEqualKindsOverWhereTheyStand)
     EXPECT_EQ(to.getByIndex(0), first);
     EXPECT_TRUE(to.get(CC_PropertyId::NAME)->isEqual(CC_PropertyUnsigned(0, 7)));
     EXPECT_EQ(IDS_OF(to), IDS_OF(from));
+}
+
+namespace
+{
+/// Holds a name inside, and lets its base's assign take that over; the base is a number.
+class NamedNumber : public CC_PropertyUnsigned
+{
+public:
+    NamedNumber(unsigned int id, unsigned int number, String const& name)
+        : CC_PropertyUnsigned(id, number), m_name(id, name)
+    {
+    }
+    String const& getName() const { return m_name.getValue(); }
+    /// Takes the name over, and forgets the number.
+    CC_Property& assign(CC_Property const& other) override
+    {
+        if (auto const* const same = dynamic_cast<NamedNumber const*>(&other))
+            m_name.assign(same->m_name);
+        return *this;
+    }
+    CC_Property* clone() const override { return new NamedNumber(*this); }
+
+private:
+    CC_PropertyString m_name;
+};
+
+/// Compares by the rounded number only.
+class Rounded : public CC_PropertyClass<Rounded>
+{
+public:
+    static constexpr char const* TYPE_NAME = "Rounded";
+    static unsigned int s_typeId;
+    using CC_PropertyClass::CC_PropertyClass;
+    Rounded(unsigned int id, int number, String const& remark)
+        : CC_PropertyClass(id), m_number(number), m_remark(remark)
+    {
+    }
+    String& getValueString(String& out) const override { return out.format("%d %s", m_number, m_remark.c_str()); }
+    bool hasSameValue(Rounded const& other) const { return m_number / 10 == other.m_number / 10; }
+
+private:
+    int m_number = 0;
+    String m_remark;
+};
+unsigned int Rounded::s_typeId = CC_Property::NO_TYPE_ID;
+
+/// A container with an acting property between two others.
+struct CC_PropertyContainerWalkTest : testing::Test
+{
+    CC_PropertyContainerWalkTest()
+    {
+        EXPECT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NETWORK, "isdn")).isOk());
+        EXPECT_TRUE(properties.set(ActingProperty(CC_PropertyId::NAME, 1, deeds)).isOk());
+        EXPECT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::DISPLAY, "A")).isOk());
+    }
+    ~CC_PropertyContainerWalkTest() override { *deeds = {}; }
+
+    auto removing(unsigned int id)
+    {
+        return [this, id] { properties.remove(id); };
+    }
+    auto clearing()
+    {
+        return [this] { properties.clear(); };
+    }
+
+    std::shared_ptr<ActingProperty::Deeds> const deeds = std::make_shared<ActingProperty::Deeds>();
+    CC_PropertyContainer properties;
+};
+using Ids = std::vector<unsigned int>;
+} // namespace
+
+TEST(CC_PropertyContainer, AssigningCopiesAClassWhoseAssignTakesLessThanItHolds)
+{
+    CC_PropertyContainer from;
+    CC_PropertyContainer to;
+    ASSERT_TRUE(to.set(NamedNumber(CC_PropertyId::NAME, 1, "Anna")).isOk());
+    ASSERT_TRUE(from.set(NamedNumber(CC_PropertyId::NAME, 2, "Berta")).isOk());
+    to = from;
+    auto const* const copy = dynamic_cast<NamedNumber const*>(to.get(CC_PropertyId::NAME));
+    ASSERT_NE(copy, nullptr);
+    EXPECT_EQ(copy->getName(), "Berta");
+    EXPECT_EQ(copy->getValue(), 2U);
+}
+
+TEST(CC_PropertyContainer, AssigningCopiesAClassThatComparesLessThanItHolds)
+{
+    CC_PropertyContainer from;
+    CC_PropertyContainer to;
+    ASSERT_TRUE(to.set(Rounded(CC_PropertyId::NAME, 11, "eleven")).isOk());
+    ASSERT_TRUE(from.set(Rounded(CC_PropertyId::NAME, 12, "twelve")).isOk());
+    to = from;
+    EXPECT_EQ("12 twelve", VALUE_OF(*to.get(CC_PropertyId::NAME)));
+    ASSERT_TRUE(to.set(Rounded(CC_PropertyId::NAME, 13, "thirteen")).isOk());
+    EXPECT_EQ("13 thirteen", VALUE_OF(*to.get(CC_PropertyId::NAME)));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AssigningAsksAModulesClassForAClone)
+{
+    CC_PropertyContainer to(properties);
+    EXPECT_EQ(deeds->numberOfClones, 2U) << "to be stored, and as a copy";
+    to = properties;
+    EXPECT_EQ(deeds->numberOfClones, 3U);
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AssigningLeavesOutWhatIsNotCloned)
+{
+    CC_PropertyContainer to(properties);
+    deeds->isClonable = false;
+    to = properties;
+    EXPECT_EQ(IDS_OF(to), (Ids{CC_PropertyId::NETWORK, CC_PropertyId::DISPLAY}));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AnAssignThatFailsInsideAnotherDoesNotPassForTheOuterOne)
+{
+    CC_PropertyContainer other;
+    std::string const text(100, 'x');
+    CC_PropertyString const longer(CC_PropertyId::NAME, text.c_str());
+    ASSERT_TRUE(other.set(CC_PropertyString(CC_PropertyId::NAME, "short")).isOk());
+    XCode inner;
+    deeds->onAssign = [&]
+    {
+        FailingAllocator::failNth(1);
+        inner = other.set(longer);
+        FailingAllocator::stop();
+    };
+    EXPECT_EQ(properties.set(ActingProperty(CC_PropertyId::NAME, 2, deeds)), XCode::OK);
+    EXPECT_EQ(inner, XCode::NO_ELEMENT);
+}
+
+TEST(CC_PropertyContainer, AnAssignThatFailsIsSeenThoughAnotherSucceedsInsideIt)
+{
+    /// Sets a container of its own once its base has, or has not, taken the value over.
+    class Busy : public CC_PropertyString
+    {
+    public:
+        using CC_PropertyString::CC_PropertyString;
+        CC_Property& assign(CC_Property const& other) override
+        {
+            CC_PropertyString::assign(other);
+            FailingAllocator::stop();
+            EXPECT_TRUE(m_inner.set(CC_PropertyUnsigned(CC_PropertyId::HOPS, ++m_count)).isOk());
+            return *this;
+        }
+        CC_Property* clone() const override { return new Busy(*this); }
+
+    private:
+        CC_PropertyContainer m_inner;
+        unsigned int m_count = 0;
+    };
+    CC_PropertyContainer properties;
+    ASSERT_TRUE(properties.set(Busy(CC_PropertyId::NAME, "Anna")).isOk());
+    Busy const longer(CC_PropertyId::NAME, std::string(100, 'x').c_str());
+    FailingAllocator::failNth(1);
+    XCode const result = properties.set(longer);
+    FailingAllocator::stop();
+    EXPECT_EQ(result, XCode::NO_ELEMENT);
+    EXPECT_EQ("Anna", VALUE_OF(*properties.get(CC_PropertyId::NAME)));
+}
+
+// --- properties that change the container while it walks -------------------------------------------------------------
+
+TEST_F(CC_PropertyContainerWalkTest, AnEndingPropertyMayRemoveTheNextOneOfAnAssignedContainer)
+{
+    deeds->onEnd = removing(CC_PropertyId::DISPLAY);
+    properties = CC_PropertyContainer::EMPTY();
+    EXPECT_TRUE(properties.isEmpty());
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AnEndingPropertyMayClearItsContainerOrAddToIt)
+{
+    deeds->onEnd = clearing();
+    properties = CC_PropertyContainer::EMPTY();
+    EXPECT_TRUE(properties.isEmpty());
+
+    CC_PropertyContainer other;
+    ASSERT_TRUE(other.set(CC_PropertyString(CC_PropertyId::NETWORK, "sip")).isOk());
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::NETWORK, "isdn")).isOk());
+    ASSERT_TRUE(properties.set(ActingProperty(CC_PropertyId::NAME, 1, deeds)).isOk());
+    deeds->onEnd = [this] { EXPECT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::ALERT_INFO, "!")).isOk()); };
+    properties = other;
+    EXPECT_EQ(IDS_OF(properties), Ids{CC_PropertyId::NETWORK}) << "as clear() does, what it adds goes as well";
+    EXPECT_EQ("sip", VALUE_OF(*properties.get(CC_PropertyId::NETWORK)));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AnEndingPropertySeesNothingOfTheNewValues)
+{
+    CC_PropertyContainer other;
+    ASSERT_TRUE(other.set(CC_PropertyString(CC_PropertyId::NETWORK, "sip")).isOk());
+    bool isNetworkThere = true;
+    deeds->onEnd = [&] { isNetworkThere = properties.get(CC_PropertyId::NETWORK) != nullptr; };
+    properties = other;
+    EXPECT_FALSE(isNetworkThere) << "all are deleted before the first is copied";
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AClonedPropertyMayRemoveOthersOfTheCopiedContainer)
+{
+    deeds->onClone = removing(CC_PropertyId::DISPLAY);
+    EXPECT_EQ(IDS_OF(CC_PropertyContainer(properties)), (Ids{CC_PropertyId::NETWORK, CC_PropertyId::NAME}));
+    ASSERT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::DISPLAY, "A")).isOk());
+    deeds->onClone = removing(CC_PropertyId::NETWORK);
+    EXPECT_EQ(IDS_OF(CC_PropertyContainer(properties)),
+              (Ids{CC_PropertyId::NETWORK, CC_PropertyId::NAME, CC_PropertyId::DISPLAY}));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AClonedPropertyMayRemoveItselfFromTheCopiedContainer)
+{
+    deeds->onClone = removing(CC_PropertyId::NAME);
+    EXPECT_EQ(IDS_OF(CC_PropertyContainer(properties)),
+              (Ids{CC_PropertyId::NETWORK, CC_PropertyId::NAME, CC_PropertyId::DISPLAY}));
+    EXPECT_EQ(IDS_OF(properties), (Ids{CC_PropertyId::NETWORK, CC_PropertyId::DISPLAY}));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AClonedPropertyMayClearTheCopiedContainerOrAddToIt)
+{
+    deeds->onClone = [this] { EXPECT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::ALERT_INFO, "!")).isOk()); };
+    EXPECT_EQ(CC_PropertyContainer(properties).getNumberOfProperties(), 4U);
+    deeds->onClone = clearing();
+    EXPECT_EQ(IDS_OF(CC_PropertyContainer(properties)), (Ids{CC_PropertyId::NETWORK, CC_PropertyId::NAME}));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AStoredPropertyMayChangeTheContainersOfASelectiveCopy)
+{
+    CC_PropertyContainer to;
+    deeds->onClone = clearing();
+    EXPECT_EQ(to.set(properties), XCode::OK);
+    EXPECT_EQ(IDS_OF(to), (Ids{CC_PropertyId::NETWORK, CC_PropertyId::NAME}));
+
+    deeds->onClone = [&to] { to.clear(); };
+    ASSERT_TRUE(properties.set(ActingProperty(CC_PropertyId::NAME, 1, deeds)).isOk());
+    deeds->onAssign = [&] { properties.clear(), to.clear(); };
+    ASSERT_TRUE(to.set(ActingProperty(CC_PropertyId::NAME, 2, deeds)).isOk());
+    EXPECT_EQ(to.set(properties), XCode::OK);
+    EXPECT_TRUE(to.isEmpty());
+}
+
+TEST_F(CC_PropertyContainerWalkTest, AnAssignedPropertyMayRemoveTheOneThatIsCopied)
+{
+    CC_PropertyContainer from;
+    ASSERT_TRUE(from.set(CC_PropertyString(CC_PropertyId::NAME, "a text too long to be kept without memory")).isOk());
+    ASSERT_TRUE(from.set(CC_PropertyString(CC_PropertyId::DISPLAY, "B")).isOk());
+    deeds->onAssign = [&] { from.remove(CC_PropertyId::NAME); };
+    EXPECT_EQ(properties.set(from), XCode::OK);
+    EXPECT_EQ("B", VALUE_OF(*properties.get(CC_PropertyId::DISPLAY)));
+}
+
+TEST_F(CC_PropertyContainerWalkTest, ACloneThatStoresItsIdItselfDoesNotMakeTwoOfIt)
+{
+    CC_PropertyContainer to;
+    deeds->onClone = [&] { EXPECT_TRUE(to.set(CC_PropertyString(CC_PropertyId::NAME, "first")).isOk()); };
+    EXPECT_EQ(to.set(*properties.get(CC_PropertyId::NAME)), XCode::OK);
+    EXPECT_EQ(IDS_OF(to), Ids{CC_PropertyId::NAME});
+}
+
+TEST_F(CC_PropertyContainerWalkTest, ADumpedPropertyMayChangeItsContainer)
+{
+    deeds->onText = removing(CC_PropertyId::DISPLAY);
+    EXPECT_EQ("Properties\n  Network: isdn\n  Name: 1\n", DUMP(properties, 1, 0));
+    deeds->onText = [this] { EXPECT_TRUE(properties.set(CC_PropertyString(CC_PropertyId::ALERT_INFO, "!")).isOk()); };
+    EXPECT_EQ("Properties\n  Network: isdn\n  Name: 1\n  Alert-Info: !\n", DUMP(properties, 1, 0));
+    deeds->onText = removing(CC_PropertyId::NETWORK);
+    EXPECT_EQ("Properties\n  Network: isdn\n  Name: 1\n  Alert-Info: !\n", DUMP(properties, 1, 0));
 }

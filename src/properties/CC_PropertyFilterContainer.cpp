@@ -6,6 +6,7 @@
 
 namespace
 {
+constexpr unsigned int AT_THE_END = 0xffffffff;
 unsigned int s_infoDepth = 0; // of all filter containers' dumps
 } // namespace
 
@@ -13,8 +14,8 @@ CC_PropertyFilter::~CC_PropertyFilter() = default;
 
 CC_PropertyFilterContainer::~CC_PropertyFilterContainer()
 {
-    for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
-        delete element->getValue();
+    while (m_filters.getFirst() != nullptr)
+        removeFilter(0);
 }
 
 CC_PropertyFilter const* CC_PropertyFilterContainer::getFilter(unsigned int index) const
@@ -23,10 +24,7 @@ CC_PropertyFilter const* CC_PropertyFilterContainer::getFilter(unsigned int inde
     return element != nullptr ? element->getValue() : nullptr;
 }
 
-XCode CC_PropertyFilterContainer::addFilter(CC_PropertyFilter const& filter)
-{
-    return addFilter(filter, getNumberOfFilters());
-}
+XCode CC_PropertyFilterContainer::addFilter(CC_PropertyFilter const& filter) { return addFilter(filter, AT_THE_END); }
 
 XCode CC_PropertyFilterContainer::addFilter(CC_PropertyFilter const& filter, unsigned int index)
 {
@@ -43,8 +41,11 @@ XCode CC_PropertyFilterContainer::replaceFilter(CC_PropertyFilter const& filter,
     if (element == nullptr)
         return insert(copy, index);
     CC_PropertyFilter const* const replaced = element->getValue();
-    element->setValue(copy);
+    element->setValue(nullptr); // the element stays, so that there is no memory to be refused
     delete replaced;
+    if (!isThere(element))
+        return insert(copy, index);
+    element->setValue(copy);
     return XCode::OK;
 }
 
@@ -78,9 +79,12 @@ XCode APPLY(CC_PropertyFilter const& filter, CC_PropertyContainer& properties)
 XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties) const
 {
     XCode result = XCode::OK;
-    for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
-        if (XCode const applied = APPLY(*element->getValue(), properties); result.isOk())
-            result = applied;
+    forEach(
+        [&](CC_PropertyFilter const& filter)
+        {
+            if (XCode const applied = APPLY(filter, properties); result.isOk())
+                result = applied;
+        });
     return result;
 }
 
@@ -92,9 +96,38 @@ InfoContainer& CC_PropertyFilterContainer::getInfo(InfoContainer& info, unsigned
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call-Control Property Filter Container",
                    String::s_empty);
     if (level + 1 <= maxLevel && detail <= maxDetail && nesting.isOutermost())
-        for (Element const* element = m_filters.getFirst(); element != nullptr; element = element->getNext())
-            element->getValue()->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
+        forEach([&](CC_PropertyFilter const& filter)
+                { filter.getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty); });
     return info;
+}
+
+/// Calls `visit(filter)` for each, which may change the list: the walk goes on behind the visited element if it is
+/// still there, otherwise with what has taken its place. Elements that are gone are compared by address and not
+/// touched.
+template <class Visit>
+void CC_PropertyFilterContainer::forEach(Visit const& visit) const
+{
+    unsigned int index = 0;
+    for (Element const* element = m_filters.getFirst(); element != nullptr;)
+    {
+        if (element->getValue() != nullptr)
+            visit(*element->getValue());
+        unsigned int place = 0;
+        Element const* found = m_filters.getFirst();
+        for (; found != nullptr && found != element; found = found->getNext())
+            ++place;
+        if (found != nullptr)
+            index = place + 1;
+        element = found != nullptr ? found->getNext() : find(index);
+    }
+}
+
+bool CC_PropertyFilterContainer::isThere(Element const* element) const
+{
+    Element const* other = m_filters.getFirst();
+    while (other != nullptr && other != element)
+        other = other->getNext();
+    return other != nullptr;
 }
 
 CC_PropertyFilterContainer::Element* CC_PropertyFilterContainer::find(unsigned int index) const

@@ -9,7 +9,8 @@
 /// Filters in the order in which they are applied. It owns copies of what it is given.
 ///
 /// Made and filled by whoever made the endpoint that it is handed to; the endpoint only borrows it. Filled before it is
-/// attached and only read afterwards; not locked.
+/// attached and only read afterwards; not locked. A filter that changes the container from its own operations all the
+/// same finds it whole: what it removes is not applied any more, what it adds is.
 ///
 ///     CC_PropertyFilterContainer outputFilters;
 ///     if (outputFilters.addFilter(WithholdName()).isOk())
@@ -23,7 +24,8 @@ public:
     CC_PropertyFilterContainer& operator=(CC_PropertyFilterContainer const&) = delete;
 
     unsigned int getNumberOfFilters() const { return m_filters.getCount(); }
-    /// The filter at that position (0 is applied first), null past the end. It stays the container's.
+    /// The filter at that position (0 is applied first), null past the end, and while the one that it replaces ends. It
+    /// stays the container's.
     CC_PropertyFilter const* getFilter(unsigned int index) const;
 
     /// Appends a copy: OK, or NO_ELEMENT when memory is out; nothing changes then.
@@ -46,6 +48,9 @@ public:
 
 private:
     using Element = TYList<CC_PropertyFilter*>::Element;
+    template <class Visit>
+    void forEach(Visit const& visit) const;
+    bool isThere(Element const* element) const;
     Element* find(unsigned int index) const;
     XCode insert(CC_PropertyFilter* owned, unsigned int index);
 

@@ -6,10 +6,13 @@
 #include "tests/support/PropertyTesting.h"
 
 #include <cstddef>
+#include <functional>
 #include <gtest/gtest.h>
+#include <memory>
 #include <new>
 #include <string>
 #include <tuple>
+#include <utility>
 
 namespace
 {
@@ -210,4 +213,128 @@ TEST(CC_PropertyFilter, VirtualOperationsKeepTheirSlots)
     std::size_t const first = SLOT_OF(&CC_PropertyFilter::clone); // behind the destructor
     EXPECT_EQ(first + 1, SLOT_OF(&CC_PropertyFilter::apply));
     EXPECT_EQ(first + 2, SLOT_OF(&CC_PropertyFilter::getInfo));
+}
+
+namespace
+{
+/// A letter that does what the test says, each deed once; its copies share them.
+class ActingLetter : public Letter
+{
+public:
+    struct Deeds
+    {
+        std::function<void()> onClone, onApply, onInfo, onEnd;
+    };
+    ActingLetter(char letter, std::shared_ptr<Deeds> deeds) : Letter(letter), m_deeds(std::move(deeds)) {}
+    ActingLetter(ActingLetter const&) = default;
+    ~ActingLetter() override { ACT(m_deeds->onEnd); }
+    CC_PropertyFilter* clone() const override
+    {
+        ACT(m_deeds->onClone);
+        return new (std::nothrow) ActingLetter(*this);
+    }
+    XCode apply(CC_PropertyContainer& properties) const override
+    {
+        XCode const result = Letter::apply(properties);
+        ACT(m_deeds->onApply);
+        return result;
+    }
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const override
+    {
+        Letter::getInfo(info, maxLevel, level, maxDetail, detail, prefix);
+        ACT(m_deeds->onInfo);
+        return info;
+    }
+
+private:
+    static void ACT(std::function<void()>& deed)
+    {
+        if (auto const once = std::exchange(deed, nullptr))
+            once();
+    }
+    std::shared_ptr<Deeds> m_deeds;
+};
+
+/// "abc" with an acting "b".
+struct CC_PropertyFilterContainerWalkTest : testing::Test
+{
+    CC_PropertyFilterContainerWalkTest()
+    {
+        EXPECT_TRUE(m_filters->addFilter(Letter('a')).isOk());
+        EXPECT_TRUE(m_filters->addFilter(ActingLetter('b', m_deeds)).isOk());
+        EXPECT_TRUE(m_filters->addFilter(Letter('c')).isOk());
+    }
+    ~CC_PropertyFilterContainerWalkTest() override { *m_deeds = {}; }
+
+    std::function<void()> removing(unsigned int index)
+    {
+        return [this, index] { m_filters->removeFilter(index); };
+    }
+    std::function<void()> adding(char letter)
+    {
+        return [this, letter] { EXPECT_TRUE(m_filters->addFilter(Letter(letter)).isOk()); };
+    }
+
+    std::shared_ptr<ActingLetter::Deeds> const m_deeds = std::make_shared<ActingLetter::Deeds>();
+    std::unique_ptr<CC_PropertyFilterContainer> m_filters = std::make_unique<CC_PropertyFilterContainer>();
+};
+} // namespace
+
+TEST_F(CC_PropertyFilterContainerWalkTest, AFilterIsAppendedBehindWhatItsCloneAdds)
+{
+    m_deeds->onClone = adding('x');
+    EXPECT_TRUE(m_filters->addFilter(ActingLetter('d', m_deeds)).isOk());
+    EXPECT_EQ("abcxd", LETTERS_OF(*m_filters));
+}
+
+TEST_F(CC_PropertyFilterContainerWalkTest, APositionCountsWhatTheCloneHasAddedOrRemoved)
+{
+    m_deeds->onClone = removing(0);
+    EXPECT_TRUE(m_filters->addFilter(ActingLetter('d', m_deeds), 1).isOk());
+    EXPECT_EQ("bdc", LETTERS_OF(*m_filters));
+    m_deeds->onClone = adding('x');
+    EXPECT_TRUE(m_filters->replaceFilter(ActingLetter('e', m_deeds), 3).isOk());
+    EXPECT_EQ("bdce", LETTERS_OF(*m_filters));
+}
+
+TEST_F(CC_PropertyFilterContainerWalkTest, AnAppliedFilterMayRemoveOthersOrItself)
+{
+    m_deeds->onApply = removing(2);
+    EXPECT_EQ("ab", LETTERS_OF(*m_filters));
+    m_deeds->onApply = removing(0);
+    EXPECT_EQ("ab", LETTERS_OF(*m_filters));
+    m_deeds->onApply = adding('x');
+    EXPECT_EQ("bx", LETTERS_OF(*m_filters));
+    m_deeds->onApply = removing(0);
+    EXPECT_EQ("bx", LETTERS_OF(*m_filters));
+    EXPECT_EQ("x", LETTERS_OF(*m_filters));
+}
+
+TEST_F(CC_PropertyFilterContainerWalkTest, ADumpedFilterMayRemoveOthersOrItself)
+{
+    m_deeds->onInfo = removing(2);
+    EXPECT_EQ("Call-Control Property Filter Container\n  Letter: a\n  Letter: b\n", DUMP(*m_filters, 9, 0));
+    m_deeds->onInfo = removing(1);
+    EXPECT_EQ("Call-Control Property Filter Container\n  Letter: a\n  Letter: b\n", DUMP(*m_filters, 9, 0));
+    EXPECT_EQ("Call-Control Property Filter Container\n  Letter: a\n", DUMP(*m_filters, 9, 0));
+}
+
+TEST_F(CC_PropertyFilterContainerWalkTest, AnEndingFilterMayRemoveOthersOfAnEndingContainer)
+{
+    CC_PropertyFilterContainer& ending = *m_filters;
+    m_deeds->onEnd = [&ending] { ending.removeFilter(ending.getNumberOfFilters() - 1); };
+    m_filters.reset();
+    EXPECT_EQ(0, Letter::s_alive);
+}
+
+TEST_F(CC_PropertyFilterContainerWalkTest, AnEndingFilterMayRemoveAllOthersWhileItIsReplaced)
+{
+    m_deeds->onEnd = [this]
+    {
+        while (m_filters->getNumberOfFilters() != 0)
+            m_filters->removeFilter(0);
+    };
+    EXPECT_TRUE(m_filters->replaceFilter(Letter('B'), 1).isOk());
+    EXPECT_EQ("B", LETTERS_OF(*m_filters)) << "the new one comes in once the old one is gone";
 }

@@ -21,7 +21,8 @@ private:
     friend CC_PropertyClass<CC_PropertyString>;
     void takeWhole(CC_PropertyString const& other)
     {
-        setValue(other.getValue()); // throws before it changes anything
+        if (getValue() != other.getValue()) // comparing is cheaper than copying
+            setValue(other.getValue());     // throws before it changes anything
         CC_Property::operator=(other);
     }
 };

@@ -2,7 +2,9 @@
 
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyContainer.h"
+#include "properties/CC_PropertyKind.h"
 
+#include <tuple>
 #include <utility>
 
 /// A copy of somebody's properties that follows them: what an adapter knows of a leg or call.
@@ -11,6 +13,7 @@
 /// written to the view itself. So it looks at no more than that, as long as it hears of every change and the source
 /// neither gains nor loses a property; otherwise at everything. Of a property change between two legs of twelve
 /// properties this saves a third of the instructions, and most of the memory that is touched when many calls are up.
+/// That holds for properties of our own classes; with a module's among them it looks at everything every time.
 ///
 ///     CC_PropertyView::Told const told{&event.getFlags(), leg.getNumberOfNotifications()};
 ///     m_peerView.follow(leg.getProperties(), told, [this](unsigned int id) { mark(id); });
@@ -45,17 +48,9 @@ public:
     void follow(CC_PropertyContainer const& source, Told const& told, OnDifference&& onDifference)
     {
         auto const take = [&](CC_Property& former, CC_Property const& current)
-        {
-            if (current.isEqual(former))
-                return true;
-            former.assign(current);
-            onDifference(current.getId());
-            if (!current.isEqual(former)) // memory is out, or the classes differ
-                m_inStepWith = nullptr;
-            return true;
-        };
-        if (!takeChanged(source, told, take))
-            followAll(source, told, take, onDifference);
+        { return takeOne(former, current, onDifference); };
+        if (!takeChanged(source, told, take) && !takeAll(source, told, take, onDifference))
+            followCopy(source, onDifference);
     }
 
 private:
@@ -80,9 +75,27 @@ private:
         return written == NONE || told.ids->get(written) || takeOne(written);
     }
 
+    /// Whether both are of our own classes, so that nothing but the value has changed by now.
+    template <class OnDifference>
+    bool takeOne(CC_Property& former, CC_Property const& current, OnDifference const& onDifference)
+    {
+        CC_PropertyKind const* const kind = CC_PropertyKind::OF_BOTH(former, current);
+        if (kind == nullptr)
+            return false;
+        if (kind->isEqual(former, current))
+            return true;
+        if (!kind->isSelfContained)
+            return false;
+        if (!kind->assign(former, current))
+            m_inStepWith = nullptr;
+        onDifference(current.getId());
+        return true;
+    }
+
+    /// Whether all were taken; otherwise one of a class that is not ours, or of another class than before, stopped it.
     template <class Take, class OnDifference>
-    void followAll(CC_PropertyContainer const& source, Told const& told, Take const& take,
-                   OnDifference const& onDifference)
+    bool takeAll(CC_PropertyContainer const& source, Told const& told, Take const& take,
+                 OnDifference const& onDifference)
     {
         m_inStepWith = &source;
         m_lastHeard = told.number;
@@ -91,22 +104,48 @@ private:
         CC_PropertyContainer::Cursor formers(m_properties);
         for (CC_Property const& current : source)
         {
-            if (CC_Property* const former = formers.find(current.getId()))
-            {
-                ++kept;
-                take(*former, current);
-                continue;
-            }
-            if (m_properties.replace(nullptr, current).isOk())
+            CC_Property* const former = formers.find(current.getId());
+            if (former != nullptr ? !take(*former, current) : CC_PropertyKind::OF(current) == nullptr)
+                return false;
+            if (former != nullptr || m_properties.replace(nullptr, current).isOk())
                 ++kept;
             else
                 m_inStepWith = nullptr; // without memory it is not seen; that it differs is told all the same
+            if (former == nullptr)
+                onDifference(current.getId());
+        }
+        if (kept < m_properties.getNumberOfProperties())
+            removeWhatIsGone(source, onDifference);
+        return true;
+    }
+
+    /// A module's class may do anything when it is cloned, compared, assigned or ended, to this view as well as to the
+    /// source. So the source is copied first and nothing that was found in the view is relied on after a call; and what
+    /// the class does not compare may differ unnoticed, so there is no step to be in.
+    template <class OnDifference>
+    void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
+    {
+        m_inStepWith = nullptr;
+        CC_PropertyContainer const copy(source);
+        if (!hasAllOfOwnKinds(copy, source))
+            return; // memory is out: better the view of before than one that calls what is there gone
+        for (CC_Property const& current : copy)
+        {
+            CC_Property const* const former = m_properties.get(current.getId());
+            if (former != nullptr && current.isEqual(*former))
+                continue;
+            std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
             onDifference(current.getId());
         }
-        for (unsigned int i = 0;
-             i < m_properties.getNumberOfProperties() && kept < m_properties.getNumberOfProperties();)
+        removeWhatIsGone(copy, onDifference);
+    }
+
+    template <class OnDifference>
+    void removeWhatIsGone(CC_PropertyContainer const& source, OnDifference const& onDifference)
+    {
+        for (unsigned int i = 0; CC_Property const* const former = m_properties.getByIndex(i);)
         {
-            unsigned int const id = m_properties.getByIndex(i)->getId();
+            unsigned int const id = former->getId();
             if (source.get(id) != nullptr)
             {
                 ++i;
@@ -116,6 +155,8 @@ private:
             onDifference(id);
         }
     }
+
+    static bool hasAllOfOwnKinds(CC_PropertyContainer const& copy, CC_PropertyContainer const& source);
 
     CC_PropertyContainer m_properties;
     CC_PropertyContainer const* m_inStepWith = nullptr; // null, or not the source: everything may differ

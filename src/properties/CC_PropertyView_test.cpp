@@ -4,9 +4,12 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyString.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/PropertyTesting.h"
 
+#include <algorithm>
 #include <gtest/gtest.h>
 #include <initializer_list>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -222,4 +225,124 @@ TEST_F(CC_PropertyView_Test, AssignedWithoutMemoryItLacksWhatWasRefusedUntilTheN
     CC_Flags const told;
     view.assign(source, TELL(&told));
     EXPECT_EQ(seen(), "Network=isdn Name=" + std::string(LONG_TEXT.c_str()) + " Display=A");
+}
+
+// --- a module's own classes ------------------------------------------------------------------------------------------
+
+namespace
+{
+struct CC_PropertyViewOfAModulesClass_Test : CC_PropertyView_Test
+{
+    CC_PropertyViewOfAModulesClass_Test()
+    {
+        act(1);
+        say(ALERT_INFO, "ring");
+        follow(nullptr);
+        differences.clear();
+    }
+    ~CC_PropertyViewOfAModulesClass_Test() override { *deeds = {}; }
+
+    void act(int value) { EXPECT_TRUE(source.set(ActingProperty(PRECALL_SERVICE, value, deeds)).isOk()); }
+    void followAll() { follow(nullptr); }
+
+    std::shared_ptr<ActingProperty::Deeds> const deeds = std::make_shared<ActingProperty::Deeds>();
+};
+} // namespace
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, ItIsComparedWithEveryChangeWhateverIsTold)
+{
+    act(2);
+    say(NAME, "Bert");
+    CC_Flags const told = FLAGS_OF({NAME});
+    follow(&told);
+    EXPECT_EQ(seen(), "Network=isdn Name=Bert Display=A Precall-Service=2 Alert-Info=ring");
+    EXPECT_EQ(differences, (Ids{NAME, PRECALL_SERVICE}));
+    act(3);
+    follow(&told);
+    EXPECT_EQ(differences, (Ids{NAME, PRECALL_SERVICE, PRECALL_SERVICE}));
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, AssignedItIsClonedEveryTime)
+{
+    view.assign(source, TELL(nullptr));
+    unsigned int const before = deeds->numberOfClones;
+    CC_Flags const told = FLAGS_OF({NAME});
+    view.assign(source, TELL(&told));
+    EXPECT_EQ(deeds->numberOfClones, before + 1);
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, WhatIsNotClonedIsGone)
+{
+    deeds->isClonable = false;
+    followAll();
+    EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=A Alert-Info=ring");
+    EXPECT_EQ(differences, Ids{PRECALL_SERVICE});
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, WithoutMemoryForACopyNothingOfOursIsCalledGone)
+{
+    say(ALERT_INFO, LONG_TEXT);
+    Ids told;
+    auto const followTold = [&] { view.follow(source, {}, [&](unsigned int id) { told.push_back(id); }); };
+    told.reserve(10);
+    unsigned long const failures = WITH_EACH_ALLOCATION_FAILING(
+        followTold, [&] { EXPECT_EQ(seen().find("Network=isdn Name=Anna Display=A"), 0U); });
+    EXPECT_LE(5U, failures);
+    EXPECT_EQ(view.getProperties().getNumberOfProperties(), 5U);
+    EXPECT_EQ(std::count(told.begin(), told.end(), NETWORK), 0);
+    EXPECT_EQ(VALUE_OF(*view.getProperties().get(ALERT_INFO)), LONG_TEXT.c_str());
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, ComparedItMayChangeTheSource)
+{
+    deeds->onIsEqual = [this] { source.clear(); };
+    followAll();
+    EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=A Precall-Service=1 Alert-Info=ring") << "as it was";
+    followAll();
+    EXPECT_EQ(seen(), "");
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, ComparedItMayClearTheView)
+{
+    act(2);
+    deeds->onIsEqual = [this] { view.clear(); };
+    followAll();
+    EXPECT_EQ(seen(), "Precall-Service=2 Alert-Info=ring");
+    followAll();
+    EXPECT_EQ(seen(), "Precall-Service=2 Alert-Info=ring Network=isdn Name=Anna Display=A");
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, AssignedItMayClearTheView)
+{
+    act(2);
+    deeds->onAssign = [this] { view.clear(); };
+    followAll();
+    EXPECT_EQ(seen(), "Alert-Info=ring");
+    EXPECT_EQ(differences, (Ids{PRECALL_SERVICE, ALERT_INFO}));
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, AssignedItMayWriteToTheView)
+{
+    act(2);
+    deeds->onAssign = [this] { EXPECT_TRUE(view.write(CC_PropertyString(DISPLAY, "mine")).isOk()); };
+    followAll();
+    EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=mine Precall-Service=2 Alert-Info=ring");
+    followAll();
+    EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=A Precall-Service=2 Alert-Info=ring");
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, EndingItMayClearTheView)
+{
+    EXPECT_TRUE(source.remove(PRECALL_SERVICE));
+    deeds->onEnd = [this] { view.clear(); };
+    followAll();
+    EXPECT_EQ(seen(), "");
+    EXPECT_EQ(differences, Ids{PRECALL_SERVICE});
+
+    act(1);
+    followAll();
+    EXPECT_TRUE(source.remove(PRECALL_SERVICE));
+    deeds->onEnd = [this] { view.clear(); };
+    view.assign(source, TELL(nullptr));
+    EXPECT_EQ(seen(), "Network=isdn Name=Anna Display=A Alert-Info=ring");
 }

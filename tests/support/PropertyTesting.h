@@ -6,8 +6,12 @@
 
 #include <cstddef>
 #include <cstring>
+#include <functional>
 #include <gtest/gtest.h>
+#include <memory>
+#include <new>
 #include <string>
+#include <utility>
 
 // What the tests of the properties share.
 
@@ -62,3 +66,67 @@ std::size_t SLOT_OF(Operation operation)
     std::memcpy(parts, &operation, sizeof parts);
     return (parts[0] - 1) / sizeof(void*);
 }
+
+/// A module's property of a number, written without the library's help, that does what the test says when it is asked
+/// for something: each deed once. It shares them with its copies.
+class ActingProperty : public CC_Property
+{
+public:
+    using Deed = std::function<void()>;
+    struct Deeds
+    {
+        Deed onClone, onAssign, onIsEqual, onText, onEnd;
+        unsigned int numberOfClones = 0;
+        bool isClonable = true;
+    };
+
+    ActingProperty(unsigned int id, int value, std::shared_ptr<Deeds> deeds)
+        : CC_Property(id), m_value(value), m_deeds(std::move(deeds))
+    {
+    }
+    ActingProperty(ActingProperty const&) = default;
+    ~ActingProperty() override { ACT(m_deeds->onEnd); }
+
+    int getNumber() const { return m_value; }
+    CC_Property& assign(CC_Property const& other) override
+    {
+        if (auto const* const same = dynamic_cast<ActingProperty const*>(&other))
+        {
+            CC_Property::operator=(other);
+            m_value = same->m_value;
+        }
+        ACT(m_deeds->onAssign);
+        return *this;
+    }
+    CC_Property* clone() const override
+    {
+        ++m_deeds->numberOfClones;
+        CC_Property* const copy = m_deeds->isClonable ? new (std::nothrow) ActingProperty(*this) : nullptr;
+        ACT(m_deeds->onClone);
+        return copy;
+    }
+    String& getValueString(String& out) const override
+    {
+        out.format("%d", m_value);
+        ACT(m_deeds->onText);
+        return out;
+    }
+    bool isEqual(CC_Property const& other) const override
+    {
+        auto const* const same = dynamic_cast<ActingProperty const*>(&other);
+        bool const isSame = same != nullptr && same->m_value == m_value;
+        ACT(m_deeds->onIsEqual);
+        return isSame;
+    }
+
+private:
+    /// What the deed may end is not touched: neither the property nor, unless others hold them, its deeds.
+    static void ACT(Deed& deed)
+    {
+        if (Deed const once = std::exchange(deed, nullptr))
+            once();
+    }
+
+    int m_value;
+    std::shared_ptr<Deeds> m_deeds;
+};

@@ -1,0 +1,104 @@
+#include "properties/CC_PropertyKind.h"
+
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyCallProgressTone.h"
+#include "properties/CC_PropertyCallType.h"
+#include "properties/CC_PropertyCause.h"
+#include "properties/CC_PropertyCharge.h"
+#include "properties/CC_PropertyCodec.h"
+#include "properties/CC_PropertyCodecNegotiating.h"
+#include "properties/CC_PropertyCodecs.h"
+#include "properties/CC_PropertyContextId.h"
+#include "properties/CC_PropertyInformationTransferCapability.h"
+#include "properties/CC_PropertyIpAddress.h"
+#include "properties/CC_PropertyNumberingPlan.h"
+#include "properties/CC_PropertyParametrizedString.h"
+#include "properties/CC_PropertyPresentationIndicator.h"
+#include "properties/CC_PropertyQoS.h"
+#include "properties/CC_PropertyRedirectingReason.h"
+#include "properties/CC_PropertyScreeningIndicator.h"
+#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyTariff.h"
+#include "properties/CC_PropertyTypeOfNumber.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "properties/CC_PropertyWaitForMessage.h"
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <type_traits>
+#include <typeinfo>
+
+template <class Property>
+CC_PropertyKind const CC_PropertyKind::THE = {
+    [](CC_Property const& property, CC_Property const& other)
+    { return static_cast<Property const&>(property).hasSameValue(static_cast<Property const&>(other)); },
+    [](CC_Property& property, CC_Property const& other)
+    { return &property == &other || static_cast<Property&>(property).take(static_cast<Property const&>(other)); },
+    !std::is_same_v<Property, CC_PropertyContextId>};
+
+/// The kinds by the addresses of their type information, which the linker makes the same for all shared objects. Where
+/// it did not, a class would be of no kind: slower, nothing else.
+class CC_PropertyKinds
+{
+public:
+    CC_PropertyKinds()
+    {
+        add<CC_PropertyBoolean, CC_PropertyCallLegState, CC_PropertyCallProgressTone, CC_PropertyCallType,
+            CC_PropertyCause, CC_PropertyCharge, CC_PropertyCodec, CC_PropertyCodecNegotiating, CC_PropertyCodecs,
+            CC_PropertyContextId, CC_PropertyInformationTransferCapability, CC_PropertyIpAddress,
+            CC_PropertyNumberingPlan, CC_PropertyParametrizedString, CC_PropertyPresentationIndicator, CC_PropertyQoS,
+            CC_PropertyRedirectingReason, CC_PropertyScreeningIndicator, CC_PropertyString, CC_PropertyTariff,
+            CC_PropertyTypeOfNumber, CC_PropertyUnsigned, CC_PropertyWaitForMessage>();
+    }
+
+    static CC_PropertyKind const* FIND(std::type_info const& type)
+    {
+        std::size_t slot = SLOT_OF(type);
+        while (s_entries[slot].type != &type && s_entries[slot].type != nullptr)
+            slot = (slot + 1) % s_entries.size();
+        return s_entries[slot].kind;
+    }
+
+private:
+    struct Entry
+    {
+        std::type_info const* type;
+        CC_PropertyKind const* kind;
+    };
+    static std::array<Entry, 128> s_entries; // few of them taken, so that nearly every look-up ends at the first
+
+    static std::size_t SLOT_OF(std::type_info const& type)
+    {
+        return reinterpret_cast<std::uintptr_t>(&type) / sizeof(void*) % s_entries.size();
+    }
+    template <class... Property>
+    static void add()
+    {
+        (add(typeid(Property), CC_PropertyKind::THE<Property>), ...);
+    }
+    static void add(std::type_info const& type, CC_PropertyKind const& kind)
+    {
+        std::size_t slot = SLOT_OF(type);
+        while (s_entries[slot].type != nullptr)
+            slot = (slot + 1) % s_entries.size();
+        s_entries[slot] = {&type, &kind};
+    }
+};
+constinit std::array<CC_PropertyKinds::Entry, 128> CC_PropertyKinds::s_entries{};
+
+namespace
+{
+CC_PropertyKinds const s_kinds; // until it is made, no class is of any kind
+} // namespace
+
+CC_PropertyKind const* CC_PropertyKind::OF(CC_Property const& property)
+{
+    return CC_PropertyKinds::FIND(typeid(property));
+}
+
+CC_PropertyKind const* CC_PropertyKind::OF_BOTH(CC_Property const& property, CC_Property const& other)
+{
+    return &typeid(property) == &typeid(other) ? OF(property) : nullptr;
+}
