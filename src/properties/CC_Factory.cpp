@@ -1,5 +1,6 @@
 #include "properties/CC_Factory.h"
 
+#include "properties/CC_PropertyKind.h"
 #include "properties/CC_PropertyTable.h"
 
 #include <tuple>
@@ -12,6 +13,7 @@ CC_Factory::~CC_Factory() = default;
 
 void CC_Factory::getPropertyIds(TYVector<unsigned int>& ids) const
 {
+    CC_PropertyKind::ASSIGN_TYPE_IDS(); // registering asks for the ids, once and before several threads are at work
     if (!ids.reserve(ids.getSize() + CC_PropertyTable::NUMBER_OF_LISTED_IDS).isOk())
         return;
     for (unsigned int i = 0; i < CC_PropertyTable::NUMBER_OF_LISTED_IDS; ++i)

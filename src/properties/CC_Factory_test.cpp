@@ -2,6 +2,7 @@
 
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyTable.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "tests/support/PropertyTesting.h"
@@ -11,6 +12,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <tuple>
 #include <typeinfo>
 #include <vector>
 
@@ -200,4 +202,20 @@ TEST(CC_Factory, ClonesOfFreshPropertiesTakeOneAllocationAndMayFindNone)
         EXPECT_NE(nullptr, clone);
         delete clone;
     }
+}
+
+// in a process of its own, as ctest runs it, nobody has asked before
+TEST(CC_Factory, RegisteringItGivesEveryClassItsTypeNumber)
+{
+    CC_Factory factory;
+    std::ignore = IDS_OF(factory);
+    unsigned int const next = Stranger::TYPE_ID();
+    for (unsigned int const id : IDS_OF(factory))
+    {
+        std::unique_ptr<CC_Property> const property(factory.createProperty(id));
+        ASSERT_NE(nullptr, property) << std::hex << id;
+        EXPECT_LT(property->getTypeId(), next) << property->getTypeName();
+    }
+    EXPECT_LT(CC_Property::TYPE_ID(), next);
+    EXPECT_LT(CC_PropertyQoS::TYPE_ID(), next);
 }

@@ -27,8 +27,29 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <tuple>
 #include <type_traits>
 #include <typeinfo>
+
+namespace
+{
+template <class... Property>
+struct Classes
+{
+    template <class Function>
+    static void FOR_EACH(Function const& function)
+    {
+        (function.template operator()<Property>(), ...);
+    }
+};
+using OwnClasses =
+    Classes<CC_PropertyBoolean, CC_PropertyCallLegState, CC_PropertyCallProgressTone, CC_PropertyCallType,
+            CC_PropertyCause, CC_PropertyCharge, CC_PropertyCodec, CC_PropertyCodecNegotiating, CC_PropertyCodecs,
+            CC_PropertyContextId, CC_PropertyInformationTransferCapability, CC_PropertyIpAddress,
+            CC_PropertyNumberingPlan, CC_PropertyParametrizedString, CC_PropertyPresentationIndicator, CC_PropertyQoS,
+            CC_PropertyRedirectingReason, CC_PropertyScreeningIndicator, CC_PropertyString, CC_PropertyTariff,
+            CC_PropertyTypeOfNumber, CC_PropertyUnsigned, CC_PropertyWaitForMessage>;
+} // namespace
 
 template <class Property>
 CC_PropertyKind const CC_PropertyKind::THE = {
@@ -45,12 +66,7 @@ class CC_PropertyKinds
 public:
     CC_PropertyKinds()
     {
-        add<CC_PropertyBoolean, CC_PropertyCallLegState, CC_PropertyCallProgressTone, CC_PropertyCallType,
-            CC_PropertyCause, CC_PropertyCharge, CC_PropertyCodec, CC_PropertyCodecNegotiating, CC_PropertyCodecs,
-            CC_PropertyContextId, CC_PropertyInformationTransferCapability, CC_PropertyIpAddress,
-            CC_PropertyNumberingPlan, CC_PropertyParametrizedString, CC_PropertyPresentationIndicator, CC_PropertyQoS,
-            CC_PropertyRedirectingReason, CC_PropertyScreeningIndicator, CC_PropertyString, CC_PropertyTariff,
-            CC_PropertyTypeOfNumber, CC_PropertyUnsigned, CC_PropertyWaitForMessage>();
+        OwnClasses::FOR_EACH([]<class Property>() { add(typeid(Property), CC_PropertyKind::THE<Property>); });
     }
 
     static CC_PropertyKind const* FIND(std::type_info const& type)
@@ -72,11 +88,6 @@ private:
     static std::size_t SLOT_OF(std::type_info const& type)
     {
         return reinterpret_cast<std::uintptr_t>(&type) / sizeof(void*) % s_entries.size();
-    }
-    template <class... Property>
-    static void add()
-    {
-        (add(typeid(Property), CC_PropertyKind::THE<Property>), ...);
     }
     static void add(std::type_info const& type, CC_PropertyKind const& kind)
     {
@@ -101,4 +112,10 @@ CC_PropertyKind const* CC_PropertyKind::OF(CC_Property const& property)
 CC_PropertyKind const* CC_PropertyKind::OF_BOTH(CC_Property const& property, CC_Property const& other)
 {
     return &typeid(property) == &typeid(other) ? OF(property) : nullptr;
+}
+
+void CC_PropertyKind::ASSIGN_TYPE_IDS()
+{
+    std::ignore = CC_Property::TYPE_ID();
+    OwnClasses::FOR_EACH([]<class Property>() { std::ignore = Property::TYPE_ID(); });
 }

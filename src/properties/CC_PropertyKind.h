@@ -29,6 +29,9 @@ public:
     /// The kind of two objects of the same class; null when the classes differ or are a module's.
     static CC_PropertyKind const* OF_BOTH(CC_Property const& property, CC_Property const& other);
 
+    /// Gives every class its type number. Once, before several threads use properties.
+    static void ASSIGN_TYPE_IDS();
+
 private:
     template <class Property>
     static CC_PropertyKind const THE;
