@@ -23,7 +23,7 @@ class Stranger : public CC_PropertyClass<Stranger>
 {
 public:
     static constexpr char const* TYPE_NAME = "Stranger";
-    static inline unsigned int s_typeId = CC_Property::NO_TYPE_ID;
+    static inline TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     String& getValueString(String& out) const override { return out = "?"; }
     bool hasSameValue(Stranger const&) const { return true; }

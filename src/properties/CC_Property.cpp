@@ -6,7 +6,7 @@
 #include <new>
 
 unsigned int CC_Property::s_numberOfInstances = 0;
-unsigned int CC_Property::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyTypeId<CC_Property> CC_Property::s_typeId;
 unsigned int CC_Property::s_nextFreeTypeId = 0;
 
 namespace
@@ -46,6 +46,8 @@ private:
 };
 thread_local Awaited* Awaited::t_innermost = nullptr;
 } // namespace
+
+unsigned int CC_PropertyTypeNumber::assign() { return m_number = CC_Property::s_nextFreeTypeId++; }
 
 unsigned int CC_Property::getTypeId() const { return TYPE_ID(); }
 

@@ -7,6 +7,34 @@
 #include "platform/base/TYRecycled.h"
 #include "platform/base/XCode.h"
 
+#include <atomic>
+
+/// The number of a property class in this process, to be kept in a variable of the class. Nothing but asking changes
+/// it.
+class CC_EXPORT CC_PropertyTypeNumber
+{
+public:
+    constexpr CC_PropertyTypeNumber() = default;
+    CC_PropertyTypeNumber(CC_PropertyTypeNumber const&) = delete;
+    CC_PropertyTypeNumber& operator=(CC_PropertyTypeNumber const&) = delete;
+
+    /// The first call assigns the next free number.
+    unsigned int get() { return m_number != NONE ? m_number : assign(); }
+
+    static constexpr unsigned int NONE = 0xffffffff;
+
+private:
+    unsigned int assign();
+
+    unsigned int m_number = NONE;
+};
+
+/// The number of one class, so that a class which has none cannot pass for its base.
+template <class Class>
+class CC_EXPORT CC_PropertyTypeId : public CC_PropertyTypeNumber
+{
+};
+
 /// One value that the two sides of a call exchange: a number, an indicator, a state, a cause. The base of every value
 /// class.
 ///
@@ -19,7 +47,8 @@
 /// is out; the other operations report it as they say.
 ///
 /// Not locked: a property belongs to the thread of its owner. Type numbers are assigned lazily and unguarded, so the
-/// thread that starts call control must have asked each class for its own before other threads use properties.
+/// thread that starts call control must have asked each class for its own before other threads use properties:
+/// CC_Factory does so for the library's classes when it is registered, a module for its own.
 ///
 ///     CC_PropertyBoolean dataProvided(CC_PropertyId::PROVIDES_DATA, true);
 ///     String text;
@@ -28,13 +57,13 @@ class CC_EXPORT CC_Property : public LinkedListElement<CC_Property>, public TYRe
 {
 public:
     /// The value of a class's type number as long as none was assigned.
-    static constexpr unsigned int NO_TYPE_ID = 0xffffffff;
+    static constexpr unsigned int NO_TYPE_ID = CC_PropertyTypeNumber::NONE;
 
-    explicit CC_Property(unsigned int id) noexcept : m_id(id) { ++s_numberOfInstances; }
+    explicit CC_Property(unsigned int id) noexcept : m_id(id) { COUNT_ONE(); }
     /// The copy is in no list.
     CC_Property(CC_Property const& other) noexcept : LinkedListElement(other), TYRecycled(), m_id(other.m_id)
     {
-        ++s_numberOfInstances;
+        COUNT_ONE();
     }
     /// Copies the id; the place in a list stays.
     CC_Property& operator=(CC_Property const& other) noexcept
@@ -43,7 +72,7 @@ public:
         return *this;
     }
 
-    virtual ~CC_Property() { --s_numberOfInstances; }
+    virtual ~CC_Property() { std::atomic_ref(s_numberOfInstances).fetch_sub(1, std::memory_order_relaxed); }
     /// Takes over id and value of `other` if that is of this class or derives from it. Otherwise, and when memory is
     /// out, nothing changes (ASSIGN tells the latter). Returns this object.
     virtual CC_Property& assign(CC_Property const& other) = 0;
@@ -72,20 +101,14 @@ public:
     /// The name of the id in configuration texts ("pi"), "(unknown)" for an id without one. Lives for ever.
     char const* getPropertyShortName() const;
 
-    static unsigned int TYPE_ID() { return ASSIGN_TYPE_ID(s_typeId); }
-    /// The number in `typeId`, a class's own variable; the first call assigns the next free one.
-    static unsigned int ASSIGN_TYPE_ID(unsigned int& typeId)
-    {
-        if (typeId == NO_TYPE_ID)
-            typeId = s_nextFreeTypeId++;
-        return typeId;
-    }
+    static unsigned int TYPE_ID() { return s_typeId.get(); }
     /// Has `property` take over `other`, as `assign` does, and tells what that has no result for: OK, also when the
     /// classes differ; NO_ELEMENT when memory is out.
     static XCode ASSIGN(CC_Property& property, CC_Property const& other);
 
-    static unsigned int s_numberOfInstances; ///< live properties of all classes
-    static unsigned int s_typeId;
+    /// Live properties of all classes. Counted exactly whatever threads own them; exact to read when none is at work.
+    static unsigned int s_numberOfInstances;
+    static CC_PropertyTypeId<CC_Property> s_typeId;
 
 protected:
     /// Sets `error`, as far as memory allows, and returns FAILURE.
@@ -95,6 +118,10 @@ protected:
     void reportFailedAssignment() const noexcept;
 
 private:
+    friend class CC_PropertyTypeNumber;
+
+    static void COUNT_ONE() noexcept { std::atomic_ref(s_numberOfInstances).fetch_add(1, std::memory_order_relaxed); }
+
     static unsigned int s_nextFreeTypeId;
 
     unsigned int m_id;

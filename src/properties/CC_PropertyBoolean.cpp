@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyBoolean.h"
 
-unsigned int CC_PropertyBoolean::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyBoolean::TypeId CC_PropertyBoolean::s_typeId;
 
 String& CC_PropertyBoolean::getValueString(String& out) const { return out = String::stringOf(getValue()); }
 

@@ -9,7 +9,7 @@ class CC_EXPORT CC_PropertyBoolean : public CC_PropertyValue<CC_PropertyBoolean,
 {
 public:
     static constexpr char const* TYPE_NAME = "Boolean";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
     /// A pointer, "true" among them, would silently count as true.

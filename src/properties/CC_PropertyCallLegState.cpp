@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 
-unsigned int CC_PropertyCallLegState::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCallLegState::TypeId CC_PropertyCallLegState::s_typeId;
 
 String& CC_PropertyCallLegState::getValueString(String& out) const { return out = STATE_NAME(m_state); }
 

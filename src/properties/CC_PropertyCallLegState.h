@@ -24,7 +24,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "Call-Leg-State";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< RELEASED
     CC_PropertyCallLegState(unsigned int id, State state) : CC_PropertyClass(id), m_state(state) {}

@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyCallProgressTone.h"
 
-unsigned int CC_PropertyCallProgressTone::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCallProgressTone::TypeId CC_PropertyCallProgressTone::s_typeId;
 
 String& CC_PropertyCallProgressTone::getValueString(String& out) const
 {

@@ -13,7 +13,7 @@ public:
     using Tone = MG_Tones::ECallProgressTone::Type;
 
     static constexpr char const* TYPE_NAME = "Call-Progress-Tone";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< no tone, no text
     CC_PropertyCallProgressTone(unsigned int id, Tone tone, String const& text = String::s_empty)

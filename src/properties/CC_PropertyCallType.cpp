@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 
-unsigned int CC_PropertyCallType::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCallType::TypeId CC_PropertyCallType::s_typeId;
 
 String& CC_PropertyCallType::getValueString(String& out) const { return out = CALL_TYPE_NAME(m_value); }
 

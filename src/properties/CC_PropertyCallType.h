@@ -15,7 +15,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "CallType";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< normal
     CC_PropertyCallType(unsigned int id, _eCallType value) : CC_PropertyClass(id), m_value(value) {}

@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 
-unsigned int CC_PropertyCause::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCause::TypeId CC_PropertyCause::s_typeId;
 
 namespace
 {

@@ -13,7 +13,7 @@ class CC_EXPORT CC_PropertyCause : public CC_PropertyClass<CC_PropertyCause>
 {
 public:
     static constexpr char const* TYPE_NAME = "Cause";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< no cause, no code, no text
     /// `sipCode`: 0 for none. `text`: empty for none.

@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyCharge.h"
 
-unsigned int CC_PropertyCharge::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCharge::TypeId CC_PropertyCharge::s_typeId;
 
 namespace
 {

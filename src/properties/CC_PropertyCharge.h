@@ -61,7 +61,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "Charge";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< nothing selected, unless a charge is given
     CC_PropertyCharge(unsigned int id, Charge const& charge) : CC_PropertyClass(id), m_charge(charge) {}

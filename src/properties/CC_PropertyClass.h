@@ -7,9 +7,9 @@
 #include <typeinfo>
 #include <utility>
 
-/// Whether Derived declares a type-number variable of its own. An inherited one would give it the number of its base.
-template <class Derived, class Base>
-inline constexpr bool HAS_OWN_TYPE_ID = &Derived::s_typeId != &Base::s_typeId;
+/// Whether the class declares a type number of its own. An inherited one would give it the number of its base.
+template <class Derived>
+inline constexpr bool HAS_OWN_TYPE_ID = std::is_same_v<decltype(Derived::s_typeId), CC_PropertyTypeId<Derived>>;
 
 /// What all property classes have in common, written once: `Derived` is the class itself, `Base` the property class
 /// that it extends.
@@ -23,7 +23,7 @@ inline constexpr bool HAS_OWN_TYPE_ID = &Derived::s_typeId != &Base::s_typeId;
 ///     {
 ///     public:
 ///         static constexpr char const* TYPE_NAME = "Point";
-///         static unsigned int s_typeId;
+///         static TypeId s_typeId;
 ///         using CC_PropertyClass::CC_PropertyClass;                      // from the id alone
 ///         CC_PropertyPoint(unsigned int id, int x, int y) : CC_PropertyClass(id), m_x(x), m_y(y) {}
 ///         String& getValueString(String& out) const override;
@@ -35,18 +35,21 @@ inline constexpr bool HAS_OWN_TYPE_ID = &Derived::s_typeId != &Base::s_typeId;
 ///     };
 ///
 ///     // CC_PropertyPoint.cpp
-///     unsigned int CC_PropertyPoint::s_typeId = CC_Property::NO_TYPE_ID;
+///     CC_PropertyPoint::TypeId CC_PropertyPoint::s_typeId;
 ///     String& CC_PropertyPoint::getValueString(String& out) const { return out.format("%d/%d", m_x, m_y); }
 template <class Derived, class Base = CC_Property>
 class CC_EXPORT CC_PropertyClass : public Base
 {
 public:
+    /// Of the class's variable for its type number.
+    using TypeId = CC_PropertyTypeId<Derived>;
+
     using Base::Base;
 
     static unsigned int TYPE_ID()
     {
-        static_assert(HAS_OWN_TYPE_ID<Derived, Base>, "the class needs a static unsigned int s_typeId of its own");
-        return CC_Property::ASSIGN_TYPE_ID(Derived::s_typeId);
+        static_assert(HAS_OWN_TYPE_ID<Derived>, "the class needs a `static TypeId s_typeId;` of its own");
+        return Derived::s_typeId.get();
     }
 
     /// The property as one of this class, or of one that derives from it; null when it is null or of another class.

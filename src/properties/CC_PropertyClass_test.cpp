@@ -18,7 +18,7 @@ class Point : public CC_PropertyClass<Point>
 {
 public:
     static constexpr char const* TYPE_NAME = "Point";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     Point(unsigned int id, int x, int y) : CC_PropertyClass(id), m_x(x), m_y(y) {}
     String& getValueString(String& out) const override { return out.format("%d/%d", m_x, m_y); }
@@ -28,27 +28,27 @@ private:
     int m_x = 0;
     int m_y = 0;
 };
-unsigned int Point::s_typeId = CC_Property::NO_TYPE_ID;
+Point::TypeId Point::s_typeId;
 
 /// Extends a class of the library.
 class Title : public CC_PropertyClass<Title, CC_PropertyString>
 {
 public:
     static constexpr char const* TYPE_NAME = "Title";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     String& getValueString(String& out) const override { return out = String("Dr. ") + getValue(); }
 };
-unsigned int Title::s_typeId = CC_Property::NO_TYPE_ID;
+Title::TypeId Title::s_typeId;
 
 /// Forgot its variable.
 class Forgetful : public CC_PropertyClass<Forgetful, CC_PropertyUnsigned>
 {
 };
 
-static_assert(HAS_OWN_TYPE_ID<Title, CC_PropertyString>);
-static_assert(HAS_OWN_TYPE_ID<Point, CC_Property>);
-static_assert(!HAS_OWN_TYPE_ID<Forgetful, CC_PropertyUnsigned>, "would share its base's number");
+static_assert(HAS_OWN_TYPE_ID<Title>);
+static_assert(HAS_OWN_TYPE_ID<Point>);
+static_assert(!HAS_OWN_TYPE_ID<Forgetful>, "would share its base's number");
 } // namespace
 
 TEST(CC_PropertyClass, AClassOfItsOwnWorksAsTheLibrarysDo)

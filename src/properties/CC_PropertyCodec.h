@@ -11,7 +11,7 @@ class CC_EXPORT CC_PropertyCodec : public CC_PropertyValue<CC_PropertyCodec, Voi
 {
 public:
     static constexpr char const* TYPE_NAME = "Codec";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue; ///< no codec, unless one is given
 

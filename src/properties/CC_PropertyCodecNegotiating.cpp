@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 
-unsigned int CC_PropertyCodecNegotiating::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCodecNegotiating::TypeId CC_PropertyCodecNegotiating::s_typeId;
 
 String& CC_PropertyCodecNegotiating::getValueString(String& out) const
 {

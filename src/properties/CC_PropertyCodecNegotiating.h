@@ -18,7 +18,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "CodecNegotiating";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< not capable
     CC_PropertyCodecNegotiating(unsigned int id, State state, unsigned int negotiatedValue = 0)

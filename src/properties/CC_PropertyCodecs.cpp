@@ -1,5 +1,5 @@
 #include "properties/CC_PropertyCodecs.h"
 
-unsigned int CC_PropertyCodecs::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyCodecs::TypeId CC_PropertyCodecs::s_typeId;
 
 String& CC_PropertyCodecs::getValueString(String& out) const { return getValue().getShortInfo(out); }

@@ -10,7 +10,7 @@ class CC_EXPORT CC_PropertyCodecs : public CC_PropertyValue<CC_PropertyCodecs, V
 {
 public:
     static constexpr char const* TYPE_NAME = "Codecs";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue; ///< none, unless some are given
 

@@ -14,7 +14,7 @@ class Loop : public CC_PropertyClass<Loop>
 {
 public:
     static constexpr char const* TYPE_NAME = "Loop";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     static CC_PropertyContainerContainer const* s_sides;
     using CC_PropertyClass::CC_PropertyClass;
     String& getValueString(String& out) const override { return out = "loop"; }
@@ -25,7 +25,7 @@ public:
     }
     bool hasSameValue(Loop const&) const { return true; }
 };
-unsigned int Loop::s_typeId = CC_Property::NO_TYPE_ID;
+Loop::TypeId Loop::s_typeId;
 CC_PropertyContainerContainer const* Loop::s_sides = nullptr;
 } // namespace
 

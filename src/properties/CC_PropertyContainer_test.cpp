@@ -43,7 +43,7 @@ class Caught : public CC_PropertyClass<Caught>
 {
 public:
     static constexpr char const* TYPE_NAME = "Caught";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     static LinkedListManager_Untyped s_trap;
 
     using CC_PropertyClass::CC_PropertyClass;
@@ -62,7 +62,7 @@ public:
     String& getValueString(String& out) const override { return out = "caught"; }
     bool hasSameValue(Caught const&) const { return true; }
 };
-unsigned int Caught::s_typeId = CC_Property::NO_TYPE_ID;
+Caught::TypeId Caught::s_typeId;
 LinkedListManager_Untyped Caught::s_trap;
 
 /// A property that contains others, as a list of forwarding targets would.
@@ -70,7 +70,7 @@ class Nested : public CC_PropertyClass<Nested>
 {
 public:
     static constexpr char const* TYPE_NAME = "Nested";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     Nested(unsigned int id, CC_PropertyContainer const& inner) : CC_PropertyClass(id), m_inner(inner) {}
     String& getValueString(String& out) const override { return out = "nested"; }
@@ -84,7 +84,7 @@ public:
 private:
     CC_PropertyContainer m_inner;
 };
-unsigned int Nested::s_typeId = CC_Property::NO_TYPE_ID;
+Nested::TypeId Nested::s_typeId;
 } // namespace
 
 TEST(CC_PropertyContainer, KeepsCopiesInTheOrderOfTheirAdding)
@@ -378,7 +378,7 @@ class Rounded : public CC_PropertyClass<Rounded>
 {
 public:
     static constexpr char const* TYPE_NAME = "Rounded";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     Rounded(unsigned int id, int number, String const& remark)
         : CC_PropertyClass(id), m_number(number), m_remark(remark)
@@ -391,7 +391,7 @@ private:
     int m_number = 0;
     String m_remark;
 };
-unsigned int Rounded::s_typeId = CC_Property::NO_TYPE_ID;
+Rounded::TypeId Rounded::s_typeId;
 
 /// A container with an acting property between two others.
 struct CC_PropertyContainerWalkTest : testing::Test

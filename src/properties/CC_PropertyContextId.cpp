@@ -4,7 +4,7 @@
 
 #include <tuple>
 
-unsigned int CC_PropertyContextId::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyContextId::TypeId CC_PropertyContextId::s_typeId;
 
 CC_PropertyContextId::CC_PropertyContextId(unsigned int id, MG_IContext* context) : CC_PropertyClass(id)
 {

@@ -15,7 +15,7 @@ class CC_EXPORT CC_PropertyContextId : public CC_PropertyClass<CC_PropertyContex
 {
 public:
     static constexpr char const* TYPE_NAME = "ContextId";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     explicit CC_PropertyContextId(unsigned int id) : CC_PropertyContextId(id, nullptr) {}
     /// As `setContext`.

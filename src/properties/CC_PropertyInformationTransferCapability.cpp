@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyInformationTransferCapability.h"
 
-unsigned int CC_PropertyInformationTransferCapability::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyInformationTransferCapability::TypeId CC_PropertyInformationTransferCapability::s_typeId;
 
 String& CC_PropertyInformationTransferCapability::getValueString(String& out) const
 {

@@ -12,7 +12,7 @@ class CC_EXPORT CC_PropertyInformationTransferCapability
 {
 public:
     static constexpr char const* TYPE_NAME = "Information-Transfer-Capability";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyIpAddress.h"
 
-unsigned int CC_PropertyIpAddress::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyIpAddress::TypeId CC_PropertyIpAddress::s_typeId;
 
 String& CC_PropertyIpAddress::getValueString(String& out) const { return getValue().getIpAddrAsString(out); }
 

@@ -14,7 +14,7 @@ class CC_EXPORT CC_PropertyIpAddress : public CC_PropertyValue<CC_PropertyIpAddr
 {
 public:
     static constexpr char const* TYPE_NAME = "IP-Address";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

@@ -10,7 +10,7 @@ class CC_EXPORT CC_PropertyNumberingPlan : public CC_PropertyValue<CC_PropertyNu
 {
 public:
     static constexpr char const* TYPE_NAME = "Numbering-Plan";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

@@ -2,7 +2,7 @@
 
 #include <utility>
 
-unsigned int CC_PropertyParametrizedString::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyParametrizedString::TypeId CC_PropertyParametrizedString::s_typeId;
 
 namespace
 {

@@ -45,7 +45,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "Parametrized String";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< empty, counter 0
     CC_PropertyParametrizedString(unsigned int id, String const& content) : CC_PropertyClass(id), m_content(content) {}

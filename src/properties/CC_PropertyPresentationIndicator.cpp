@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyPresentationIndicator.h"
 
-unsigned int CC_PropertyPresentationIndicator::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyPresentationIndicator::TypeId CC_PropertyPresentationIndicator::s_typeId;
 
 String& CC_PropertyPresentationIndicator::getValueString(String& out) const
 {

@@ -12,7 +12,7 @@ class CC_EXPORT CC_PropertyPresentationIndicator
 {
 public:
     static constexpr char const* TYPE_NAME = "Presentation-Indicator";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

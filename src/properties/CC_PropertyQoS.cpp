@@ -2,7 +2,7 @@
 
 #include <new>
 
-unsigned int CC_PropertyQoS::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyQoS::TypeId CC_PropertyQoS::s_typeId;
 
 namespace
 {

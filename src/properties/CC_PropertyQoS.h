@@ -13,7 +13,7 @@ class CC_EXPORT CC_PropertyQoS : public CC_PropertyValue<CC_PropertyQoS, CC_QoS>
 {
 public:
     static constexpr char const* TYPE_NAME = "QoS";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

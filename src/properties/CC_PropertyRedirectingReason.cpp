@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyRedirectingReason.h"
 
-unsigned int CC_PropertyRedirectingReason::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyRedirectingReason::TypeId CC_PropertyRedirectingReason::s_typeId;
 
 String& CC_PropertyRedirectingReason::getValueString(String& out) const
 {

@@ -12,7 +12,7 @@ class CC_EXPORT CC_PropertyRedirectingReason
 {
 public:
     static constexpr char const* TYPE_NAME = "Redirecting-Reason";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyScreeningIndicator.h"
 
-unsigned int CC_PropertyScreeningIndicator::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyScreeningIndicator::TypeId CC_PropertyScreeningIndicator::s_typeId;
 
 String& CC_PropertyScreeningIndicator::getValueString(String& out) const
 {

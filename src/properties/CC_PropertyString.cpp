@@ -2,7 +2,7 @@
 
 #include <new>
 
-unsigned int CC_PropertyString::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyString::TypeId CC_PropertyString::s_typeId;
 
 String& CC_PropertyString::getValueString(String& out) const { return out = getValue(); }
 

@@ -9,7 +9,7 @@ class CC_EXPORT CC_PropertyString : public CC_PropertyValue<CC_PropertyString, S
 {
 public:
     static constexpr char const* TYPE_NAME = "String";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

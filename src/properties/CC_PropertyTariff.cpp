@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyTariff.h"
 
-unsigned int CC_PropertyTariff::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyTariff::TypeId CC_PropertyTariff::s_typeId;
 
 namespace
 {

@@ -32,7 +32,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "Tariff";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< nothing selected, unless a tariff is given
     CC_PropertyTariff(unsigned int id, Tariff const& tariff) : CC_PropertyClass(id), m_tariff(tariff) {}

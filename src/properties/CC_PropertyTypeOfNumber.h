@@ -10,7 +10,7 @@ class CC_EXPORT CC_PropertyTypeOfNumber : public CC_PropertyValue<CC_PropertyTyp
 {
 public:
     static constexpr char const* TYPE_NAME = "Type-Of-Number";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyValue::CC_PropertyValue;
 

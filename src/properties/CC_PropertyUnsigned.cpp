@@ -1,6 +1,6 @@
 #include "properties/CC_PropertyUnsigned.h"
 
-unsigned int CC_PropertyUnsigned::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyUnsigned::TypeId CC_PropertyUnsigned::s_typeId;
 
 String& CC_PropertyUnsigned::getValueString(String& out) const { return out.format("0x%8.8llx", getValue()); }
 

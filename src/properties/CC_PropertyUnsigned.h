@@ -12,7 +12,7 @@ class CC_EXPORT CC_PropertyUnsigned : public CC_PropertyClass<CC_PropertyUnsigne
 {
 public:
     static constexpr char const* TYPE_NAME = "Unsigned";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< 0
     CC_PropertyUnsigned(unsigned int id, unsigned long long value) : CC_PropertyClass(id), m_value(value) {}

@@ -12,12 +12,12 @@ class Minutes : public CC_PropertyClass<Minutes, CC_PropertyUnsigned>
 {
 public:
     static constexpr char const* TYPE_NAME = "Minutes";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     unsigned long long getValue() const override { return 60 * CC_PropertyUnsigned::getValue(); }
     void setValue(unsigned long long value) override { CC_PropertyUnsigned::setValue(value / 60); }
 };
-unsigned int Minutes::s_typeId = CC_Property::NO_TYPE_ID;
+Minutes::TypeId Minutes::s_typeId;
 } // namespace
 
 TEST(CC_PropertyUnsigned, PrintsAtLeastEightHexadecimalDigits)

@@ -10,7 +10,7 @@
 ///     {
 ///     public:
 ///         static constexpr char const* TYPE_NAME = "Type-Of-Number";
-///         static unsigned int s_typeId;
+///         static TypeId s_typeId;
 ///         using CC_PropertyValue::CC_PropertyValue;
 ///         String& getValueString(String& out) const override;
 ///     };

@@ -2,7 +2,7 @@
 
 #include "platform/base/NameOf.h"
 
-unsigned int CC_PropertyWaitForMessage::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyWaitForMessage::TypeId CC_PropertyWaitForMessage::s_typeId;
 
 String& CC_PropertyWaitForMessage::getValueString(String& out) const
 {

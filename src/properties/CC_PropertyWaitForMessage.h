@@ -23,7 +23,7 @@ public:
     };
 
     static constexpr char const* TYPE_NAME = "WaitForMessage";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< not capable
     CC_PropertyWaitForMessage(unsigned int id, State state, MessageType messageType = UNDEFINED)

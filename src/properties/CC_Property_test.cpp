@@ -8,7 +8,10 @@
 
 #include <cstddef>
 #include <gtest/gtest.h>
+#include <memory>
 #include <string>
+#include <thread>
+#include <type_traits>
 
 namespace
 {
@@ -88,13 +91,36 @@ TEST(CC_Property, AnIdBesideTheTableIsUnknown)
 
 TEST(CC_Property, TypeNumbersAreAssignedInTheOrderOfAsking)
 {
-    unsigned int first = CC_Property::NO_TYPE_ID;
-    unsigned int second = CC_Property::NO_TYPE_ID;
-    unsigned int const number = CC_Property::ASSIGN_TYPE_ID(first);
-    EXPECT_EQ(number + 1, CC_Property::ASSIGN_TYPE_ID(second));
-    EXPECT_EQ(number, CC_Property::ASSIGN_TYPE_ID(first));
-    EXPECT_EQ(number, first);
+    CC_PropertyTypeNumber first;
+    CC_PropertyTypeNumber second;
+    unsigned int const number = first.get();
+    EXPECT_EQ(number + 1, second.get());
+    EXPECT_EQ(number, first.get());
     EXPECT_EQ(0xffffffffU, CC_Property::NO_TYPE_ID);
+}
+
+// nobody else gives a class another's number
+static_assert(!std::is_assignable_v<decltype(CC_PropertyString::s_typeId)&, unsigned int>);
+static_assert(!std::is_copy_assignable_v<decltype(CC_PropertyString::s_typeId)>);
+static_assert(!std::is_move_assignable_v<decltype(CC_PropertyString::s_typeId)>);
+
+TEST(CC_Property, OwnersOnSeveralThreadsAreAllCounted)
+{
+    unsigned int const before = CC_Property::s_numberOfInstances;
+    std::unique_ptr<CC_Property> kept[2];
+    auto const make = [](std::unique_ptr<CC_Property>& last)
+    {
+        for (unsigned int i = 0; i < 20000; ++i)
+            last = std::make_unique<CC_PropertyUnsigned>(CC_PropertyId::HOPS, i);
+    };
+    {
+        std::jthread const one([&] { make(kept[0]); });
+        std::jthread const other([&] { make(kept[1]); });
+    }
+    EXPECT_EQ(before + 2, CC_Property::s_numberOfInstances);
+    kept[0].reset();
+    kept[1].reset();
+    EXPECT_EQ(before, CC_Property::s_numberOfInstances);
 }
 
 TEST(CC_Property, ADumpNamesTheClassWhileMoreDetailIsWanted)
