@@ -168,6 +168,61 @@ public:
     XCode setCallPropertyUnfiltered(CC_Property const& property);
     XCode setCallPropertiesUnfiltered(CC_PropertyContainer const& properties);
 
+    // The same by typed keys (CC_PropertyKeys.h), filtered. Getters: the property as one of the key's class, or a copy
+    // of its value with a fallback. Setters: with a property made from the values.
+
+    template <class Property>
+    CC_FoundProperty<Property> getOwn(CC_PropertyKey<Property> key) const
+    {
+        return key.in(getOwnProperty(key.getId()));
+    }
+    template <class Property, class Fallback>
+    auto getOwn(CC_PropertyKey<Property> key, Fallback const& fallback) const
+    {
+        return getOwn(key).getValueOr(fallback);
+    }
+    template <class Property, class... Values>
+    requires(CC_PropertyKey<Property>::template TAKES<Values...>) XCode
+        setOwn(CC_PropertyKey<Property> key, Values&&... values)
+    {
+        return key.store([this](Property const& made) { return setOwnProperty(made); }, XCode::FAILURE,
+                         std::forward<Values>(values)...);
+    }
+    template <class Property>
+    CC_FoundProperty<Property> getPeer(CC_PropertyKey<Property> key) const
+    {
+        return key.in(getPeerProperty(key.getId()));
+    }
+    template <class Property, class Fallback>
+    auto getPeer(CC_PropertyKey<Property> key, Fallback const& fallback) const
+    {
+        return getPeer(key).getValueOr(fallback);
+    }
+    template <class Property, class... Values>
+    requires(CC_PropertyKey<Property>::template TAKES<Values...>) XCode
+        setPeer(CC_PropertyKey<Property> key, Values&&... values)
+    {
+        return key.store([this](Property const& made) { return setPeerProperty(made); }, XCode::FAILURE,
+                         std::forward<Values>(values)...);
+    }
+    template <class Property>
+    CC_FoundProperty<Property> getCall(CC_PropertyKey<Property> key) const
+    {
+        return key.in(getCallProperty(key.getId()));
+    }
+    template <class Property, class Fallback>
+    auto getCall(CC_PropertyKey<Property> key, Fallback const& fallback) const
+    {
+        return getCall(key).getValueOr(fallback);
+    }
+    template <class Property, class... Values>
+    requires(CC_PropertyKey<Property>::template TAKES<Values...>) XCode
+        setCall(CC_PropertyKey<Property> key, Values&&... values)
+    {
+        return key.store([this](Property const& made) { return setCallProperty(made); }, XCode::FAILURE,
+                         std::forward<Values>(values)...);
+    }
+
     /// The media context of the call (its property 0x400400). Setting goes through the input filters and reports
     /// nothing; null is returned without a leg, a call or such a property.
     void setDatapathContext(MG_IContext* context);

@@ -5,8 +5,7 @@
 
 /// The tone that a party is to hear, with an accompanying text such as a parameter of the tone. Not settable by text.
 ///
-///     leg.setProperty(CC_PropertyCallProgressTone(CC_PropertyId::CALL_PROGRESS_TONE,
-///                                                 MG_Tones::ECallProgressTone::RINGING));
+///     adapter.setPeer(Key::CALL_PROGRESS_TONE, MG_Tones::ECallProgressTone::RINGING);
 class CC_EXPORT CC_PropertyCallProgressTone : public CC_PropertyClass<CC_PropertyCallProgressTone>
 {
 public:

@@ -49,7 +49,7 @@ public:
             m_visited = isAtEnd() ? nullptr : &*m_position;
             return;
         }
-        Iterator position = m_container.m_properties.begin();
+        Position position = m_container.m_properties.begin();
         unsigned int index = 0;
         for (; position != m_container.m_properties.end() && &*position != m_visited; ++position)
             ++index;
@@ -67,7 +67,7 @@ private:
 
     CC_PropertyContainer const& m_container;
     bool m_isUndisturbed;
-    Iterator m_position;
+    Position m_position;
     CC_Property* m_visited;
     unsigned int m_index = 0;
 };
@@ -90,8 +90,8 @@ CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const
 /// The same where nobody is called, who could tell it from all being deleted and copied anew.
 void CC_PropertyContainer::takeOver(CC_PropertyContainer const& other)
 {
-    Iterator stored = m_properties.begin();
-    Iterator source = other.m_properties.begin();
+    Position stored = m_properties.begin();
+    Position source = other.m_properties.begin();
     while (stored != m_properties.end() && source != other.m_properties.end() && IS_MADE_A_COPY(*stored, *source))
     {
         ++stored;
@@ -149,7 +149,7 @@ XCode CC_PropertyContainer::set(CC_PropertyContainer const& other, unsigned int 
 
 void CC_PropertyContainer::take(CC_PropertyContainer& other)
 {
-    for (Iterator position = other.m_properties.begin(); position != other.m_properties.end();)
+    for (Position position = other.m_properties.begin(); position != other.m_properties.end();)
     {
         CC_Property& property = *position;
         ++position;
@@ -194,7 +194,7 @@ CC_PropertyContainer const& CC_PropertyContainer::EMPTY()
 
 CC_Property* CC_PropertyContainer::Cursor::findElsewhere(unsigned int id)
 {
-    Iterator position = m_container.m_properties.begin();
+    Position position = m_container.m_properties.begin();
     while (position != m_container.m_properties.end() && position->getId() != id)
         ++position;
     if (position == m_container.m_properties.end())
@@ -205,7 +205,7 @@ CC_Property* CC_PropertyContainer::Cursor::findElsewhere(unsigned int id)
 }
 
 /// REQUIRES: they are self-contained.
-void CC_PropertyContainer::removeFrom(Iterator position)
+void CC_PropertyContainer::removeFrom(Position position)
 {
     while (position != m_properties.end())
     {

@@ -5,6 +5,12 @@
 #include "platform/base/LinkedListManager.h"
 #include "platform/base/XCode.h"
 #include "properties/CC_Property.h"
+#include "properties/CC_PropertyKey.h"
+
+#include <cstddef>
+#include <iterator>
+#include <type_traits>
+#include <utility>
 
 /// The properties of a call, a leg, an adapter or an event: owned, in the order in which they were added, at most one
 /// per id. Lists are short, so look-up is a linear search. Not locked.
@@ -13,7 +19,7 @@
 /// they remove is not visited any more, what they add is.
 ///
 ///     CC_PropertyContainer properties;
-///     if (!properties.set(CC_PropertyString(CC_PropertyId::E164_NUMBER, "49891234")).isOk())
+///     if (!properties.set(Key::E164_NUMBER, "49891234").isOk())
 ///         ...
 ///     for (CC_Property const& property : properties)
 ///         ...
@@ -23,25 +29,129 @@ public:
     /// Takes every id group that exists.
     static constexpr unsigned int ALL_GROUPS = 0xff00;
 
-    class ConstIterator
+    /// A position in the container; a standard forward iterator. `Property`: CC_Property, or CC_Property const.
+    template <class Property>
+    class BasicIterator
     {
     public:
-        explicit ConstIterator(LinkedListManager<CC_Property>::Iterator position) : m_position(position) {}
-        CC_Property const& operator*() const { return *m_position; }
-        CC_Property const* operator->() const { return &*m_position; }
-        ConstIterator& operator++()
+        using iterator_category = std::forward_iterator_tag;
+        using value_type = CC_Property;
+        using difference_type = std::ptrdiff_t;
+        using pointer = Property*;
+        using reference = Property&;
+
+        BasicIterator() = default;
+        /// A constant one from the other.
+        template <class Other>
+        requires(std::is_const_v<Property> && !std::is_const_v<Other>) BasicIterator(BasicIterator<Other> const& other)
+            : m_position(other.m_position)
+        {
+        }
+        reference operator*() const { return *m_position; }
+        pointer operator->() const { return &*m_position; }
+        BasicIterator& operator++()
         {
             ++m_position;
             return *this;
         }
-        friend bool operator==(ConstIterator const& left, ConstIterator const& right)
+        BasicIterator operator++(int)
+        {
+            BasicIterator const before = *this;
+            ++*this;
+            return before;
+        }
+        friend bool operator==(BasicIterator const& left, BasicIterator const& right)
         {
             return left.m_position == right.m_position;
         }
 
     private:
-        LinkedListManager<CC_Property>::Iterator m_position;
+        friend class CC_PropertyContainer;
+        template <class>
+        friend class BasicIterator;
+        using Position = LinkedListManager<CC_Property>::Iterator;
+
+        explicit BasicIterator(Position position) : m_position(position) {}
+
+        Position m_position;
     };
+    using ConstIterator = BasicIterator<CC_Property const>;
+    using Iterator = BasicIterator<CC_Property>;
+
+    CC_PropertyContainer() = default;
+    CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
+    ~CC_PropertyContainer() = default;
+    /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
+    /// tells so. As far as both begin with the same ids and classes of the library, and no others follow, the values
+    /// are taken over where they stand.
+    CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
+
+    /// The property of that id, null if there is none. It stays the container's; removing it ends it.
+    CC_Property* get(unsigned int id);
+    CC_Property const* get(unsigned int id) const;
+    /// The same by a typed key (CC_PropertyKeys.h), none as well when it is of another class than the key's.
+    template <class Property>
+    CC_FoundProperty<Property> get(CC_PropertyKey<Property> key) const
+    {
+        return key.in(get(key.getId()));
+    }
+    /// The property at that position, null past the end.
+    CC_Property* getByIndex(unsigned int index);
+    CC_Property const* getByIndex(unsigned int index) const;
+    unsigned int getNumberOfProperties() const { return m_properties.getCount(); }
+    bool isEmpty() const { return m_properties.isEmpty(); }
+    /// Whether no operation of any property calls anybody (CC_PropertyKind); also false once there was another.
+    bool isSelfContained() const { return m_isSelfContained; }
+    /// In order. Adding properties does not disturb a walk, removing the one it stands on does.
+    ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
+    ConstIterator end() const { return ConstIterator(m_properties.end()); }
+    Iterator begin() { return Iterator(m_properties.begin()); }
+    Iterator end() { return Iterator(m_properties.end()); }
+
+    /// Stores a copy: assigned to the property of that id if there is one, otherwise appended.
+    ///
+    /// OK, also when the stored property is of another class and keeps its value: intended, an id's class is fixed by
+    /// its first owner. NO_ELEMENT when memory is out, FAILURE when the list refuses; the container is then unchanged.
+    XCode set(CC_Property const& property);
+    /// The same with a property made from the values: `properties.set(Key::NAME, "Ada")`.
+    template <class Property, class... Values>
+    requires(CC_PropertyKey<Property>::template TAKES<Values...>) XCode
+        set(CC_PropertyKey<Property> key, Values&&... values)
+    {
+        return key.store([this](Property const& property) { return set(property); }, XCode::NO_ELEMENT,
+                         std::forward<Values>(values)...);
+    }
+    /// Stores the other's properties whose id has a bit in common with `mask`, in order: 0x100 takes the 0x4001xx ids,
+    /// 0x200 the 0x4002xx ids, 0x400 and 0x800 likewise, 0x1000 and above the 0x401xxx ids. OK, or FAILURE at the
+    /// first one that is refused; those before it stay stored.
+    XCode set(CC_PropertyContainer const& other, unsigned int mask);
+    /// The same for all groups. A property whose id belongs to no group (bits 8 to 15 clear) is left out.
+    XCode set(CC_PropertyContainer const& other) { return set(other, ALL_GROUPS); }
+
+    /// Deletes the property of that id; whether there was one.
+    bool remove(unsigned int id);
+    /// Deletes the property at that position; whether there was one.
+    bool removeByIndex(unsigned int index);
+    void clear()
+    {
+        m_properties.clear();
+        m_isSelfContained = true;
+    }
+
+    /// Adds the line "Properties" and, unless this dump is already part of a container's, the properties one level
+    /// below it. Returns `info`.
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const;
+
+    /// A shared container without properties, for parameters that are not used.
+    static CC_PropertyContainer const& EMPTY();
+
+private:
+    // what the library does with containers of its own
+    friend class CC_CallLeg;
+    friend class CC_PropertyView;
+    class Walk;
+    using Position = LinkedListManager<CC_Property>::Iterator;
 
     /// Finds properties that are asked for in nearly the order in which they are stored, as they are in two containers
     /// of which one follows the other: the property behind the one found last is looked at first.
@@ -72,77 +182,20 @@ public:
         CC_Property* findElsewhere(unsigned int id);
 
         CC_PropertyContainer& m_container;
-        LinkedListManager<CC_Property>::Iterator m_next;
+        Position m_next;
     };
 
-    CC_PropertyContainer() = default;
-    CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
-    ~CC_PropertyContainer() = default;
-    /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
-    /// tells so. As far as both begin with the same ids and classes of the library, and no others follow, the values
-    /// are taken over where they stand.
-    CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
-
-    /// The property of that id, null if there is none. It stays the container's; removing it ends it.
-    CC_Property* get(unsigned int id);
-    CC_Property const* get(unsigned int id) const;
-    /// The property at that position, null past the end.
-    CC_Property* getByIndex(unsigned int index);
-    CC_Property const* getByIndex(unsigned int index) const;
-    unsigned int getNumberOfProperties() const { return m_properties.getCount(); }
-    bool isEmpty() const { return m_properties.isEmpty(); }
-    /// Whether no operation of any property calls anybody (CC_PropertyKind); also false once there was another.
-    bool isSelfContained() const { return m_isSelfContained; }
-    /// In order. Adding properties does not disturb a walk, removing the one it stands on does.
-    ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
-    ConstIterator end() const { return ConstIterator(m_properties.end()); }
-
-    /// Stores a copy: assigned to the property of that id if there is one, otherwise appended.
-    ///
-    /// OK, also when the stored property is of another class and keeps its value: intended, an id's class is fixed by
-    /// its first owner. NO_ELEMENT when memory is out, FAILURE when the list refuses; the container is then unchanged.
-    XCode set(CC_Property const& property);
-    /// The same for who has looked the property up: `stored` is what `get` gave for its id, null included.
+    /// As `set`, for who has looked the property up: `stored` is what `get` gave for its id, null included.
     XCode replace(CC_Property* stored, CC_Property const& property);
-    /// Stores the other's properties whose id has a bit in common with `mask`, in order: 0x100 takes the 0x4001xx ids,
-    /// 0x200 the 0x4002xx ids, 0x400 and 0x800 likewise, 0x1000 and above the 0x401xxx ids. OK, or FAILURE at the
-    /// first one that is refused; those before it stay stored.
-    XCode set(CC_PropertyContainer const& other, unsigned int mask);
-    /// The same for all groups. A property whose id belongs to no group (bits 8 to 15 clear) is left out.
-    XCode set(CC_PropertyContainer const& other) { return set(other, ALL_GROUPS); }
-
     /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.
     void take(CC_PropertyContainer& other);
-
-    /// Deletes the property of that id; whether there was one.
-    bool remove(unsigned int id);
-    /// Deletes the property at that position; whether there was one.
-    bool removeByIndex(unsigned int index);
-    void clear()
-    {
-        m_properties.clear();
-        m_isSelfContained = true;
-    }
-
-    /// Adds the line "Properties" and, unless this dump is already part of a container's, the properties one level
-    /// below it. Returns `info`.
-    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
-                           unsigned int detail, String const& prefix) const;
-
-    /// A shared container without properties, for parameters that are not used.
-    static CC_PropertyContainer const& EMPTY();
-
-private:
-    using Iterator = LinkedListManager<CC_Property>::Iterator;
 
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
 
-    class Walk;
-
     void takeOver(CC_PropertyContainer const& other);
     XCode appendOfAnyKind(CC_Property* copy);
-    void removeFrom(Iterator position);
+    void removeFrom(Position position);
 
     LinkedListManager<CC_Property> m_properties;
     bool m_isSelfContained = true;

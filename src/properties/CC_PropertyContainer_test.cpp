@@ -6,10 +6,13 @@
 #include "properties/CC_PropertyUnsigned.h"
 #include "tests/support/PropertyTesting.h"
 
+#include <algorithm>
 #include <gtest/gtest.h>
 #include <iterator>
 #include <memory>
+#include <ranges>
 #include <string>
+#include <type_traits>
 #include <utility>
 #include <vector>
 
@@ -100,6 +103,37 @@ TEST(CC_PropertyContainer, KeepsCopiesInTheOrderOfTheirAdding)
     ASSERT_NE(nullptr, properties.get(CC_PropertyId::NAME));
     EXPECT_EQ("Anna", VALUE_OF(*properties.get(CC_PropertyId::NAME)));
     EXPECT_EQ(3U, properties.getNumberOfProperties());
+}
+
+static_assert(std::forward_iterator<CC_PropertyContainer::Iterator>);
+static_assert(std::forward_iterator<CC_PropertyContainer::ConstIterator>);
+static_assert(std::ranges::forward_range<CC_PropertyContainer>);
+static_assert(std::ranges::forward_range<CC_PropertyContainer const>);
+static_assert(std::is_convertible_v<CC_PropertyContainer::Iterator, CC_PropertyContainer::ConstIterator>);
+static_assert(!std::is_convertible_v<CC_PropertyContainer::ConstIterator, CC_PropertyContainer::Iterator>);
+
+TEST(CC_PropertyContainer, StandardAlgorithmsWalkIt)
+{
+    CC_PropertyContainer properties;
+    FILL(properties);
+    auto const isName = [](CC_Property const& property) { return property.getId() == CC_PropertyId::NAME; };
+    auto const found = std::find_if(std::as_const(properties).begin(), std::as_const(properties).end(), isName);
+    ASSERT_NE(found, std::as_const(properties).end());
+    EXPECT_EQ(found->getId(), CC_PropertyId::NAME);
+    EXPECT_EQ(std::distance(properties.begin(), properties.end()), 6);
+    EXPECT_EQ(std::ranges::count_if(properties, isName), 1);
+    CC_PropertyContainer::Iterator position = properties.begin();
+    EXPECT_EQ((position++)->getId(), UNGROUPED);
+    EXPECT_EQ(position->getId(), CC_PropertyId::NETWORK);
+}
+
+TEST(CC_PropertyContainer, AWalkOverAContainerOfOnesOwnMayChangeTheValues)
+{
+    CC_PropertyContainer properties;
+    FILL(properties);
+    for (CC_Property& property : properties)
+        CC_PropertyUnsigned::FROM(&property)->setValue(5);
+    EXPECT_EQ("0x00000005", VALUE_OF(*properties.get(CC_PropertyId::TARIFF)));
 }
 
 TEST(CC_PropertyContainer, AnAbsentIdIsNull)

@@ -79,4 +79,10 @@ inline constexpr unsigned int CHARGE = 0x401000;
 inline constexpr unsigned int CAUSE = 0x401001;
 inline constexpr unsigned int QUALITY_OF_SERVICE = 0x401002;
 inline constexpr unsigned int STATE = 0x401003;
+
+// Set apart for modules, which agree among themselves who takes which. They are a group of their own, of bit 15 alone:
+// the library gives it to none of its ids, and none of its other groups' masks has it, so they are in nobody's way and
+// cross with ALL_GROUPS like all others. Declared names: CC_PropertyTable::DECLARE, or CC_PropertyKey.
+inline constexpr unsigned int FIRST_OF_MODULES = 0x408000;
+inline constexpr unsigned int LAST_OF_MODULES = 0x4080ff;
 } // namespace CC_PropertyId

@@ -5,8 +5,7 @@
 
 /// What the bearer of a call has to carry, as Q.931 says it: speech, 3.1 kHz audio, data. Not settable by text.
 ///
-///     leg.setProperty(CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
-///     QInformationTransferCapability::SPEECH));
+///     adapter.setOwn(Key::INFORMATION_TRANSFER_CAPABILITY, QInformationTransferCapability::SPEECH);
 class CC_EXPORT CC_PropertyInformationTransferCapability
     : public CC_PropertyValue<CC_PropertyInformationTransferCapability, QInformationTransferCapability>
 {

@@ -5,8 +5,7 @@
 
 /// Whether a number may be shown to the other party, as Q.931 says it. Not settable by text.
 ///
-///     leg.setProperty(CC_PropertyPresentationIndicator(CC_PropertyId::PRESENTATION_INDICATOR,
-///     QPresentationIndicator::RESTRICTED));
+///     adapter.setOwn(Key::PRESENTATION_INDICATOR, QPresentationIndicator::RESTRICTED);
 class CC_EXPORT CC_PropertyPresentationIndicator
     : public CC_PropertyValue<CC_PropertyPresentationIndicator, QPresentationIndicator>
 {

@@ -5,8 +5,7 @@
 
 /// Why a call was redirected, as Q.931 says it. Not settable by text.
 ///
-///     leg.setProperty(CC_PropertyRedirectingReason(CC_PropertyId::REDIRECTING_REASON,
-///     QReasonForRedirection::FORWARDING_BUSY));
+///     adapter.setOwn(Key::REDIRECTING_REASON, QReasonForRedirection::FORWARDING_BUSY);
 class CC_EXPORT CC_PropertyRedirectingReason
     : public CC_PropertyValue<CC_PropertyRedirectingReason, QReasonForRedirection>
 {

@@ -5,8 +5,7 @@
 
 /// Who gave a number and whether the network has checked it, as Q.931 says it. Not settable by text.
 ///
-///     leg.setProperty(CC_PropertyScreeningIndicator(CC_PropertyId::SCREENING_INDICATOR,
-///     QScreeningIndicator::NETWORK_PROVIDED));
+///     adapter.setOwn(Key::SCREENING_INDICATOR, QScreeningIndicator::NETWORK_PROVIDED);
 class CC_EXPORT CC_PropertyScreeningIndicator
     : public CC_PropertyValue<CC_PropertyScreeningIndicator, QScreeningIndicator>
 {

@@ -1,11 +1,12 @@
 #pragma once
 
 #include "platform/base/Export.h"
+#include "platform/base/XCode.h"
 
 class CC_Property;
 
 /// The one table of property ids: names, classes, initial values and the order in which the built-in factory lists
-/// them. Constant data; any thread.
+/// them; and the names that modules declare for ids of their own. Any thread.
 ///
 ///     CC_PropertyTable::Row const* const row = CC_PropertyTable::FIND(CC_PropertyId::HOPS);
 ///     std::puts(row->shortName); // hops
@@ -26,9 +27,15 @@ public:
     static constexpr unsigned int NUMBER_OF_IDS = 60;
     static constexpr unsigned int NUMBER_OF_LISTED_IDS = 57;
 
-    /// The row of the id, or null.
+    /// The row of the id, of a declared one as well, or null. Lives for ever.
     static Row const* FIND(unsigned int id);
-    /// The rows in ascending order of their ids. REQUIRES: index < NUMBER_OF_IDS
+    /// Gives a module's id its names, which are copied, for as long as the process lives; at start-up, before
+    /// properties of it are about. OK; REFUSED for an id that is not set apart for modules or has names, and for names
+    /// that are empty or another id's; NO_ELEMENT when memory is out.
+    ///
+    ///     CC_PropertyTable::DECLARE(CC_PropertyId::FIRST_OF_MODULES + 7, "Trunk-Group", "trunk-group");
+    static XCode DECLARE(unsigned int id, char const* longName, char const* shortName);
+    /// The library's rows in ascending order of their ids. REQUIRES: index < NUMBER_OF_IDS
     static Row const& GET_ROW(unsigned int index);
     /// The ids in list order. REQUIRES: index < NUMBER_OF_LISTED_IDS
     static unsigned int GET_LISTED_ID(unsigned int index);

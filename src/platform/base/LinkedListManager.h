@@ -103,6 +103,7 @@ public:
     class Iterator
     {
     public:
+        Iterator() = default; // no position, equal to others like it
         explicit Iterator(LinkedListElement_Untyped* element, LinkedListManager_Untyped const& list)
             : m_element(element), m_list(&list)
         {
@@ -120,8 +121,8 @@ public:
         }
 
     private:
-        LinkedListElement_Untyped* m_element;
-        LinkedListManager_Untyped const* m_list;
+        LinkedListElement_Untyped* m_element = nullptr;
+        LinkedListManager_Untyped const* m_list = nullptr;
     };
 
     LinkedListManager() = default;
