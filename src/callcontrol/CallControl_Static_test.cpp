@@ -217,7 +217,7 @@ TEST(CallControl_Static, KeepingALongNameWithoutMemoryIsAResult)
 
 TEST(CallControl_Static, AContextOfALongNameEndsWithoutMemory)
 {
-    RecordingContextsObserver observer("o");
+    RecordingRegistryObserver observer("o");
     CallControl::REGISTER_CONTEXT_OBSERVER(observer);
     ASSERT_TRUE(CallControl::CREATE_CONTEXT(s_longContext).isOk());
     {
