@@ -18,9 +18,10 @@ class CC_EXPORT TYSyncEvent
 {
 public:
     /// Blocks until the loop has run `function()` in its place among the events of this priority; on the loop's own
-    /// thread it runs at once. OK; FAILURE when the loop was destroyed before it came to it; NO_ELEMENT when memory
-    /// is out. Unless OK the function has not run and never will. A loop that has stopped keeps the caller waiting
-    /// until it runs again or is destroyed. The function must not throw.
+    /// thread it runs at once (whoever made a loop for another thread is taken for it until that thread runs it). OK;
+    /// FAILURE when the loop was destroyed before it came to it; NO_ELEMENT when memory is out. Unless OK the function
+    /// has not run and never will. A loop that has stopped keeps the caller waiting until it runs again or is
+    /// destroyed. The function must not throw.
     template <class Function>
     XCode execute(Function&& function)
     {
