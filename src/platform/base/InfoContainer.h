@@ -21,6 +21,8 @@
 /// - the base level: entries of that level stand at the margin, deeper ones two blanks per level to the right of it,
 ///   higher ones at the margin as well.
 ///
+/// A NUL octet in a key or text is rendered like any other; std::puts and "%s" end there.
+///
 ///     InfoContainer info;
 ///     CallControl::GET_CALL_INFO(info, "SWITCH", 9, 0, 9, 0, "");
 ///     std::puts(info.getString_TreeFormat().c_str());

@@ -130,3 +130,10 @@ TEST(InfoContainer, WhatLiesAtALimitIsAddedAndWhatLiesBeyondIsNot)
             << row.maxLevel << ' ' << row.level << ' ' << row.maxDetail << ' ' << row.detail;
     }
 }
+
+TEST(InfoContainer, ANulOctetIsRenderedLikeAnyOther)
+{
+    InfoContainer info;
+    info.add(0, 0, String("k\0y", 3), String("a\0b", 3));
+    EXPECT_EQ(String("k\0y: a\0b\n", 9), info.getString_TreeFormat());
+}

@@ -11,9 +11,10 @@
 
 /// A text, held by value.
 ///
-/// It may contain NUL bytes, and two strings are equal when their lengths and bytes are. What takes or prints a C
-/// string ends at the first NUL, however: the constructor from a pointer, "%s" of `format` and of the monitors, and so
-/// the dumps that InfoContainer renders. `view()` has the whole text.
+/// It may contain NUL bytes, and two strings are equal when their lengths and bytes are. What keeps texts keeps them
+/// whole: names, properties, the dump that InfoContainer renders. What reads a C string ends at the first NUL: the
+/// constructor from a pointer, `c_str()` with whatever it is given to, "%s" in `format`, `concatf` and the log.
+/// `view()` has the whole text.
 ///
 /// Memory that runs out throws std::bad_alloc; the library's operations catch it at their boundary. A String that is
 /// made from a literal to be passed on is made before that boundary, on the caller's own line: one of up to 15 bytes is

@@ -196,3 +196,12 @@ TEST(String, ATextIsWhateverNamesCanBeTakenFrom)
     EXPECT_EQ("sip", String::VIEW_OF("sip"));
     EXPECT_EQ("sip", String::VIEW_OF(String("sip")));
 }
+
+TEST(String, WhatReadsACStringEndsAtTheFirstNul)
+{
+    String const text("a\0b", 3);
+    EXPECT_EQ(String("a"), String(text.c_str()));
+    EXPECT_EQ("<a>", String().format("<%s>", text.c_str()));
+    EXPECT_TRUE(text == text.view());
+    EXPECT_FALSE(text == text.c_str());
+}
