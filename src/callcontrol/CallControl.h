@@ -288,6 +288,19 @@ public:
     {
         return getCall(keyOf(String::VIEW_OF(contextName)), index);
     }
+    template <TYText Name>
+    InfoContainer& getProviderInfo(InfoContainer& info, Name const& contextName, unsigned int maxLevel,
+                                   unsigned int level, unsigned int maxDetail, unsigned int detail,
+                                   String const& prefix) const
+    {
+        return getProviderInfo(info, keyOf(String::VIEW_OF(contextName)), maxLevel, level, maxDetail, detail, prefix);
+    }
+    template <TYText Name>
+    InfoContainer& getCallInfo(InfoContainer& info, Name const& contextName, unsigned int maxLevel, unsigned int level,
+                               unsigned int maxDetail, unsigned int detail, String const& prefix) const
+    {
+        return getCallInfo(info, keyOf(String::VIEW_OF(contextName)), maxLevel, level, maxDetail, detail, prefix);
+    }
 
     template <TYText Name>
     static XCode CREATE_CONTEXT(Name const& name)
@@ -388,6 +401,20 @@ public:
     static CC_Call* GET_CALL(Name const& contextName, unsigned int index)
     {
         return INSTANCE()->getCall(contextName, index);
+    }
+    template <TYText Name>
+    static InfoContainer& GET_PROVIDER_INFO(InfoContainer& info, Name const& contextName, unsigned int maxLevel,
+                                            unsigned int level, unsigned int maxDetail, unsigned int detail,
+                                            String const& prefix)
+    {
+        return INSTANCE()->getProviderInfo(info, contextName, maxLevel, level, maxDetail, detail, prefix);
+    }
+    template <TYText Name>
+    static InfoContainer& GET_CALL_INFO(InfoContainer& info, Name const& contextName, unsigned int maxLevel,
+                                        unsigned int level, unsigned int maxDetail, unsigned int detail,
+                                        String const& prefix)
+    {
+        return INSTANCE()->getCallInfo(info, contextName, maxLevel, level, maxDetail, detail, prefix);
     }
 
 private:

@@ -150,6 +150,7 @@ TEST(CallControl_Static, LookingUpLongNamesTakesNoMemory)
     ASSERT_TRUE(CallControl::CREATE_CONTEXT(s_longContext).isOk());
     ASSERT_TRUE(CallControl::ADD_PROVIDER(s_longContext, s_longProvider, provider).isOk());
     ASSERT_TRUE(CallControl::SET_NATIONAL_PREFIX(s_longContext, s_longProvider).isOk());
+    InfoContainer info;
     std::string_view const view(s_longContext);
     CC_Context const* context = nullptr;
     CC_Provider const* found[5] = {};
@@ -171,11 +172,16 @@ TEST(CallControl_Static, LookingUpLongNamesTakesNoMemory)
         set = CallControl::SET_MAX_HOPS(s_longContext, 3);
         taken = CallControl::ADD_PROVIDER(s_longContext, s_longProvider, provider);
         CallControl::RELEASE_CALL(s_longContext, nullptr);
+        CallControl::GET_CALL_INFO(info, s_longProvider, 9, 0, 9, 0, String::s_empty);
+        CallControl::GET_PROVIDER_INFO(info, s_longContext, 0, 1, 0, 0, String::s_empty);
         CallControl::REMOVE_PROVIDER(s_longContext, s_longProvider);
         CallControl::REMOVE_PROVIDER(s_longContext, s_longProvider);
         EXPECT_EQ(FailingAllocator::count(), 1UL); // to tell that a name was removed which was not there
     }
     ASSERT_NE(context, nullptr);
+    EXPECT_EQ(info.getNumberOfEntries(), 0u); // of no context, and of none that the level lets through
+    CallControl::GET_PROVIDER_INFO(info, s_longContext, 0, 0, 0, 0, String::s_empty);
+    EXPECT_EQ(info.getNumberOfEntries(), 1u);
     EXPECT_EQ(found[0], &provider);
     EXPECT_EQ(found[1], &provider);
     EXPECT_EQ(found[2], &provider);
