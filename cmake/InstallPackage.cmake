@@ -20,3 +20,7 @@ foreach(package callcontrol callcontrol-testing)
     configure_file(packaging/${package}.pc.in ${package}.pc @ONLY)
     install(FILES ${PROJECT_BINARY_DIR}/${package}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()
+
+install(DIRECTORY examples/line DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol/examples)
+install(FILES examples/two_modules.cpp DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol/examples)
+install(FILES docs/writing-a-module.md README.md LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})

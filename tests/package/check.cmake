@@ -31,6 +31,19 @@ fails_with("leaves counted objects behind: .*CC_CallLeg: 1 more"
     ${EMULATOR} ${WORK}/build/kit_tests --gtest_also_run_disabled_tests)
 fails_with("FailingAllocator: operator new does not ask it" ${EMULATOR} ${WORK}/build/memory_user_without_new)
 
+# the module of the guide, from the sources that were installed; a cross build has no GoogleTest package to find
+if(NOT TOOLCHAIN)
+    must(${CMAKE_COMMAND} -S ${WORK}/installed/share/callcontrol/examples/line -B ${WORK}/line -G ${GENERATOR}
+        -DCMAKE_PREFIX_PATH=${WORK}/installed -DCMAKE_CXX_COMPILER=${COMPILER}
+        "-DCMAKE_CXX_FLAGS=${FLAGS} -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wold-style-cast -Werror")
+    must(${CMAKE_COMMAND} --build ${WORK}/line)
+    must(${WORK}/line/line_test)
+    must(${WORK}/line/house)
+    if(NOT output MATCHES "anna hears tone 6\n.*calls left: 0\n$")
+        message(FATAL_ERROR "the house of the guide prints\n${output}")
+    endif()
+endif()
+
 # with pkg-config
 find_program(PKG_CONFIG pkg-config)
 if(PKG_CONFIG AND NOT TOOLCHAIN)
