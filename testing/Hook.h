@@ -12,6 +12,7 @@
 template <class Signature>
 class Hook;
 
+/// The hook of that signature.
 template <class Result, class... Arguments>
 class Hook<Result(Arguments...)>
 {

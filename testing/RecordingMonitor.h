@@ -19,6 +19,7 @@
 class RecordingMonitor : public RTD::Writer
 {
 public:
+    /// One log line.
     struct Line
     {
         unsigned int level;

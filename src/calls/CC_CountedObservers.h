@@ -16,6 +16,7 @@ template <class Observer, class Count, unsigned int INLINE>
 class CC_CountedObservers
 {
 public:
+    /// An observer and how often it is registered.
     struct CountedObserver
     {
         Observer* m_observer;

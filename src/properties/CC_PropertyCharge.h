@@ -18,9 +18,11 @@
 class CC_EXPORT CC_PropertyCharge : public CC_PropertyClass<CC_PropertyCharge>
 {
 public:
+    /// The record: exactly one of its members is selected.
     class CC_EXPORT Charge : public AsnClass<Charge, ASN_CHOICE>
     {
     public:
+        /// An amount, and what it stands for.
         class CC_EXPORT Specific : public AsnClass<Specific, AsnSequence>
         {
         public:

@@ -15,6 +15,7 @@
 class CC_EXPORT CC_PropertyParametrizedString : public CC_PropertyClass<CC_PropertyParametrizedString>
 {
 public:
+    /// One parameter.
     struct KeyValuePair
     {
         String key;

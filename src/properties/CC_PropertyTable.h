@@ -13,6 +13,7 @@ class CC_Property;
 class CC_EXPORT CC_PropertyTable
 {
 public:
+    /// All that belongs to one id.
     struct Row
     {
         unsigned int id;

@@ -17,6 +17,7 @@
 class CC_EXPORT CC_PropertyTariff : public CC_PropertyClass<CC_PropertyTariff>
 {
 public:
+    /// The record: exactly one of its members is selected.
     class CC_EXPORT Tariff : public AsnClass<Tariff, ASN_CHOICE>
     {
     public:

@@ -22,9 +22,11 @@ public:
     class CC_EXPORT MediaInfo : public AsnClass<MediaInfo, ASN_CHOICE>
     {
     public:
+        /// What was set for the stream and what was measured.
         class CC_EXPORT RTP : public AsnClass<RTP, AsnSequence>
         {
         public:
+            /// How the stream was set up.
             class CC_EXPORT RtpCfg : public AsnClass<RtpCfg, AsnSequence>
             {
             public:
@@ -62,6 +64,7 @@ public:
             class CC_EXPORT RtpStat : public AsnClass<RtpStat, AsnSequence>
             {
             public:
+                /// What one end counted.
                 class CC_EXPORT Stat : public AsnClass<Stat, AsnSequence>
                 {
                 public:

@@ -4,8 +4,9 @@
 
 /// Asks the peer to send its party to another number, without waiting for that number to answer.
 ///
-/// The module that receives it carries it out: on its wire where that can transfer, otherwise by dialling the number with
-/// another adapter and transferring its call. It tells the outcome the other way, with a CC_ServiceBlindTransferStatus.
+/// The module that receives it carries it out: on its wire where that can transfer, otherwise by dialling the number
+/// with another adapter and transferring its call. It tells the outcome the other way, with a
+/// CC_ServiceBlindTransferStatus.
 ///
 ///     CC_ServiceBlindTransfer transfer("*7", "49891234");
 ///     leg.invokeSynchronousService(transfer);

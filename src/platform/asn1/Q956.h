@@ -14,6 +14,7 @@
 ///     charge.m_rAmount.m_multiplier = Q956::EMultiplier::ONE_HUNDREDTH; // 12.34
 namespace Q956
 {
+/// The name of a currency, such as "EUR".
 class CC_EXPORT Currency : public AsnClass<Currency, AsnIA5String>
 {
 public:
@@ -22,6 +23,7 @@ public:
     using AsnIA5String::operator=;
 };
 
+/// An amount of money, in units of a multiplier.
 class CC_EXPORT CurrencyAmount : public AsnClass<CurrencyAmount, AsnInteger>
 {
 public:
@@ -30,6 +32,7 @@ public:
     using AsnInteger::operator=;
 };
 
+/// How many charging units.
 class CC_EXPORT NumberOfUnits : public AsnClass<NumberOfUnits, AsnInteger>
 {
 public:
@@ -38,6 +41,7 @@ public:
     using AsnInteger::operator=;
 };
 
+/// The kind of charging unit, as the network numbers them.
 class CC_EXPORT TypeOfUnit : public AsnClass<TypeOfUnit, AsnInteger>
 {
 public:
@@ -46,6 +50,7 @@ public:
     using AsnInteger::operator=;
 };
 
+/// A length of time, in units of a scale.
 class CC_EXPORT LengthOfTimeUnit : public AsnClass<LengthOfTimeUnit, AsnInteger>
 {
 public:
@@ -54,6 +59,7 @@ public:
     using AsnInteger::operator=;
 };
 
+/// A charge that the network and its users know by number.
 class CC_EXPORT SpecialChargingCode : public AsnClass<SpecialChargingCode, AsnInteger>
 {
 public:
@@ -94,6 +100,7 @@ private:
 class CC_EXPORT RecordedUnits : public AsnClass<RecordedUnits, AsnSequence>
 {
 public:
+    /// The units, if their number is known: exactly one of its members is selected.
     class CC_EXPORT RecordedNumber : public AsnClass<RecordedNumber, ASN_CHOICE>
     {
     public:
@@ -188,6 +195,7 @@ private:
 class CC_EXPORT AOCSCurrencyInfo : public AsnClass<AOCSCurrencyInfo, AsnSequence>
 {
 public:
+    /// How the item is charged in money: exactly one of its members is selected.
     class CC_EXPORT SpecificCurrency : public AsnClass<SpecificCurrency, ASN_CHOICE>
     {
     public:
@@ -201,6 +209,7 @@ public:
         void declareSpecificCurrency();
     };
 
+    /// What is said about one charged item: exactly one of its members is selected.
     class CC_EXPORT Info : public AsnClass<Info, ASN_CHOICE>
     {
     public:

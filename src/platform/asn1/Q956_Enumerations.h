@@ -9,6 +9,7 @@
 ///     std::puts(Q956::EMultiplier::NAME(Q956::EMultiplier::ONE_TENTH)); // oneTenth
 namespace Q956
 {
+/// By what an amount is to be multiplied.
 struct CC_EXPORT EMultiplier
 {
     enum Type : int
@@ -26,6 +27,7 @@ struct CC_EXPORT EMultiplier
     static char const* NAME(Type value);
 };
 
+/// Whether a charge is the final one.
 struct CC_EXPORT ETypeOfChargingInfo
 {
     enum Type : int
@@ -71,6 +73,7 @@ struct CC_EXPORT EAOCEBillingId
     static char const* NAME(Type value);
 };
 
+/// What is charged for.
 struct CC_EXPORT EChargedItem
 {
     enum Type : int
@@ -86,6 +89,7 @@ struct CC_EXPORT EChargedItem
     static char const* NAME(Type value);
 };
 
+/// Whether the charge grows steadily or in steps.
 struct CC_EXPORT EChargingType
 {
     enum Type : int
@@ -98,6 +102,7 @@ struct CC_EXPORT EChargingType
     static char const* NAME(Type value);
 };
 
+/// The unit of a length of time.
 struct CC_EXPORT EScale
 {
     enum Type : int
@@ -115,6 +120,7 @@ struct CC_EXPORT EScale
     static char const* NAME(Type value);
 };
 
+/// The unit of a volume of data.
 struct CC_EXPORT EVolumeUnit
 {
     enum Type : int

@@ -29,6 +29,7 @@
 class CC_EXPORT InfoContainer
 {
 public:
+    /// One line of the dump.
     struct Entry
     {
         unsigned int level;

@@ -100,6 +100,7 @@ template <class T>
 class LinkedListManager
 {
 public:
+    /// For walks over the elements in their order.
     class Iterator
     {
     public:

@@ -18,6 +18,7 @@ struct TYHash
     using Argument = Key const&;
     std::size_t operator()(Key const& key) const { return static_cast<std::size_t>(key); }
 };
+/// Hashes the text.
 template <>
 struct TYHash<String>
 {
@@ -31,8 +32,10 @@ template <class Key, class Value>
 class TYHashTable
 {
 public:
+    /// What a key is looked up by.
     using Argument = typename TYHash<Key>::Argument;
 
+    /// One key with its value, as walks see it.
     class Entry
     {
     public:

@@ -13,6 +13,7 @@
 class TYLifeline
 {
 public:
+    /// Tells whether the object still exists.
     class Watch
     {
     public:

@@ -9,6 +9,7 @@ template <class T>
 class TYList
 {
 public:
+    /// One value of the list.
     class Element
     {
     public:

@@ -7,6 +7,7 @@
 /// Comfort noise and telephone events accompany a codec in its stream; they are none themselves.
 struct CC_EXPORT MG_Rtp
 {
+    /// The codecs of RTP streams.
     struct CC_EXPORT ECodec
     {
         /// Where a codec has a fixed RTP payload type, its number is that; the others are numbered from 128 on, past

@@ -5,6 +5,7 @@
 /// The sounds by which a network tells a user what becomes of a call.
 struct CC_EXPORT MG_Tones
 {
+    /// What a party hears of the progress of a call.
     struct CC_EXPORT ECallProgressTone
     {
         /// The tones of E.180 and E.182 and the line tones in national use. The numbers are this system's own; how a
