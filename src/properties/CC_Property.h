@@ -35,6 +35,20 @@ class CC_EXPORT CC_PropertyTypeId : public CC_PropertyTypeNumber
 {
 };
 
+/// Counts the live properties, whatever threads own them. A base, and the first one, so that the compiler need not
+/// complete half an object before it counts: that is a hundredth of a call.
+class CC_EXPORT CC_PropertyCount
+{
+protected:
+    CC_PropertyCount() noexcept { std::atomic_ref(COUNT()).fetch_add(1, std::memory_order_relaxed); }
+    CC_PropertyCount(CC_PropertyCount const&) noexcept : CC_PropertyCount() {}
+    CC_PropertyCount& operator=(CC_PropertyCount const&) = default;
+    ~CC_PropertyCount() { std::atomic_ref(COUNT()).fetch_sub(1, std::memory_order_relaxed); }
+
+private:
+    static unsigned int& COUNT() noexcept;
+};
+
 /// One value that the two sides of a call exchange: a number, an indicator, a state, a cause. The base of every value
 /// class.
 ///
@@ -53,17 +67,17 @@ class CC_EXPORT CC_PropertyTypeId : public CC_PropertyTypeNumber
 ///     CC_PropertyBoolean dataProvided(CC_PropertyId::PROVIDES_DATA, true);
 ///     String text;
 ///     dataProvided.getValueString(text); // "true"
-class CC_EXPORT CC_Property : public LinkedListElement<CC_Property>, public TYRecycled
+class CC_EXPORT CC_Property : private CC_PropertyCount, public LinkedListElement<CC_Property>, public TYRecycled
 {
 public:
     /// The value of a class's type number as long as none was assigned.
     static constexpr unsigned int NO_TYPE_ID = CC_PropertyTypeNumber::NONE;
 
-    explicit CC_Property(unsigned int id) noexcept : m_id(id) { COUNT_ONE(); }
+    explicit CC_Property(unsigned int id) noexcept : m_id(id) {}
     /// The copy is in no list.
-    CC_Property(CC_Property const& other) noexcept : LinkedListElement(other), TYRecycled(), m_id(other.m_id)
+    CC_Property(CC_Property const& other) noexcept
+        : CC_PropertyCount(other), LinkedListElement(other), TYRecycled(), m_id(other.m_id)
     {
-        COUNT_ONE();
     }
     /// Copies the id; the place in a list stays.
     CC_Property& operator=(CC_Property const& other) noexcept
@@ -72,7 +86,7 @@ public:
         return *this;
     }
 
-    virtual ~CC_Property() { std::atomic_ref(s_numberOfInstances).fetch_sub(1, std::memory_order_relaxed); }
+    virtual ~CC_Property() = default;
     /// Takes over id and value of `other` if that is of this class or derives from it. Otherwise, and when memory is
     /// out, nothing changes (ASSIGN tells the latter). Returns this object.
     virtual CC_Property& assign(CC_Property const& other) = 0;
@@ -120,9 +134,9 @@ protected:
 private:
     friend class CC_PropertyTypeNumber;
 
-    static void COUNT_ONE() noexcept { std::atomic_ref(s_numberOfInstances).fetch_add(1, std::memory_order_relaxed); }
-
     static unsigned int s_nextFreeTypeId;
 
     unsigned int m_id;
 };
+
+inline unsigned int& CC_PropertyCount::COUNT() noexcept { return CC_Property::s_numberOfInstances; }

@@ -99,8 +99,7 @@ void CC_PropertyContainer::takeOver(CC_PropertyContainer const& other)
     }
     removeFrom(stored);
     for (; source != other.m_properties.end(); ++source)
-        if (CC_Property* const copy = source->clone())
-            std::ignore = m_properties.append(copy); // it is in no list
+        std::ignore = appendCopy(*source); // what memory refuses is missing
 }
 
 CC_Property* CC_PropertyContainer::get(unsigned int id) { return find(id); }

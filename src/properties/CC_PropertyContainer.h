@@ -9,6 +9,7 @@
 
 #include <cstddef>
 #include <iterator>
+#include <tuple>
 #include <type_traits>
 #include <utility>
 
@@ -193,6 +194,14 @@ private:
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
 
+    /// As `set` for an id that is not there; whether memory sufficed. REQUIRES: the property is self-contained.
+    bool appendCopy(CC_Property const& property)
+    {
+        CC_Property* const copy = property.clone();
+        if (copy != nullptr)
+            std::ignore = m_properties.append(copy); // it is in no list
+        return copy != nullptr;
+    }
     void takeOver(CC_PropertyContainer const& other);
     XCode appendOfAnyKind(CC_Property* copy);
     void removeFrom(Position position);

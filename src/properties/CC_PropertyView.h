@@ -101,18 +101,25 @@ private:
         m_lastHeard = told.number;
         m_written = NONE;
         unsigned int kept = 0;
+        bool const isSelfContained = source.isSelfContained();
         CC_PropertyContainer::Cursor formers(m_properties);
         for (CC_Property const& current : source)
         {
             CC_Property* const former = formers.find(current.getId());
-            if (former != nullptr ? !take(*former, current) : CC_PropertyKind::OF(current) == nullptr)
+            if (former != nullptr)
+            {
+                if (!take(*former, current))
+                    return false;
+                ++kept;
+                continue;
+            }
+            if (!isSelfContained && CC_PropertyKind::OF(current) == nullptr)
                 return false;
-            if (former != nullptr || m_properties.replace(nullptr, current).isOk())
+            if (isSelfContained ? m_properties.appendCopy(current) : m_properties.replace(nullptr, current).isOk())
                 ++kept;
             else
                 m_inStepWith = nullptr; // without memory it is not seen; that it differs is told all the same
-            if (former == nullptr)
-                onDifference(current.getId());
+            onDifference(current.getId());
         }
         if (kept < m_properties.getNumberOfProperties())
             removeWhatIsGone(source, onDifference);
