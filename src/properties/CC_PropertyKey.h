@@ -107,7 +107,10 @@ public:
     template <class... Values>
     Property make(Values&&... values) const
     {
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wsign-conversion" // a plain 3 is an int, and the numbers have no sign
         return Property(m_id, std::forward<Values>(values)...);
+#pragma GCC diagnostic pop
     }
 
     /// Whether `make` takes the values; a single one must be of the value's kind.
