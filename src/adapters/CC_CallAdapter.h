@@ -282,6 +282,7 @@ private:
     XCode writeCall(Written const& written, bool isFiltered);
 
     static void GIVE_UP(CC_CallLeg& leg);
+    static void GIVE_UP_RELEASED(CC_CallLeg& leg);
     void observeCall(CC_Call& call);
     void unobserveCall();
     void updateOwnCallLeg(CC_Flags const& changed);
@@ -294,6 +295,7 @@ private:
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();
     void catchUp();
+    bool hasToCatchUp() const;
     void onPeerPropertyChanged(CC_Flags const& flags);
     void onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags const& flags);
 
@@ -313,6 +315,7 @@ private:
     bool m_observesOwnCallLeg = false;
     unsigned int m_attempt = 0;      // counts the legs we have let go, to tell one attempt from the next
     bool m_isResetting = false;      // in setup or cleanup: who is told of the ending leg cannot begin another
+    bool m_isWritingOwn = false;     // without filters, and the leg has not told us of it yet
     bool m_isPeerToBeChosen = false; // its fall did not show: choose anew before the module is told
     unsigned int m_refreshes = 0;    // of views through filters, to tell whether one came inside another
     TYLifeline m_lifeline;

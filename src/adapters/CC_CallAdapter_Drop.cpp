@@ -40,16 +40,18 @@ void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
     writeFinalProperties(cause, causeValue);
     if (attempt.isOver())
         return;
-    GIVE_UP(*std::exchange(m_ownCallLeg, nullptr));
+    GIVE_UP_RELEASED(*std::exchange(m_ownCallLeg, nullptr));
     if (!attempt.isOver())
         letGoOfTheRest();
 }
 
 /// Gives a reference up. A released leg may have kept its call waiting for that, or for the last live one: nobody else
 /// would have the call looked at, since no state changes.
-void CC_CallAdapter::GIVE_UP(CC_CallLeg& leg)
+void CC_CallAdapter::GIVE_UP(CC_CallLeg& leg) { IS_RELEASED(leg) ? GIVE_UP_RELEASED(leg) : leg.removeReference(); }
+
+void CC_CallAdapter::GIVE_UP_RELEASED(CC_CallLeg& leg)
 {
-    CC_Call::Hold const call(IS_RELEASED(leg) ? leg.getCall() : nullptr);
+    CC_Call::Hold const call(leg.getCall());
     leg.removeReference();
     if (call.get() != nullptr)
         call.get()->defer();
@@ -67,10 +69,11 @@ void CC_CallAdapter::writeFinalProperties(QCause cause, unsigned int causeValue)
         return;
     CC_PropertyCallLegState const released(CC_PropertyId::STATE, CC_PropertyCallLegState::RELEASED);
     m_ownCallLeg->fixState(); // whatever the module or a peer writes when they hear of it
-    std::ignore = setOwnProperty(released);
+    bool const isFiltered = getInputFilters() != nullptr;
+    bool const isWritten = setOwnProperty(released).isOk();
     // a leg that memory or a filter keeps from being released would keep its call for ever: then past our copy and the
     // filters
-    if (!attempt.isOver() && !IS_RELEASED(*m_ownCallLeg))
+    if ((isFiltered || !isWritten) && !attempt.isOver() && !IS_RELEASED(*m_ownCallLeg))
         std::ignore = m_ownCallLeg->setProperty(released); // no State at all counts as released, too
 }
 

@@ -12,15 +12,18 @@ CC_CallAdapter::Event::Event(TYEventLoop& loop, EventPrio::Type priority, CC_Cal
 
 XCode CC_CallAdapter::Event::setPeerPropertyChange(unsigned int id)
 {
-    return m_flags.set(id, true).isOk() && setIfNotPending().isOk() ? XCode::OK : XCode::FAILURE;
+    return m_flags.set(id, true).isOk() && (isPending() || setIfNotPending().isOk()) ? XCode::OK : XCode::FAILURE;
 }
 
 void CC_CallAdapter::Event::handle()
 {
-    Attempt const attempt(m_adapter);
-    m_adapter.catchUp();
-    if (attempt.isOver())
-        return;
+    if (m_adapter.hasToCatchUp())
+    {
+        Attempt const attempt(m_adapter);
+        m_adapter.catchUp();
+        if (attempt.isOver())
+            return;
+    }
     CC_Flags const flags(std::move(m_flags)); // what changes inside the notification belongs to the next turn
     if (flags.isEmpty())
         return;

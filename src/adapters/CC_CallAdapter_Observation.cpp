@@ -152,7 +152,9 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
     {
-        m_ownView.assign(leg.getProperties(), TOLD(leg, &changed));
+        CC_PropertyView::Told const told = TOLD(leg, &changed);
+        if (!std::exchange(m_isWritingOwn, false) || !m_ownView.hasWritten(leg.getProperties(), told))
+            m_ownView.assign(leg.getProperties(), told);
         return;
     }
     Attempt const attempt(*this);
@@ -217,12 +219,15 @@ void CC_CallAdapter::mark(unsigned int id)
 /// news.
 void CC_CallAdapter::catchUp()
 {
-    bool const isToBeChosen = std::exchange(m_isPeerToBeChosen, false);
-    if (m_peerCallLeg == nullptr)
-        return;
-    bool const hasMissed = !m_peerView.hasHeard(m_peerCallLeg->getNumberOfNotifications());
-    if ((isToBeChosen || hasMissed) && !linkPeerCallLeg() && hasMissed)
+    m_isPeerToBeChosen = false;
+    if (!linkPeerCallLeg() && hasToCatchUp())
         updatePeerCallLeg(nullptr);
+}
+
+bool CC_CallAdapter::hasToCatchUp() const
+{
+    return m_peerCallLeg != nullptr &&
+           (m_isPeerToBeChosen || !m_peerView.hasHeard(m_peerCallLeg->getNumberOfNotifications()));
 }
 
 /// Chooses the peer among the other legs. Whether it changed, or there is none; the adapter may then be gone.

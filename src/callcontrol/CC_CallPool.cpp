@@ -9,6 +9,7 @@
 #include "properties/CC_PropertyId.h"
 
 #include <new>
+#include <optional>
 #include <tuple>
 #include <utility>
 
@@ -102,20 +103,23 @@ void CC_CallPool::giveContext(CC_Call& call, MG_IContext* mgContext)
 class CC_CallPool::Lock
 {
 public:
-    explicit Lock(CC_CallPool const& pool)
-        : m_pool(pool), m_watch(pool.m_lifeline), m_rebootMgmt(pool.m_rebootMgmt), m_wasLast(pool.m_calls.isEmpty())
+    explicit Lock(CC_CallPool const& pool) : m_pool(pool), m_watch(pool.m_lifeline), m_wasLast(pool.m_calls.isEmpty())
     {
+        if (m_wasLast)
+            m_rebootMgmt.emplace(pool.m_rebootMgmt); // for a pool that its last call's end destroys
     }
     void giveBackIfUnused() const
     {
-        if (m_watch.isAlive() ? m_pool.m_calls.isEmpty() : m_wasLast)
-            RELEASE_LOCK(m_rebootMgmt);
+        if (m_watch.isAlive() && m_pool.m_calls.isEmpty())
+            RELEASE_LOCK(m_pool.m_rebootMgmt);
+        else if (!m_watch.isAlive() && m_wasLast)
+            RELEASE_LOCK(*m_rebootMgmt);
     }
 
 private:
     CC_CallPool const& m_pool;
     TYLifeline::Watch m_watch;
-    TYPPtr<IRebootMgmt> m_rebootMgmt;
+    std::optional<TYPPtr<IRebootMgmt>> m_rebootMgmt;
     bool m_wasLast;
 };
 

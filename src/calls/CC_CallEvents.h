@@ -33,7 +33,9 @@ class CC_EXPORT CC_EvCallPropertyChanged : public CC_EventClass<CC_EvCallPropert
 {
 public:
     static constexpr char const* CLASS_NAME = "CC_EvCallPropertyChanged";
-    CC_EvCallPropertyChanged(CC_Call& call, CC_Flags flags) : CC_EventClass(call), m_flags(std::move(flags)) {}
+    CC_EvCallPropertyChanged(CC_Call& call, CC_Flags const& flags) : CC_EventClass(call), m_flags(flags) {}
+    /// Takes the flags over, which needs no memory.
+    CC_EvCallPropertyChanged(CC_Call& call, CC_Flags&& flags) : CC_EventClass(call), m_flags(std::move(flags)) {}
     ~CC_EvCallPropertyChanged() override;
 
     CC_Flags const& getFlags() const { return m_flags; }

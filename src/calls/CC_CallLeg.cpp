@@ -67,9 +67,9 @@ CC_CallLeg::CC_CallLeg() : m_serial(++s_lastSerial)
     ++s_numberOfInstances;
     // straight into the container: this is the one time that the state is IDLE. What memory refuses is absent, and a
     // leg without State counts as released.
-    std::ignore = m_properties.set(CC_PropertyCallLegState(CC_PropertyId::STATE, CC_PropertyCallLegState::IDLE));
-    std::ignore = m_properties.set(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA));
-    std::ignore = m_properties.set(CC_PropertyCause(CC_PropertyId::CAUSE));
+    m_properties.append<CC_PropertyCallLegState>(CC_PropertyId::STATE, CC_PropertyCallLegState::IDLE);
+    m_properties.append<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
+    m_properties.append<CC_PropertyCause>(CC_PropertyId::CAUSE);
 }
 
 CC_CallLeg::~CC_CallLeg()

@@ -40,7 +40,9 @@ class CC_EXPORT CC_EvCallLegPropertyChanged : public CC_EventClass<CC_EvCallLegP
 {
 public:
     static constexpr char const* CLASS_NAME = "CC_EvCallLegPropertyChanged";
-    CC_EvCallLegPropertyChanged(CC_CallLeg& leg, CC_Flags flags) : CC_EventClass(leg), m_flags(std::move(flags)) {}
+    CC_EvCallLegPropertyChanged(CC_CallLeg& leg, CC_Flags const& flags) : CC_EventClass(leg), m_flags(flags) {}
+    /// Takes the flags over, which needs no memory.
+    CC_EvCallLegPropertyChanged(CC_CallLeg& leg, CC_Flags&& flags) : CC_EventClass(leg), m_flags(std::move(flags)) {}
     ~CC_EvCallLegPropertyChanged() override;
 
     CC_Flags const& getFlags() const { return m_flags; }

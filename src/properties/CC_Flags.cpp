@@ -5,14 +5,6 @@
 #include <new>
 #include <utility>
 
-namespace
-{
-constexpr unsigned int BITS_PER_WORD = 32;
-
-constexpr unsigned int WORD_OF(unsigned int bit) { return bit / BITS_PER_WORD; }
-constexpr unsigned int MASK_OF(unsigned int bit) { return 1U << (bit % BITS_PER_WORD); }
-} // namespace
-
 CC_Flags::CC_Flags(CC_Flags&& other) noexcept
     : m_capacity(std::exchange(other.m_capacity, 0)), m_count(std::exchange(other.m_count, 0))
 {
@@ -37,15 +29,6 @@ CC_Flags& CC_Flags::operator=(CC_Flags const& other)
     return *this;
 }
 
-bool CC_Flags::get(unsigned int bit) const
-{
-    unsigned int const word = WORD_OF(bit);
-    for (unsigned int i = 0; i < m_count && m_entries[i].wordIndex <= word; ++i)
-        if (m_entries[i].wordIndex == word)
-            return (m_entries[i].bits & MASK_OF(bit)) != 0;
-    return false;
-}
-
 XCode CC_Flags::set(unsigned int bit, bool value)
 {
     unsigned int const word = WORD_OF(bit);
@@ -63,14 +46,15 @@ XCode CC_Flags::set(unsigned int bit, bool value)
 
 XCode CC_Flags::insert(unsigned int index, Entry entry)
 {
-    if (m_count == m_capacity)
+    if (m_count == m_capacity && m_capacity < INLINE)
+        ++m_capacity;
+    else if (m_count == m_capacity)
     {
-        if (m_capacity < INLINE)
-            ++m_capacity;
-        else if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: there are only a few words
+        if (XCode const enlarged = enlarge(m_capacity + 1); !enlarged.isOk()) // by one: there are only a few words
             return enlarged;
     }
-    std::copy_backward(m_entries + index, m_entries + m_count, m_entries + m_count + 1);
+    for (unsigned int i = m_count; i > index; --i) // few, and nearly always none
+        m_entries[i] = m_entries[i - 1];
     m_entries[index] = entry;
     ++m_count;
     return XCode::OK;

@@ -37,7 +37,14 @@ public:
     /// as many words as fit are copied and the rest is missing; nothing tells so.
     CC_Flags& operator=(CC_Flags const& other);
 
-    bool get(unsigned int bit) const;
+    bool get(unsigned int bit) const
+    {
+        unsigned int const word = WORD_OF(bit);
+        for (Entry const* entry = m_entries; entry != m_entries + m_count && entry->wordIndex <= word; ++entry)
+            if (entry->wordIndex == word)
+                return (entry->bits & MASK_OF(bit)) != 0;
+        return false;
+    }
     /// OK, or NO_ELEMENT when a word is needed and memory is out; the set is then unchanged. A word whose bits all
     /// become clear stays in place.
     XCode set(unsigned int bit, bool value);
@@ -74,6 +81,10 @@ public:
 
 private:
     static constexpr unsigned int INLINE = 2;
+    static constexpr unsigned int BITS_PER_WORD = 32;
+
+    static constexpr unsigned int WORD_OF(unsigned int bit) { return bit / BITS_PER_WORD; }
+    static constexpr unsigned int MASK_OF(unsigned int bit) { return 1U << (bit % BITS_PER_WORD); }
 
     XCode insert(unsigned int index, Entry entry);
     void release()

@@ -9,6 +9,7 @@
 
 #include <cstddef>
 #include <iterator>
+#include <new>
 #include <tuple>
 #include <type_traits>
 #include <utility>
@@ -186,6 +187,14 @@ private:
         Position m_next;
     };
 
+    /// Makes a property of the library's own at the end, for who knows that there is none of its id. Without memory
+    /// there is none afterwards either.
+    template <class Property, class... Values>
+    void append(unsigned int id, Values const&... values)
+    {
+        if (auto* const made = new (std::nothrow) Property(id, values...))
+            std::ignore = m_properties.append(made); // it is in no list
+    }
     /// As `set`, for who has looked the property up: `stored` is what `get` gave for its id, null included.
     XCode replace(CC_Property* stored, CC_Property const& property);
     /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.

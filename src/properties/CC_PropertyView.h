@@ -39,6 +39,18 @@ public:
     /// The same for the first properties, which are not copied. REQUIRES: the view is empty.
     void take(CC_PropertyContainer& properties) { m_properties.take(properties); }
 
+    /// Whether what is told is just the one property that was written here and then to the source, so that the view is
+    /// a copy of it already. REQUIRES: nobody has written to the source in between.
+    bool hasWritten(CC_PropertyContainer const& source, Told const& told)
+    {
+        if (told.ids == nullptr || m_inStepWith != &source || told.number != m_lastHeard + 1 || m_written == NONE ||
+            !source.isSelfContained() || !m_properties.isSelfContained())
+            return false;
+        m_lastHeard = told.number;
+        m_written = NONE;
+        return true;
+    }
+
     /// Makes the view a copy of the source.
     void assign(CC_PropertyContainer const& source, Told const& told);
 

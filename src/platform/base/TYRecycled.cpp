@@ -97,20 +97,24 @@ void* TAKE(std::size_t size)
     return block;
 }
 
-bool KEEP(void* memory, std::size_t size)
+/// Whether the thread has kept the block.
+bool KEEP(Cache& cache, void* memory, std::size_t size)
 {
-    unsigned int const limit = s_limit.load(std::memory_order_relaxed);
-    if (limit == 0 || size > MAX_SIZE)
-        return false;
-    Cache* const cache = t_cache != nullptr ? t_cache : MAKE_CACHE();
-    if (cache == nullptr)
-        return false;
-    List& list = cache->lists[INDEX_OF(size)];
-    if (list.count >= limit)
+    List& list = cache.lists[INDEX_OF(size)];
+    if (list.count >= s_limit.load(std::memory_order_relaxed))
         return false;
     list.first = new (memory) Block{list.first};
     ++list.count;
     return true;
+}
+
+/// A block that is too large, null, or the thread's first.
+[[gnu::noinline]] void GIVE_BACK(void* block, std::size_t size)
+{
+    bool const isToKeep = block != nullptr && size <= MAX_SIZE && s_limit.load(std::memory_order_relaxed) != 0;
+    Cache* const cache = isToKeep && t_cache == nullptr ? MAKE_CACHE() : nullptr;
+    if (cache == nullptr || !KEEP(*cache, block, size))
+        ::operator delete(block);
 }
 } // namespace
 
@@ -128,7 +132,10 @@ void* TYRecycled::operator new(std::size_t size, std::nothrow_t const&) noexcept
 
 void TYRecycled::operator delete(void* block, std::size_t size) noexcept
 {
-    if (block == nullptr || !KEEP(block, size))
+    Cache* const cache = t_cache;
+    if (block == nullptr || cache == nullptr || size > MAX_SIZE)
+        return GIVE_BACK(block, size);
+    if (!KEEP(*cache, block, size))
         ::operator delete(block);
 }
 

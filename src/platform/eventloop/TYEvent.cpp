@@ -32,8 +32,6 @@ void TYEvent::destroy()
     removeReference();
 }
 
-bool TYEvent::isPending() const { return m_isPending.load(); }
-
 void TYEvent::addReference() { m_references.fetch_add(1, std::memory_order_relaxed); }
 
 void TYEvent::removeReference()

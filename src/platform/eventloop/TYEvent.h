@@ -47,7 +47,7 @@ public:
     /// reference. Safe from inside the event's own handler.
     void destroy();
 
-    bool isPending() const;
+    bool isPending() const { return m_isPending.load(); }
     void addReference();
     void removeReference();
 
