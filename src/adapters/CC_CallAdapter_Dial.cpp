@@ -132,9 +132,9 @@ XCode CC_CallAdapter::joinNewCall(CC_Call& call, CC_PropertyContainer const& pro
     Attempt const attempt(*this, "Dial");
     CC_PropertyContainer filtered;
     CC_PropertyContainer const* const written = FILTER_INPUT(filters, properties, filtered);
-    if (!attempt.survives(written != nullptr ? XCode::OK : XCode::FAILURE, "the input filters refuse the call's "
-                                                                           "properties") ||
-        !attempt.survives(call.setProperties(*written), "the call takes not all properties") ||
+    if (written == nullptr)
+        return attempt.fail("the input filters refuse the call's properties");
+    if (attempt.isOver() || !attempt.survives(call.setProperties(*written), "the call takes not all properties") ||
         !attempt.survives(call.addCallLeg(*m_ownCallLeg), CALL_TAKES_NO_LEG))
         return XCode::FAILURE;
     return XCode::OK;

@@ -145,7 +145,8 @@ private:
     void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
         m_inStepWith = nullptr;
-        CC_PropertyContainer const copy(source);
+        CC_PropertyContainer copy;
+        copy = source;
         if (!hasAllOfOwnKinds(copy, source))
             return; // memory is out: better the view of before than one that calls what is there gone
         for (CC_Property const& current : copy)
