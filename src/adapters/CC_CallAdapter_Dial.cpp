@@ -245,6 +245,8 @@ XCode CC_CallAdapter::writeFirstProperties(CC_PropertyContainer& properties)
     XCode const written = m_ownCallLeg->setProperties(properties);
     if (!written.isOk() || attempt.isOver())
         return XCode::FAILURE;
+    if (!m_ownView.getProperties().isEmpty())
+        return m_ownView.write(properties); // somebody was called who has written to it before us
     m_ownView.take(properties);
     return XCode::OK;
 }

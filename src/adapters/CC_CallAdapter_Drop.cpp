@@ -85,6 +85,8 @@ void CC_CallAdapter::letGoOfTheRest()
     m_ownView.clear();
     if (!attempt.isOver())
         m_peerView.clear();
+    if (!attempt.isOver())
+        m_callView.clear(); // while the events are there: an ending property must not begin another attempt
     if (attempt.isOver())
         return;
     if (CC_CallLeg* const peer = std::exchange(m_peerCallLeg, nullptr))
@@ -95,7 +97,6 @@ void CC_CallAdapter::letGoOfTheRest()
         if (*event != nullptr)
             std::exchange(*event, nullptr)->destroy();
     ++m_attempt;
-    m_callView.clear();
 }
 
 XCode CC_CallAdapter::transfer(CC_CallAdapter const& other, bool removeOwnLeg)

@@ -14,17 +14,6 @@
 
 namespace
 {
-/// The properties whose id shares a bit with the mask. The first failure is the result, the copying goes on.
-XCode COPY(CC_PropertyContainer& to, CC_PropertyContainer const& from, unsigned int mask)
-{
-    XCode result = XCode::OK;
-    for (CC_Property const& property : from)
-        if ((property.getId() & mask) != 0)
-            if (XCode const copied = to.set(property); result.isOk())
-                result = copied;
-    return result;
-}
-
 XCode OK_OR_FAILURE(XCode result) { return result.isOk() ? XCode::OK : XCode::FAILURE; }
 
 XCode WRITE(CC_CallLeg& leg, CC_Property const& property) { return OK_OR_FAILURE(leg.setProperty(property)); }
@@ -97,12 +86,12 @@ CC_Property const* CC_CallAdapter::getOwnPropertyUnfiltered(unsigned int id) con
 
 XCode CC_CallAdapter::getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_ownView.getProperties(), mask);
+    return properties.setEach(m_ownView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_ownCallLeg != nullptr ? COPY(properties, m_ownCallLeg->getProperties(), mask) : XCode::ABSENT;
+    return m_ownCallLeg != nullptr ? properties.setEach(m_ownCallLeg->getProperties(), mask) : XCode::ABSENT;
 }
 
 XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
@@ -147,12 +136,12 @@ CC_Property const* CC_CallAdapter::getPeerPropertyUnfiltered(unsigned int id) co
 
 XCode CC_CallAdapter::getPeerProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_peerView.getProperties(), mask);
+    return properties.setEach(m_peerView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getPeerPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return m_peerCallLeg != nullptr ? COPY(properties, m_peerCallLeg->getProperties(), mask) : XCode::ABSENT;
+    return m_peerCallLeg != nullptr ? properties.setEach(m_peerCallLeg->getProperties(), mask) : XCode::ABSENT;
 }
 
 namespace
@@ -201,13 +190,13 @@ CC_Property const* CC_CallAdapter::getCallPropertyUnfiltered(unsigned int id) co
 
 XCode CC_CallAdapter::getCallProperties(CC_PropertyContainer& properties, unsigned int mask) const
 {
-    return COPY(properties, m_callView.getProperties(), mask);
+    return properties.setEach(m_callView.getProperties(), mask);
 }
 
 XCode CC_CallAdapter::getCallPropertiesUnfiltered(CC_PropertyContainer& properties, unsigned int mask) const
 {
     CC_Call const* const call = getCall();
-    return call != nullptr ? COPY(properties, call->getProperties(), mask) : XCode::ABSENT;
+    return call != nullptr ? properties.setEach(call->getProperties(), mask) : XCode::ABSENT;
 }
 
 template <class Written>

@@ -153,7 +153,16 @@ XCode CC_Call::setProperty(CC_Property const& property)
 XCode CC_Call::setProperties(CC_PropertyContainer const& properties)
 {
     Hold const self(this);
-    XCode result = XCode::OK;
+    if (m_properties.takesUndisturbed(properties))
+        return storeAll(properties, XCode::OK);
+    CC_PropertyContainer kept; // a module's classes may change or end the given ones meanwhile
+    XCode const isWhole = kept.copy(properties);
+    return storeAll(kept, isWhole.isOk() ? XCode::OK : XCode::REFUSED);
+}
+
+/// `result`: that of what was done before.
+XCode CC_Call::storeAll(CC_PropertyContainer const& properties, XCode result)
+{
     CC_Flags flags;
     for (CC_Property const& property : properties)
     {

@@ -134,8 +134,8 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
         return XCode::OK;
     if (m_isStateFixed && property.getId() == CC_PropertyId::STATE && !IS_RELEASED(property))
         return XCode::OK;
-    if (LOG_PROPERTY(m_name, property))
-        stored = m_properties.get(property.getId()); // a monitor is the host's code
+    if (LOG_PROPERTY(m_name, property) || !m_properties.isSelfContained())
+        stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
     if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
         return XCode::REFUSED;
     if (!m_properties.replace(stored, property).isOk())
@@ -159,7 +159,16 @@ XCode CC_CallLeg::setProperty(CC_Property const& property)
 XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
 {
     Reference const self(*this);
-    XCode result = XCode::OK;
+    if (m_properties.takesUndisturbed(properties))
+        return storeAll(properties, XCode::OK);
+    CC_PropertyContainer kept; // a module's classes may change or end the given ones meanwhile
+    XCode const isWhole = kept.copy(properties);
+    return storeAll(kept, isWhole.isOk() ? XCode::OK : XCode::REFUSED);
+}
+
+/// `result`: that of what was done before.
+XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result)
+{
     CC_Flags flags;
     CC_Property const* state = nullptr;
     auto const storeNext = [&](CC_Property const& property)

@@ -117,6 +117,7 @@ private:
 
     ~CC_CallLeg();
     XCode store(CC_Property const& property, bool& changed);
+    XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
     void notifyPropertyChange(CC_Flags& flags);
 

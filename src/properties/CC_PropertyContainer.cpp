@@ -3,17 +3,13 @@
 #include "platform/base/NestingGuard.h"
 #include "properties/CC_PropertyKind.h"
 
+#include <algorithm>
 #include <tuple>
 
 namespace
 {
-unsigned int s_infoDepth = 0; // of all containers' dumps
-
-bool IS_SELF_CONTAINED(CC_Property const& property)
-{
-    CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
-    return kind != nullptr && kind->isSelfContained;
-}
+unsigned int s_infoDepth = 0;                  // of all containers' dumps
+constexpr unsigned int MOST_REMOVALS = 100000; // of one `clear`, should ending properties always bring others
 
 bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
 {
@@ -23,52 +19,67 @@ bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
 }
 } // namespace
 
+namespace
+{
+thread_local void* t_innermostWatch __attribute__((tls_model("initial-exec"))) = nullptr;
+} // namespace
+
+CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container)
+    : m_container(&container), m_outer(static_cast<Watch*>(t_innermostWatch))
+{
+    container.m_isWatched = true;
+    t_innermostWatch = this;
+}
+
+CC_PropertyContainer::Watch::~Watch() { t_innermostWatch = m_outer; }
+
+void CC_PropertyContainer::tellWatches() const
+{
+    for (auto* watch = static_cast<Watch*>(t_innermostWatch); watch != nullptr; watch = watch->m_outer)
+        if (watch->m_container == this)
+            watch->m_container = nullptr;
+}
+
 /// A walk that goes on whatever the properties that it visits do to the container meanwhile.
 ///
 /// It finds its place again by the visited one's address, which is compared and not followed. Should another property
-/// have come to that address, the walk goes on behind that one.
+/// have come to that address, the walk goes on behind that one. When the container is destroyed it has ended.
 class CC_PropertyContainer::Walk
 {
 public:
-    /// `isUndisturbed`: whether nobody is called meanwhile.
-    explicit Walk(CC_PropertyContainer const& container, bool isUndisturbed = false)
-        : m_container(container), m_isUndisturbed(isUndisturbed), m_position(container.m_properties.begin())
-    {
-        m_visited = isAtEnd() ? nullptr : &*m_position;
-    }
-    bool isAtEnd() const { return m_position == m_container.m_properties.end(); }
+    explicit Walk(CC_PropertyContainer const& container) : m_container(container), m_watch(container) { goTo(0); }
+    bool isAtEnd() const { return m_visited == nullptr; }
     CC_Property& operator*() const { return *m_visited; }
     CC_Property* operator->() const { return m_visited; }
 
     /// Behind the visited one if it is still there, otherwise to what has taken its place.
     void goOn()
     {
-        if (m_isUndisturbed)
+        if (!m_watch.isAlive())
         {
-            ++m_position;
-            m_visited = isAtEnd() ? nullptr : &*m_position;
+            m_visited = nullptr;
             return;
         }
-        Position position = m_container.m_properties.begin();
         unsigned int index = 0;
-        for (; position != m_container.m_properties.end() && &*position != m_visited; ++position)
+        for (CC_Property const& property : m_container.m_properties)
+        {
+            if (&property == m_visited)
+                return goTo(index + 1);
             ++index;
-        goTo(position != m_container.m_properties.end() ? index + 1 : m_index);
+        }
+        goTo(m_index);
     }
 
 private:
     void goTo(unsigned int index)
     {
-        m_position = m_container.m_properties.begin();
-        for (m_index = 0; m_index < index && !isAtEnd(); ++m_index)
-            ++m_position;
-        m_visited = isAtEnd() ? nullptr : &*m_position;
+        m_index = index;
+        m_visited = m_container.findByIndex(index);
     }
 
     CC_PropertyContainer const& m_container;
-    bool m_isUndisturbed;
-    Position m_position;
-    CC_Property* m_visited;
+    Watch const m_watch;
+    CC_Property* m_visited = nullptr;
     unsigned int m_index = 0;
 };
 
@@ -81,10 +92,22 @@ CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const
         takeOver(other);
         return *this;
     }
-    clear();
-    for (Walk source(other); !source.isAtEnd(); source.goOn())
-        std::ignore = replace(nullptr, *source); // what memory refuses is missing
+    std::ignore = copy(other); // what memory refuses is missing
     return *this;
+}
+
+XCode CC_PropertyContainer::copy(CC_PropertyContainer const& other)
+{
+    Watch const self(*this);
+    Watch const source(other);
+    clear();
+    if (!self.isAlive() || !source.isAlive())
+        return XCode::FAILURE; // an ending property was faster
+    XCode result = XCode::OK;
+    for (Walk walk(other); !walk.isAtEnd() && self.isAlive(); walk.goOn())
+        if (XCode const stored = set(*walk); result.isOk())
+            result = stored;
+    return self.isAlive() ? result : XCode::FAILURE;
 }
 
 /// The same where nobody is called, who could tell it from all being deleted and copied anew.
@@ -115,35 +138,90 @@ XCode CC_PropertyContainer::set(CC_Property const& property) { return replace(fi
 XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& property)
 {
     if (stored != nullptr)
-        return CC_Property::ASSIGN(*stored, property);
-    CC_Property* const copy = property.clone();
-    if (copy == nullptr)
+        return CC_Property::ASSIGN(*stored, property); // and nothing else: an assign may destroy us
+    CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
+    if (kind == nullptr)
+        return appendForeign(property);
+    if (!appendCopy(property))
         return XCode::NO_ELEMENT;
-    if (!IS_SELF_CONTAINED(*copy))
-        return appendOfAnyKind(copy);
-    std::ignore = m_properties.append(copy); // it is in no list
+    m_isSelfContained = m_isSelfContained && kind->isSelfContained;
     return XCode::OK;
 }
 
-/// Takes the copy over, also when it fails.
-XCode CC_PropertyContainer::appendOfAnyKind(CC_Property* copy)
+XCode CC_PropertyContainer::appendForeign(CC_Property const& property)
 {
-    m_isSelfContained = false;
-    CC_Property* const stored = find(copy->getId()); // what the clone stored itself
-    if (stored == nullptr && m_properties.append(copy).isOk())
-        return XCode::OK;
-    XCode const result = stored != nullptr ? CC_Property::ASSIGN(*stored, *copy) : XCode::FAILURE;
+    Watch const self(*this);
+    CC_Property* const copy = property.clone();
+    if (copy == nullptr)
+        return XCode::NO_ELEMENT;
+    XCode result = XCode::FAILURE;
+    if (self.isAlive())
+    {
+        m_isSelfContained = false;
+        m_hasForeign = true;
+        CC_Property* const stored = find(copy->getId()); // what the clone stored itself
+        if (stored == nullptr && m_properties.append(copy).isOk())
+            return XCode::OK;
+        if (stored != nullptr)
+            result = CC_Property::ASSIGN(*stored, *copy);
+    }
     delete copy;
     return result;
 }
 
+/// As long as an ending property adds others they end as well, up to a bound.
+void CC_PropertyContainer::clearOfAnyKind()
+{
+    Watch const self(*this);
+    for (unsigned int left = MOST_REMOVALS; left > 0 && self.isAlive() && !m_properties.isEmpty(); --left)
+        m_properties.remove(*m_properties.begin());
+    if (!self.isAlive())
+        return;
+    m_isSelfContained = m_properties.isEmpty();
+    m_hasForeign = !m_isSelfContained;
+}
+
 XCode CC_PropertyContainer::set(CC_PropertyContainer const& other, unsigned int mask)
 {
-    bool const isUndisturbed = m_isSelfContained && other.m_isSelfContained;
-    for (Walk source(other, isUndisturbed); !source.isAtEnd(); source.goOn())
-        if ((source->getId() & mask) != 0 && !set(*source).isOk())
+    if (takesUndisturbed(other))
+    {
+        for (CC_Property const& property : other)
+            if ((property.getId() & mask) != 0 && !set(property).isOk())
+                return XCode::FAILURE;
+        return XCode::OK;
+    }
+    return setDisturbed(other, mask);
+}
+
+/// The same where a module's class may do anything to both.
+XCode CC_PropertyContainer::setDisturbed(CC_PropertyContainer const& other, unsigned int mask)
+{
+    Watch const self(*this);
+    for (Walk source(other); !source.isAtEnd(); source.goOn())
+        if ((source->getId() & mask) != 0 && (!set(*source).isOk() || !self.isAlive()))
             return XCode::FAILURE;
     return XCode::OK;
+}
+
+XCode CC_PropertyContainer::setEach(CC_PropertyContainer const& other, unsigned int mask)
+{
+    XCode result = XCode::OK;
+    auto const setOne = [&](CC_Property const& property)
+    {
+        if ((property.getId() & mask) == 0)
+            return;
+        if (XCode const stored = set(property); result.isOk())
+            result = stored;
+    };
+    if (takesUndisturbed(other))
+    {
+        std::for_each(other.begin(), other.end(), setOne);
+        return result;
+    }
+    Watch const self(*this);
+    for (Walk source(other); !source.isAtEnd() && self.isAlive(); source.goOn())
+        setOne(*source);
+    return result;
 }
 
 void CC_PropertyContainer::take(CC_PropertyContainer& other)
@@ -156,6 +234,7 @@ void CC_PropertyContainer::take(CC_PropertyContainer& other)
             other.m_properties.moveTo(m_properties, property);
     }
     m_isSelfContained = m_isSelfContained && other.m_isSelfContained;
+    m_hasForeign = m_hasForeign || other.m_hasForeign;
 }
 
 bool CC_PropertyContainer::remove(unsigned int id)

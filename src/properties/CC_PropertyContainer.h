@@ -17,8 +17,8 @@
 /// The properties of a call, a leg, an adapter or an event: owned, in the order in which they were added, at most one
 /// per id. Lists are short, so look-up is a linear search. Not locked.
 ///
-/// The operations of a module's property class may change the very container that calls them, as long as it lives: what
-/// they remove is not visited any more, what they add is.
+/// The operations of a module's property class may change the very container that calls them, or destroy it: what they
+/// remove is not visited any more, what they add is.
 ///
 ///     CC_PropertyContainer properties;
 ///     if (!properties.set(Key::E164_NUMBER, "49891234").isOk())
@@ -82,7 +82,11 @@ public:
 
     CC_PropertyContainer() = default;
     CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
-    ~CC_PropertyContainer() = default;
+    ~CC_PropertyContainer()
+    {
+        if (m_isWatched)
+            tellWatches();
+    }
     /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
     /// tells so. As far as both begin with the same ids and classes of the library, and no others follow, the values
     /// are taken over where they stand.
@@ -136,8 +140,10 @@ public:
     bool removeByIndex(unsigned int index);
     void clear()
     {
-        m_properties.clear();
-        m_isSelfContained = true;
+        if (m_isSelfContained)
+            m_properties.clear();
+        else
+            clearOfAnyKind();
     }
 
     /// Adds the line "Properties" and, unless this dump is already part of a container's, the properties one level
@@ -150,6 +156,8 @@ public:
 
 private:
     // what the library does with containers of its own
+    friend class CC_Call;
+    friend class CC_CallAdapter;
     friend class CC_CallLeg;
     friend class CC_PropertyView;
     class Walk;
@@ -195,6 +203,31 @@ private:
         if (auto* const made = new (std::nothrow) Property(id, values...))
             std::ignore = m_properties.append(made); // it is in no list
     }
+    /// Tells who has called a module's class whether the container still exists. On the stack; one thread only. Where
+    /// all are self-contained nobody watches, and nobody pays.
+    class CC_EXPORT Watch
+    {
+    public:
+        explicit Watch(CC_PropertyContainer const& container);
+        ~Watch();
+        Watch(Watch const&) = delete;
+        Watch& operator=(Watch const&) = delete;
+        bool isAlive() const { return m_container != nullptr; }
+
+    private:
+        friend class CC_PropertyContainer;
+        CC_PropertyContainer const* m_container;
+        Watch* m_outer;
+    };
+    [[gnu::cold]] void tellWatches() const;
+
+    /// Whether nobody is called when the other's properties are stored here.
+    bool takesUndisturbed(CC_PropertyContainer const& other) const { return !m_hasForeign && other.m_isSelfContained; }
+    /// As `set(other, mask)`, but goes on after a failure: OK or the first one.
+    XCode setEach(CC_PropertyContainer const& other, unsigned int mask);
+    /// A copy that stays as it is, whatever happens to the other, and whether it is whole.
+    [[gnu::noinline]] XCode copy(CC_PropertyContainer const& other);
+
     /// As `set`, for who has looked the property up: `stored` is what `get` gave for its id, null included.
     XCode replace(CC_Property* stored, CC_Property const& property);
     /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.
@@ -203,7 +236,8 @@ private:
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
 
-    /// As `set` for an id that is not there; whether memory sufficed. REQUIRES: the property is self-contained.
+    /// As `set` for an id that is not there; whether memory sufficed. REQUIRES: the property is of our own classes; who
+    /// appends one that is not self-contained notes it.
     bool appendCopy(CC_Property const& property)
     {
         CC_Property* const copy = property.clone();
@@ -212,9 +246,13 @@ private:
         return copy != nullptr;
     }
     void takeOver(CC_PropertyContainer const& other);
-    XCode appendOfAnyKind(CC_Property* copy);
+    [[gnu::noinline]] XCode appendForeign(CC_Property const& property);
+    [[gnu::noinline]] void clearOfAnyKind();
+    [[gnu::noinline]] XCode setDisturbed(CC_PropertyContainer const& other, unsigned int mask);
     void removeFrom(Position position);
 
     LinkedListManager<CC_Property> m_properties;
     bool m_isSelfContained = true;
+    bool m_hasForeign = false;        // properties of a module's class, or had once
+    mutable bool m_isWatched = false; // or was once
 };

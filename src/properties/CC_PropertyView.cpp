@@ -2,8 +2,8 @@
 
 void CC_PropertyView::clear()
 {
-    m_properties.clear();
     m_inStepWith = nullptr;
+    m_properties.clear(); // last: an ending property may destroy us
 }
 
 XCode CC_PropertyView::write(CC_Property const& property)
@@ -29,11 +29,13 @@ void CC_PropertyView::assign(CC_PropertyContainer const& source, Told const& tol
     };
     if (takeChanged(source, told, take))
         return;
-    m_properties = source;
+    bool const isUndisturbed = m_properties.isSelfContained() && source.isSelfContained();
     m_lastHeard = told.number;
     m_written = NONE;
-    bool const isWhole = m_properties.getNumberOfProperties() == source.getNumberOfProperties();
-    m_inStepWith = isWhole && source.isSelfContained() ? &source : nullptr;
+    m_inStepWith = nullptr;
+    m_properties = source; // a module's class may destroy us meanwhile
+    if (isUndisturbed && m_properties.getNumberOfProperties() == source.getNumberOfProperties())
+        m_inStepWith = &source;
 }
 
 bool CC_PropertyView::hasAllOfOwnKinds(CC_PropertyContainer const& copy, CC_PropertyContainer const& source)

@@ -139,31 +139,38 @@ private:
     }
 
     /// A module's class may do anything when it is cloned, compared, assigned or ended, to this view as well as to the
-    /// source. So the source is copied first and nothing that was found in the view is relied on after a call; and what
-    /// the class does not compare may differ unnoticed, so there is no step to be in.
+    /// source, destroying it included. So the source is copied first and nothing that was found in the view is relied
+    /// on after a call; and what the class does not compare may differ unnoticed, so there is no step to be in.
+    /// REQUIRES: the source outlives this.
     template <class OnDifference>
-    void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
+    [[gnu::noinline]] void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
         m_inStepWith = nullptr;
+        CC_PropertyContainer::Watch const self(m_properties);
         CC_PropertyContainer copy;
         copy = source;
-        if (!hasAllOfOwnKinds(copy, source))
+        if (!self.isAlive() || !hasAllOfOwnKinds(copy, source))
             return; // memory is out: better the view of before than one that calls what is there gone
         for (CC_Property const& current : copy)
         {
             CC_Property const* const former = m_properties.get(current.getId());
-            if (former != nullptr && current.isEqual(*former))
-                continue;
-            std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
-            onDifference(current.getId());
+            bool const isSame = former != nullptr && current.isEqual(*former);
+            if (self.isAlive() && !isSame)
+                std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
+            if (!self.isAlive())
+                return;
+            if (!isSame)
+                onDifference(current.getId());
         }
         removeWhatIsGone(copy, onDifference);
     }
 
     template <class OnDifference>
-    void removeWhatIsGone(CC_PropertyContainer const& source, OnDifference const& onDifference)
+    [[gnu::noinline]] void removeWhatIsGone(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
-        for (unsigned int i = 0; CC_Property const* const former = m_properties.getByIndex(i);)
+        CC_PropertyContainer::Watch const self(m_properties); // an ending property may destroy us
+        unsigned int i = 0;
+        while (CC_Property const* const former = self.isAlive() ? m_properties.getByIndex(i) : nullptr)
         {
             unsigned int const id = former->getId();
             if (source.get(id) != nullptr)
@@ -172,7 +179,8 @@ private:
                 continue;
             }
             m_properties.removeByIndex(i);
-            onDifference(id);
+            if (self.isAlive())
+                onDifference(id);
         }
     }
 

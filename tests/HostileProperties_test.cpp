@@ -1,0 +1,431 @@
+// What a module's property class does when it is cloned, assigned, compared, logged or ended: it may change or destroy
+// what it is just being stored into, and the adapter, leg or call that owns that. Each of these once touched freed
+// memory.
+#include "properties/CC_PropertyUnsigned.h"
+#include "testing/CallControlFixture.h"
+#include "testing/RecordingMonitor.h"
+#include "tests/support/Party.h"
+#include "tests/support/PropertyTesting.h"
+
+#include <functional>
+#include <gtest/gtest.h>
+#include <memory>
+#include <vector>
+
+namespace
+{
+using namespace CC_PropertyId;
+
+class HostileProperties : public testing::Test
+{
+protected:
+    ~HostileProperties() override { *deeds = {}; }
+
+    void settle() { fixture.m_loop.settle(); }
+    void connect(Party& caller, Party& callee)
+    {
+        ASSERT_EQ(caller.dial(callee), XCode::OK);
+        ASSERT_EQ(callee.become(State::CONNECTED), XCode::OK);
+        settle();
+    }
+    /// A party whose adapter was destroyed gets another one.
+    void reconnect(Party& caller, Party& callee)
+    {
+        *deeds = {};
+        callee.hangUp();
+        settle();
+        caller.adapter = std::make_unique<CC_CallAdapter>();
+        caller.setup();
+        connect(caller, callee);
+    }
+    ActingProperty acting(int value, unsigned int id = NAME) const { return ActingProperty(id, value, deeds); }
+    /// An acting property between two others.
+    CC_PropertyContainer several(int value) const
+    {
+        CC_PropertyContainer properties;
+        EXPECT_EQ(properties.set(CC_PropertyString(DISPLAY, "before")), XCode::OK);
+        EXPECT_EQ(properties.set(acting(value)), XCode::OK);
+        EXPECT_EQ(properties.set(CC_PropertyString(ALERT_INFO, "behind")), XCode::OK);
+        return properties;
+    }
+    void expectNothingLeft(std::initializer_list<Party*> parties)
+    {
+        for (Party* const party : parties)
+            party->adapter.reset();
+        settle();
+        EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
+        EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
+    }
+    static int NUMBER_IN(CC_PropertyContainer const& properties, unsigned int id = NAME)
+    {
+        auto const* const property = dynamic_cast<ActingProperty const*>(properties.get(id));
+        return property != nullptr ? property->getNumber() : -1;
+    }
+
+    CallControlFixture fixture;
+    std::shared_ptr<ActingProperty::Deeds> const deeds = std::make_shared<ActingProperty::Deeds>();
+};
+} // namespace
+
+// --- legs and calls --------------------------------------------------------------------------------------------------
+
+TEST_F(HostileProperties, AStoredPropertyMayLeaveTheLegThatComparesIt)
+{
+    auto* const leg = new CC_CallLeg;
+    ASSERT_EQ(leg->setProperty(acting(1)), XCode::OK);
+    deeds->onIsEqual = [leg] { leg->getPropertiesToWrite().remove(NAME); };
+    EXPECT_EQ(leg->setProperty(acting(2)), XCode::OK);
+    EXPECT_EQ(NUMBER_IN(leg->getProperties()), 2);
+    leg->removeReference();
+}
+
+TEST_F(HostileProperties, AStoredPropertyMayGiveUpTheLegThatComparesIt)
+{
+    auto* const leg = new CC_CallLeg;
+    ASSERT_EQ(leg->setProperty(acting(1)), XCode::OK);
+    deeds->onIsEqual = [leg] { leg->removeReference(); };
+    EXPECT_EQ(leg->setProperty(acting(2)), XCode::OK);
+    EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
+}
+
+TEST_F(HostileProperties, AClonedPropertyMayGiveUpTheLegThatStoresIt)
+{
+    auto* const leg = new CC_CallLeg;
+    deeds->onClone = [leg] { leg->removeReference(); };
+    EXPECT_EQ(leg->setProperty(acting(1)), XCode::OK);
+    EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
+}
+
+TEST_F(HostileProperties, APropertyMayChangeOrEndWhatALegTakesSeveralFrom)
+{
+    for (bool const isEnding : {false, true})
+        for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onIsEqual})
+        {
+            auto* const leg = new CC_CallLeg;
+            ASSERT_EQ(leg->setProperty(acting(1)), XCode::OK);
+            auto source = std::make_unique<CC_PropertyContainer>(several(2));
+            ASSERT_EQ(source->set(State(STATE, State::CONNECTED)), XCode::OK);
+            (*deeds).*event = [&] { isEnding ? source.reset() : source->clear(); };
+            std::ignore = leg->setProperties(*source);
+            EXPECT_FALSE((*deeds).*event) << "it has happened";
+            EXPECT_EQ(NUMBER_IN(leg->getProperties()), 2);
+            leg->removeReference();
+            *deeds = {};
+        }
+}
+
+TEST_F(HostileProperties, AStoredPropertyMayTakeTheStateOutOfWhatTheLegTakes)
+{
+    auto* const leg = new CC_CallLeg;
+    ASSERT_EQ(leg->setProperty(acting(1)), XCode::OK);
+    CC_PropertyContainer source;
+    ASSERT_EQ(source.set(State(STATE, State::CONNECTED)), XCode::OK);
+    ASSERT_EQ(source.set(CC_PropertyUnsigned(NAME, 7)), XCode::OK) << "of a class that the stored one compares with";
+    deeds->onIsEqual = [&] { source.remove(STATE); };
+    EXPECT_EQ(leg->setProperties(source), XCode::OK);
+    EXPECT_EQ(leg->getState(), State::CONNECTED) << "it was there when the leg was asked";
+    leg->removeReference();
+}
+
+TEST_F(HostileProperties, APropertyMayChangeOrEndWhatACallTakesSeveralFrom)
+{
+    for (bool const isEnding : {false, true})
+        for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onIsEqual})
+        {
+            CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+            ASSERT_EQ(call->setProperty(acting(1)), XCode::OK);
+            auto source = std::make_unique<CC_PropertyContainer>(several(2));
+            (*deeds).*event = [&] { isEnding ? source.reset() : source->clear(); };
+            std::ignore = call->setProperties(*source);
+            EXPECT_FALSE((*deeds).*event) << "it has happened";
+            EXPECT_EQ(NUMBER_IN(call->getProperties()), 2);
+            CallControl::RELEASE_CALL("SWITCH", call);
+            *deeds = {};
+        }
+}
+
+TEST_F(HostileProperties, APropertyMayReleaseTheCallThatStoresIt)
+{
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onIsEqual,
+                             &ActingProperty::Deeds::onAssign, &ActingProperty::Deeds::onEnd})
+    {
+        CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+        ASSERT_EQ(call->setProperty(acting(1)), XCode::OK);
+        CC_PropertyContainer const source = several(2); // before anything happens
+        (*deeds).*event = [call] { CallControl::RELEASE_CALL("SWITCH", call); };
+        std::ignore = call->setProperties(source);
+        EXPECT_FALSE((*deeds).*event) << "it has happened";
+        EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
+    }
+}
+
+TEST_F(HostileProperties, ALoggedPropertyMayGiveUpTheLegThatStoresIt)
+{
+    RecordingMonitor monitor(RTD::LEVEL_CHANGE);
+    auto* const leg = new CC_CallLeg;
+    ASSERT_EQ(leg->setProperty(acting(1)), XCode::OK);
+    deeds->onText = [leg]
+    {
+        leg->getPropertiesToWrite().clear();
+        leg->removeReference();
+    };
+    EXPECT_EQ(leg->setProperty(acting(2)), XCode::OK);
+    EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
+}
+
+// --- adapters --------------------------------------------------------------------------------------------------------
+
+TEST_F(HostileProperties, APropertyMayDestroyTheAdapterThatItIsWrittenWith)
+{
+    Party anna("anna"), bert("bert");
+    using Write = std::function<XCode(CC_CallAdapter&, CC_PropertyContainer const&)>;
+    Write const writes[] = {
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from)
+        { return adapter.setOwnProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from)
+        { return adapter.setPeerProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from)
+        { return adapter.setCallProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from)
+        { return adapter.setOwnPropertyUnfiltered(*from.get(NAME)); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from) { return adapter.setOwnProperties(from); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from) { return adapter.setPeerProperties(from); },
+        [](CC_CallAdapter& adapter, CC_PropertyContainer const& from) { return adapter.setCallProperties(from); },
+    };
+    CC_PropertyContainer const first = several(1);
+    CC_PropertyContainer const second = several(2);
+    for (Write const& write : writes)
+        for (bool const isThereBefore : {false, true})
+        {
+            reconnect(anna, bert);
+            if (isThereBefore)
+            {
+                ASSERT_EQ(write(*anna.adapter, first), XCode::OK);
+                settle();
+            }
+            auto const event = isThereBefore ? &ActingProperty::Deeds::onAssign : &ActingProperty::Deeds::onClone;
+            (*deeds).*event = [&] { anna.adapter.reset(); };
+            EXPECT_EQ(write(*anna.adapter, second), XCode::FAILURE);
+            EXPECT_EQ(anna.adapter, nullptr);
+        }
+    expectNothingLeft({&anna, &bert});
+}
+
+TEST_F(HostileProperties, APropertyMayDestroyTheAdapterWhoseViewFollows)
+{
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onIsEqual,
+                             &ActingProperty::Deeds::onAssign, &ActingProperty::Deeds::onEnd})
+        for (unsigned int skipped = 0; skipped < 8; ++skipped)
+        {
+            Party anna("anna"), bert("bert");
+            connect(anna, bert);
+            ASSERT_EQ(bert.adapter->setOwnProperty(acting(1)), XCode::OK);
+            ASSERT_EQ(bert.adapter->setCallProperty(acting(1)), XCode::OK);
+            settle();
+            unsigned int left = skipped;
+            std::function<void()> act;
+            act = [&]
+            {
+                if (left-- > 0)
+                    (*deeds).*event = act; // the next one
+                else
+                    anna.adapter.reset();
+            };
+            (*deeds).*event = act;
+            CC_CallLeg& leg = *anna.getCall()->getCallLeg(1);
+            std::ignore = leg.setProperty(acting(2));
+            if (anna.adapter != nullptr)
+                std::ignore = anna.getCall()->setProperty(acting(2));
+            if (anna.adapter != nullptr)
+            {
+                leg.getPropertiesToWrite().remove(NAME);
+                std::ignore = leg.setProperty(CC_PropertyString(DISPLAY, "x"));
+            }
+            *deeds = {};
+            expectNothingLeft({&anna, &bert});
+        }
+}
+
+TEST_F(HostileProperties, APropertyMayDestroyTheAdapterWhoseOwnViewFollows)
+{
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onEnd})
+        for (unsigned int skipped = 0; skipped < 6; ++skipped)
+        {
+            Party anna("anna"), bert("bert");
+            connect(anna, bert);
+            ASSERT_EQ(anna.adapter->setOwnProperty(acting(1)), XCode::OK);
+            settle();
+            unsigned int left = skipped;
+            std::function<void()> act;
+            act = [&]
+            {
+                if (left-- > 0)
+                    (*deeds).*event = act;
+                else
+                    anna.adapter.reset();
+            };
+            (*deeds).*event = act;
+            std::ignore = anna.getCall()->getCallLeg(0)->setProperty(CC_PropertyString(DISPLAY, "x"));
+            *deeds = {};
+            expectNothingLeft({&anna, &bert});
+        }
+}
+
+TEST_F(HostileProperties, APropertyMayDestroyTheAdapterWhosePropertiesAreCopied)
+{
+    using Read = std::function<XCode(CC_CallAdapter const&, CC_PropertyContainer&)>;
+    Read const reads[] = {
+        [](CC_CallAdapter const& adapter, CC_PropertyContainer& to) { return adapter.getOwnProperties(to, 0xffff); },
+        [](CC_CallAdapter const& adapter, CC_PropertyContainer& to) { return adapter.getPeerProperties(to, 0xffff); },
+        [](CC_CallAdapter const& adapter, CC_PropertyContainer& to) { return adapter.getCallProperties(to, 0xffff); },
+        [](CC_CallAdapter const& adapter, CC_PropertyContainer& to)
+        { return adapter.getOwnPropertiesUnfiltered(to, 0xffff); },
+        [](CC_CallAdapter const& adapter, CC_PropertyContainer& to)
+        { return adapter.getCallPropertiesUnfiltered(to, 0xffff); },
+    };
+    Party anna("anna"), bert("bert");
+    for (Read const& read : reads)
+        for (bool const isThereBefore : {false, true})
+        {
+            reconnect(anna, bert);
+            ASSERT_EQ(anna.adapter->setOwnProperty(acting(1)), XCode::OK);
+            ASSERT_EQ(bert.adapter->setOwnProperty(acting(1)), XCode::OK);
+            ASSERT_EQ(bert.adapter->setCallProperty(acting(1)), XCode::OK);
+            settle();
+            CC_PropertyContainer to;
+            if (isThereBefore)
+            {
+                ASSERT_EQ(to.set(acting(0)), XCode::OK);
+            }
+            auto const event = isThereBefore ? &ActingProperty::Deeds::onAssign : &ActingProperty::Deeds::onClone;
+            (*deeds).*event = [&] { anna.adapter.reset(); };
+            std::ignore = read(*anna.adapter, to);
+            EXPECT_EQ(anna.adapter, nullptr);
+            EXPECT_EQ(NUMBER_IN(to), 1);
+        }
+    expectNothingLeft({&anna, &bert});
+}
+
+TEST_F(HostileProperties, AnEndingPropertyMayDestroyTheAdapterThatDropsIt)
+{
+    for (unsigned int skipped = 0; skipped < 8; ++skipped)
+    {
+        Party anna("anna"), bert("bert");
+        connect(anna, bert);
+        ASSERT_EQ(anna.adapter->setOwnProperty(acting(1)), XCode::OK);
+        ASSERT_EQ(bert.adapter->setOwnProperty(acting(1)), XCode::OK);
+        ASSERT_EQ(bert.adapter->setCallProperty(acting(1)), XCode::OK);
+        settle();
+        unsigned int left = skipped;
+        std::function<void()> act;
+        act = [&]
+        {
+            if (left-- > 0)
+                deeds->onEnd = act;
+            else
+                anna.adapter.reset();
+        };
+        deeds->onEnd = act;
+        anna.hangUp();
+        *deeds = {};
+        expectNothingLeft({&anna, &bert});
+    }
+}
+
+TEST_F(HostileProperties, AnEndingPropertyMayDialAnewWithoutLosingTheNewCallsProperties)
+{
+    for (unsigned int skipped = 0; skipped < 8; ++skipped)
+    {
+        Party anna("anna"), bert("bert"), carl("carl");
+        connect(anna, bert);
+        ASSERT_EQ(anna.adapter->setCallProperty(acting(1)), XCode::OK);
+        settle();
+        unsigned int left = skipped;
+        std::function<void()> act;
+        act = [&]
+        {
+            if (left-- > 0)
+                deeds->onEnd = act;
+            else
+                std::ignore = anna.dial(carl); // refused as long as anything of the old call is left
+        };
+        deeds->onEnd = act;
+        anna.hangUp();
+        *deeds = {};
+        if (anna.getCall() != nullptr)
+        {
+            EXPECT_NE(anna.adapter->getCallProperty(CONTEXT), nullptr);
+        }
+        bert.hangUp();
+        expectNothingLeft({&anna, &bert, &carl});
+    }
+}
+
+TEST_F(HostileProperties, WhatAPropertyWritesInsideADialIsNotThereTwice)
+{
+    Party anna("anna"), bert("bert");
+    CC_PropertyContainer own;
+    ASSERT_EQ(own.set(acting(1, ALERT_INFO)), XCode::OK);
+    std::function<void()> act = [&]
+    {
+        deeds->onClone = act;
+        if (anna.adapter->getOwnCallLeg() == nullptr)
+            return;
+        deeds->onClone = nullptr;
+        EXPECT_EQ(anna.say(DISPLAY, "early"), XCode::OK);
+    };
+    deeds->onClone = act;
+    ASSERT_EQ(own.set(CC_PropertyString(DISPLAY, "given")), XCode::OK);
+    ASSERT_EQ(anna.dial(bert, own), XCode::OK);
+    String text;
+    EXPECT_EQ(anna.adapter->getOwnCallLeg()->getProperties().get(DISPLAY)->getValueString(text), "given");
+    EXPECT_EQ(anna.adapter->getOwnProperty(DISPLAY)->getValueString(text), "given") << "the only one";
+    *deeds = {};
+    act = nullptr;
+    expectNothingLeft({&anna, &bert});
+}
+
+// --- containers ------------------------------------------------------------------------------------------------------
+
+TEST_F(HostileProperties, APropertyMayDestroyTheContainerThatStoresAssignsOrClearsIt)
+{
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onEnd})
+        for (unsigned int way = 0; way < 4; ++way)
+        {
+            *deeds = {};
+            CC_PropertyContainer const source = several(2);
+            auto container = std::make_unique<CC_PropertyContainer>();
+            ASSERT_EQ(container->set(acting(1, DISPLAY)), XCode::OK);
+            (*deeds).*event = [&] { delete container.release(); };
+            CC_PropertyContainer& used = *container;
+            if (way == 0)
+                std::ignore = used.set(source);
+            else if (way == 1)
+                used = source;
+            else if (way == 2)
+                used.clear();
+            else
+                std::ignore = used.set(*source.get(NAME));
+            EXPECT_EQ(container == nullptr, !((*deeds).*event));
+            *deeds = {};
+        }
+}
+
+TEST_F(HostileProperties, ClearingEndsThoughAnEndingPropertyComesBackForEver)
+{
+    CC_PropertyContainer properties;
+    std::function<void()> act = [&]
+    {
+        EXPECT_EQ(properties.set(acting(1)), XCode::OK);
+        deeds->onEnd = act;
+    };
+    ASSERT_EQ(properties.set(acting(1)), XCode::OK);
+    properties.clear();
+    EXPECT_TRUE(properties.isEmpty());
+    ASSERT_EQ(properties.set(acting(1)), XCode::OK);
+    deeds->onEnd = act;
+    properties.clear();
+    EXPECT_LE(properties.getNumberOfProperties(), 1u) << "one stays";
+    *deeds = {};
+    act = nullptr;
+}
