@@ -244,6 +244,8 @@ protected:
 private:
     class Event;
     class Attempt;
+    class Copy;
+    struct Kept;
 
     char const* getEndpointName() const;
     String nameOrAddress(String const& name) const;
@@ -274,6 +276,8 @@ private:
                                                     CC_PropertyContainer& filtered);
     template <class Target, class Written>
     XCode writeFiltered(CC_PropertyView& view, Target* target, Written const& written);
+    template <class Target>
+    XCode writeCopy(CC_PropertyView& view, Target& target, CC_PropertyFilterContainer const& filters);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
     template <class Written>
@@ -286,11 +290,15 @@ private:
     void observeCall(CC_Call& call);
     void unobserveCall();
     void updateOwnCallLeg(CC_Flags const& changed);
+    void filterOwnCallLeg(CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
     template <class OnDifference>
     void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
                     OnDifference const& onDifference);
+    template <class OnDifference>
+    void filterView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
+                    OnDifference const& onDifference, CC_PropertyFilterContainer const& filters);
     void mark(unsigned int id);
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();

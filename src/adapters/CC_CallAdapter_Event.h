@@ -1,8 +1,12 @@
 #pragma once
 
 #include "adapters/CC_CallAdapter.h"
+#include "adapters/CC_CallAdapter_Kept.h"
 #include "platform/eventloop/TYEvent.h"
 #include "properties/CC_Flags.h"
+
+#include <memory>
+#include <new>
 
 /// Collects the ids of changed peer and call properties and tells the module of them in the loop's next turn.
 class CC_CallAdapter::Event : public TYEvent
@@ -13,6 +17,15 @@ public:
     /// Marks the id and posts the event. OK, or FAILURE.
     XCode setPeerPropertyChange(unsigned int id);
 
+    /// What filters have worked on: here, since it is the attempt's and an adapter cannot grow. Made when it is first
+    /// asked for; null when memory is out.
+    Kept* getKept()
+    {
+        if (m_kept == nullptr)
+            m_kept.reset(new (std::nothrow) Kept);
+        return m_kept.get();
+    }
+
 protected:
     ~Event() override = default;
     void handle() override;
@@ -20,4 +33,5 @@ protected:
 private:
     CC_CallAdapter& m_adapter;
     CC_Flags m_flags;
+    std::unique_ptr<Kept> m_kept;
 };

@@ -8,6 +8,7 @@
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
+#include "adapters/CC_CallAdapter_Copy.h"
 #include "adapters/CC_CallAdapter_Event.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
@@ -157,12 +158,20 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
             m_ownView.assign(leg.getProperties(), told);
         return;
     }
+    filterOwnCallLeg(*filters);
+}
+
+/// Apart, so that a call without filters does not pay for it.
+__attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_PropertyFilterContainer const& filters)
+{
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
-    CC_PropertyContainer filtered(leg.getProperties());
-    XCode const result = filters->applyFilters(filtered);
+    Copy const copy(attempt, *this, Kept::OWN_OUTPUT, m_ownCallLeg->getProperties());
+    if (!copy.isWhole())
+        return;
+    XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
-        m_ownView.assign(filtered, {});
+        m_ownView.assign(copy.get(), {});
 }
 
 /// `changed`: the ids of which the peer tells; null when the peer is another.
@@ -198,14 +207,22 @@ void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer cons
         view.follow(source, told, onDifference);
         return;
     }
+    filterView(view, source, told, onDifference, *filters);
+}
+
+template <class OnDifference>
+__attribute__((noinline)) void
+CC_CallAdapter::filterView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
+                           OnDifference const& onDifference, CC_PropertyFilterContainer const& filters)
+{
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
-    CC_PropertyContainer filtered(source);
-    if (attempt.isOver() || filtered.getNumberOfProperties() != source.getNumberOfProperties())
+    Copy const copy(attempt, *this, &view == &m_peerView ? Kept::PEER_OUTPUT : Kept::CALL_OUTPUT, source);
+    if (!copy.isWhole())
         return; // memory is out: better the view of before than one that calls what is there gone
-    std::ignore = filters->applyFilters(filtered); // what the filters leave is what the module sees
+    std::ignore = filters.applyFilters(copy.get()); // what the filters leave is what the module sees
     if (!attempt.isOver() && refresh == m_refreshes)
-        view.follow(filtered, {nullptr, told.number}, onDifference);
+        view.follow(copy.get(), {nullptr, told.number}, onDifference);
 }
 
 void CC_CallAdapter::mark(unsigned int id)

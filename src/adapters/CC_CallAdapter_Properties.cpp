@@ -1,6 +1,7 @@
 // The module's access to the properties of the own leg, the peer leg and the call.
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
+#include "adapters/CC_CallAdapter_Copy.h"
 #include "adapters/CC_CallAdapter_Event.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "calls/CC_Call.h"
@@ -50,9 +51,18 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
     CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return WRITE(*target, written);
-    CC_PropertyContainer filtered;
-    CC_PropertyContainer const* const all = FILTER_INPUT(filters, view.getProperties(), filtered);
-    return all != nullptr && !attempt.isOver() ? WRITE(*target, *all) : XCode::FAILURE;
+    return writeCopy(view, *target, *filters);
+}
+
+/// Apart, so that a call without filters does not pay for it.
+template <class Target>
+__attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view, Target& target,
+                                                          CC_PropertyFilterContainer const& filters)
+{
+    Attempt const attempt(*this);
+    Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view.getProperties());
+    bool const isFiltered = copy.isWhole() && filters.applyFilters(copy.get()).isOk();
+    return isFiltered && !attempt.isOver() ? WRITE(target, copy.get()) : XCode::FAILURE;
 }
 
 template <class Target, class Written>
