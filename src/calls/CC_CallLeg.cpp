@@ -171,11 +171,20 @@ XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result)
 {
     CC_Flags flags;
     CC_Property const* state = nullptr;
+    // nearly all that come through filters are known; of the first ones none is, and need not be looked for twice
+    CC_PropertyContainer::Cursor formers(m_properties);
+    auto const areOurs = [&] { return m_properties.isSelfContained() && properties.isSelfContained(); };
+    bool areKnown = properties.getNumberOfProperties() <= m_properties.getNumberOfProperties() && areOurs();
     auto const storeNext = [&](CC_Property const& property)
     {
+        CC_Property const* const former = areKnown ? formers.find(property.getId()) : nullptr;
+        if (former != nullptr && former->isEqual(property))
+            return;
         bool changed = false;
         if (XCode const stored = storeAndMark(property, flags, changed); result.isOk())
             result = stored;
+        areKnown = former != nullptr && areOurs();
+        formers = CC_PropertyContainer::Cursor(m_properties); // who logs it may have written to the leg
     };
     for (CC_Property const& property : properties)
     {

@@ -232,6 +232,39 @@ TEST_F(CC_CallLegTest, ALineWithoutALegNameHasAnEmptyPlaceForIt)
     EXPECT_EQ(monitor.linesOfLevel(RTD::LEVEL_CHANGE), Lines{"[EP ] Set call-leg property: Network -> pstn"});
 }
 
+TEST_F(CC_CallLegTest, WhoLogsOneOfSeveralMayRemoveTheNextOnesFromTheLeg)
+{
+    class RemovingMonitor : public RecordingMonitor
+    {
+    public:
+        explicit RemovingMonitor(CC_CallLeg& leg) : m_leg(leg) {}
+        void write(unsigned int monitorId, unsigned int level, char const* text) override
+        {
+            RecordingMonitor::write(monitorId, level, text);
+            if (getLines().size() > 1)
+                return;
+            for (unsigned int const id : {CC_PropertyId::NAME, CC_PropertyId::DISPLAY})
+                EXPECT_TRUE(m_leg.getPropertiesToWrite().remove(id));
+        }
+
+    private:
+        CC_CallLeg& m_leg;
+    };
+    CC_CallLeg& leg = newObservedLeg();
+    CC_PropertyContainer properties;
+    for (unsigned int const id : {CC_PropertyId::NETWORK, CC_PropertyId::NAME, CC_PropertyId::DISPLAY})
+        ASSERT_EQ(properties.set(CC_PropertyString(id, "x")), XCode::OK);
+    ASSERT_EQ(leg.setProperties(properties), XCode::OK);
+    m_journal.clear();
+    ASSERT_EQ(properties.set(NETWORK("pstn")), XCode::OK);
+    RemovingMonitor const monitor(leg);
+    EXPECT_EQ(leg.setProperties(properties), XCode::OK);
+    EXPECT_EQ(m_journal.take(), Lines{"o: L changed (Network, Name, Display)"});
+    EXPECT_EQ(monitor.linesOfLevel(RTD::LEVEL_CHANGE),
+              (Lines{"[EP L] Set call-leg property: Network -> pstn", "[EP L] Set call-leg property: Name -> x",
+                     "[EP L] Set call-leg property: Display -> x"}));
+}
+
 TEST_F(CC_CallLegTest, SetPropertyNoNotificationTellsNobody)
 {
     CC_CallLeg& leg = newObservedLeg();

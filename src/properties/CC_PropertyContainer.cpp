@@ -272,10 +272,10 @@ CC_PropertyContainer const& CC_PropertyContainer::EMPTY()
 
 CC_Property* CC_PropertyContainer::Cursor::findElsewhere(unsigned int id)
 {
-    Position position = m_container.m_properties.begin();
-    while (position != m_container.m_properties.end() && position->getId() != id)
+    Position position = m_container->m_properties.begin();
+    while (position != m_container->m_properties.end() && position->getId() != id)
         ++position;
-    if (position == m_container.m_properties.end())
+    if (position == m_container->m_properties.end())
         return nullptr;
     CC_Property& found = *position;
     m_next = ++position;

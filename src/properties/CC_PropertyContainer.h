@@ -175,13 +175,13 @@ private:
     public:
         /// Removing properties disturbs it, adding does not.
         explicit Cursor(CC_PropertyContainer& container)
-            : m_container(container), m_next(container.m_properties.begin())
+            : m_container(&container), m_next(container.m_properties.begin())
         {
         }
         /// The property of that id, null if there is none.
         CC_Property* find(unsigned int id)
         {
-            if (m_next == m_container.m_properties.end() || m_next->getId() != id)
+            if (m_next == m_container->m_properties.end() || m_next->getId() != id)
                 return findElsewhere(id);
             CC_Property& found = *m_next;
             ++m_next;
@@ -191,7 +191,7 @@ private:
     private:
         CC_Property* findElsewhere(unsigned int id);
 
-        CC_PropertyContainer& m_container;
+        CC_PropertyContainer* m_container;
         Position m_next;
     };
 
