@@ -47,6 +47,16 @@ public:
     }
 
 private:
+    friend CC_PropertyClass<CC_PropertyCause>;
+    void takeWhole(CC_PropertyCause const& other)
+    {
+        if (m_text != other.m_text) // comparing is cheaper than copying
+            m_text = other.m_text;  // throws before anything has changed
+        m_cause = other.m_cause;
+        m_sipCode = other.m_sipCode;
+        CC_Property::operator=(other);
+    }
+
     QCause m_cause = QCause::NONE;
     unsigned int m_sipCode = 0;
     String m_text;
