@@ -9,6 +9,7 @@
 #include "calls/CC_CallLeg.h"
 #include "platform/eventloop/TYEvent.h"
 #include "sip/SipCause.h"
+#include "sip/SipPropertyId.h"
 
 #include <spdlog/spdlog.h>
 
@@ -81,6 +82,8 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
 {
+    if (!SipPropertyId::DECLARE().isOk())
+        throw std::runtime_error("the names of the SIP properties cannot be declared");
     m_stack.attach(m_callControlLoop);
     m_stack.attach(m_datapathLoop);
     m_stack.watch(m_signals.get(), [this] { onSignal(); });

@@ -1,14 +1,22 @@
 #pragma once
 
-/// The properties that the SIP modules exchange beyond those that every module knows. They are of the group of the
-/// party information (0x4002xx), so containers copy them with it.
+#include "platform/base/XCode.h"
+#include "properties/CC_PropertyId.h"
+
+/// The properties that the SIP modules exchange beyond those that every module knows, under ids that are set apart for
+/// modules.
 namespace SipPropertyId
 {
-inline constexpr unsigned int SESSION_DESCRIPTION =
-    0x4002f0;                                          ///< CC_PropertyString, of a leg: its side's own offer or answer
-inline constexpr unsigned int CALL_NUMBER = 0x4002f1;  ///< CC_PropertyUnsigned, of a call: the gateway's number for it
-inline constexpr unsigned int MAX_FORWARDS = 0x4002f2; ///< CC_PropertyUnsigned, of an offer: how many hops are left
+/// CC_PropertyString, of a leg: its side's own offer or answer
+inline constexpr unsigned int SESSION_DESCRIPTION = CC_PropertyId::FIRST_OF_MODULES;
+/// CC_PropertyUnsigned, of a call: the gateway's number for it
+inline constexpr unsigned int CALL_NUMBER = CC_PropertyId::FIRST_OF_MODULES + 1;
+/// CC_PropertyUnsigned, of an offer: how many hops are left
+inline constexpr unsigned int MAX_FORWARDS = CC_PropertyId::FIRST_OF_MODULES + 2;
 
-/// The name of any property id, these included; "(unknown)" otherwise.
+/// Declares the names of these three, with which logs and dumps show them from then on: OK, also when they have these
+/// already; otherwise as CC_PropertyTable::DECLARE.
+XCode DECLARE();
+/// The name of any property id, these included once they are declared; "(unknown)" otherwise.
 char const* NAME(unsigned int id);
 } // namespace SipPropertyId

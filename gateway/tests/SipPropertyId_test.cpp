@@ -1,15 +1,25 @@
 #include "sip/SipPropertyId.h"
 
-#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
 
 #include <gtest/gtest.h>
 
 TEST(SipPropertyId, OwnAndKnownIdsHaveNames)
 {
+    EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK);
     EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::SESSION_DESCRIPTION), "Session-Description");
     EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::CALL_NUMBER), "Call-Number");
     EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::MAX_FORWARDS), "Max-Forwards");
     EXPECT_STREQ(SipPropertyId::NAME(CC_PropertyId::STATE), "State");
     EXPECT_STREQ(SipPropertyId::NAME(CC_PropertyId::UNNAMED_BOOLEAN), "(unknown)");
     EXPECT_STREQ(SipPropertyId::NAME(0), "(unknown)");
+}
+
+TEST(SipPropertyId, LogsShowTheNamesOfThoseOfTheGateway)
+{
+    EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK);
+    EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK) << "a second gateway in the process declares the same";
+    CC_PropertyString const session(SipPropertyId::SESSION_DESCRIPTION, "v=0");
+    InfoContainer info;
+    EXPECT_EQ(session.getInfo(info, 9, 0, 9, 0, "").getString_TreeFormat(), "Session-Description: v=0 (String)\n");
 }
