@@ -4,10 +4,7 @@
 #include "WithholdRestricted.h"
 #include "callcontrol/CallControl.h"
 #include "properties/CC_Flags.h"
-#include "properties/CC_PropertyCallProgressTone.h"
-#include "properties/CC_PropertyCause.h"
-#include "properties/CC_PropertyId.h"
-#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyKeys.h"
 #include "services/CC_ServiceBlindTransfer.h"
 #include "services/CC_ServiceBlindTransferStatus.h"
 #include "services/CC_ServiceUserInput.h"
@@ -44,11 +41,14 @@ Line::Line(String const& name, String const& number, Telephone& telephone, Route
     , m_telephone(telephone)
     , m_route(route)
     , m_isEnBloc(isEnBloc)
+    , m_noAnswer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_NO_ANSWER, this)
 {
 }
 
 XCode Line::open()
 {
+    if (XCode const result = DECLARE_RING_RHYTHM(); !result.isOk())
+        return result;
     if (!m_filters.addFilter(WithholdRestricted()).isOk() || !bind(*m_call).isOk() || !bind(*m_consultation).isOk())
         return XCode::FAILURE;
     return CallControl::ADD_PROVIDER("SWITCH", m_name, *this);
@@ -81,14 +81,16 @@ XCode Line::place(CC_CallAdapterE164& adapter, String const& number, bool isComp
         return XCode::REFUSED;
     CC_PropertyContainer offer;
     if (rhythm != 0)
-        if (XCode const result = offer.set(RingRhythm(RingRhythm::ID, rhythm)); !result.isOk())
+        if (XCode const result = offer.set(RING_RHYTHM, rhythm); !result.isOk())
             return result;
     auto const dial = [&]
     {
-        return adapter.dial("SWITCH", m_route(number), number, m_number, QTypeOfNumber::INTERNATIONAL,
-                            QNumberingPlan::ISDN, getPresentation(), QScreeningIndicator::NETWORK_PROVIDED, m_name,
-                            number, QTypeOfNumber::INTERNATIONAL, QNumberingPlan::ISDN, "", isComplete,
-                            QInformationTransferCapability::SPEECH, nullptr, nullptr, &offer, nullptr);
+        return adapter.dial({.providerName = m_route(number),
+                             .destination = number,
+                             .calling = getParty(),
+                             .called = {.number = number, .typeOfNumber = QTypeOfNumber::INTERNATIONAL},
+                             .sendingComplete = isComplete,
+                             .extraOfferProperties = &offer});
     };
     XCode const result = GUARDED(dial);
     if (!result.isOk())
@@ -99,9 +101,13 @@ XCode Line::place(CC_CallAdapterE164& adapter, String const& number, bool isComp
     return result;
 }
 
-QPresentationIndicator Line::getPresentation() const
+CC_CallAdapterE164::Party Line::getParty() const
 {
-    return m_isRestricted ? QPresentationIndicator::RESTRICTED : QPresentationIndicator::ALLOWED;
+    return {.number = m_number,
+            .typeOfNumber = QTypeOfNumber::INTERNATIONAL,
+            .presentation = m_isRestricted ? QPresentationIndicator::RESTRICTED : QPresentationIndicator::ALLOWED,
+            .screening = QScreeningIndicator::NETWORK_PROVIDED,
+            .name = m_name};
 }
 
 void Line::key(String const& digits)
@@ -124,26 +130,22 @@ XCode Line::dial(CC_Call& call, String const&, String const& destination, CC_Pro
 
 XCode Line::handleOffer(CC_Call& call, String const& name, CC_PropertyContainer const& offered)
 {
-    auto const* const own = State::FROM(m_call->getOwnProperty(CC_PropertyId::STATE));
-    if (own != nullptr && own->getState() == State::ADDRESS_INCOMPLETE)
+    if (m_call->getOwn(Key::STATE) == State::ADDRESS_INCOMPLETE)
         m_call->drop(QCause::NORMAL_CALL_CLEARING, 0); // the caller dials once more, with more digits
     if (m_call->getCall() != nullptr)
     {
         actionRejectOfferedCall_WithCause(call, CC_PropertyContainer::EMPTY(), QCause::USER_BUSY);
         return XCode::OK;
     }
-    if (XCode const result = m_call->accept(call, m_number, QTypeOfNumber::INTERNATIONAL, QNumberingPlan::ISDN,
-                                            getPresentation(), QScreeningIndicator::NETWORK_PROVIDED, m_name);
-        !result.isOk())
+    if (XCode const result = GUARDED([&] { return m_call->acceptAs(call, getParty()); }); !result.isOk())
     {
         std::ignore = bind(*m_call);
         return result;
     }
-    auto const* const rhythm = RingRhythm::FROM(offered.get(RingRhythm::ID));
-    m_rhythm = rhythm != nullptr ? rhythm->getValue() : 0;
+    m_rhythm = offered.get(RING_RHYTHM).getValueOr(0u);
     m_collected.clear();
-    auto const* const number = CC_PropertyString::FROM(offered.get(CC_PropertyId::E164_NUMBER));
-    return collect(number != nullptr ? number->getValue() : name);
+    auto const number = offered.get(Key::E164_NUMBER);
+    return collect(number ? number->getValue() : name);
 }
 
 XCode Line::collect(String const& digits)
@@ -153,6 +155,7 @@ XCode Line::collect(String const& digits)
     if (m_collected == m_number)
     {
         m_telephone.ring(m_call->getPeerE164(), m_call->getPeerName(), m_rhythm);
+        m_noAnswer.start(RINGING_TIME);
         return become(State::ALERTING);
     }
     if (m_number.startsWith(m_collected))
@@ -166,7 +169,7 @@ XCode Line::collect(String const& digits)
 
 XCode Line::answer() { return become(State::CONNECTED); }
 
-XCode Line::become(State::State state) { return m_call->setOwnProperty(State(CC_PropertyId::STATE, state)); }
+XCode Line::become(State::State state) { return m_call->setOwn(Key::STATE, state); }
 
 // --- what the other side does ----------------------------------------------------------------------------------------
 
@@ -174,13 +177,12 @@ void Line::notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const& cha
 {
     auto& told = static_cast<CC_CallAdapterE164&>(adapter);
     if (changed.get(CC_PropertyId::CALL_PROGRESS_TONE))
-        if (auto const* const tone =
-                CC_PropertyCallProgressTone::FROM(told.getPeerProperty(CC_PropertyId::CALL_PROGRESS_TONE)))
+        if (auto const tone = told.getPeer(Key::CALL_PROGRESS_TONE))
             m_telephone.hear(tone->getTone());
     if (changed.get(CC_PropertyId::DISPLAY))
         m_telephone.show(told.getPeerDisplay());
     if (changed.get(CC_PropertyId::CHARGE))
-        if (CC_Property const* const charge = told.getPeerProperty(CC_PropertyId::CHARGE))
+        if (auto const charge = told.getPeer(Key::CHARGE))
         {
             auto const show = [&]
             {
@@ -196,19 +198,16 @@ void Line::notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const& cha
 
 void Line::followState(CC_CallAdapterE164& adapter)
 {
-    auto const* const peer = State::FROM(adapter.getPeerProperty(CC_PropertyId::STATE));
-    if (peer == nullptr)
-        return; // nobody else is in the call any more, or not yet
-    if (peer->getState() == State::ALERTING)
+    auto const peer = adapter.getPeer(Key::STATE);
+    if (peer == State::ALERTING)
         m_telephone.hear(Tones::RINGING);
-    else if (peer->getState() == State::HELD)
+    else if (peer == State::HELD)
         m_telephone.hear(Tones::HOLD);
-    else if (peer->getState() == State::CONNECTED)
+    else if (peer == State::CONNECTED)
         m_telephone.hear(Tones::NONE);
-    else if (peer->getState() == State::RELEASED)
+    else if (!peer || peer == State::RELEASED) // without a peer the leg was taken out of the call
     {
-        auto const* const cause = CC_PropertyCause::FROM(adapter.getPeerCauseProperty());
-        QCause const why = cause != nullptr ? cause->getCause() : QCause::NORMAL_CALL_CLEARING;
+        QCause const why = adapter.getPeer(Key::CAUSE, QCause::NORMAL_CALL_CLEARING);
         adapter.drop(QCause::NORMAL_CALL_CLEARING, 0);
         m_telephone.clear(why);
     }
@@ -217,8 +216,7 @@ void Line::followState(CC_CallAdapterE164& adapter)
 void Line::notifyPeerSynchronousService(CC_CallAdapter& adapter, CC_Service& service)
 {
     auto& asked = static_cast<CC_CallAdapterE164&>(adapter);
-    auto const* const own = State::FROM(asked.getOwnProperty(CC_PropertyId::STATE));
-    if (service.isOfType(CC_ServiceUserInput::TYPE()) && own != nullptr && own->getState() == State::ADDRESS_INCOMPLETE)
+    if (service.isOfType(CC_ServiceUserInput::TYPE()) && asked.getOwn(Key::STATE) == State::ADDRESS_INCOMPLETE)
         std::ignore = collect(static_cast<CC_ServiceUserInput&>(service).getInput());
     else if (service.isOfType(CC_ServiceBlindTransfer::TYPE()))
         follow(asked, static_cast<CC_ServiceBlindTransfer&>(service).getNumber());
@@ -274,10 +272,22 @@ void Line::follow(CC_CallAdapterE164& adapter, String const& number)
     std::swap(m_call, m_consultation); // the new call is the line's
 }
 
+// --- time ------------------------------------------------------------------------------------------------------------
+
+void Line::ON_NO_ANSWER(void* line)
+{
+    auto& self = *static_cast<Line*>(line);
+    if (self.m_call->getOwn(Key::STATE) != State::ALERTING)
+        return; // the call that rang has gone on, or ended
+    self.m_call->drop(QCause::NO_ANSWER_FROM_USER, 0);
+    self.m_telephone.clear(QCause::NO_ANSWER_FROM_USER);
+}
+
 // --- the end ---------------------------------------------------------------------------------------------------------
 
 void Line::hangUp()
 {
+    m_noAnswer.stop();
     m_consultation->drop(QCause::NORMAL_CALL_CLEARING, 0);
     m_call->drop(QCause::NORMAL_CALL_CLEARING, 0);
 }

@@ -4,6 +4,7 @@
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "callcontrol/provider/CC_Provider.h"
+#include "platform/eventloop/TYTimer.h"
 #include "platform/media/MG_Tones.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyFilterContainer.h"
@@ -18,15 +19,17 @@ public:
     virtual void ring(String const& number, String const& name, unsigned int rhythm) = 0;
     virtual void hear(Tone tone) = 0; ///< NONE: what the other side sends
     virtual void show(String const& text) = 0;
-    virtual void clear(QCause cause) = 0; ///< the other side has gone
+    virtual void clear(QCause cause) = 0; ///< the call is over, and the user did not end it
 };
 
 /// A telephone line: a module with one number, one call and a second one to consult somebody. Registered under its name
-/// while it lives. Everything happens on the call-control loop's thread.
+/// while it lives. Everything happens on the call-control loop's thread; that loop is set before the line is made.
 class Line : public CC_Provider, public CC_Endpoint, public CC_CallAdapterObserver
 {
 public:
     using State = CC_PropertyCallLegState;
+
+    static constexpr unsigned int RINGING_TIME = 60000; ///< milliseconds until a call that nobody answers ends
 
     /// The name of the provider that carries a number, or its first digits: routing is the application's.
     using Route = char const* (*)(String const& number);
@@ -34,7 +37,7 @@ public:
     /// `isEnBloc`: a number that comes bit by bit is of no use here. Throws std::bad_alloc when memory is out.
     Line(String const& name, String const& number, Telephone& telephone, Route route, bool isEnBloc = false);
     ~Line() override;
-    /// Registers the line: OK, REFUSED when the name is taken, FAILURE when memory is out.
+    /// Registers the line: OK, REFUSED when the name is taken, another result when memory is out.
     XCode open();
 
     // what the user does; the results are those of the adapters
@@ -71,7 +74,8 @@ private:
     XCode collect(String const& digits);
     void followState(CC_CallAdapterE164& adapter);
     void follow(CC_CallAdapterE164& adapter, String const& number);
-    QPresentationIndicator getPresentation() const;
+    CC_CallAdapterE164::Party getParty() const;
+    static void ON_NO_ANSWER(void* line);
 
     String m_name;
     String m_number;
@@ -81,6 +85,7 @@ private:
     bool m_isRestricted = false;
     String m_collected;        // of the called number
     unsigned int m_rhythm = 0; // of the call that is offered
+    TYTimer m_noAnswer;
     CC_PropertyFilterContainer m_filters;
     CC_CallAdapterE164 m_adapters[2];
     CC_CallAdapterE164* m_call = &m_adapters[0];

@@ -1,11 +1,11 @@
 #include "Line.h"
 
 #include "RingRhythm.h"
+#include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CallControl.h"
-#include "properties/CC_PropertyCallProgressTone.h"
-#include "properties/CC_PropertyCharge.h"
-#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKeys.h"
 #include "testing/CallControlFixture.h"
+#include "testing/DrivenClock.h"
 #include "testing/FailingAllocator.h"
 #include "testing/FakeModule.h"
 
@@ -60,6 +60,7 @@ struct LineTest : testing::Test, CallControlFixture
         return journal.take();
     }
 
+    DrivenClock clock;
     Journal journal;
     FakeTelephone annas{"anna", &journal};
     FakeTelephone berts{"bert", &journal};
@@ -91,6 +92,13 @@ TEST_F(LineTest, ARestrictedCallerIsNotShown)
     EXPECT_EQ(happened().front(), "bert: rings,  , rhythm 3");
 }
 
+TEST_F(LineTest, DumpsShowTheRhythmByItsName)
+{
+    InfoContainer info;
+    EXPECT_EQ(RING_RHYTHM.make(3u).getInfo(info, 1, 0, 1, 0, "").getString_TreeFormat(),
+              "Ring-Rhythm: rhythm 3 (Ring-Rhythm)\n");
+}
+
 TEST_F(LineTest, ANumberMayComeDigitByDigit)
 {
     EXPECT_EQ(anna.call("498", false), XCode::OK);
@@ -113,6 +121,25 @@ TEST_F(LineTest, ALineThatWantsTheNumberAtOnceIsDialledAgain)
     EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS(), 1u);
 }
 
+TEST_F(LineTest, ACallThatNobodyAnswersEnds)
+{
+    EXPECT_EQ(anna.call("4989123"), XCode::OK);
+    happened();
+    clock.advance(Line::RINGING_TIME - 1);
+    EXPECT_EQ(happened(), Lines());
+    clock.advance(1);
+    EXPECT_EQ(happened(), (Lines{"bert: cleared 19", "anna: cleared 19"}));
+}
+
+TEST_F(LineTest, ACallThatIsAnsweredIsNotEndedByTheTimer)
+{
+    EXPECT_EQ(anna.call("4989123"), XCode::OK);
+    EXPECT_EQ(bert.answer(), XCode::OK);
+    happened();
+    clock.advance(Line::RINGING_TIME);
+    EXPECT_EQ(happened(), Lines());
+}
+
 TEST_F(LineTest, AWrongNumberAndABusyLineSaySo)
 {
     EXPECT_EQ(anna.call("4985"), XCode::OK);
@@ -126,13 +153,11 @@ TEST_F(LineTest, AWrongNumberAndABusyLineSaySo)
 TEST_F(LineTest, TonesTextsAndChargesReachTheTelephone)
 {
     EXPECT_EQ(anna.call("115"), XCode::OK);
-    EXPECT_EQ(
-        carl.say(CC_PropertyCallProgressTone(CC_PropertyId::CALL_PROGRESS_TONE, MG_Tones::ECallProgressTone::QUEUE)),
-        XCode::OK);
+    EXPECT_EQ(carl.say(Key::CALL_PROGRESS_TONE.make(MG_Tones::ECallProgressTone::QUEUE)), XCode::OK);
     EXPECT_EQ(carl.say(CC_PropertyId::DISPLAY, "two before you"), XCode::OK);
     CC_PropertyCharge::Charge charge;
     charge.select(charge.m_freeOfCharge);
-    EXPECT_EQ(carl.say(CC_PropertyCharge(CC_PropertyId::CHARGE, charge)), XCode::OK);
+    EXPECT_EQ(carl.say(Key::CHARGE.make(charge)), XCode::OK);
     EXPECT_EQ(happened(), (Lines{"anna: hears 35", "anna: shows two before you", "anna: shows Free"}));
 }
 
@@ -196,6 +221,16 @@ TEST_F(LineTest, MemoryMayRunOutAtAnyMoment)
         ASSERT_EQ(CallControl::GET_NUMBER_OF_CALLS(), 0u) << "allocation " << n;
     }
     EXPECT_EQ(journal.take().back(), "anna: hears 0") << "in the end the call is up";
+}
+
+TEST_F(LineTest, ACallThatTheOperatorDropsIsCleared)
+{
+    EXPECT_EQ(anna.call("4989123"), XCode::OK);
+    EXPECT_EQ(bert.answer(), XCode::OK);
+    happened();
+    getPool()->dropCalls("", "");
+    EXPECT_EQ(happened(), (Lines{"bert: cleared 16", "anna: cleared 16"}));
+    EXPECT_EQ(anna.call("4989123"), XCode::OK) << "both are idle again";
 }
 
 TEST_F(LineTest, ALineMayGoAwayInTheMiddleOfACall)

@@ -1,8 +1,7 @@
 #include "WithholdRestricted.h"
 
 #include "properties/CC_PropertyContainer.h"
-#include "properties/CC_PropertyId.h"
-#include "properties/CC_PropertyPresentationIndicator.h"
+#include "properties/CC_PropertyKeys.h"
 
 #include <new>
 
@@ -10,9 +9,8 @@ CC_PropertyFilter* WithholdRestricted::clone() const { return new (std::nothrow)
 
 XCode WithholdRestricted::apply(CC_PropertyContainer& properties) const
 {
-    auto const* const presentation =
-        CC_PropertyPresentationIndicator::FROM(properties.get(CC_PropertyId::PRESENTATION_INDICATOR));
-    if (presentation == nullptr || presentation->getValue() == QPresentationIndicator::ALLOWED)
+    if (properties.get(Key::PRESENTATION_INDICATOR).getValueOr(QPresentationIndicator::ALLOWED) ==
+        QPresentationIndicator::ALLOWED)
         return XCode::OK;
     properties.remove(CC_PropertyId::E164_NUMBER);
     properties.remove(CC_PropertyId::NAME);
