@@ -15,6 +15,9 @@
 ///             break;                             // fewer than n allocations: all were tried
 ///     }
 ///
+/// Bring everything back to its beginning in each round: what refuses to go on after a failure (CC_CallAdapter::dial)
+/// allocates nothing, and the loop ends early. Assert behind it that the last round did it all.
+///
 /// Memory that TYRecycled keeps for reuse is no allocation: `TYRecycled::KEEP_BLOCKS(0)` first, as the test main does.
 /// The fakes and recorders of the kit do not count: they work in a Pause. A program with a main of its own links
 /// `callcontrol::testing-new`, or its own operator new asks `isToFail()`; in one that does neither `failNth` aborts.

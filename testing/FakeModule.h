@@ -41,7 +41,8 @@ public:
     FakeModule& operator=(FakeModule const&) = delete;
 
     String const& getName() const { return m_endpoint.getName(); }
-    /// The number with which the line dials and accepts from now on; empty: none.
+    /// The number with which the line accepts and dials other fakes from now on; empty: none. The dial with containers
+    /// takes `own` as it is, without the number.
     void setNumber(String const& number) { m_number = number; }
 
     // --- what becomes of offers; they are accepted unless the test says otherwise ------------------------------------
@@ -68,7 +69,8 @@ public:
     /// The user keys digits in.
     void key(String const& digits);
     void hangUp(QCause cause = QCause::NORMAL_CALL_CLEARING);
-    /// A new adapter in place of the one before, which drops.
+    /// A new adapter in place of the one before, which drops. After a dial or accept that memory kept from a leg there
+    /// is no other way to the next call (CC_CallAdapter::dial).
     void renew();
 
     // --- what the module sees ----------------------------------------------------------------------------------------

@@ -2,6 +2,7 @@
 
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "callcontrol/provider/CC_Provider.h"
+#include "properties/CC_PropertyId.h"
 
 #include <memory>
 #include <string>
@@ -21,7 +22,7 @@ public:
     virtual unsigned int getTypeOfUserInput() const = 0;
     /// The type number of the module's own property class, and a property of it that the module has put on its leg.
     virtual unsigned int getTypeIdOfOwnClass() const = 0;
-    static constexpr unsigned int OWN_ID = 0x4002e0;
+    static constexpr unsigned int OWN_ID = CC_PropertyId::FIRST_OF_MODULES;
     virtual void hangUp() = 0;
 };
 

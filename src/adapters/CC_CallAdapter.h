@@ -79,13 +79,16 @@ public:
     /// be had; FAILURE for an unknown provider, one that refuses, and all else. After these two the own leg was dropped
     /// with cause 38. A log line of level 1 says which it was.
     ///
+    /// When memory ran out so early that there is no own leg, the adapter is not idle again: from then on it refuses
+    /// everything, and `drop` does nothing, until `cleanup()`; then it is set up anew.
+    ///
     /// The endpoint's input filters of the beginning filter the call's and the offer's properties, whatever is set
     /// meanwhile. Whoever hears of the new call may drop or destroy this adapter: then FAILURE.
     virtual XCode dial(String const& contextName, String const& providerName, String const& destination,
                        CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                        CC_PropertyContainer const& callProperties, MG_IContext* datapathContext);
     /// Joins a call that was offered to the endpoint, with an own leg in state TRYING. OK; REFUSED as for `dial`;
-    /// FAILURE otherwise, the own leg was then dropped with cause 38.
+    /// FAILURE otherwise, the own leg was then dropped with cause 38; without a leg as for `dial`.
     virtual XCode accept(CC_Call& call, CC_PropertyContainer const& ownProperties);
     /// Moves the other legs of the other adapter's call into this one's. With `removeOwnLeg` this adapter's leg leaves
     /// its call first (a transfer: the two peers are connected), without it stays (a conference). The other adapter's

@@ -115,7 +115,8 @@ public:
     /// Joins an offered call, with the answering party's data as own properties. OK, or FAILURE.
     virtual XCode accept(CC_Call& call, String const& number, QTypeOfNumber typeOfNumber, QNumberingPlan numberingPlan,
                          QPresentationIndicator presentation, QScreeningIndicator screening, String const& name);
-    /// The same, with the arguments in a form: `adapter.acceptAs(call, {.number = "4989123", .name = "Bob"})`.
+    /// The same, with the arguments in a form: `adapter.acceptAs(call, {.number = "4989123", .name = "Bob"})`. Making
+    /// it may throw, too.
     XCode acceptAs(CC_Call& call, Party const& answering);
 
     // The called side of a call that may be dialled overlap says with `setOwnSupportsOverlapReceiving` whether it takes

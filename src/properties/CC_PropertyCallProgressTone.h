@@ -5,7 +5,9 @@
 
 /// The tone that a party is to hear, with an accompanying text such as a parameter of the tone. Not settable by text.
 ///
-///     adapter.setPeer(Key::CALL_PROGRESS_TONE, MG_Tones::ECallProgressTone::RINGING);
+/// A side says it of its own leg; the module at the other side hears that its peer's changed, and plays it.
+///
+///     adapter.setOwn(Key::CALL_PROGRESS_TONE, MG_Tones::ECallProgressTone::RINGING);
 class CC_EXPORT CC_PropertyCallProgressTone : public CC_PropertyClass<CC_PropertyCallProgressTone>
 {
 public:

@@ -76,7 +76,7 @@ private:
 /// A property id that knows the class of its properties. Those of the library stand in CC_PropertyKeys.h.
 ///
 /// A module makes keys of its own from the ids that are set apart for modules (CC_PropertyId::FIRST_OF_MODULES), and
-/// declares their names when it starts:
+/// declares their names when it starts, once for the process:
 ///
 ///     inline constexpr CC_PropertyKey<CC_PropertyString> TRUNK_GROUP(CC_PropertyId::FIRST_OF_MODULES + 7);
 ///

@@ -31,8 +31,9 @@ public:
     /// The row of the id, of a declared one as well, or null. Lives for ever.
     static Row const* FIND(unsigned int id);
     /// Gives a module's id its names, which are copied, for as long as the process lives; at start-up, before
-    /// properties of it are about. OK; REFUSED for an id that is not set apart for modules or has names, and for names
-    /// that are empty or another id's; NO_ELEMENT when memory is out.
+    /// properties of it are about. OK; REFUSED for an id that is not set apart for modules or has names, be they the
+    /// same, and for names that are empty or another id's; NO_ELEMENT when memory is out. What may come to it twice, as
+    /// each object of a module or each test does, asks FIND first.
     ///
     ///     CC_PropertyTable::DECLARE(CC_PropertyId::FIRST_OF_MODULES + 7, "Trunk-Group", "trunk-group");
     static XCode DECLARE(unsigned int id, char const* longName, char const* shortName);

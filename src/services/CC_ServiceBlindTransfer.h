@@ -6,7 +6,8 @@
 ///
 /// The module that receives it carries it out: on its wire where that can transfer, otherwise by dialling the number
 /// with another adapter and transferring its call. It tells the outcome the other way, with a
-/// CC_ServiceBlindTransferStatus.
+/// CC_ServiceBlindTransferStatus, inside this request or any time later; a module that does not know the service tells
+/// nothing, so who asks waits with a timer.
 ///
 ///     CC_ServiceBlindTransfer transfer("*7", "49891234");
 ///     leg.invokeSynchronousService(transfer);
