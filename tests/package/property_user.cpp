@@ -7,7 +7,7 @@ class CC_EXPORT CC_PropertyPoint : public CC_PropertyClass<CC_PropertyPoint>
 {
 public:
     static constexpr char const* TYPE_NAME = "Point";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyClass::CC_PropertyClass;
     CC_PropertyPoint(unsigned int id, int x, int y) : CC_PropertyClass(id), m_x(x), m_y(y) {}
     String& getValueString(String& out) const override;
@@ -18,7 +18,7 @@ private:
     int m_y = 0;
 };
 
-unsigned int CC_PropertyPoint::s_typeId = CC_Property::NO_TYPE_ID;
+CC_PropertyPoint::TypeId CC_PropertyPoint::s_typeId;
 String& CC_PropertyPoint::getValueString(String& out) const { return out.format("%d/%d", m_x, m_y); }
 
 int main()
