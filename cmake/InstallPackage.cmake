@@ -23,4 +23,6 @@ endforeach()
 
 install(DIRECTORY examples/line DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol/examples)
 install(FILES examples/two_modules.cpp DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol/examples)
-install(FILES docs/writing-a-module.md README.md LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(FILES README.md LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(FILES docs/writing-a-module.md docs/event-loop.md docs/architecture.md docs/performance.md
+    DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs) # where the README and they themselves look for each other
