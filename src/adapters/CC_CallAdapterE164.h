@@ -29,9 +29,8 @@ class VoipCodecListSet;
 ///
 ///     CC_CallAdapterE164 adapter;
 ///     std::ignore = adapter.setup("line 7", endpoint, &observer);
-///     if (!adapter.dial({.providerName = "sip", .destination = "trunk", .calling = {.number = "4420791234", .name =
-///     "Ada"},
-///                        .called = {.number = "4989"}}).isOk())
+///     if (!adapter.dial({.providerName = "sip", .destination = "trunk",
+///                        .calling = {.number = "4420791234", .name = "Ada"}, .called = {.number = "4989"}}).isOk())
 ///         ...
 ///     CC_ServiceUserInput digit("1"); // the user keys on
 ///     adapter.invokeSynchronousService(digit);
