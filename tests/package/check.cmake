@@ -24,7 +24,7 @@ file(RENAME ${WORK}/staged ${WORK}/installed)
 must(${CMAKE_COMMAND} -S ${SOURCE} -B ${WORK}/build -G ${GENERATOR} -DCMAKE_PREFIX_PATH=${WORK}/installed
     -DCMAKE_CXX_COMPILER=${COMPILER} -DCMAKE_TOOLCHAIN_FILE=${TOOLCHAIN} "-DCMAKE_CXX_FLAGS=${FLAGS}")
 must(${CMAKE_COMMAND} --build ${WORK}/build)
-foreach(program two_modules property_user kit_user user_of_1_0 memory_user kit_tests)
+foreach(program two_modules property_user kit_user memory_user kit_tests)
     must(${EMULATOR} ${WORK}/build/${program})
 endforeach()
 fails_with("leaves counted objects behind: .*CC_CallLeg: 1 more"
