@@ -33,11 +33,11 @@ class PropertyTrunk : public CC_PropertyValue<PropertyTrunk, unsigned int>
 {
 public:
     static constexpr char const* TYPE_NAME = "Trunk";
-    static unsigned int s_typeId;
+    static TypeId s_typeId;
     using CC_PropertyValue::CC_PropertyValue;
     String& getValueString(String& out) const override { return out.format("trunk %u", getValue()); }
 };
-unsigned int PropertyTrunk::s_typeId = CC_Property::NO_TYPE_ID;
+PropertyTrunk::TypeId PropertyTrunk::s_typeId;
 
 /// Shows the module no displays but its own.
 class FilterDisplay : public CC_PropertyFilter
