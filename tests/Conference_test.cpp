@@ -1,23 +1,15 @@
 // Transfer and conference among three and four adapters, and the choice of the peer.
 #include "properties/CC_PropertyUnsigned.h"
 #include "services/CC_ServiceUserInput.h"
-#include "testing/CallControlFixture.h"
-#include "tests/support/Party.h"
+#include "tests/support/PartyTest.h"
 
 #include <gtest/gtest.h>
 
 namespace
 {
-class Conference : public testing::Test
+class Conference : public PartyTest
 {
 protected:
-    void settle() { fixture.m_loop.settle(); }
-    void connect(Party& caller, Party& callee)
-    {
-        ASSERT_EQ(caller.dial(callee), XCode::OK);
-        ASSERT_EQ(callee.become(State::CONNECTED), XCode::OK);
-        settle();
-    }
     void hangUpAll(std::initializer_list<Party*> parties)
     {
         for (Party* const party : parties)
@@ -26,8 +18,6 @@ protected:
         EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 0u);
         EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
     }
-
-    CallControlFixture fixture;
 };
 
 TEST_F(Conference, ATransferConnectsTheTwoPeersAndLeavesBothConsultingLegsUp)

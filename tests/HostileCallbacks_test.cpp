@@ -1,43 +1,25 @@
-// What calls back besides observers: the media layer, the reboot management, filters; and what observers do to a call
-// that moves or ends. Each of these once touched freed memory or left something behind for ever.
+// What calls back besides observers: the media layer, the reboot management, filters. Each of these once touched freed
+// memory or left something behind for ever.
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyFilterContainer.h"
-#include "testing/CallControlFixture.h"
 #include "testing/FakeRebootMgmt.h"
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingCallObserver.h"
 #include "testing/RecordingMonitor.h"
 #include "testing/RecordingPropertyFilter.h"
-#include "tests/support/Party.h"
+#include "tests/support/PartyTest.h"
 
 #include <functional>
 #include <gtest/gtest.h>
 
 namespace
 {
-class HostileCallbacks : public testing::Test
+class HostileCallbacks : public PartyTest
 {
 protected:
-    void settle() { fixture.m_loop.settle(); }
-    void connect(Party& caller, Party& callee)
-    {
-        ASSERT_EQ(caller.dial(callee), XCode::OK);
-        ASSERT_EQ(callee.become(State::CONNECTED), XCode::OK);
-        settle();
-    }
     static CC_CallPool& pool() { return *CallControl::GET_CALL_POOL("SWITCH"); }
-    void expectNothingLeft(std::initializer_list<Party*> parties)
-    {
-        for (Party* const party : parties)
-            party->adapter.reset();
-        settle();
-        EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
-        EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
-    }
-
-    CallControlFixture fixture;
 };
 
 /// A filter container with one filter that does what the test says.
@@ -183,142 +165,6 @@ TEST_F(HostileCallbacks, ACallGivenBackToAnotherContextIsListedNowhereAndNoLockS
     EXPECT_EQ(reboot.take(), (Lines{"reboot: add Call-Control (Calls are ongoing, 0)", "reboot: release Call-Control"}))
         << "the other pool never found the driver";
     CallControl::DESTROY_CONTEXT("other");
-}
-
-// --- moves and ends --------------------------------------------------------------------------------------------------
-
-TEST_F(HostileCallbacks, EveryLegGoesThoughAnObserverCleansUpInBetween)
-{
-    Party anna("anna"), bert("bert");
-    RecordingCallObserver observer("observer");
-    connect(anna, bert);
-    CC_Call* const call = anna.getCall();
-    ASSERT_EQ(call->addCallObserver(&observer), XCode::OK);
-    observer.m_onLegRemoved = [&](CC_EvCallCallLegModified const&)
-    {
-        observer.m_onLegRemoved = nullptr;
-        call->deferred();
-    };
-    call->destroyParticipatingCallLegs();
-    EXPECT_EQ(call->getNumberOfCallLegs(), 0u);
-    EXPECT_EQ(bert.getCall(), nullptr);
-    expectNothingLeft({&anna, &bert});
-}
-
-TEST_F(HostileCallbacks, ALegOnItsMoveGoesIntoNoCallThatEnds)
-{
-    RecordingCallObserver ofTheEnding("ending");
-    RecordingCallObserver ofTheMove("move");
-    CC_Call* const ending = CallControl::ACQUIRE_CALL("SWITCH");
-    CC_Call* const other = CallControl::ACQUIRE_CALL("SWITCH");
-    auto* const leg = new CC_CallLeg;
-    ASSERT_EQ(ending->addCallObserver(&ofTheEnding), XCode::OK);
-    ASSERT_EQ(other->addCallObserver(&ofTheMove), XCode::OK);
-    XCode sent = XCode::OK;
-    ofTheEnding.m_onEnded = [&](CC_EvCallObservationEnded const& event) { sent = event.getSource()->addCallLeg(*leg); };
-    ofTheMove.m_onLegAdded = [&](CC_EvCallCallLegModified const&) { CallControl::RELEASE_CALL("SWITCH", ending); };
-    EXPECT_EQ(other->addCallLeg(*leg), XCode::OK);
-    EXPECT_EQ(sent, XCode::FAILURE);
-    EXPECT_EQ(leg->getCall(), other);
-    CallControl::RELEASE_CALL("SWITCH", other);
-    leg->removeReference();
-}
-
-TEST_F(HostileCallbacks, AWaitingMoveIntoACallThatWasReleasedMeanwhileIsNotMade)
-{
-    RecordingCallObserver observer("observer");
-    CC_Call* const first = CallControl::ACQUIRE_CALL("SWITCH");
-    CC_Call* const second = CallControl::ACQUIRE_CALL("SWITCH");
-    auto* const leg = new CC_CallLeg;
-    ASSERT_EQ(first->addCallObserver(&observer), XCode::OK);
-    observer.m_onLegAdded = [&](CC_EvCallCallLegModified const& event)
-    {
-        EXPECT_EQ(second->addCallLeg(*event.getCallLeg()), XCode::OK) << "waits";
-        CallControl::RELEASE_CALL("SWITCH", second);
-    };
-    EXPECT_EQ(first->addCallLeg(*leg), XCode::OK);
-    EXPECT_EQ(leg->getCall(), first);
-    EXPECT_EQ(CC_Call::s_numberOfInstances, 1u);
-    CallControl::RELEASE_CALL("SWITCH", first);
-    leg->removeReference();
-}
-
-TEST_F(HostileCallbacks, WhoJoinsInsideTheNewsOfAJoiningLegHearsWhatThatLegChangesMeanwhile)
-{
-    RecordingCallObserver observer("observer");
-    Party anna("anna"), bert("bert");
-    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
-    auto* const joining = new CC_CallLeg;
-    ASSERT_EQ(joining->setProperty(State(CC_PropertyId::STATE, State::CONNECTED)), XCode::OK);
-    ASSERT_EQ(bert.adapter->accept(*call, {}), XCode::OK);
-    ASSERT_EQ(call->addCallObserver(&observer), XCode::OK);
-    observer.m_onLegAdded = [&](CC_EvCallCallLegModified const&)
-    {
-        observer.m_onLegAdded = nullptr;
-        EXPECT_EQ(anna.adapter->accept(*call, {}), XCode::OK);
-        EXPECT_EQ(anna.peerState(), "CONNECTED");
-        EXPECT_EQ(joining->setProperty(State(CC_PropertyId::STATE, State::RELEASED)), XCode::OK);
-    };
-    EXPECT_EQ(call->addCallLeg(*joining), XCode::OK);
-    EXPECT_EQ(anna.peerState(), "TRYING") << "bert";
-    settle();
-    EXPECT_EQ(bert.peerState(), "TRYING") << "who was there before has missed it, and makes up for it";
-    joining->removeReference();
-    expectNothingLeft({&anna, &bert});
-}
-
-TEST_F(HostileCallbacks, AModuleThatReleasedItsLegItselfLeavesNoCallWhenTheOthersAreMovedAway)
-{
-    FakeRebootMgmt reboot;
-    Party anna("anna"), bert("bert"), carl("carl"), dora("dora");
-    connect(anna, bert);
-    connect(carl, dora);
-    ASSERT_EQ(anna.become(State::RELEASED), XCode::OK);
-    settle();
-    ASSERT_EQ(carl.adapter->transfer(*anna.adapter, false), XCode::OK);
-    settle();
-    for (Party* const party : {&anna, &bert, &carl, &dora})
-        party->hangUp();
-    settle();
-    EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 0u);
-    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
-}
-
-TEST_F(HostileCallbacks, ADropHasTheCallLookedAtThoughTheLegWasReleasedBefore)
-{
-    Party anna("anna");
-    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
-    auto* const live = new CC_CallLeg;
-    ASSERT_EQ(live->setProperty(State(CC_PropertyId::STATE, State::CONNECTED)), XCode::OK);
-    ASSERT_EQ(anna.adapter->accept(*call, {}), XCode::OK);
-    ASSERT_EQ(call->addCallLeg(*live), XCode::OK);
-    ASSERT_EQ(anna.become(State::RELEASED), XCode::OK);
-    settle();
-    EXPECT_EQ(call->getNumberOfCallLegs(), 2u) << "anna holds hers";
-    anna.hangUp();
-    settle();
-    EXPECT_EQ(call->getNumberOfCallLegs(), 1u);
-    CallControl::RELEASE_CALL("SWITCH", call);
-    live->removeReference();
-}
-
-TEST_F(HostileCallbacks, ACallThatItsLastLegLeavesForAnotherIsGivenBack)
-{
-    FakeRebootMgmt reboot;
-    CC_Call* const first = CallControl::ACQUIRE_CALL("SWITCH");
-    CC_Call* const second = CallControl::ACQUIRE_CALL("SWITCH");
-    auto* const leg = new CC_CallLeg;
-    ASSERT_EQ(leg->setProperty(State(CC_PropertyId::STATE, State::CONNECTED)), XCode::OK);
-    ASSERT_EQ(first->addCallLeg(*leg), XCode::OK);
-    settle();
-    ASSERT_EQ(second->addCallLeg(*leg), XCode::OK);
-    settle();
-    EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 1u);
-    EXPECT_EQ(CC_Call::TRANSFER_CALL_LEG(nullptr, *leg), XCode::OK);
-    leg->removeReference();
-    settle();
-    EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 0u);
-    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
 }
 
 // --- adapters --------------------------------------------------------------------------------------------------------

@@ -2,9 +2,8 @@
 // what it is just being stored into, and the adapter, leg or call that owns that. Each of these once touched freed
 // memory.
 #include "properties/CC_PropertyUnsigned.h"
-#include "testing/CallControlFixture.h"
 #include "testing/RecordingMonitor.h"
-#include "tests/support/Party.h"
+#include "tests/support/PartyTest.h"
 #include "tests/support/PropertyTesting.h"
 
 #include <functional>
@@ -16,18 +15,11 @@ namespace
 {
 using namespace CC_PropertyId;
 
-class HostileProperties : public testing::Test
+class HostileProperties : public PartyTest
 {
 protected:
     ~HostileProperties() override { *deeds = {}; }
 
-    void settle() { fixture.m_loop.settle(); }
-    void connect(Party& caller, Party& callee)
-    {
-        ASSERT_EQ(caller.dial(callee), XCode::OK);
-        ASSERT_EQ(callee.become(State::CONNECTED), XCode::OK);
-        settle();
-    }
     /// A party whose adapter was destroyed gets another one.
     void reconnect(Party& caller, Party& callee)
     {
@@ -48,21 +40,11 @@ protected:
         EXPECT_EQ(properties.set(CC_PropertyString(ALERT_INFO, "behind")), XCode::OK);
         return properties;
     }
-    void expectNothingLeft(std::initializer_list<Party*> parties)
-    {
-        for (Party* const party : parties)
-            party->adapter.reset();
-        settle();
-        EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
-        EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
-    }
     static int NUMBER_IN(CC_PropertyContainer const& properties, unsigned int id = NAME)
     {
         auto const* const property = dynamic_cast<ActingProperty const*>(properties.get(id));
         return property != nullptr ? property->getNumber() : -1;
     }
-
-    CallControlFixture fixture;
     std::shared_ptr<ActingProperty::Deeds> const deeds = std::make_shared<ActingProperty::Deeds>();
 };
 } // namespace

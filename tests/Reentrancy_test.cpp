@@ -3,40 +3,19 @@
 #include "callcontrol/CC_Context.h"
 #include "properties/CC_Factory.h"
 #include "properties/CC_PropertyFilterContainer.h"
-#include "testing/CallControlFixture.h"
 #include "testing/FailingAllocator.h"
 #include "testing/FakeRebootMgmt.h"
 #include "testing/RecordingCallLegObserver.h"
 #include "testing/RecordingCallObserver.h"
 #include "testing/RecordingPropertyFilter.h"
-#include "tests/support/Party.h"
+#include "tests/support/PartyTest.h"
 
 #include <gtest/gtest.h>
 #include <new>
 
 namespace
 {
-class Reentrancy : public testing::Test
-{
-protected:
-    void settle() { fixture.m_loop.settle(); }
-    void connect(Party& caller, Party& callee)
-    {
-        ASSERT_EQ(caller.dial(callee), XCode::OK);
-        ASSERT_EQ(callee.become(State::CONNECTED), XCode::OK);
-        settle();
-    }
-    void expectNothingLeft(std::initializer_list<Party*> parties)
-    {
-        for (Party* const party : parties)
-            party->adapter.reset();
-        settle();
-        EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
-        EXPECT_EQ(CC_CallLeg::s_numberOfInstances, 0u);
-    }
-
-    CallControlFixture fixture;
-};
+using Reentrancy = PartyTest;
 
 TEST_F(Reentrancy, ACleanUpAskedForInsideTheEndOfTheCallLeavesNoLegBehind)
 {
