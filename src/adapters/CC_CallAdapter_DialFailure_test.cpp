@@ -142,6 +142,50 @@ TEST_F(CC_CallAdapter_DialFailure_Test, AnAcceptThatDoesNotPassTheFiltersLeavesT
     EXPECT_EQ(c.accept(theCall()), XCode::OK) << "it was idle again";
 }
 
+TEST_F(CC_CallAdapter_DialFailure_Test, TheLogSaysInOneLineWhichFailureItWas)
+{
+    CC_PropertyContainer const& none = CC_PropertyContainer::EMPTY();
+    RecordingMonitor monitor(RTD::LEVEL_FAILURE);
+    auto const expectLine = [&](std::string const& text)
+    {
+        settle();
+        EXPECT_EQ(monitor.getLines(), (std::vector<LogLine>{{1, "[EP a/line] " + text}}));
+        monitor.clear();
+    };
+    REFUSE_MARKED(a);
+    EXPECT_EQ(a.dial("isdn", MARKED()), XCode::FAILURE);
+    expectLine("Dial failed: the own leg takes not all properties");
+    EXPECT_EQ(a.dial("isdn", none, none, MARKED()), XCode::FAILURE);
+    expectLine("Dial failed: the input filters refuse the call's properties");
+    EXPECT_EQ(a.dial("isdn", none, MARKED()), XCode::FAILURE);
+    expectLine("Dial failed: the input filters refuse the offer's properties");
+    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&)
+    { return XCode::REFUSED; };
+    EXPECT_EQ(a.dial(), XCode::FAILURE);
+    expectLine("Dial failed: the provider refuses");
+
+    CC_Call* const call = CallControl::ACQUIRE_CALL("");
+    EXPECT_EQ(a.adapter.accept(*call, MARKED()), XCode::FAILURE);
+    expectLine("Accept failed: the own leg takes not all properties");
+    {
+        CC_Call::Hold const keep(call);
+        CallControl::RELEASE_CALL("", call); // it goes at the end of the hold, and takes no leg until then
+        EXPECT_EQ(a.accept(*call), XCode::FAILURE);
+        expectLine("Accept failed: the call takes no leg");
+    }
+
+    RecordingContextObserver thief("thief");
+    ASSERT_TRUE(getContext()->addContextObserver(thief).isOk());
+    thief.m_onCreateCall = [](CC_Context& context, CC_Call* created) { context.releaseCall(created); };
+    EXPECT_EQ(a.dial(), XCode::NO_ELEMENT);
+    expectLine("Dial failed: no call could be had");
+    getContext()->removeContextObserver(thief);
+
+    CC_CallAdapter idle;
+    EXPECT_EQ(idle.dial("", "isdn", "1", none, none, none, nullptr), XCode::REFUSED);
+    EXPECT_EQ(monitor.getLines(), (std::vector<LogLine>{{1, "[EP /] Dial failed: the adapter is not set up"}}));
+}
+
 // --- without memory --------------------------------------------------------------------------------------------------
 
 namespace

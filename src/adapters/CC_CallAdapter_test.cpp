@@ -289,3 +289,13 @@ TEST_F(CC_CallAdapter_Test, AContextPropertyOfAnotherClassIsNoMediaContext)
     a.drop();
     settle();
 }
+
+TEST_F(CC_CallAdapter_Test, ShowsItsLegAndItsPeers)
+{
+    EXPECT_EQ(a.adapter.getOwnCallLeg(), nullptr);
+    EXPECT_EQ(a.adapter.getPeerCallLeg(), nullptr);
+    connect();
+    EXPECT_EQ(a.adapter.getOwnCallLeg(), theCall().getCallLeg(0));
+    EXPECT_EQ(a.adapter.getPeerCallLeg(), theCall().getCallLeg(1));
+    EXPECT_EQ(b.adapter.getPeerCallLeg(), a.adapter.getOwnCallLeg());
+}

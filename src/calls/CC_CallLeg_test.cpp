@@ -56,6 +56,34 @@ TEST_F(CC_CallLegTest, ANewOneIsIdleInNoCallAndHasThreeProperties)
     leg->removeReference();
 }
 
+TEST_F(CC_CallLegTest, NoTwoHaveTheSameNumberThoughAnAddressComesBack)
+{
+    unsigned long long last = 0;
+    for (int i = 0; i < 3; ++i)
+    {
+        CC_CallLeg* const leg = new CC_CallLeg;
+        EXPECT_GT(leg->getSerial(), last);
+        last = leg->getSerial();
+        leg->removeReference();
+    }
+}
+
+TEST_F(CC_CallLegTest, OnceItsOwnerLetsItGoItTakesNoStateButReleased)
+{
+    CC_CallLeg& leg = newObservedLeg(CC_PropertyCallLegState::CONNECTED);
+    leg.fixState();
+    m_journal.clear();
+    EXPECT_EQ(leg.setProperty(STATE(CC_PropertyCallLegState::HELD)), XCode::OK);
+    EXPECT_EQ(leg.getState(), CC_PropertyCallLegState::CONNECTED);
+    EXPECT_EQ(leg.setProperty(STATE(CC_PropertyCallLegState::RELEASED)), XCode::OK);
+    CC_PropertyContainer stale;
+    ASSERT_EQ(stale.set(NAME("Anna")), XCode::OK);
+    ASSERT_EQ(stale.set(STATE(CC_PropertyCallLegState::CONNECTED)), XCode::OK);
+    EXPECT_EQ(leg.setProperties(stale), XCode::OK);
+    EXPECT_EQ(leg.getState(), CC_PropertyCallLegState::RELEASED);
+    EXPECT_EQ(m_journal.take(), (Lines{"o: L changed (State)", "o: L changed (Name)"}));
+}
+
 TEST_F(CC_CallLegTest, AsLongAsEveryChangeIsToldNothingChangesUntold)
 {
     CC_CallLeg& leg = newObservedLeg();

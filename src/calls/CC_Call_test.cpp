@@ -46,6 +46,18 @@ TEST_F(CC_CallTest, IsNamedAfterItsAddressAndCountedWhileItLives)
     EXPECT_EQ(CC_Call::s_numberOfInstances, before);
 }
 
+TEST_F(CC_CallTest, NoTwoHaveTheSameNumberThoughAnAddressComesBack)
+{
+    unsigned long long last = m_call.getSerial();
+    for (int i = 0; i < 3; ++i)
+    {
+        CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+        EXPECT_GT(call->getSerial(), last);
+        last = call->getSerial();
+        CallControl::RELEASE_CALL("SWITCH", call);
+    }
+}
+
 TEST_F(CC_CallTest, StatesHaveNames)
 {
     EXPECT_STREQ(CC_Call::STATE_NAME(CC_Call::INACTIVE), "INACTIVE");

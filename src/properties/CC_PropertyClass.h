@@ -1,6 +1,7 @@
 #pragma once
 
 #include "properties/CC_Property.h"
+#include "properties/CC_PropertyId.h" // for who makes a value of a class
 
 #include <new>
 #include <type_traits>

@@ -15,6 +15,7 @@ caller() {
 callee() {
     expect_invite body "o=caller" From: "Alice .*4420@" To: "4989123" Max-Forwards: "69"
     respond "180 Ringing"
+    pause 100 # the caller's module is told once per turn: both in one would be a 200 alone
     respond_with "$SDP_OF_CALLEE" retrans "200 OK"
     expect_request ACK
     expect_request BYE Reason: "Q.850;cause=31;"
