@@ -9,8 +9,11 @@
 #include "calls/CC_Monitor.h"
 #include "platform/base/NameOf.h"
 #include "platform/base/NestingGuard.h"
+#include "recorder/CC_RecordWriter.h"
 #include "services/CC_Service.h"
 
+#include <array>
+#include <cstdio>
 #include <new>
 #include <tuple>
 #include <utility>
@@ -151,10 +154,35 @@ InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLeve
 
 XCode CC_CallAdapter::Attempt::fail(char const* reason, XCode result) const
 {
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON(); recorder != nullptr && !isOver())
+    {
+        std::array<char, CC_RecordFormat::LARGEST_TEXT> text;
+        std::snprintf(text.data(), text.size(), "%s failed: %s", m_operation, reason);
+        recorder->addText(CC_RecordFormat::Kind::FAILED, m_adapter.getCallSerial(), m_adapter.getLegSerial(), 0,
+                          text.data());
+    }
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE); monitor != nullptr && !isOver())
         monitor->debug("[EP %s/%s] %s failed: %s", m_adapter.getEndpointName(), m_adapter.m_name.c_str(), m_operation,
                        reason);
     return result;
+}
+
+void CC_CallAdapter::Attempt::record(CC_RecordFormat::Kind kind, XCode result) const
+{
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON(); recorder != nullptr && !isOver())
+        recorder->add(kind, m_adapter.getCallSerial(), m_adapter.getLegSerial(),
+                      static_cast<unsigned int>(result.getValue()));
+}
+
+unsigned long long CC_CallAdapter::getLegSerial() const
+{
+    return m_ownCallLeg != nullptr ? m_ownCallLeg->getSerial() : 0;
+}
+
+unsigned long long CC_CallAdapter::getCallSerial() const
+{
+    CC_Call const* const call = getCall();
+    return call != nullptr ? call->getSerial() : 0;
 }
 
 void CC_CallAdapter::notifyPeerPropertyChange(CC_Flags const&) {}

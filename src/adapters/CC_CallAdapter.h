@@ -251,6 +251,8 @@ private:
     struct Kept;
 
     char const* getEndpointName() const;
+    unsigned long long getLegSerial() const;
+    unsigned long long getCallSerial() const;
     String nameOrAddress(String const& name) const;
     String makeCallLegName() const;
     CC_PropertyFilterContainer* getInputFilters() const;
@@ -283,6 +285,8 @@ private:
     XCode writeCopy(CC_PropertyView& view, Target& target, CC_PropertyFilterContainer const& filters);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
+    template <class Written>
+    XCode writeOwn(Written const& written, bool isFiltered);
     template <class Written>
     XCode writePeer(Written const& written, bool isFiltered);
     template <class Written>

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "adapters/CC_CallAdapter.h"
+#include "recorder/CC_RecordFormat.h"
 
 #include <tuple>
 
@@ -29,6 +30,8 @@ public:
     }
     /// Logs why the operation fails, unless it is over and nothing is left to name, and returns the result.
     XCode fail(char const* reason, XCode result = XCode::FAILURE) const;
+    /// Records what came of the operation, unless the attempt is over.
+    void record(CC_RecordFormat::Kind kind, XCode result) const;
 
 private:
     CC_CallAdapter const& m_adapter;

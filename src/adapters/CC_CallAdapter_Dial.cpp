@@ -20,16 +20,30 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
+#include "recorder/CC_FilterNotes.h"
+#include "recorder/CC_RecordWriter.h"
 
+#include <array>
 #include <cstdint>
+#include <cstdio>
 #include <new>
 #include <tuple>
 
 namespace
 {
+using Kind = CC_RecordFormat::Kind;
+
 constexpr char const* NO_MEMORY = "out of memory";
 constexpr char const* LEG_TAKES_NOT_ALL = "the own leg takes not all properties";
 constexpr char const* CALL_TAKES_NO_LEG = "the call takes no leg";
+
+void RECORD_DIAL(CC_RecordWriter& recorder, CC_Call const& call, CC_CallLeg const& leg, String const& providerName,
+                 String const& destination)
+{
+    std::array<char, CC_RecordFormat::LARGEST_TEXT> text;
+    std::snprintf(text.data(), text.size(), "%s %s", providerName.c_str(), destination.c_str());
+    recorder.addText(Kind::DIALLING, call.getSerial(), leg.getSerial(), 0, text.data());
+}
 
 /// Copying tells nothing of what memory has refused.
 XCode WHOLE(CC_PropertyContainer const& copy, CC_PropertyContainer const& original)
@@ -61,6 +75,7 @@ XCode CC_CallAdapter::dial(String const& contextName, String const& providerName
     {
         result = attempt.fail(NO_MEMORY);
     }
+    attempt.record(Kind::DIALLED, result);
     if (!result.isOk() && !attempt.isOver())
         dropOwnCallLeg(QCause::NETWORK_OUT_OF_ORDER, 0);
     return result;
@@ -113,6 +128,8 @@ XCode CC_CallAdapter::joinAndOffer(CC_Provider& provider, CC_Call& call, String 
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[EP %s/%s] Dial to provider %s (%s) using call %s", getEndpointName(), m_name.c_str(),
                        providerName.c_str(), destination.c_str(), call.getName().c_str());
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON(); recorder != nullptr && !isOver())
+        RECORD_DIAL(*recorder, call, *m_ownCallLeg, providerName, destination);
     CC_PropertyContainer filtered;
     CC_PropertyContainer const* const offered = FILTER_INPUT(filters, offerProperties, filtered);
     if (isOver())
@@ -130,6 +147,9 @@ XCode CC_CallAdapter::joinNewCall(CC_Call& call, CC_PropertyContainer const& pro
                                   CC_PropertyFilterContainer const* filters)
 {
     Attempt const attempt(*this, "Dial");
+    CC_FilterNotes notes;
+    CC_Writing const writing(CC_RecordFormat::Writer::CALL, *m_ownCallLeg);
+    CC_Writing const throughFilters(notes);
     CC_PropertyContainer filtered;
     CC_PropertyContainer const* const written = FILTER_INPUT(filters, properties, filtered);
     if (written == nullptr)
@@ -155,6 +175,7 @@ XCode CC_CallAdapter::accept(CC_Call& call, CC_PropertyContainer const& ownPrope
     {
         result = attempt.fail(NO_MEMORY);
     }
+    attempt.record(Kind::ACCEPTED, result);
     if (!result.isOk() && !attempt.isOver())
         dropOwnCallLeg(QCause::NETWORK_OUT_OF_ORDER, 0);
     return result;
@@ -242,6 +263,7 @@ XCode CC_CallAdapter::writeFirstProperties(CC_PropertyContainer& properties)
     if (getInputFilters() != nullptr)
         return setOwnProperties(properties);
     Attempt const attempt(*this);
+    CC_Writing const writing(CC_RecordFormat::Writer::OWN, *m_ownCallLeg);
     XCode const written = m_ownCallLeg->setProperties(properties);
     if (!written.isOk() || attempt.isOver())
         return XCode::FAILURE;

@@ -9,6 +9,7 @@
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCause.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <tuple>
 #include <utility>
@@ -32,6 +33,9 @@ void CC_CallAdapter::dropOwnCallLeg(QCause cause, unsigned int causeValue)
 {
     if (m_ownCallLeg == nullptr)
         return;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addNumber(CC_RecordFormat::Kind::DROPPED, getCallSerial(), getLegSerial(),
+                            static_cast<unsigned int>(cause), causeValue);
     unobserveCall();
     if (std::exchange(m_observesOwnCallLeg, false))
         m_ownCallLeg->removeCallLegObserver(this);
@@ -102,7 +106,13 @@ void CC_CallAdapter::letGoOfTheRest()
 XCode CC_CallAdapter::transfer(CC_CallAdapter const& other, bool removeOwnLeg)
 {
     TYLifeline::Watch const self(m_lifeline);
+    unsigned long long const leg = getLegSerial();
+    unsigned long long const to = getCallSerial();
+    unsigned long long const from = other.getCallSerial();
     XCode const result = tryTransfer(other, removeOwnLeg); // in which either adapter may go
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addNumber(CC_RecordFormat::Kind::TRANSFERRED, to, leg, static_cast<unsigned int>(result.getValue()),
+                            from, removeOwnLeg ? "transfer" : "conference");
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE);
         monitor != nullptr && !result.isOk() && self.isAlive())
         monitor->debug("[EP %s/%s] TRANSFER FAILED", getEndpointName(), m_name.c_str());

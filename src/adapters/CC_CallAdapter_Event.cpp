@@ -2,7 +2,9 @@
 
 #include "adapters/CC_CallAdapterObserver.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
+#include "recorder/CC_RecordWriter.h"
 
+#include <array>
 #include <utility>
 
 CC_CallAdapter::Event::Event(TYEventLoop& loop, EventPrio::Type priority, CC_CallAdapter& adapter)
@@ -13,6 +15,22 @@ CC_CallAdapter::Event::Event(TYEventLoop& loop, EventPrio::Type priority, CC_Cal
 XCode CC_CallAdapter::Event::setPeerPropertyChange(unsigned int id)
 {
     return m_flags.set(id, true).isOk() && (isPending() || setIfNotPending().isOk()) ? XCode::OK : XCode::FAILURE;
+}
+
+void CC_CallAdapter::Event::record(CC_RecordWriter& recorder, CC_Flags const& flags) const
+{
+    std::array<unsigned int, CC_RecordFormat::MOST_LISTED_IDS> ids;
+    unsigned int count = 0;
+    flags.forEachSet(
+        [&](unsigned int id)
+        {
+            if (count < ids.size())
+                ids[count] = id;
+            ++count;
+            return true;
+        });
+    unsigned int next = 0;
+    recorder.addIds(m_adapter.getCallSerial(), m_adapter.getLegSerial(), count, [&] { return ids[next++]; });
 }
 
 void CC_CallAdapter::Event::handle()
@@ -27,6 +45,8 @@ void CC_CallAdapter::Event::handle()
     CC_Flags const flags(std::move(m_flags)); // what changes inside the notification belongs to the next turn
     if (flags.isEmpty())
         return;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        record(*recorder, flags);
     if (m_adapter.m_observer != nullptr)
         m_adapter.m_observer->notifyPeerPropertyChange(m_adapter, flags);
     else

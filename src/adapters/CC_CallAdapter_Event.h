@@ -8,6 +8,8 @@
 #include <memory>
 #include <new>
 
+class CC_RecordWriter;
+
 /// Collects the ids of changed peer and call properties and tells the module of them in the loop's next turn.
 class CC_CallAdapter::Event : public TYEvent
 {
@@ -31,6 +33,8 @@ protected:
     void handle() override;
 
 private:
+    void record(CC_RecordWriter& recorder, CC_Flags const& flags) const;
+
     CC_CallAdapter& m_adapter;
     CC_Flags m_flags;
     std::unique_ptr<Kept> m_kept;

@@ -15,8 +15,11 @@
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_RecordWriter.h"
+#include "services/CC_Service.h"
 
 #include <tuple>
+#include <typeinfo>
 #include <utility>
 
 void CC_CallAdapter::onCallObservationEnded(CC_Event<CC_Call> const& event)
@@ -88,6 +91,9 @@ void CC_CallAdapter::onCallLegSynchronousService(CC_Event<CC_CallLeg> const& eve
     auto const& service = CC_EvCallLegSynchronousService::FROM(event);
     if (m_ownCallLeg == nullptr || service.getSource() == m_ownCallLeg)
         return;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addNumber(CC_RecordFormat::Kind::SERVICE_TOLD, getCallSerial(), getLegSerial(), 0,
+                            service.getSource()->getSerial(), typeid(*service.getService()).name());
     if (m_observer != nullptr)
         m_observer->notifyPeerSynchronousService(*this, *service.getService());
     else

@@ -9,12 +9,16 @@
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_FilterNotes.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <tuple>
 #include <utility>
 
 namespace
 {
+using CC_RecordFormat::Writer;
+
 XCode OK_OR_FAILURE(XCode result) { return result.isOk() ? XCode::OK : XCode::FAILURE; }
 
 XCode WRITE(CC_CallLeg& leg, CC_Property const& property) { return OK_OR_FAILURE(leg.setProperty(property)); }
@@ -39,11 +43,10 @@ CC_PropertyContainer const* CC_CallAdapter::FILTER_INPUT(CC_PropertyFilterContai
 
 /// Writes one property or several to our view and through the input filters to the leg or call. What filters and
 /// foreign properties do meanwhile may end the attempt; the caller keeps a target that could go without that.
+/// REQUIRES: target != nullptr
 template <class Target, class Written>
 XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Written const& written)
 {
-    if (target == nullptr)
-        return XCode::ABSENT;
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
     if (!seen.isOk() || attempt.isOver())
@@ -60,6 +63,8 @@ __attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view,
                                                           CC_PropertyFilterContainer const& filters)
 {
     Attempt const attempt(*this);
+    CC_FilterNotes notes;
+    CC_Writing const throughFilters(notes);
     Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view.getProperties());
     bool const isFiltered = copy.isWhole() && filters.applyFilters(copy.get()).isOk();
     return isFiltered && !attempt.isOver() ? WRITE(target, copy.get()) : XCode::FAILURE;
@@ -68,8 +73,6 @@ __attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view,
 template <class Target, class Written>
 XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written)
 {
-    if (target == nullptr)
-        return XCode::ABSENT;
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
     return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
@@ -106,7 +109,10 @@ XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& propertie
 
 XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
 {
-    if (m_ownCallLeg == nullptr || getInputFilters() != nullptr)
+    if (m_ownCallLeg == nullptr)
+        return XCode::ABSENT;
+    CC_Writing const writing(Writer::OWN, *m_ownCallLeg);
+    if (getInputFilters() != nullptr)
         return writeFiltered(m_ownView, m_ownCallLeg, property);
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
@@ -120,19 +126,23 @@ XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
     return result;
 }
 
-XCode CC_CallAdapter::setOwnProperties(CC_PropertyContainer const& properties)
-{
-    return writeFiltered(m_ownView, m_ownCallLeg, properties);
-}
+XCode CC_CallAdapter::setOwnProperties(CC_PropertyContainer const& properties) { return writeOwn(properties, true); }
 
-XCode CC_CallAdapter::setOwnPropertyUnfiltered(CC_Property const& property)
-{
-    return writeUnfiltered(m_ownView, m_ownCallLeg, property);
-}
+XCode CC_CallAdapter::setOwnPropertyUnfiltered(CC_Property const& property) { return writeOwn(property, false); }
 
 XCode CC_CallAdapter::setOwnPropertiesUnfiltered(CC_PropertyContainer const& properties)
 {
-    return writeUnfiltered(m_ownView, m_ownCallLeg, properties);
+    return writeOwn(properties, false);
+}
+
+template <class Written>
+XCode CC_CallAdapter::writeOwn(Written const& written, bool isFiltered)
+{
+    if (m_ownCallLeg == nullptr)
+        return XCode::ABSENT;
+    CC_Writing const writing(Writer::OWN, *m_ownCallLeg);
+    return isFiltered ? writeFiltered(m_ownView, m_ownCallLeg, written)
+                      : writeUnfiltered(m_ownView, m_ownCallLeg, written);
 }
 
 // --- peer leg --------------------------------------------------------------------------------------------------------
@@ -173,6 +183,7 @@ XCode CC_CallAdapter::writePeer(Written const& written, bool isFiltered)
         m_isPeerToBeChosen = true;
         std::ignore = m_peerChangeEvent->setIfNotPending(); // fails only for an event that was destroyed
     }
+    CC_Writing const writing(Writer::PEER, *m_ownCallLeg);
     return isFiltered ? writeFiltered(m_peerView, m_peerCallLeg, written)
                       : writeUnfiltered(m_peerView, m_peerCallLeg, written);
 }
@@ -213,6 +224,9 @@ template <class Written>
 XCode CC_CallAdapter::writeCall(Written const& written, bool isFiltered)
 {
     CC_Call::Hold const keepCall(getCall());
+    if (keepCall.get() == nullptr)
+        return XCode::ABSENT;
+    CC_Writing const writing(Writer::CALL, *m_ownCallLeg);
     return isFiltered ? writeFiltered(m_callView, keepCall.get(), written)
                       : writeUnfiltered(m_callView, keepCall.get(), written);
 }

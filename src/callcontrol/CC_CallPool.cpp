@@ -7,6 +7,7 @@
 #include "platform/driver/DRIVER.h"
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <new>
 #include <optional>
@@ -36,8 +37,16 @@ void ASK(TYPPtr<IRebootMgmt> const& holder, Ask&& ask)
     rebootMgmt.unlock();
 }
 
+void RECORD(CC_RecordFormat::Kind kind, unsigned long long call = 0)
+{
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(kind, call, 0);
+}
+
 void RELEASE_LOCK(TYPPtr<IRebootMgmt> const& holder)
 {
+    if (!holder.isEmpty())
+        RECORD(CC_RecordFormat::Kind::LOCK_GIVEN_BACK);
     ASK(holder, [](IRebootMgmt& rebootMgmt)
         { std::ignore = rebootMgmt.releaseGracefulLock(LOCK_OWNER); }); // nothing could be done about a refusal
 }
@@ -71,6 +80,7 @@ CC_Call* CC_CallPool::acquireCall(MG_IContext* mgContext)
         return nullptr;
     }
     s_statistics.onCallAdded();
+    RECORD(CC_RecordFormat::Kind::CALL_ACQUIRED, call->getSerial());
     giveContext(*call, mgContext); // the media layer may, too, or release the call
     if (self.isAlive() && !keepCall.isReleased())
         return call;
@@ -95,6 +105,7 @@ bool CC_CallPool::list(CC_Call& call)
 void CC_CallPool::giveContext(CC_Call& call, MG_IContext* mgContext)
 {
     CC_PropertyContextId const context(CC_PropertyId::CONTEXT, mgContext);
+    CC_Writing const writing(CC_RecordFormat::Writer::POOL);
     std::ignore = call.setProperty(context); // without it: no media
 }
 
@@ -139,6 +150,7 @@ void CC_CallPool::releaseCall(CC_Call* call)
 void CC_CallPool::end(CC_Call& call)
 {
     Lock const lock(*this);
+    RECORD(CC_RecordFormat::Kind::CALL_GIVEN_BACK, call.getSerial());
     s_statistics.onCallRemoved();
     call.destroy();
     lock.giveBackIfUnused();
@@ -209,6 +221,7 @@ void CC_CallPool::addReloadGracefulLock()
         if (m_rebootMgmt.isEmpty())
             return;
     }
+    RECORD(CC_RecordFormat::Kind::LOCK_TAKEN);
     ASK(m_rebootMgmt, [](IRebootMgmt& rebootMgmt)
         { std::ignore = rebootMgmt.addGracefulLock(LOCK_OWNER, LOCK_REASON, 0); }); // a refusal stops no call
 }

@@ -7,8 +7,10 @@
 #include "platform/base/NameOf.h"
 #include "platform/base/NestingGuard.h"
 #include "platform/eventloop/TYEventLoop.h"
+#include "properties/CC_PropertyBrief.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <limits>
 #include <new>
@@ -66,6 +68,8 @@ CC_Call::~CC_Call()
     if (m_deferredEvent != nullptr)
         std::exchange(m_deferredEvent, nullptr)->destroy();
     m_callPool = nullptr;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(CC_RecordFormat::Kind::CALL_ENDED, m_serial, 0);
     --s_numberOfInstances;
 }
 
@@ -128,10 +132,36 @@ XCode CC_Call::setPropertyNoNotification(CC_Property const& property, bool& chan
     if (stored != nullptr && stored->isEqual(property))
         return XCode::OK;
     LOG_PROPERTY(m_name, property);
-    if (!m_properties.set(property).isOk())
+    if (!replace(property).isOk())
         return XCode::REFUSED;
     changed = true;
     return XCode::OK;
+}
+
+XCode CC_Call::replace(CC_Property const& property)
+{
+    return CC_RecordWriter::ON() == nullptr ? m_properties.set(property) : replaceRecorded(property);
+}
+
+/// Apart, so that who does not record does not pay for it.
+__attribute__((noinline)) XCode CC_Call::replaceRecorded(CC_Property const& property)
+{
+    unsigned int const id = property.getId();
+    CC_RecordFormat::Brief const before = CC_PropertyBrief::OF(m_properties.get(id));
+    if (!m_properties.set(property).isOk())
+        return XCode::REFUSED;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addChange(CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0, id, before,
+                            CC_PropertyBrief::OF(m_properties.get(id)));
+    return XCode::OK;
+}
+
+/// Hands the flags over.
+void CC_Call::tellChange(CC_Flags& flags)
+{
+    CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
+    m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
+                                   &CC_CallObserver::onCallPropertyChanged);
 }
 
 XCode CC_Call::setProperty(CC_Property const& property)
@@ -144,8 +174,7 @@ XCode CC_Call::setProperty(CC_Property const& property)
     {
         CC_Flags flags;
         std::ignore = flags.set(property.getId(), true); // without memory the observers hear of a change, not of which
-        m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
-                                       &CC_CallObserver::onCallPropertyChanged);
+        tellChange(flags);
     }
     return XCode::OK;
 }
@@ -172,8 +201,7 @@ XCode CC_Call::storeAll(CC_PropertyContainer const& properties, XCode result)
         if (changed)
             std::ignore = flags.set(property.getId(), true); // as in setProperty
     }
-    m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
-                                   &CC_CallObserver::onCallPropertyChanged);
+    tellChange(flags);
     return result;
 }
 

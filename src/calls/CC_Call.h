@@ -157,6 +157,9 @@ private:
 
     /// Whether the call takes part in nothing any more: it is in its destructor, or will be when the last hold ends.
     bool isOver() const { return m_isEnding || m_isReleased; }
+    XCode replace(CC_Property const& property);
+    XCode replaceRecorded(CC_Property const& property);
+    void tellChange(CC_Flags& flags);
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     static XCode MOVE(CC_Call* to, CC_CallLeg& leg);
     XCode addLegObserver(CC_CallLeg& leg, CC_CallLegObserver* observer);

@@ -4,13 +4,17 @@
 #include "calls/CC_Monitor.h"
 #include "platform/base/NestingGuard.h"
 #include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyBrief.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCause.h"
 #include "properties/CC_PropertyId.h"
+#include "recorder/CC_RecordWriter.h"
+#include "services/CC_Service.h"
 
 #include <limits>
 #include <new>
 #include <tuple>
+#include <typeinfo>
 #include <utility>
 
 unsigned int CC_CallLeg::s_numberOfInstances = 0;
@@ -65,6 +69,8 @@ bool IS_RELEASED(CC_Property const& property)
 CC_CallLeg::CC_CallLeg() : m_serial(++s_lastSerial)
 {
     ++s_numberOfInstances;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(CC_RecordFormat::Kind::LEG_MADE, 0, m_serial);
     // straight into the container: this is the one time that the state is IDLE. What memory refuses is absent, and a
     // leg without State counts as released.
     m_properties.append<CC_PropertyCallLegState>(CC_PropertyId::STATE, CC_PropertyCallLegState::IDLE);
@@ -85,6 +91,8 @@ CC_CallLeg::~CC_CallLeg()
     }
     m_observers.broadcastEvent(CC_EvCallLegObservationEnded(*this), &CC_CallLegObserver::onCallLegObservationEnded);
     m_observers.silence();
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(CC_RecordFormat::Kind::LEG_ENDED, 0, m_serial);
     --s_numberOfInstances;
 }
 
@@ -101,6 +109,8 @@ XCode CC_CallLeg::setName(String const& name)
     try
     {
         m_name = name;
+        if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+            recorder->addText(CC_RecordFormat::Kind::LEG_NAMED, getCallSerial(), m_serial, 0, m_name);
         return XCode::OK;
     }
     catch (std::bad_alloc const&)
@@ -138,11 +148,32 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
         stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
     if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
         return XCode::REFUSED;
-    if (!m_properties.replace(stored, property).isOk())
+    if (!replace(stored, property).isOk())
         return XCode::REFUSED;
     changed = true;
     return XCode::OK;
 }
+
+/// `stored`: the property of that id, or null.
+XCode CC_CallLeg::replace(CC_Property* stored, CC_Property const& property)
+{
+    return CC_RecordWriter::ON() == nullptr ? m_properties.replace(stored, property) : replaceRecorded(property);
+}
+
+/// Apart, so that who does not record does not pay for it.
+__attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property const& property)
+{
+    unsigned int const id = property.getId();
+    CC_RecordFormat::Brief const before = CC_PropertyBrief::OF(m_properties.get(id));
+    if (!m_properties.replace(m_properties.get(id), property).isOk()) // the media layer may have been asked
+        return XCode::REFUSED;
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, before,
+                            CC_PropertyBrief::OF(m_properties.get(id)));
+    return XCode::OK;
+}
+
+unsigned long long CC_CallLeg::getCallSerial() const { return m_call != nullptr ? m_call->getSerial() : 0; }
 
 XCode CC_CallLeg::setProperty(CC_Property const& property)
 {
@@ -218,6 +249,7 @@ XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, boo
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
     ++m_numberOfNotifications;
+    CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
     m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
                                &CC_CallLegObserver::onCallLegPropertyChanged);
 }
@@ -225,6 +257,8 @@ void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 void CC_CallLeg::invokeSynchronousService(CC_Service& service)
 {
     Reference const self(*this);
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addText(CC_RecordFormat::Kind::SERVICE, getCallSerial(), m_serial, 0, typeid(service).name());
     m_observers.broadcastEvent(CC_EvCallLegSynchronousService(*this, service),
                                &CC_CallLegObserver::onCallLegSynchronousService);
 }

@@ -117,6 +117,9 @@ private:
 
     ~CC_CallLeg();
     XCode store(CC_Property const& property, bool& changed);
+    XCode replace(CC_Property* stored, CC_Property const& property);
+    XCode replaceRecorded(CC_Property const& property);
+    unsigned long long getCallSerial() const;
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
     void notifyPropertyChange(CC_Flags& flags);

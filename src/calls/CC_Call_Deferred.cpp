@@ -7,6 +7,7 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
+#include "recorder/CC_RecordWriter.h"
 #include "services/CC_ServicePushBack.h"
 
 #include <algorithm>
@@ -21,6 +22,17 @@ void CC_Call::defer()
 
 void CC_Call::DEFERRED(void* call) { static_cast<CC_Call*>(call)->deferred(); }
 
+namespace
+{
+using CleanUp = CC_RecordFormat::CleanUp;
+
+void RECORD(unsigned long long call, CleanUp outcome)
+{
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(CC_RecordFormat::Kind::CLEANED_UP, call, 0, static_cast<unsigned int>(outcome));
+}
+} // namespace
+
 void CC_Call::deferred()
 {
     if (isOver())
@@ -29,8 +41,9 @@ void CC_Call::deferred()
     bool const wasCleaningUp = std::exchange(m_isCleaningUp, true);
     removeReleasedCallLegs();
     if (self.isReleased())
-        return; // an observer was faster
+        return RECORD(m_serial, CleanUp::OVERTAKEN); // an observer was faster
     bool const isLive = hasLiveCallLeg();
+    RECORD(m_serial, isLive ? CleanUp::KEPT : CleanUp::GIVEN_BACK);
     if (!isLive)
         giveBack();
     m_isCleaningUp = wasCleaningUp;
@@ -67,6 +80,8 @@ void CC_Call::pushBackOnLoop()
     auto const& id = static_cast<CC_PropertyUnsigned const&>(*target->getProperties().get(CC_PropertyId::CALL_LEG_ID));
     if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
         monitor->debug("[Call %s] Internal loop detected; push-back to %s", m_name.c_str(), network.getValue().c_str());
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(CC_RecordFormat::Kind::PUSHED_BACK, m_serial, target->getSerial());
     CC_ServicePushBack pushBack(id.getValue());
     target->invokeSynchronousService(pushBack);
 }

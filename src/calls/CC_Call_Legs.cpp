@@ -11,13 +11,29 @@
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "properties/CC_PropertyCallLegState.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <algorithm>
 #include <tuple>
 
 namespace
 {
+using Kind = CC_RecordFormat::Kind;
+
 unsigned long long s_walks = 0; // of calls over their legs
+
+void RECORD(Kind kind, CC_Call const& call, CC_CallLeg const& leg)
+{
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->add(kind, call.getSerial(), leg.getSerial());
+}
+
+void RECORD_MOVE(CC_Call const* from, CC_Call const* to, CC_CallLeg const& leg)
+{
+    auto const serialOf = [](CC_Call const* call) { return call != nullptr ? call->getSerial() : 0; };
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addNumber(Kind::LEG_MOVED, serialOf(to), leg.getSerial(), 0, serialOf(from));
+}
 
 template <class List, class Value>
 bool CONTAINS(List const& list, Value const* value)
@@ -77,11 +93,13 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         if (to->isOver() || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
             return XCode::NO_ELEMENT;
         leg.addReference(); // the new call's
+        RECORD(Kind::LEG_JOINED, *to, leg);
     }
     if (from != nullptr)
     {
         from->takeObserversFrom(leg);
         from->unlist(leg);
+        RECORD(Kind::LEG_LEFT, *from, leg);
         from->m_callObservers.broadcastEvent(CC_EvCallCallLegModified(*from, leg),
                                              &CC_CallObserver::onCallCallLegRemoved);
     }
@@ -91,6 +109,7 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         to->m_callObservers.broadcastEvent(CC_EvCallCallLegModified(*to, leg), &CC_CallObserver::onCallCallLegAdded);
         to->giveObserversTo(leg);
     }
+    RECORD_MOVE(from, to, leg);
     leg.m_observers.broadcastEvent(CC_EvCallLegCallRelinked(leg, to, from), &CC_CallLegObserver::onCallLegCallRelinked);
     if (from != nullptr)
     {

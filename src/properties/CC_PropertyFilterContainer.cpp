@@ -1,8 +1,15 @@
 #include "properties/CC_PropertyFilterContainer.h"
 
 #include "platform/base/NestingGuard.h"
+#include "properties/CC_PropertyBrief.h"
+#include "properties/CC_PropertyContainer.h"
+#include "recorder/CC_FilterNotes.h"
+#include "recorder/CC_RecordWriter.h"
 
+#include <array>
+#include <cstring>
 #include <new>
+#include <typeinfo>
 
 namespace
 {
@@ -74,16 +81,85 @@ XCode APPLY(CC_PropertyFilter const& filter, CC_PropertyContainer& properties)
         return XCode::NO_ELEMENT;
     }
 }
+
+/// What a recording keeps of the properties that a filter is given, so that what it makes different is seen afterwards.
+class Before
+{
+public:
+    explicit Before(CC_PropertyContainer const& properties)
+    {
+        for (CC_Property const& property : properties)
+            if (m_count < m_values.size())
+                m_values[m_count++] = {property.getId(), CC_PropertyBrief::OF(&property)};
+    }
+    bool isDifferent(CC_Property const& property) const
+    {
+        for (std::size_t i = 0; i < m_count; ++i)
+            if (m_values[i].id == property.getId())
+                return !IS_SAME(m_values[i].brief, CC_PropertyBrief::OF(&property));
+        return m_count < m_values.size();
+    }
+
+private:
+    struct Value
+    {
+        unsigned int id;
+        CC_RecordFormat::Brief brief;
+    };
+
+    static bool IS_SAME(CC_RecordFormat::Brief const& left, CC_RecordFormat::Brief const& right)
+    {
+        return left.getSize() == right.getSize() && std::memcmp(&left, &right, left.getSize()) == 0;
+    }
+
+    std::size_t m_count = 0;
+    std::array<Value, 48> m_values; // beyond these nothing is noted
+};
+
+/// As APPLY, while changes are recorded.
+XCode APPLY_RECORDED(CC_PropertyFilter const& filter, unsigned int place, CC_PropertyContainer& properties,
+                     CC_FilterNotes* notes)
+{
+    char const* const name = typeid(filter).name(); // the filter may be gone afterwards
+    Before const before(properties);
+    XCode result = XCode::OK;
+    {
+        CC_Writing const pastTheAdapter(CC_RecordFormat::Writer::FILTER);
+        result = APPLY(filter, properties);
+    }
+    for (CC_Property const& property : properties)
+        if (notes != nullptr && before.isDifferent(property))
+            notes->add({property.getId(), place, name});
+    return result;
+}
 } // namespace
 
 XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties) const
 {
+    CC_RecordWriter* const recorder = CC_RecordWriter::ON();
+    if (recorder != nullptr)
+        return applyRecorded(properties, recorder->getWriting().filters);
     XCode result = XCode::OK;
     forEach(
         [&](CC_PropertyFilter const& filter)
         {
             if (XCode const applied = APPLY(filter, properties); result.isOk())
                 result = applied;
+        });
+    return result;
+}
+
+/// `notes`: null when the properties are not on their way to a leg or call.
+XCode CC_PropertyFilterContainer::applyRecorded(CC_PropertyContainer& properties, CC_FilterNotes* notes) const
+{
+    XCode result = XCode::OK;
+    unsigned int place = 0;
+    forEach(
+        [&](CC_PropertyFilter const& filter)
+        {
+            if (XCode const applied = APPLY_RECORDED(filter, place, properties, notes); result.isOk())
+                result = applied;
+            ++place;
         });
     return result;
 }

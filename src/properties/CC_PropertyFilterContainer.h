@@ -6,6 +6,8 @@
 #include "platform/base/XCode.h"
 #include "properties/CC_PropertyFilter.h"
 
+class CC_FilterNotes;
+
 /// Filters in the order in which they are applied. It owns copies of what it is given.
 ///
 /// Made and filled by whoever made the endpoint that it is handed to; the endpoint only borrows it. Filled before it is
@@ -53,6 +55,7 @@ private:
     bool isThere(Element const* element) const;
     Element* find(unsigned int index) const;
     XCode insert(CC_PropertyFilter* owned, unsigned int index);
+    XCode applyRecorded(CC_PropertyContainer& properties, CC_FilterNotes* notes) const;
 
     TYList<CC_PropertyFilter*> m_filters;
 };

@@ -1,28 +1,6 @@
 #include "properties/CC_PropertyKind.h"
 
-#include "properties/CC_PropertyBoolean.h"
-#include "properties/CC_PropertyCallLegState.h"
-#include "properties/CC_PropertyCallProgressTone.h"
-#include "properties/CC_PropertyCallType.h"
-#include "properties/CC_PropertyCause.h"
-#include "properties/CC_PropertyCharge.h"
-#include "properties/CC_PropertyCodec.h"
-#include "properties/CC_PropertyCodecNegotiating.h"
-#include "properties/CC_PropertyCodecs.h"
-#include "properties/CC_PropertyContextId.h"
-#include "properties/CC_PropertyInformationTransferCapability.h"
-#include "properties/CC_PropertyIpAddress.h"
-#include "properties/CC_PropertyNumberingPlan.h"
-#include "properties/CC_PropertyParametrizedString.h"
-#include "properties/CC_PropertyPresentationIndicator.h"
-#include "properties/CC_PropertyQoS.h"
-#include "properties/CC_PropertyRedirectingReason.h"
-#include "properties/CC_PropertyScreeningIndicator.h"
-#include "properties/CC_PropertyString.h"
-#include "properties/CC_PropertyTariff.h"
-#include "properties/CC_PropertyTypeOfNumber.h"
-#include "properties/CC_PropertyUnsigned.h"
-#include "properties/CC_PropertyWaitForMessage.h"
+#include "properties/CC_PropertyClasses.h"
 
 #include <array>
 #include <cstddef>
@@ -31,33 +9,13 @@
 #include <type_traits>
 #include <typeinfo>
 
-namespace
-{
-template <class... Property>
-struct Classes
-{
-    template <class Function>
-    static void FOR_EACH(Function const& function)
-    {
-        (function.template operator()<Property>(), ...);
-    }
-};
-using OwnClasses =
-    Classes<CC_PropertyBoolean, CC_PropertyCallLegState, CC_PropertyCallProgressTone, CC_PropertyCallType,
-            CC_PropertyCause, CC_PropertyCharge, CC_PropertyCodec, CC_PropertyCodecNegotiating, CC_PropertyCodecs,
-            CC_PropertyContextId, CC_PropertyInformationTransferCapability, CC_PropertyIpAddress,
-            CC_PropertyNumberingPlan, CC_PropertyParametrizedString, CC_PropertyPresentationIndicator, CC_PropertyQoS,
-            CC_PropertyRedirectingReason, CC_PropertyScreeningIndicator, CC_PropertyString, CC_PropertyTariff,
-            CC_PropertyTypeOfNumber, CC_PropertyUnsigned, CC_PropertyWaitForMessage>;
-} // namespace
-
 template <class Property>
 CC_PropertyKind const CC_PropertyKind::THE = {
     [](CC_Property const& property, CC_Property const& other)
     { return static_cast<Property const&>(property).hasSameValue(static_cast<Property const&>(other)); },
     [](CC_Property& property, CC_Property const& other)
     { return &property == &other || static_cast<Property&>(property).take(static_cast<Property const&>(other)); },
-    !std::is_same_v<Property, CC_PropertyContextId>};
+    !std::is_same_v<Property, CC_PropertyContextId>, CC_PropertyClasses::PLACE_OF<Property>()};
 
 /// The kinds by the addresses of their type information, which the linker makes the same for all shared objects. Where
 /// it did not, a class would be of no kind: slower, nothing else.
@@ -66,7 +24,7 @@ class CC_PropertyKinds
 public:
     CC_PropertyKinds()
     {
-        OwnClasses::FOR_EACH([]<class Property>() { add(typeid(Property), CC_PropertyKind::THE<Property>); });
+        CC_PropertyClasses::FOR_EACH([]<class Property>() { add(typeid(Property), CC_PropertyKind::THE<Property>); });
     }
 
     static CC_PropertyKind const* FIND(std::type_info const& type)
@@ -117,5 +75,5 @@ CC_PropertyKind const* CC_PropertyKind::OF_BOTH(CC_Property const& property, CC_
 void CC_PropertyKind::ASSIGN_TYPE_IDS()
 {
     std::ignore = CC_Property::TYPE_ID();
-    OwnClasses::FOR_EACH([]<class Property>() { std::ignore = Property::TYPE_ID(); });
+    CC_PropertyClasses::FOR_EACH([]<class Property>() { std::ignore = Property::TYPE_ID(); });
 }

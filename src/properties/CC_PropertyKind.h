@@ -24,6 +24,9 @@ public:
     /// Whether nobody hears of an assignment or the object's end either. The media layer may hear of a context's.
     bool isSelfContained;
 
+    /// The class's place among the library's own (CC_PropertyClasses).
+    unsigned int place;
+
     /// The kind of the object's very class; null for a module's. Any thread.
     static CC_PropertyKind const* OF(CC_Property const& property);
     /// The kind of two objects of the same class; null when the classes differ or are a module's.

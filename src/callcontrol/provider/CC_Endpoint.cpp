@@ -1,9 +1,12 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 
+#include "calls/CC_Call.h"
 #include "properties/CC_PropertyContainer.h"
 #include "properties/CC_PropertyFilterContainer.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <tuple>
+#include <typeinfo>
 
 unsigned int CC_Endpoint::s_numberOfInstances = 0;
 
@@ -33,6 +36,25 @@ XCode CC_Endpoint::addEndpointObserver(Observer& observer)
 void CC_Endpoint::removeEndpointObserver(Observer& observer) { m_observers.removeObserver(observer); }
 
 XCode CC_Endpoint::offer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
+{
+    if (CC_RecordWriter::ON() != nullptr)
+        return offerRecorded(call, name, properties);
+    return offerFiltered(call, name, properties);
+}
+
+XCode CC_Endpoint::offerRecorded(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
+{
+    using Kind = CC_RecordFormat::Kind;
+    unsigned long long const serial = call.getSerial(); // whoever is offered the call may end it, and the endpoint
+    char const* const endpoint = typeid(*this).name();
+    CC_RecordWriter::INSTANCE().addText(Kind::OFFERED, serial, 0, 0, endpoint);
+    XCode const result = offerFiltered(call, name, properties);
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
+        recorder->addText(Kind::OFFER_TAKEN, serial, 0, static_cast<unsigned int>(result.getValue()), endpoint);
+    return result;
+}
+
+XCode CC_Endpoint::offerFiltered(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
 {
     if (m_outputFilterContainer == nullptr)
         return handleOffer(call, name, properties);

@@ -79,6 +79,8 @@ public:
     static unsigned int s_numberOfInstances;
 
 private:
+    XCode offerRecorded(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
+    XCode offerFiltered(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     CC_ObserverContainerOld<Observer, CC_Endpoint> m_observers;
     CC_PropertyFilterContainer* m_inputFilterContainer;
     CC_PropertyFilterContainer* m_outputFilterContainer;

@@ -18,12 +18,16 @@
 class CC_EXPORT IpAddress
 {
 public:
+    using Octets = std::array<unsigned char, 16>;
+
     IpAddress() = default; ///< unspecified, version 4
 
     bool isHostType() const;
     bool isNetType() const { return m_prefixLength != NO_PREFIX; }
     /// 4 or 6
     unsigned int getVersion() const { return m_version; }
+    /// In network order; version 4 uses the first four, the others are 0.
+    Octets const& getOctets() const { return m_octets; }
     /// The prefix length of a network: 0 to 32 bits in version 4, 0 to 128 in version 6. Of any other address the
     /// length of the whole address, 32 or 128.
     unsigned int getPrefixLength() const;
@@ -42,12 +46,11 @@ public:
 
 private:
     static constexpr int NO_PREFIX = -1;
-    using Octets = std::array<unsigned char, 16>;
 
     unsigned int getNumberOfBits() const { return m_version == 4 ? 32 : 128; }
     bool hasBitsBehindPrefix() const;
 
-    Octets m_octets{}; // version 4 uses the first four, the others stay 0
+    Octets m_octets{};
     unsigned char m_version = 4;
     int m_prefixLength = NO_PREFIX;
 };

@@ -6,14 +6,21 @@
 namespace
 {
 std::atomic<TY::Time::Clock> s_clock{nullptr};
+
+clockid_t CLOCK_OF(unsigned int source)
+{
+    return source == TY::Time::REALTIME           ? CLOCK_REALTIME
+           : source == TY::Time::MONOTONIC_COARSE ? CLOCK_MONOTONIC_COARSE
+                                                  : CLOCK_MONOTONIC;
 }
+} // namespace
 
 TY::Time TY::Time::NOW(unsigned int source)
 {
     if (Clock const clock = s_clock.load(std::memory_order_relaxed))
         return clock(source);
     timespec now{};
-    clock_gettime(source == REALTIME ? CLOCK_REALTIME : CLOCK_MONOTONIC, &now);
+    clock_gettime(CLOCK_OF(source), &now);
     return {now.tv_sec, now.tv_nsec};
 }
 

@@ -13,7 +13,8 @@ struct CC_EXPORT Time
     enum Source : unsigned int
     {
         MONOTONIC = 0,
-        REALTIME = 1
+        REALTIME = 1,
+        MONOTONIC_COARSE = 2 ///< the first as of the system's last tick, up to 10 ms ago: four times as quick to read
     };
     /// Replaces the system's clocks; null restores them. Tests drive time with it.
     using Clock = Time (*)(unsigned int source);

@@ -20,9 +20,9 @@ namespace
 constexpr long long NANOSECONDS_IN_SECOND = 1000000000;
 constexpr long long NANOSECONDS_IN_MILLISECOND = 1000000;
 
-long long NOW()
+long long NOW(TY::Time::Source source = TY::Time::MONOTONIC)
 {
-    TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
+    TY::Time const now = TY::Time::NOW(source);
     return now.seconds * NANOSECONDS_IN_SECOND + now.nanoseconds;
 }
 
@@ -106,6 +106,8 @@ bool TYEventLoop::runTurn()
     m_thread.store(std::this_thread::get_id(), std::memory_order_relaxed);
 
     takeTurn();
+    ++m_turns;
+    m_turnTime = NEVER;
     if (hasTimers())
         return runTurnWithTimers();
     bool const hadWork = !m_turn.isEmpty();
@@ -144,6 +146,8 @@ void TYEventLoop::runFirstEvent()
     event.handle();
     event.removeReference();
 }
+
+void TYEventLoop::readTime() { m_turnTime = NOW(m_isInTurn ? TY::Time::MONOTONIC : TY::Time::MONOTONIC_COARSE); }
 
 void TYEventLoop::takeTurn()
 {

@@ -55,6 +55,19 @@ public:
     TYSyncEvent& getSyncEvent(EventPrio::Type priority);
     bool isLoopThread() const { return m_thread.load(std::memory_order_relaxed) == std::this_thread::get_id(); }
 
+    /// How many turns have begun; the loop's thread. It tells which turn something belongs to.
+    unsigned long long getNumberOfTurns() const { return m_turns; }
+    /// Whether a turn is under way; the loop's thread. Otherwise the host, or the one that made the loop, is at work.
+    bool isInTurn() const { return m_isInTurn; }
+    /// What time it is, in nanoseconds of the monotonic clock; the loop's thread. In a turn that of its first reading,
+    /// so that all that a turn does has one time; between turns that of the system's last tick, at most 10 ms ago.
+    long long getTime()
+    {
+        if (!m_isInTurn || m_turnTime == NEVER)
+            readTime();
+        return m_turnTime;
+    }
+
 private:
     friend class TYEvent;
     friend class TYSyncEvent;
@@ -62,6 +75,7 @@ private:
 
     static constexpr long long NEVER = -1; // no moment of the clock, in nanoseconds
 
+    void readTime();
     void takeTurn();
     void runFirstEvent();
     /// Whether timers run, or the descriptor is armed for one that did.
@@ -108,4 +122,6 @@ private:
     bool m_isStopped = false;
     bool m_isEnded = false;
     bool m_isInTurn = false;
+    unsigned long long m_turns = 0; // that have begun
+    long long m_turnTime = NEVER;   // what the turn has read, or who asked last between turns
 };

@@ -1,0 +1,63 @@
+#include "environment/CC_Moment.h"
+
+#include "testing/DrivenClock.h"
+#include "testing/DrivenLoop.h"
+
+#include <gtest/gtest.h>
+#include <tuple>
+
+namespace
+{
+constexpr long long MILLISECOND = 1000000;
+
+struct Moments
+{
+    DrivenClock clock;
+    DrivenLoop loop;
+    CC_Moment first;
+    CC_Moment second;
+};
+
+void TAKE_TWO(void* argument)
+{
+    Moments& moments = *static_cast<Moments*>(argument);
+    moments.first = CC_Moment::NOW();
+    moments.clock.advance(7);
+    moments.second = CC_Moment::NOW();
+}
+} // namespace
+
+TEST(CC_Moment, AllThatHappensInATurnHasOneTime)
+{
+    Moments moments;
+    auto* const event = new TYEvent(moments.loop, EventPrio::HIGH, TAKE_TWO, &moments);
+    std::ignore = event->setIfNotPending();
+    moments.loop.turn();
+    CC_Moment const ofTheFirstTurn = moments.first;
+    EXPECT_EQ(moments.first, moments.second);
+    EXPECT_EQ(moments.first.turn, 1u);
+    std::ignore = event->setIfNotPending();
+    moments.loop.turn();
+    EXPECT_EQ(moments.first.turn, 2u);
+    EXPECT_EQ(moments.first.nanoseconds - ofTheFirstTurn.nanoseconds, 7 * MILLISECOND) << "each turn reads anew";
+    event->destroy();
+}
+
+TEST(CC_Moment, BetweenTurnsTimeGoesOn)
+{
+    Moments moments;
+    TAKE_TWO(&moments);
+    EXPECT_EQ(moments.second.nanoseconds - moments.first.nanoseconds, 7 * MILLISECOND);
+    EXPECT_EQ(moments.second.turn, 0u) << "no turn has begun yet";
+}
+
+TEST(CC_Moment, WithoutALoopIsNoMoment) { EXPECT_EQ(CC_Moment::NOW(), CC_Moment()); }
+
+TEST(CC_Moment, TheSystemsCoarseClockIsTheMonotonicOneOfAMomentAgo)
+{
+    auto const nanoseconds = [](TY::Time const& time) { return time.seconds * 1000000000 + time.nanoseconds; };
+    long long const coarse = nanoseconds(TY::Time::NOW(TY::Time::MONOTONIC_COARSE));
+    long long const exact = nanoseconds(TY::Time::NOW(TY::Time::MONOTONIC));
+    EXPECT_LE(coarse, exact);
+    EXPECT_LE(exact, nanoseconds(TY::Time::NOW(TY::Time::MONOTONIC_COARSE)) + 20 * MILLISECOND);
+}

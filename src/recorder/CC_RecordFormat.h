@@ -1,0 +1,141 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <type_traits>
+
+/// How a recording is laid out, in memory and in a file alike, for who writes it (CC_RecordWriter) and who reads it.
+///
+/// A header, then a ring of records. Positions count octets since the recording began and never wrap: the record at a
+/// position stands in the ring at the position modulo the capacity. A record never wraps either: what is left at the
+/// end of the ring is filled by a PADDING. So the ring's beginning always is a record's, too.
+///
+/// A record bears the low part of its own position, so that a reader finds out what was overwritten while it read, and
+/// the header's `head` moves behind a record when that is complete: whatever ends the process, what lies between `tail`
+/// and `head` is whole. Numbers have the byte order of the machine that wrote them.
+namespace CC_RecordFormat
+{
+inline constexpr char MAGIC[8] = {'c', 'c', 'r', 'e', 'c', 'o', 'r', 'd'};
+/// Of this layout and of what the numbers in it mean (Kind, Writer, CC_PropertyClasses). Adding at the end of these
+/// keeps it.
+inline constexpr std::uint32_t VERSION = 1;
+inline constexpr std::uint32_t BYTE_ORDER_MARK = 0x01020304;
+/// Of records and of everything that a position points to.
+inline constexpr std::size_t ALIGNMENT = 8;
+inline constexpr std::size_t LARGEST_TEXT = 200;
+
+struct Header
+{
+    char magic[8];
+    std::uint32_t version;
+    std::uint32_t byteOrder;
+    std::uint64_t capacity; ///< octets of the ring
+    std::uint64_t head;     ///< the position behind the last record
+    std::uint64_t tail;     ///< the position of the oldest record
+    std::int64_t monotonic; ///< when the recording began, in nanoseconds of the clock that the records bear
+    std::int64_t realtime;  ///< the same moment, in nanoseconds since 1970
+    std::uint64_t process;  ///< the number that the system gave the process
+};
+static_assert(sizeof(Header) == 64 && std::is_trivially_copyable_v<Header>);
+
+/// What happened. In brackets: the record's `detail`, then what follows the record.
+enum class Kind : std::uint8_t
+{
+    PADDING,
+    CALL_ACQUIRED,   ///< a pool made the call
+    CALL_GIVEN_BACK, ///< the call went back to its pool
+    CALL_ENDED,
+    CALL_CHANGED, ///< [property id; Change] a property of the call
+    LEG_MADE,
+    LEG_NAMED, ///< [; text]
+    LEG_JOINED,
+    LEG_LEFT,
+    LEG_MOVED,   ///< [; the number of the call before] both calls and the leg were told; `call` may be none
+    LEG_CHANGED, ///< [property id; Change] a property of the leg
+    LEG_ENDED,
+    DIALLING,     ///< [; text: provider and destination]
+    DIALLED,      ///< [XCode] what came of it
+    OFFERED,      ///< [; text: the endpoint]
+    OFFER_TAKEN,  ///< [XCode; text: the endpoint] what the endpoint said
+    ACCEPTED,     ///< [XCode]
+    TRANSFERRED,  ///< [XCode; the number of the other call, whether the own leg left] the other call's legs to here
+    DROPPED,      ///< [cause; SIP code]
+    FAILED,       ///< [; text: the operation and why]
+    SERVICE,      ///< [; text: class] asked by the leg's adapter
+    SERVICE_TOLD, ///< [; the number of the asking leg, text: class] to the leg's module
+    TOLD,         ///< [how many ids; these, as many as there is room for] the leg's module, of peer and call
+    CLEANED_UP,   ///< [CleanUp] a call looked after itself
+    PUSHED_BACK,  ///< the leg's module was asked to step back from an internal loop
+    LOCK_TAKEN,
+    LOCK_GIVEN_BACK,
+    NUMBER_OF_KINDS
+};
+
+/// Who wrote a property.
+enum class Writer : std::uint8_t
+{
+    OUTSIDE, ///< code outside any adapter
+    OWN,     ///< the adapter of the leg `by`, to its own leg
+    PEER,    ///< the adapter of the leg `by`, to its peer
+    CALL,    ///< the adapter of the leg `by`, to the call
+    POOL,    ///< the pool that makes the call
+    LEG,     ///< the leg itself, when it is made
+    FILTER,  ///< a filter of an endpoint, past the adapter
+    NUMBER_OF_WRITERS
+};
+
+/// What a call's clean-up came to.
+enum class CleanUp : std::uint8_t
+{
+    KEPT,       ///< a leg is live
+    GIVEN_BACK, ///< none is
+    OVERTAKEN,  ///< somebody who was told released the call
+    NUMBER_OF_CLEAN_UPS
+};
+
+struct Record
+{
+    std::uint32_t stamp; ///< the position in units of ALIGNMENT, low part
+    std::uint16_t size;  ///< with all that follows and belongs to it, a multiple of ALIGNMENT
+    Kind kind;
+    Writer writer;            ///< of a change
+    std::int64_t nanoseconds; ///< of the monotonic clock
+    std::uint64_t call;       ///< serial numbers; 0: none
+    std::uint64_t leg;
+    std::uint32_t turn; ///< of the call-control loop, low part
+    std::uint32_t detail;
+};
+static_assert(sizeof(Record) == 40 && std::is_trivially_copyable_v<Record>);
+
+/// A property's value in little room: up to two numbers and the beginning of a text.
+struct Brief
+{
+    static constexpr std::uint8_t NOTHING = 255;     ///< no property
+    static constexpr std::uint8_t OTHER_CLASS = 254; ///< a module's class: the text is the class's name
+    static constexpr unsigned int MOST_TEXT = 32;
+    static constexpr unsigned int FIXED_SIZE = 12; ///< of what stands before the text
+
+    std::uint8_t place = NOTHING; ///< of the class in CC_PropertyClasses
+    std::uint8_t textSize = 0;    ///< octets of the text that are there
+    std::uint16_t textLength = 0; ///< of the whole text, 65535 as well when it is longer
+    std::uint32_t first = 0;
+    std::uint32_t second = 0;
+    char text[MOST_TEXT];
+
+    /// Octets in a recording.
+    unsigned int getSize() const { return FIXED_SIZE + textSize; }
+};
+static_assert(offsetof(Brief, text) == Brief::FIXED_SIZE);
+
+/// What a change begins with; the old and the new value (Brief) follow, and then the name of the filter's class.
+struct Change
+{
+    std::uint64_t by; ///< the serial number of the writing adapter's leg; 0: none
+    std::uint8_t filterPlace;
+    std::uint8_t filterNameSize; ///< 0: no filter has made the value different
+    std::uint8_t reserved[6];
+};
+static_assert(sizeof(Change) == 16);
+inline constexpr unsigned int MOST_FILTER_NAME = 96;
+inline constexpr unsigned int MOST_LISTED_IDS = 16;
+} // namespace CC_RecordFormat
