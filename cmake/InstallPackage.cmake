@@ -1,7 +1,7 @@
 # What `cmake --install` leaves for others: libraries, headers, the test kit, a CMake package and pkg-config files. The
 # folder may be moved afterwards.
 include(CMakePackageConfigHelpers)
-install(TARGETS ccplatform callcontrol callcontrol-testing callcontrol-testing-new-sources
+install(TARGETS ccplatform callcontrol callcontrol-diagnosis callcontrol-testing callcontrol-testing-new-sources
         callcontrol-testing-main-sources
     EXPORT callcontrolTargets
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
@@ -16,7 +16,7 @@ install(FILES ${PROJECT_BINARY_DIR}/callcontrolConfig.cmake ${PROJECT_BINARY_DIR
 
 file(RELATIVE_PATH PREFIX_FROM_PC /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 string(REGEX REPLACE "/$" "" PREFIX_FROM_PC "${PREFIX_FROM_PC}")
-foreach(package callcontrol callcontrol-testing)
+foreach(package callcontrol callcontrol-diagnosis callcontrol-testing)
     configure_file(packaging/${package}.pc.in ${package}.pc @ONLY)
     install(FILES ${PROJECT_BINARY_DIR}/${package}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()

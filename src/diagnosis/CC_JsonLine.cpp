@@ -1,0 +1,77 @@
+#include "diagnosis/CC_JsonLine.h"
+
+#include <array>
+#include <cstdio>
+
+namespace
+{
+constexpr std::string_view REPLACEMENT = "\xef\xbf\xbd"; // U+FFFD
+
+unsigned char OCTET(char c) { return static_cast<unsigned char>(c); }
+
+/// The octets of the UTF-8 character that the text begins with (RFC 3629); 0 when it begins with none.
+std::size_t LENGTH_OF_FIRST(std::string_view text)
+{
+    unsigned char const lead = OCTET(text[0]);
+    if (lead < 0x80)
+        return 1;
+    std::size_t const length = lead >= 0xc2 && lead < 0xe0   ? 2
+                               : lead >= 0xe0 && lead < 0xf0 ? 3
+                               : lead >= 0xf0 && lead < 0xf5 ? 4
+                                                             : 0;
+    if (length == 0 || text.size() < length)
+        return 0;
+    for (std::size_t i = 1; i < length; ++i)
+        if ((OCTET(text[i]) & 0xc0) != 0x80)
+            return 0;
+    unsigned char const second = OCTET(text[1]);
+    bool const isTooLong = (lead == 0xe0 && second < 0xa0) || (lead == 0xf0 && second < 0x90);
+    bool const isNone = (lead == 0xed && second >= 0xa0) || (lead == 0xf4 && second >= 0x90);
+    return isTooLong || isNone ? 0 : length;
+}
+
+void APPEND_ESCAPED(std::string& out, char c)
+{
+    if (c == '"' || c == '\\')
+        (out += '\\') += c;
+    else if (OCTET(c) < 0x20 || c == 0x7f)
+    {
+        std::array<char, 8> escape;
+        std::snprintf(escape.data(), escape.size(), "\\u%04x", unsigned{OCTET(c)});
+        out += escape.data();
+    }
+    else
+        out += c;
+}
+} // namespace
+
+std::string CC_JsonLine::QUOTED(std::string_view text)
+{
+    std::string out = "\"";
+    while (!text.empty())
+    {
+        std::size_t const length = LENGTH_OF_FIRST(text);
+        if (length == 1)
+            APPEND_ESCAPED(out, text[0]);
+        else
+            out += length == 0 ? REPLACEMENT : text.substr(0, length);
+        text.remove_prefix(length == 0 ? 1 : length);
+    }
+    return out + '"';
+}
+
+CC_JsonLine& CC_JsonLine::add(std::string_view name, std::string_view text) { return addJson(name, QUOTED(text)); }
+
+CC_JsonLine& CC_JsonLine::add(std::string_view name, unsigned long long number)
+{
+    return addJson(name, std::to_string(number));
+}
+
+CC_JsonLine& CC_JsonLine::addJson(std::string_view name, std::string_view json)
+{
+    if (m_text.size() > 1)
+        m_text += ',';
+    (m_text += QUOTED(name)) += ':';
+    m_text += json;
+    return *this;
+}

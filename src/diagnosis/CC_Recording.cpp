@@ -1,0 +1,229 @@
+// Reading what may be torn, cut off or anything at all. Nothing in the octets is trusted: sizes are checked before they
+// are used, and every step goes forward. A record is taken for one only where it bears the stamp of its position; where
+// there is none, the reader goes on octet group by octet group until there is, which finds the ring's beginning at the
+// latest.
+#include "diagnosis/CC_Recording.h"
+
+#include "diagnosis/Demangled.h"
+
+#include <algorithm>
+#include <cstring>
+#include <fstream>
+#include <iterator>
+#include <string_view>
+
+using namespace CC_RecordFormat;
+
+namespace
+{
+constexpr std::size_t SIZE_OF_PADDING = 8; // at least; the first octets of a record
+
+/// Takes what follows a record apart, from its front.
+class Payload
+{
+public:
+    explicit Payload(std::string_view octets) : m_octets(octets) {}
+
+    /// Zeros where there are not that many octets.
+    template <class Value>
+    Value take()
+    {
+        Value value{};
+        if (m_octets.size() >= sizeof value)
+        {
+            std::memcpy(&value, m_octets.data(), sizeof value);
+            m_octets.remove_prefix(sizeof value);
+        }
+        return value;
+    }
+    Brief takeBrief()
+    {
+        Brief brief;
+        if (m_octets.size() < Brief::FIXED_SIZE)
+            return brief;
+        std::memcpy(static_cast<void*>(&brief), m_octets.data(), Brief::FIXED_SIZE);
+        m_octets.remove_prefix(Brief::FIXED_SIZE);
+        brief.textSize = static_cast<std::uint8_t>(
+            std::min({std::size_t{brief.textSize}, std::size_t{Brief::MOST_TEXT}, m_octets.size()}));
+        std::memcpy(brief.text, m_octets.data(), brief.textSize);
+        m_octets.remove_prefix(brief.textSize);
+        return brief;
+    }
+    std::string takeText(std::size_t size)
+    {
+        std::string_view const text = m_octets.substr(0, size);
+        m_octets.remove_prefix(text.size());
+        return std::string(text);
+    }
+    /// All that is left, without the zeros that fill the last group.
+    std::string takeRest() { return std::string(m_octets.substr(0, m_octets.find('\0'))); }
+
+private:
+    std::string_view m_octets;
+};
+
+void TAKE_CHANGE(CC_Recording::Event& event, Payload& payload)
+{
+    auto const change = payload.take<Change>();
+    event.by = change.by;
+    event.filterPlace = change.filterPlace;
+    event.before = payload.takeBrief();
+    event.after = payload.takeBrief();
+    event.filter = DEMANGLED(payload.takeText(change.filterNameSize));
+}
+
+void TAKE_IDS(CC_Recording::Event& event, Payload& payload)
+{
+    for (unsigned int left = std::min(event.record.detail, MOST_LISTED_IDS); left > 0; --left)
+        event.ids.push_back(payload.take<std::uint32_t>());
+}
+
+void TAKE(CC_Recording::Event& event, Payload payload)
+{
+    switch (event.record.kind)
+    {
+    case Kind::CALL_CHANGED:
+    case Kind::LEG_CHANGED:
+        return TAKE_CHANGE(event, payload);
+    case Kind::TOLD:
+        return TAKE_IDS(event, payload);
+    case Kind::LEG_MOVED:
+    case Kind::TRANSFERRED:
+    case Kind::DROPPED:
+        event.number = payload.take<std::uint64_t>();
+        event.text = payload.takeRest();
+        return;
+    case Kind::SERVICE_TOLD:
+        event.number = payload.take<std::uint64_t>();
+        event.text = DEMANGLED(payload.takeRest());
+        return;
+    case Kind::OFFERED:
+    case Kind::OFFER_TAKEN:
+    case Kind::SERVICE:
+        event.text = DEMANGLED(payload.takeRest());
+        return;
+    default:
+        event.text = payload.takeRest();
+    }
+}
+} // namespace
+
+/// Walks through the ring of one image.
+class CC_Recording::Reader
+{
+public:
+    Reader(CC_Recording& recording, std::string_view image) : m_recording(recording), m_image(image) {}
+
+    void read()
+    {
+        if (!readHeader())
+            return;
+        m_ring = m_image.substr(sizeof(Header));
+        Header const& header = m_recording.m_header;
+        if (m_ring.size() < header.capacity)
+            complain("it is cut off: " + std::to_string(m_ring.size()) + " of " + std::to_string(header.capacity) +
+                     " octets of the ring are there");
+        std::uint64_t lost = 0;
+        for (std::uint64_t position = header.tail; position < header.head;)
+        {
+            std::uint64_t const size = readRecord(position);
+            std::uint64_t const step = size != 0 ? size : getStepWithoutRecord(position);
+            lost += size != 0 ? 0 : step;
+            position += step;
+        }
+        if (lost != 0)
+            complain(std::to_string(lost) + " octets hold no record that could be read");
+    }
+
+private:
+    bool readHeader()
+    {
+        Header& header = m_recording.m_header;
+        if (m_image.size() < sizeof header)
+            return complain("it is too short for a recording");
+        std::memcpy(&header, m_image.data(), sizeof header);
+        if (!std::equal(std::begin(MAGIC), std::end(MAGIC), header.magic))
+            return complain("it is no recording");
+        if (header.byteOrder != BYTE_ORDER_MARK)
+            return complain("it was written by a machine of another byte order");
+        if (header.version != VERSION)
+            return complain("it has version " + std::to_string(header.version) + ", this reads version " +
+                            std::to_string(VERSION));
+        bool const isWhole = header.capacity != 0 && header.capacity % ALIGNMENT == 0 && header.tail % ALIGNMENT == 0 &&
+                             header.head % ALIGNMENT == 0 && header.tail <= header.head &&
+                             header.head - header.tail <= header.capacity;
+        return isWhole || complain("its header is damaged");
+    }
+
+    /// To where the next record may stand: what is cut off is passed over at once, however much it claims to be.
+    std::uint64_t getStepWithoutRecord(std::uint64_t position) const
+    {
+        Header const& header = m_recording.m_header;
+        std::uint64_t const offset = position % header.capacity;
+        bool const isCutOff = offset + SIZE_OF_PADDING > m_ring.size();
+        return std::min<std::uint64_t>(isCutOff ? header.capacity - offset : ALIGNMENT, header.head - position);
+    }
+
+    /// The size of the record at the position; 0 when there is none.
+    std::uint64_t readRecord(std::uint64_t position)
+    {
+        Header const& header = m_recording.m_header;
+        std::uint64_t const offset = position % header.capacity;
+        Event event;
+        if (offset + SIZE_OF_PADDING > m_ring.size())
+            return 0;
+        std::memcpy(&event.record, m_ring.data() + offset, SIZE_OF_PADDING);
+        std::uint64_t const size = event.record.size;
+        std::uint64_t const most = std::min<std::uint64_t>(header.capacity - offset, header.head - position);
+        if (event.record.stamp != static_cast<std::uint32_t>(position / ALIGNMENT) || size % ALIGNMENT != 0 ||
+            size == 0 || size > most || offset + size > m_ring.size())
+            return 0;
+        if (event.record.kind == Kind::PADDING)
+            return size;
+        if (size < sizeof(Record) || event.record.kind >= Kind::NUMBER_OF_KINDS)
+            return 0;
+        std::memcpy(&event.record, m_ring.data() + offset, sizeof(Record));
+        TAKE(event, Payload(m_ring.substr(offset + sizeof(Record), size - sizeof(Record))));
+        m_recording.m_events.push_back(std::move(event));
+        return size;
+    }
+
+    /// False.
+    bool complain(std::string const& what)
+    {
+        std::string& complaint = m_recording.m_complaint;
+        complaint += complaint.empty() ? what : "; " + what;
+        return false;
+    }
+
+    CC_Recording& m_recording;
+    std::string_view m_image;
+    std::string_view m_ring;
+};
+
+CC_Recording CC_Recording::READ(std::span<std::byte const> image)
+{
+    CC_Recording recording;
+    Reader(recording, {reinterpret_cast<char const*>(image.data()), image.size()}).read();
+    return recording;
+}
+
+CC_Recording CC_Recording::READ_FILE(char const* path)
+{
+    std::ifstream file(path, std::ios::binary);
+    std::string const octets{std::istreambuf_iterator<char>(file), {}};
+    CC_Recording recording;
+    if (file.bad() || !file.is_open())
+        recording.m_complaint = "it cannot be read";
+    else
+        Reader(recording, octets).read();
+    return recording;
+}
+
+long long CC_Recording::getRealtime(Event const& event) const
+{
+    // unsigned, since the times of a damaged recording may be any
+    return static_cast<long long>(static_cast<unsigned long long>(m_header.realtime) +
+                                  static_cast<unsigned long long>(event.record.nanoseconds) -
+                                  static_cast<unsigned long long>(m_header.monotonic));
+}
