@@ -7,9 +7,11 @@
 #include "diagnosis/Demangled.h"
 
 #include <algorithm>
+#include <array>
+#include <cstdio>
 #include <cstring>
-#include <fstream>
 #include <iterator>
+#include <memory>
 #include <string_view>
 
 using namespace CC_RecordFormat;
@@ -61,6 +63,18 @@ public:
 private:
     std::string_view m_octets;
 };
+
+/// Whether the file could be read.
+bool READ_ALL(char const* path, std::string& octets)
+{
+    std::unique_ptr<std::FILE, decltype(&std::fclose)> const file(std::fopen(path, "rb"), std::fclose);
+    if (file == nullptr)
+        return false;
+    std::array<char, 65536> chunk;
+    while (std::size_t const size = std::fread(chunk.data(), 1, chunk.size(), file.get()))
+        octets.append(chunk.data(), size);
+    return std::ferror(file.get()) == 0;
+}
 
 void TAKE_CHANGE(CC_Recording::Event& event, Payload& payload)
 {
@@ -210,10 +224,9 @@ CC_Recording CC_Recording::READ(std::span<std::byte const> image)
 
 CC_Recording CC_Recording::READ_FILE(char const* path)
 {
-    std::ifstream file(path, std::ios::binary);
-    std::string const octets{std::istreambuf_iterator<char>(file), {}};
     CC_Recording recording;
-    if (file.bad() || !file.is_open())
+    std::string octets;
+    if (!READ_ALL(path, octets))
         recording.m_complaint = "it cannot be read";
     else
         Reader(recording, octets).read();

@@ -38,6 +38,12 @@ std::vector<std::uint64_t> LEGS_OF(std::uint64_t call, std::vector<Event> const&
     return legs;
 }
 
+/// That a leg has moved between a call and none follows from its joining or leaving.
+bool IS_SAID_ALREADY(Event const& event)
+{
+    return event.record.kind == Kind::LEG_MOVED && (event.record.call == 0 || event.number == 0);
+}
+
 std::string TIME_AND_TURN(Event const& event, long long start)
 {
     std::array<char, 64> text;
@@ -68,7 +74,8 @@ CC_RecordingReport::Lines CC_RecordingReport::getLadder(std::uint64_t call) cons
     {
         Record const& record = event.record;
         // what a leg went through before it came and after it left is told, too, but not its time in other calls
-        if (call == 0 || (record.call != call && (record.call != 0 || !CONTAINS(legs, record.leg))))
+        if (call == 0 || (record.call != call && (record.call != 0 || !CONTAINS(legs, record.leg))) ||
+            IS_SAID_ALREADY(event))
             continue;
         if (lines.empty())
         {
@@ -110,7 +117,7 @@ class CC_RecordingReport::Summary
 public:
     using Numbers = std::map<std::uint64_t, std::string>; // of the legs
 
-    /// One of the call's events; `cause`: what the event has made the last cause, if it has.
+    /// One of the call's events; `cause`: what it gives for one. The first one tells why the call ends.
     void note(Event const& event, std::string const& cause)
     {
         Record const& record = event.record;
@@ -123,7 +130,7 @@ public:
             m_hasEnded = true;
         if (record.leg != 0 && !CONTAINS(m_legs, record.leg))
             m_legs.push_back(record.leg);
-        if (!cause.empty())
+        if (m_cause.empty())
             m_cause = cause;
     }
 
