@@ -20,8 +20,10 @@ class CC_EXPORT IpAddress
 public:
     IpAddress() = default; ///< unspecified, version 4
 
+    /// Which of the three it is; neither when unspecified. @{
     bool isHostType() const;
     bool isNetType() const { return m_prefixLength != NO_PREFIX; }
+    /// @}
     /// 4 or 6
     unsigned int getVersion() const { return m_version; }
     /// The prefix length of a network: 0 to 32 bits in version 4, 0 to 128 in version 6. Of any other address the
