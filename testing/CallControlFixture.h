@@ -26,14 +26,19 @@ public:
     CallControlFixture(CallControlFixture const&) = delete;
     CallControlFixture& operator=(CallControlFixture const&) = delete;
 
-    /// Null once the test has destroyed the context.
+    /// Null once the test has destroyed the context. @{
     CC_Context* getContext() const;
     CC_CallPool* getPool() const;
+    /// @}
 
+    /// As the loop's. @{
     bool turn() { return m_loop.turn(); }
     unsigned int settle() { return m_loop.settle(); }
+    /// @}
 
+    /// The parts, for what a test does with them itself. @{
     DrivenLoop m_loop;
     FakeMediaContextRepository m_mediaContexts;
     CC_Factory m_factory;
+    /// @}
 };

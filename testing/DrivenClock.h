@@ -23,5 +23,6 @@ public:
     void advance(long long milliseconds);
     /// Moves both clocks to that moment.
     void set(TY::Time const& now);
+    /// What both clock sources say.
     TY::Time const& getTime() const;
 };

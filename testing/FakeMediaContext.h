@@ -9,6 +9,7 @@
 class FakeMediaContext : public MG_IContext
 {
 public:
+    /// `id`: what `getId` gives; two contexts may have the same.
     explicit FakeMediaContext(unsigned int id) : m_id(id) { ++s_numberOfInstances; }
     ~FakeMediaContext() override;
 

@@ -19,7 +19,9 @@ public:
     /// OK with a new context; FAILURE, and nothing made, while it is failing.
     XCode createContext(TYPtr<MG_IContext>& context) override;
 
+    /// From the next answer on.
     void setFailing(bool isFailing) { m_isFailing = isFailing; }
+    /// So far, failed ones and the one under way included.
     unsigned int getNumberOfRequests() const { return m_requests; }
 
     /// Runs inside each request, before it is answered.

@@ -28,6 +28,7 @@
 class FakeModule
 {
 public:
+    /// Short for the states that `become` takes.
     using State = CC_PropertyCallLegState;
 
     /// The name is that of the provider, the endpoint and the recorders, and of the network unless that is given. The
@@ -40,6 +41,7 @@ public:
     FakeModule(FakeModule const&) = delete;
     FakeModule& operator=(FakeModule const&) = delete;
 
+    /// That of the provider, the endpoint and the recorders.
     String const& getName() const { return m_endpoint.getName(); }
     /// The number with which the line accepts and dials other fakes from now on; empty: none. The dial with containers
     /// takes `own` as it is, without the number.
@@ -47,10 +49,13 @@ public:
 
     // --- what becomes of offers; they are accepted unless the test says otherwise ------------------------------------
 
+    /// From the next offer on. @{
     void acceptOffers();
     void rejectOffers(QCause cause);
+    /// @}
     /// The next offer waits for `acceptHeld` or `rejectHeld`, or until its call ends.
     void holdOffers();
+    /// Whether an offer waits.
     bool isHolding() const { return m_heldCall != nullptr; }
     /// The result of the adapter's `accept`; ABSENT when no offer is held.
     XCode acceptHeld();
@@ -59,15 +64,20 @@ public:
 
     // --- what the module does; the results are the adapter's ---------------------------------------------------------
 
+    /// Dials the number at the callee's provider. The number reaches it in the offer.
     XCode dial(FakeModule const& callee, String const& number = "4989123");
     /// The offer carries the number, too, unless it has one already.
     XCode dial(String const& providerName, String const& number, CC_PropertyContainer const& own,
                CC_PropertyContainer const& offer, CC_PropertyContainer const& call);
+    /// Writes the State of the own leg.
     XCode become(State::State state);
+    /// Writes a property of the own leg; a text as a CC_PropertyString. @{
     XCode say(CC_Property const& property);
     XCode say(unsigned int id, String const& text);
+    /// @}
     /// The user keys digits in.
     void key(String const& digits);
+    /// Drops, if there is a leg.
     void hangUp(QCause cause = QCause::NORMAL_CALL_CLEARING);
     /// A new adapter in place of the one before, which drops. After a dial or accept that memory kept from a leg there
     /// is no other way to the next call (CC_CallAdapter::dial).
@@ -79,10 +89,11 @@ public:
     CC_Call* getCall() const;
     /// "CONNECTED"; "none" without a peer.
     std::string getPeerState() const;
-    /// The values as texts; "absent" for what is not there.
+    /// The values as texts; "absent" for what is not there. @{
     std::string getOwnValue(unsigned int id) const;
     std::string getPeerValue(unsigned int id) const;
     std::string getCallValue(unsigned int id) const;
+    /// @}
     /// What was recorded since the last time.
     Lines take() { return m_observer.take(); }
 
@@ -91,9 +102,11 @@ private:
     String m_number;
 
 public:
+    /// What offers come in by, what takes them, and what hears of the peer. @{
     RecordingProvider m_provider;
     RecordingEndpoint m_endpoint;
     RecordingAdapterObserver m_observer;
+    /// @}
     std::unique_ptr<CC_CallAdapterE164> m_adapter; ///< null once the test has destroyed it
 
 private:

@@ -16,6 +16,7 @@
 class FakeRebootMgmt : public Recorder
 {
 public:
+    /// Without memory it is not registered.
     explicit FakeRebootMgmt(std::string name = "reboot", Journal* journal = nullptr);
     ~FakeRebootMgmt();
 
@@ -24,7 +25,7 @@ public:
 
     XCode m_result = XCode::OK; ///< what both operations answer
     Hook<void()> m_onAdd;       ///< these run inside the operation, after the line is written
-    Hook<void()> m_onRelease;
+    Hook<void()> m_onRelease;   ///< the same, of a lock that is given back
 
 private:
     class Interface;

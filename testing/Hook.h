@@ -17,14 +17,17 @@ template <class Result, class... Arguments>
 class Hook<Result(Arguments...)>
 {
 public:
+    /// Any callable of the signature; null: none.
     template <class Function>
     Hook& operator=(Function&& function)
     {
         m_function = std::forward<Function>(function);
         return *this;
     }
+    /// Whether there is a function.
     explicit operator bool() const { return static_cast<bool>(m_function); }
 
+    /// Runs the function that is there now, also when it is replaced meanwhile; without one a plain value.
     Result operator()(Arguments... arguments) const
     {
         std::function<Result(Arguments...)> const running = copy();

@@ -23,13 +23,18 @@ using Lines = std::vector<std::string>;
 class Journal
 {
 public:
+    /// Appends the line.
     void add(std::string line);
 
+    /// In the order in which they came.
     Lines const& getLines() const { return m_lines; }
     /// The lines so far; the journal is empty afterwards.
     Lines take();
+    /// Of lines that are exactly that. @{
     bool contains(std::string const& line) const { return count(line) != 0; }
     std::size_t count(std::string const& line) const;
+    /// @}
+    /// Forgets the lines; the names stay.
     void clear() { m_lines.clear(); }
 
     /// From now on the object is printed as `text`.

@@ -13,7 +13,9 @@
 class LeakCheck
 {
 public:
+    /// One count for each.
     static constexpr std::size_t NUMBER_OF_CLASSES = 8;
+    /// In the order of `CLASS_NAME`.
     using Counts = std::array<unsigned int, NUMBER_OF_CLASSES>;
 
     /// Remembers the numbers of now.
@@ -23,9 +25,10 @@ public:
     std::string compare() const;
 
     /// The present numbers, and the classes to which they belong: CC_Property, CC_Call, CC_CallLeg, CC_CallAdapter,
-    /// CC_Provider, CC_Endpoint, TYEvent, FakeMediaContext.
+    /// CC_Provider, CC_Endpoint, TYEvent, FakeMediaContext. @{
     static Counts COUNTS();
     static char const* CLASS_NAME(std::size_t index);
+    /// @}
 
 private:
     Counts m_before;

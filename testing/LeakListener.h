@@ -10,12 +10,14 @@
 class LeakListener : public testing::EmptyTestEventListener
 {
 public:
+    /// Counts before each test, and compares after it. @{
     void OnTestStart(testing::TestInfo const&) override { m_check = LeakCheck(); }
     void OnTestEnd(testing::TestInfo const&) override
     {
         if (std::string const leaked = m_check.compare(); !leaked.empty())
             ADD_FAILURE() << "The test leaves counted objects behind: " << leaked;
     }
+    /// @}
 
 private:
     LeakCheck m_check;

@@ -26,14 +26,18 @@ public:
     Recorder(Recorder const&) = delete;
     Recorder& operator=(Recorder const&) = delete;
 
+    /// What stands in front of each line.
     std::string const& getRecorderName() const { return m_recorderName; }
+    /// The one that was given, else its own.
     Journal& getJournal() { return *m_journal; }
     /// The lines of the journal, which other recorders may share.
     Lines const& getLines() const { return m_journal->getLines(); }
+    /// The same; the journal is empty afterwards.
     Lines take() { return m_journal->take(); }
 
 protected:
     ~Recorder() = default;
+    /// Writes the line, with the name in front of it.
     void record(std::string const& what);
     /// The name that the journal knows for the call, else "call".
     std::string textOf(CC_Call const* call) const;

@@ -17,6 +17,7 @@
 class RecordingAdapterObserver : public CC_CallAdapterObserver, public Recorder
 {
 public:
+    /// A set of property ids, ascending.
     using Ids = std::vector<unsigned int>;
 
     using Recorder::Recorder;
@@ -33,9 +34,10 @@ public:
     /// The one-line texts of the services.
     Lines const& getServices() const { return m_services; }
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(CC_CallAdapter&, CC_Flags const&)> m_onPeerPropertyChange;
     Hook<void(CC_CallAdapter&, CC_Service&)> m_onPeerSynchronousService;
+    /// @}
 
 private:
     std::vector<Ids> m_flagSets;

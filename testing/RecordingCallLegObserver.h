@@ -27,11 +27,12 @@ public:
     void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event) override;
     void onCallLegSynchronousService(CC_Event<CC_CallLeg> const& event) override;
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(CC_EvCallLegObservationEnded const&)> m_onEnded;
     Hook<void(CC_EvCallLegCallRelinked const&)> m_onRelinked;
     Hook<void(CC_EvCallLegPropertyChanged const&)> m_onChanged;
     Hook<void(CC_EvCallLegSynchronousService const&)> m_onService;
+    /// @}
 
 private:
     std::vector<CC_CallLeg*> m_observed;

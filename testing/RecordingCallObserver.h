@@ -28,11 +28,12 @@ public:
     void onCallCallLegRemoved(CC_Event<CC_Call> const& event) override;
     void onCallPropertyChanged(CC_Event<CC_Call> const& event) override;
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(CC_EvCallObservationEnded const&)> m_onEnded;
     Hook<void(CC_EvCallCallLegModified const&)> m_onLegAdded;
     Hook<void(CC_EvCallCallLegModified const&)> m_onLegRemoved;
     Hook<void(CC_EvCallPropertyChanged const&)> m_onChanged;
+    /// @}
 
 private:
     std::vector<CC_Call*> m_observed;

@@ -27,12 +27,13 @@ public:
     void aboutCreateCall(CC_Context& context, CC_Call* call) override;
     void aboutDestroyCall(CC_Context& context, CC_Call* call) override;
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(CC_Context&)> m_onDestroy;
     Hook<void(CC_Context&, String const&)> m_onAddProvider;
     Hook<void(CC_Context&, String const&)> m_onRemoveProvider;
     Hook<void(CC_Context&, CC_Call*)> m_onCreateCall;
     Hook<void(CC_Context&, CC_Call*)> m_onDestroyCall;
+    /// @}
 
 private:
     void recordOf(CC_Context const& context, std::string const& what);

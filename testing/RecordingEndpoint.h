@@ -30,6 +30,7 @@ public:
     /// Answers what `m_handleOffer` does; OK without it.
     XCode handleOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties) override;
 
+    /// Runs inside `handleOffer`, after it has been recorded.
     Hook<XCode(CC_Call&, String const&, CC_PropertyContainer const&)> m_handleOffer;
 
 private:

@@ -23,9 +23,10 @@ public:
     void aboutFinished(CC_Endpoint& endpoint) override;
     void aboutDestroy(CC_Endpoint& endpoint) override;
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(CC_Endpoint&)> m_onFinished;
     Hook<void(CC_Endpoint&)> m_onDestroy;
+    /// @}
 
 private:
     std::vector<CC_Endpoint*> m_observed;

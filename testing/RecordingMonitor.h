@@ -22,14 +22,18 @@ public:
     /// One log line.
     struct Line
     {
+        /// As it was written; a text may have line breaks of its own. @{
         unsigned int level;
         std::string text;
+        /// @}
+        /// The same level and text.
         friend bool operator==(Line const&, Line const&) = default;
     };
 
     /// `journal` must outlive it; null: none.
     explicit RecordingMonitor(unsigned int level = RTD::LEVEL_BULK, unsigned int monitorId = CC_Monitor::ID,
                               Journal* journal = nullptr);
+    /// All lines of the levels up to `level`, and each of them to the journal as well.
     RecordingMonitor(unsigned int level, Journal& journal) : RecordingMonitor(level, CC_Monitor::ID, &journal) {}
     ~RecordingMonitor() override;
     RecordingMonitor(RecordingMonitor const&) = delete;
@@ -37,11 +41,13 @@ public:
 
     void write(unsigned int monitorId, unsigned int level, char const* text) override;
 
+    /// In the order in which they were written.
     std::vector<Line> const& getLines() const { return m_lines; }
     /// The texts of one level, in their order.
     Lines linesOfLevel(unsigned int level) const;
     /// Whether a line contains the text.
     bool contains(std::string const& text) const;
+    /// Forgets the lines; the journal keeps its.
     void clear() { m_lines.clear(); }
 
 private:

@@ -14,12 +14,14 @@
 class RecordingPropertyFactory : public CC_PropertyFactory, public Recorder
 {
 public:
+    /// `journal` must outlive it; null: it keeps one of its own.
     RecordingPropertyFactory(std::string name, std::vector<unsigned int> ids, Journal* journal = nullptr);
     ~RecordingPropertyFactory() override;
 
     void getPropertyIds(TYVector<unsigned int>& ids) const override;
     CC_Property* createProperty(unsigned int id) override;
 
+    /// Runs inside `createProperty`, after it has been recorded; without it a CC_PropertyString is made.
     Hook<CC_Property*(unsigned int)> m_create;
 
 private:

@@ -16,7 +16,9 @@
 class RecordingPropertyFilter : public CC_PropertyFilter
 {
 public:
+    /// `journal` must outlive the filter and its clones; null: they keep one of their own.
     explicit RecordingPropertyFilter(std::string name, Journal* journal = nullptr);
+    /// What `clone` makes; it counts as alive.
     RecordingPropertyFilter(RecordingPropertyFilter const& other);
     RecordingPropertyFilter& operator=(RecordingPropertyFilter const&) = delete;
     ~RecordingPropertyFilter() override;
@@ -29,15 +31,19 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// Sets the hook, of the clones, too.
     template <class Function>
     void onApply(Function&& function)
     {
         m_shared->apply = std::forward<Function>(function);
     }
+    /// From now on, of the clones, too.
     void refuseClones(bool isRefusing) { m_shared->isRefusing = isRefusing; }
-    /// Clones made of the filter and its clones so far, and filters (clones included) alive.
+    /// Clones made of the filter and its clones so far, and filters (clones included) alive. @{
     unsigned int getNumberOfClones() const { return m_shared->clones; }
     unsigned int getNumberAlive() const { return m_shared->alive; }
+    /// @}
+    /// The lines since the last time, those of the clones included.
     Lines take() { return m_shared->take(); }
 
 private:

@@ -15,6 +15,7 @@
 class RecordingProvider : public CC_Provider, public Recorder
 {
 public:
+    /// `type`: what `getProviderType` gives. `journal` must outlive it; null: it keeps one of its own.
     explicit RecordingProvider(std::string name, Journal* journal = nullptr,
                                ProviderType type = USER_DEFINED_INTERFACE);
     ~RecordingProvider() override;
@@ -27,6 +28,7 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// Runs inside `dial`, after it has been recorded.
     Hook<XCode(CC_Call&, String const&, String const&, CC_PropertyContainer const&)> m_dial;
 
 private:

@@ -17,7 +17,8 @@ public:
     void contextAdded(String const& name) override;
     void contextDestroyed(String const& name) override;
 
-    /// These run inside the notification, after it has been recorded.
+    /// These run inside the notification, after it has been recorded. @{
     Hook<void(String const&)> m_onAdded;
     Hook<void(String const&)> m_onDestroyed;
+    /// @}
 };

@@ -104,9 +104,10 @@ public:
     virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const;
 
-    /// Told instead of the observer when there is none; a subclass may override them. They do nothing.
+    /// Told instead of the observer when there is none; a subclass may override them. They do nothing. @{
     virtual void notifyPeerPropertyChange(CC_Flags const& flags);
     virtual void notifyPeerSynchronousService(CC_Service& service);
+    /// @}
 
     void onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event) override;
     void onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event) override;
@@ -116,34 +117,42 @@ public:
     /// `drop` without its log line.
     void dropOwnCallLeg(QCause cause, unsigned int causeValue);
 
+    /// Empty until `setup`.
     String const& getName() const { return m_name; }
     /// Also renames the leg. An empty name becomes the adapter's address. Without memory the old name stays.
     void setName(String const& name);
+    /// Null until `setup`; the observer may stay so. @{
     CC_Endpoint* getEndpoint() const { return m_endpoint; }
     CC_CallAdapterObserver* getObserver() const { return m_observer; }
+    /// @}
     /// The leg that the adapter drives, and the one of the others that it takes for its peer; null without. They are
-    /// the adapter's as long as it says so: keep one longer through a CC_CallLeg::Reference.
+    /// the adapter's as long as it says so: keep one longer through a CC_CallLeg::Reference. @{
     CC_CallLeg const* getOwnCallLeg() const { return m_ownCallLeg; }
     CC_CallLeg const* getPeerCallLeg() const { return m_peerCallLeg; }
+    /// @}
     /// Empty without an own leg.
     String const& getCallLegName() const;
     /// The own leg's call; null without.
     CC_Call* getCall() const;
 
-    // --- properties --------------------------------------------------------------------------------------------------
-    // Own leg, peer leg and call. Filtered: the endpoint's view; getters read a copy that is kept up to date, setters
-    // write it and then the leg or call through the input filters (the whole copy, since a filter may derive one
-    // property from several). Unfiltered: the leg or call itself.
-    // Getters of one property: null when it, the leg or the call is absent. Getters of several copy those whose id has
-    // a bit in common with `mask` (its group: 0x100, 0x200, 0x400, 0x800, 0x1000): OK, or the first failure, the others
-    // are copied all the same. Those of a view are OK also on an idle adapter, whose views are empty; the unfiltered
-    // ones are ABSENT without the leg or call. Setters: OK; ABSENT without the leg or call, nothing has changed then;
-    // FAILURE for anything else, also when a filter drops or destroys the adapter meanwhile: nothing is written then.
-    //
-    // Where the calling number is before `accept`: among the properties that the endpoint was offered the call with are
-    // the called party's alone; the caller's are those of the call's first leg, `call.getCallLeg(0)->getProperties()`,
-    // and from `accept` on those of the peer.
+    /// @name Properties
+    /// Of own leg, peer leg and call. Filtered: the endpoint's view; getters read a copy that is kept up to date,
+    /// setters write it and then the leg or call through the input filters (the whole copy, since a filter may derive
+    /// one property from several). Unfiltered: the leg or call itself.
+    ///
+    /// Getters of one property: null when it, the leg or the call is absent. Getters of several copy those whose id has
+    /// a bit in common with `mask` (its group: 0x100, 0x200, 0x400, 0x800, 0x1000): OK, or the first failure, the
+    /// others are copied all the same. Those of a view are OK also on an idle adapter, whose views are empty; the
+    /// unfiltered ones are ABSENT without the leg or call. Setters: OK; ABSENT without the leg or call, nothing has
+    /// changed then; FAILURE for anything else, also when a filter drops or destroys the adapter meanwhile: nothing is
+    /// written then.
+    ///
+    /// Where the calling number is before `accept`: among the properties that the endpoint was offered the call with
+    /// are the called party's alone; the caller's are those of the call's first leg,
+    /// `call.getCallLeg(0)->getProperties()`, and from `accept` on those of the peer.
+    /// @{
 
+    /// Getter or setter, of one property or several, filtered or not: as told above.
     CC_Property const* getOwnProperty(unsigned int id) const;
     CC_Property const* getOwnPropertyUnfiltered(unsigned int id) const;
     XCode getOwnProperties(CC_PropertyContainer& properties, unsigned int mask) const;
@@ -170,10 +179,10 @@ public:
     XCode setCallProperties(CC_PropertyContainer const& properties);
     XCode setCallPropertyUnfiltered(CC_Property const& property);
     XCode setCallPropertiesUnfiltered(CC_PropertyContainer const& properties);
+    /// @}
 
-    // The same by typed keys (CC_PropertyKeys.h), filtered. Getters: the property as one of the key's class, or a copy
-    // of its value with a fallback. Setters: with a property made from the values.
-
+    /// The same by typed keys (CC_PropertyKeys.h), filtered. Getters: the property as one of the key's class, or a copy
+    /// of its value with a fallback. Setters: with a property made from the values. @{
     template <class Property>
     CC_FoundProperty<Property> getOwn(CC_PropertyKey<Property> key) const
     {
@@ -225,12 +234,14 @@ public:
         return key.store([this](Property const& made) { return setCallProperty(made); }, XCode::FAILURE,
                          std::forward<Values>(values)...);
     }
+    /// @}
 
     /// The media context of the call (its property 0x400400). Setting goes through the input filters and reports
-    /// nothing; null is returned without a leg, a call or such a property.
+    /// nothing; null is returned without a leg, a call or such a property. @{
     void setDatapathContext(MG_IContext* context);
     MG_IContext* getDatapathContext();
     MG_IContext const* getDatapathContext() const;
+    /// @}
 
     /// ERROR::INVALID for other values.
     static char const* DESTINATION_TYPE_NAME(DestinationType type);

@@ -42,35 +42,44 @@ public:
     /// What a party tells of itself in a dial or accept that is written like a form.
     struct Party
     {
+        /// The number, what Q.931 says about it, and the name for display. @{
         String number{};
         QTypeOfNumber typeOfNumber = QTypeOfNumber::UNKNOWN;
         QNumberingPlan numberingPlan = QNumberingPlan::ISDN;
         QPresentationIndicator presentation = QPresentationIndicator::ALLOWED;
         QScreeningIndicator screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED;
         String name{};
+        /// @}
     };
     /// A dial, by names. The called party's presentation and screening are not used: it has not spoken yet.
     struct DialForm
     {
         String contextName{}; ///< empty: "SWITCH"
+        /// Under which the provider was added to the context.
         String providerName{};
         String destination{}; ///< in the provider's own notation
+        /// Who dials, and whom. @{
         Party calling{};
         Party called{};
+        /// @}
         bool sendingComplete = false; ///< no digits will follow
+        /// What the bearer has to carry, as Q.931 says it.
         QInformationTransferCapability informationTransferCapability = QInformationTransferCapability::SPEECH;
         MG_IContext* datapathContext = nullptr; ///< null: the media layer is asked for a new one
+        /// Merged in last, over what the form says; null: none. @{
         CC_PropertyContainer const* extraOwnProperties = nullptr;
         CC_PropertyContainer const* extraOfferProperties = nullptr;
         CC_PropertyContainer const* extraCallProperties = nullptr;
+        /// @}
     };
 
     CC_CallAdapterE164();
     ~CC_CallAdapterE164() override; ///< `cleanup()`; also forgets the last dial, which nothing else does
 
-    /// These two as the base's: the last dial stays remembered.
+    /// These two as the base's: the last dial stays remembered. @{
     XCode setup(String const& name, CC_Endpoint& endpoint, CC_CallAdapterObserver* observer) override;
     void cleanup() override;
+    /// @}
     /// As the base's, except for user input and its updates while the peer's state is TRYING, ADDRESS_INCOMPLETE,
     /// PROCEEDING or ALERTING: input is appended to the remembered called number and passed on; without memory for the
     /// longer number it is dropped.
@@ -122,16 +131,18 @@ public:
     // digits one by one (true when it says nothing), and becomes ADDRESS_INCOMPLETE when it needs more of them; the
     // calling side says with Supports Overlap-Sending whether more may come, and sends them as CC_ServiceUserInput.
 
-    // --- typed accessors ---------------------------------------------------------------------------------------------
-    // By the ids of CC_PropertyId, in their order. `getOwn...` reads the own view, `getPeer...` the peer view; a
-    // property that is absent or of another class counts as the empty text, 0, false, nothing or null, where nothing
-    // else is said. A getter with an argument returns that instead. `existsPeer...` tells whether the peer has a
-    // property of that id, of whatever class. `setOwn...` gives the result of `setOwnProperty`, FAILURE also when
-    // memory is out. References and pointers lead into the view and hold until that changes.
-    //
-    // What is not here is left out on purpose: the second number is the network's to give and only read of the peer,
-    // alert info and quality of service are for the own leg alone.
+    /// @name Typed accessors
+    /// By the ids of CC_PropertyId, in their order. `getOwn...` reads the own view, `getPeer...` the peer view; a
+    /// property that is absent or of another class counts as the empty text, 0, false, nothing or null, where nothing
+    /// else is said. A getter with an argument returns that instead. `existsPeer...` tells whether the peer has a
+    /// property of that id, of whatever class. `setOwn...` gives the result of `setOwnProperty`, FAILURE also when
+    /// memory is out. References and pointers lead into the view and hold until that changes.
+    ///
+    /// What is not here is left out on purpose: the second number is the network's to give and only read of the peer,
+    /// alert info and quality of service are for the own leg alone.
+    /// @{
 
+    /// Reads, looks for or writes the property of that name: as told above.
     String const& getOwnNetwork() const;
     String const& getPeerNetwork() const;
     XCode setOwnNetwork(String const& network);
@@ -237,10 +248,11 @@ public:
     String const& getPeerXOrgConnID() const;
     XCode setOwnXOrgConnID(String const& id);
 
-    /// Copies; empty also when memory is out. Setting gives the property the next update counter, so that the peer can
-    /// tell a message repeated from the one before.
+    /// A copy; empty also when memory is out.
     CC_PropertyParametrizedString::ParametrizedString getOwnUserToUser() const;
+    /// A copy; empty also when memory is out.
     CC_PropertyParametrizedString::ParametrizedString getPeerUserToUser() const;
+    /// Gives the property the next update counter, so that the peer can tell a message repeated from the one before.
     XCode setOwnUserToUser(CC_PropertyParametrizedString::ParametrizedString const& content);
 
     String const& getOwnDisplay() const;
@@ -276,12 +288,15 @@ public:
     CC_PropertyWaitForMessage::MessageType getOwnWaitForMessageType() const;
     CC_PropertyWaitForMessage::MessageType getPeerWaitForMessageType() const;
 
-    /// True when absent, as for the next: an endpoint can do both unless it says otherwise.
+    /// True when absent, as the next three: an endpoint can do both unless it says otherwise.
     bool getOwnSupportsOverlapReceiving() const;
+    /// True when absent.
     bool getPeerSupportsOverlapReceiving() const;
     XCode setOwnSupportsOverlapReceiving(bool supports);
 
+    /// True when absent.
     bool getOwnSupportsOverlapSending() const;
+    /// True when absent.
     bool getPeerSupportsOverlapSending() const;
     XCode setOwnSupportsOverlapSending(bool supports);
 
@@ -298,6 +313,7 @@ public:
 
     CC_QoS const* getOwnQoS() const;
     XCode setOwnQoS(CC_QoS const& qos);
+    /// @}
 
 private:
     struct LastDial;

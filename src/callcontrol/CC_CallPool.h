@@ -30,9 +30,10 @@ public:
     class CC_EXPORT Statistics
     {
     public:
-        /// A call was acquired, a call was removed. Both take the lock.
+        /// A call was acquired, a call was removed. Both take the lock. @{
         void onCallAdded();
         void onCallRemoved();
+        /// @}
         /// Accounts for the time up to now. With the lock held; the first update only starts the clock.
         void updateCallTime();
         /// With the lock held.
@@ -42,13 +43,17 @@ public:
         /// Brings the counters up to date for a reader. Takes the lock.
         void prepareGet();
 
+        /// Calls that were acquired, and those of them that are gone again: the difference is up. @{
         unsigned long long m_callsAdded = 0;
         unsigned long long m_callsRemoved = 0;
-        unsigned long long m_callTime = 0; ///< call-milliseconds: the number of active calls, summed over time
-        unsigned long long m_maxActiveCalls = 0;
+        /// @}
+        unsigned long long m_callTime = 0;       ///< call-milliseconds: the number of active calls, summed over time
+        unsigned long long m_maxActiveCalls = 0; ///< the most that were up at once, since the start or `resetMax()`
 
+        /// Up to when the call time is accounted for (MONOTONIC; 0: not begun), and the lock of all counters. @{
         static TY::Time s_tLastUpdate;
         static TYMutex s_mutex;
+        /// @}
     };
 
     CC_CallPool() = default;
@@ -58,13 +63,15 @@ public:
 
     /// A new call of this pool with the property Context (0x400400) for `mgContext`; null: the media layer is asked for
     /// a new one. Null when memory is out, and when the media layer or the reboot management, asked meanwhile, have
-    /// destroyed the pool or released the call.
+    /// destroyed the pool or released the call. @{
     CC_Call* acquireCall() { return acquireCall(nullptr); }
     CC_Call* acquireCall(MG_IContext* mgContext);
+    /// @}
     /// Takes the call back and destroys it. Counts and destroys also a call of another pool, which then forgets it, so
     /// hand back only its own. Null is ignored.
     void releaseCall(CC_Call* call) override;
 
+    /// Calls that are up. The places of `getAcquiredCall` are those below it.
     unsigned int getNumberOfAcquiredCalls() const { return m_calls.getCount(); }
     /// The call at that place in the order of acquisition; null past the end.
     CC_Call* getAcquiredCall(unsigned int index);
@@ -74,15 +81,18 @@ public:
     void dropCalls(String const& unused, String const& callName);
 
     /// Takes and gives back the lock on reloads, "Call-Control" / "Calls are ongoing"; without a reboot management
-    /// driver nothing happens.
+    /// driver nothing happens. @{
     void addReloadGracefulLock();
     void releaseReloadGracefulLock();
+    /// @}
 
     /// Diagnostic dump; returns `info`.
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const;
 
+    /// Of all pools together.
     static Statistics s_statistics;
+    /// Not used: stays 0. The moment that counts is the statistics' own.
     static TY::Time s_tLastUpdate;
 
 private:

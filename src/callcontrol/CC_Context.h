@@ -33,6 +33,7 @@ public:
         virtual ~Observer();
         /// The context is being destroyed.
         virtual void aboutDestroy(CC_Context& context) = 0;
+        /// The provider can be found under that name from now on.
         virtual void aboutAddProvider(CC_Context& context, String const& name) = 0;
         /// Told also of a name that had no provider.
         virtual void aboutRemoveProvider(CC_Context& context, String const& name) = 0;
@@ -50,54 +51,65 @@ public:
     CC_Context(CC_Context const&) = delete;
     CC_Context& operator=(CC_Context const&) = delete;
 
-    /// OK, or NO_ELEMENT when memory is out. Registrations are counted, without a floor (CC_CountedObservers).
+    /// OK, or NO_ELEMENT when memory is out. Registrations are counted, without a floor (CC_CountedObservers). @{
     XCode addContextObserver(Observer& observer);
     void removeContextObserver(Observer const& observer);
+    /// @}
 
+    /// The name under which CallControl finds it.
     String const& getName() const { return m_name; }
-    /// Prefixes are kept as they are given. The setters: OK, or FAILURE when memory is out.
+    /// Prefixes are kept as they are given. The setters: OK, or FAILURE when memory is out. @{
     String const& getNationalPrefix() const { return m_nationalPrefix; }
     XCode setNationalPrefix(String const& prefix);
     String const& getInternationalPrefix() const { return m_internationalPrefix; }
     XCode setInternationalPrefix(String const& prefix);
-    /// How many hops a call may have made; 0: not set.
+    /// @}
+    /// How many hops a call may have made; 0: not set. Setting is always OK. @{
     unsigned int getMaxHops() const { return m_maxHops; }
     XCode setMaxHops(unsigned int maxHops);
+    /// @}
 
     /// OK; REFUSED when the name is taken, nobody is told then; FAILURE when memory is out. The provider stays the
     /// module's.
     XCode addProvider(String const& name, CC_Provider& provider);
+    /// Frees the name and tells the observers, also when it had no provider. The provider is left alone.
     void removeProvider(String const& name);
+    /// The places of `getProvider` are those below it.
     unsigned int getNumberOfProviders() const { return m_providerTable.getCount(); }
     /// The provider at that place in the order of adding; null past the end.
     CC_Provider* getProvider(unsigned int index) const;
     /// Null when there is none of that name.
     CC_Provider* getProvider(String const& name) const { return m_providerTable.get(name); }
 
+    /// The pool of its calls, which the context owns.
     CC_CallPool* getCallPool() const { return m_callPool.get(); }
+    /// Calls that are up. The places of `getCall` are those below it.
     unsigned int getNumberOfCalls() const;
     /// The call at that place in the order of acquisition; null past the end.
     CC_Call* getCall(unsigned int index);
     /// A new call, null when none could be had. The media context (null: a new one is asked for) becomes its property
-    /// Context (0x400400).
+    /// Context (0x400400). @{
     CC_Call* acquireCall() { return acquireCall(nullptr); }
     CC_Call* acquireCall(MG_IContext* mgContext);
+    /// @}
     /// Announces the end of the call, then gives it back to the pool. Null is ignored.
     void releaseCall(CC_Call* call);
 
-    /// Diagnostic dumps; they return `info`.
+    /// Diagnostic dumps; they return `info`. @{
     InfoContainer& getProviderInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const;
     InfoContainer& getCallInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                                unsigned int detail, String const& prefix) const;
+    /// @}
 
     /// What the observers are called through. `data` is what the notification passes: null, a `String const*` with the
-    /// provider's name, or the CC_Call*. It is lent for the call: nothing of it is to be kept, changed or deleted.
+    /// provider's name, or the CC_Call*. It is lent for the call: nothing of it is to be kept, changed or deleted. @{
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_ADD_PROVIDER(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_REMOVE_PROVIDER(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_CREATE_CALL(Observer& observer, CC_Context& context, void* data);
     static void NOTIFY_OBSERVER_ABOUT_DESTROY_CALL(Observer& observer, CC_Context& context, void* data);
+    /// @}
 
 private:
     friend class CallControl;

@@ -14,11 +14,14 @@ template <class Observer, class Owner>
 class CC_ObserverContainerOld
 {
 public:
+    /// `data` is what the notification passes on, as the owner says.
     using Trampoline = void (*)(Observer&, Owner&, void* data);
 
     /// OK, or NO_ELEMENT when memory is out.
     XCode addObserver(Observer& observer) { return m_observers.add(&observer); }
+    /// Counts one registration less; an observer that was never added is ignored.
     void removeObserver(Observer const& observer) { m_observers.remove(&observer); }
+    /// From now on nobody is told anything.
     void silence() { m_observers.silence(); }
 
     /// The owner may end inside a notification; the walk then ends with it.

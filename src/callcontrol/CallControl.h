@@ -42,6 +42,7 @@ public:
     {
     public:
         virtual ~ContextObserver();
+        /// The context can be found from now on.
         virtual void contextAdded(String const& name) = 0;
         /// Told before the context is destroyed, and also for a name that has none.
         virtual void contextDestroyed(String const& name) = 0;
@@ -58,17 +59,19 @@ public:
 
     // --- environment, set by the application before the first call ---------------------------------------------------
 
-    /// The loop on which all call-control work runs; null until set. It must outlive all calls.
+    /// The loop on which all call-control work runs; null until set. It must outlive all calls. @{
     TYEventLoop* getCcEventLoop() const { return m_environment.m_ccEventLoop; }
     void setCcEventLoop(TYEventLoop* loop) { m_environment.m_ccEventLoop = loop; }
+    /// @}
     /// REQUIRES: the loop was set.
     TYSyncEvent& getCcSyncEvent(EventPrio::Type priority) const;
-    /// The loop of the datapath; null until set.
+    /// The loop of the datapath; null until set. @{
     TYEventLoop* getDpEventLoop() const { return m_environment.m_dpEventLoop; }
     void setDpEventLoop(TYEventLoop* loop) { m_environment.m_dpEventLoop = loop; }
+    /// @}
     /// REQUIRES: the loop was set.
     TYSyncEvent& getDpSyncEvent(EventPrio::Type priority) const;
-    /// The media layer's repositories; a counted reference is held. Null until set; null gives the held one up.
+    /// The media layer's repositories; a counted reference is held. Null until set; null gives the held one up. @{
     MG_IContextRepository* getMgContextRepository() const { return m_environment.m_mgContextRepository.get(); }
     void setMgContextRepository(MG_IContextRepository* repository)
     {
@@ -82,7 +85,9 @@ public:
     {
         m_environment.m_mgTerminationRepository.set(repository);
     }
+    /// @}
 
+    /// The same, asked of the one object. @{
     static TYEventLoop* GET_CC_EVENT_LOOP();
     static void SET_CC_EVENT_LOOP(TYEventLoop* loop);
     static TYSyncEvent& GET_CC_SYNC_EVENT(EventPrio::Type priority);
@@ -93,6 +98,7 @@ public:
     static void SET_MG_CONTEXT_REPOSITORY(MG_IContextRepository* repository);
     static MG_ITerminationRepository* GET_MG_TERMINATION_REPOSITORY();
     static void SET_MG_TERMINATION_REPOSITORY(MG_ITerminationRepository* repository);
+    /// @}
 
     // --- property factories ------------------------------------------------------------------------------------------
 
@@ -106,9 +112,11 @@ public:
     /// ignored.
     void removePropertyFactory(CC_PropertyFactory* factory);
 
+    /// The same, asked of the one object. @{
     static CC_Property* CREATE_PROPERTY(unsigned int id);
     static XCode ADD_PROPERTY_FACTORY(CC_PropertyFactory* factory);
     static void REMOVE_PROPERTY_FACTORY(CC_PropertyFactory* factory);
+    /// @}
 
     // --- contexts ----------------------------------------------------------------------------------------------------
 
@@ -116,21 +124,27 @@ public:
     XCode createContext(String const& name);
     /// Tells the context observers, also for an unknown name, and then destroys the context.
     void destroyContext(String const& name);
+    /// The context of that name, null if there is none.
     CC_Context* getContext(String const& name) const;
-    /// An observer is held once however often it is registered; when memory is out it is not held.
+    /// An observer is held once however often it is registered; when memory is out it is not held. @{
     void registerContextObserver(ContextObserver& observer);
     void unregisterContextObserver(ContextObserver& observer);
+    /// @}
 
+    /// The same, asked of the one object. @{
     static XCode CREATE_CONTEXT(String const& name);
     static void DESTROY_CONTEXT(String const& name);
     static CC_Context* GET_CONTEXT(String const& name);
     static void REGISTER_CONTEXT_OBSERVER(ContextObserver& observer);
     static void UNREGISTER_CONTEXT_OBSERVER(ContextObserver& observer);
+    /// @}
 
-    // --- operations of a context, by its name (CC_Context tells them) ------------------------------------------------
-    // Without such a context: the empty string, 0 or null from the getters, FAILURE from what returns an XCode, and the
-    // dumps add nothing.
+    /// @name Operations of a context, by its name
+    /// CC_Context tells what they do. Without such a context: the empty string, 0 or null from the getters, FAILURE
+    /// from what returns an XCode, and the dumps add nothing.
+    /// @{
 
+    /// As the context's own operation.
     String const& getNationalPrefix(String const& contextName) const;
     XCode setNationalPrefix(String const& contextName, String const& prefix);
     String const& getInternationalPrefix(String const& contextName) const;
@@ -182,12 +196,15 @@ public:
     static InfoContainer& GET_CALL_INFO(InfoContainer& info, String const& contextName, unsigned int maxLevel,
                                         unsigned int level, unsigned int maxDetail, unsigned int detail,
                                         String const& prefix);
+    /// @}
 
-    // --- the same by names that are no Strings: literals, pointers to texts, views, std::string ----------------------
-    // They make none, so a name of any length takes no memory of the caller's, and none at all where something is
-    // looked up. What keeps a name makes its own and tells by the result that memory is out, as told above; that a name
-    // which is not there was removed is then not announced.
+    /// @name The same by names that are no Strings
+    /// Literals, pointers to texts, views, std::string. They make none, so a name of any length takes no memory of the
+    /// caller's, and none at all where something is looked up. What keeps a name makes its own and tells by the result
+    /// that memory is out, as told above; that a name which is not there was removed is then not announced.
+    /// @{
 
+    /// What the operation of that name does with a String.
     template <TYText Name>
     XCode createContext(Name const& name)
     {
@@ -416,6 +433,7 @@ public:
     {
         return INSTANCE()->getCallInfo(info, contextName, maxLevel, level, maxDetail, detail, prefix);
     }
+    /// @}
 
 private:
     CC_Context* findContext(String const& name) const;

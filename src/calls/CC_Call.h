@@ -60,19 +60,23 @@ public:
     String const& getName() const { return m_name; }
     /// The call's number in this process, from 1 on in the order of their making; never used again.
     unsigned long long getSerial() const { return m_serial; }
-    /// The pool that handed the call out and takes it back; null: the call destroys itself when it is over.
+    /// The pool that handed the call out and takes it back; null: the call destroys itself when it is over. @{
     CC_CallOwner* getCallPool() const { return m_callPool; }
     void setCallPool(CC_CallOwner* callPool) { m_callPool = callPool; }
+    /// @}
 
     /// OK, or NO_ELEMENT when memory is out. Registrations are counted (CC_CountedObservers).
     XCode addCallObserver(CC_CallObserver* observer);
+    /// Counts one registration less; an observer that was never added is ignored.
     void removeCallObserver(CC_CallObserver const* observer);
     /// Adds the observer to every leg of the call, those that join later included. OK, or NO_ELEMENT when memory is
     /// out; it is registered nowhere then. A leg that is just joining tells it from now on; the observers that were
     /// there before hear that leg only from the end of its move, after `onCallCallLegAdded`.
     XCode addCallLegObserver(CC_CallLegObserver* observer);
+    /// Counts one registration less, at the call and at each leg.
     void removeCallLegObserver(CC_CallLegObserver const* observer);
 
+    /// To be read; they change through the operations below.
     CC_PropertyContainer const& getProperties() const { return m_properties; }
     /// Stores the property unless it equals the stored one, and tells nobody; `changed` says whether it was stored.
     /// OK, or REFUSED when memory is out; the old value stays.
@@ -83,15 +87,18 @@ public:
     /// on one event for each such request. OK, or the first failure (REFUSED); the others are stored all the same.
     XCode setProperties(CC_PropertyContainer const& properties);
 
+    /// The places of `getCallLeg` are those below it.
     unsigned int getNumberOfCallLegs() const { return m_callLegs.getSize(); }
     /// The leg at that place in the order of joining, from 0; null past the end.
     CC_CallLeg* getCallLeg(unsigned int index) const;
+    /// The places of `getOtherCallLeg` are those below it: `leg` is left out, if it is in the call.
     unsigned int getNumberOfOtherCallLegs(CC_CallLeg const& leg) const;
     /// The same, with `leg` left out; null when there are not that many.
     CC_CallLeg* getOtherCallLeg(unsigned int index, CC_CallLeg const& leg) const;
     /// The leg of the highest activity level. Among equals `preferred` (may be null), else the first; null without
     /// legs.
     CC_CallLeg* getMostActiveCallLeg(CC_CallLeg const* preferred) const;
+    /// The same, with `excluded` left out.
     CC_CallLeg* getOtherMostActiveCallLeg(CC_CallLeg const& excluded, CC_CallLeg const* preferred) const;
     /// A leg counts as active from DISCONNECTING (0) on.
     State getState() const;
@@ -110,6 +117,7 @@ public:
 
     /// Asks for `deferred()` in the loop's next turn, once however often it is asked.
     void defer();
+    /// What the event of `defer` calls, with the call.
     static void DEFERRED(void* call);
     /// Clean-up: takes out released legs that nobody else holds; gives the call back when no leg is live; and asks the
     /// less active of two legs of the same Network to step back when both are up (CC_ServicePushBack).
@@ -124,9 +132,10 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const;
 
-    /// ERROR::INVALID for other values.
+    /// ERROR::INVALID for other values. @{
     static char const* STATE_NAME(State state);
     static char const* LIVE_STATE_NAME(LiveState state);
+    /// @}
 
     /// The number of calls alive.
     static unsigned int s_numberOfInstances;
@@ -139,11 +148,14 @@ public:
     class CC_EXPORT Hold
     {
     public:
+        /// The call lives at least as long as the hold, or the last of several.
         explicit Hold(CC_Call* call = nullptr);
         ~Hold();
         Hold(Hold const&) = delete;
         Hold& operator=(Hold const&) = delete;
+        /// Exchanges what the two hold.
         void swap(Hold& other) { std::swap(m_call, other.m_call); }
+        /// Null when it holds none.
         CC_Call* get() const { return m_call; }
         /// Whether the call was released meanwhile and ends with the hold.
         bool isReleased() const { return m_call != nullptr && m_call->m_isReleased; }

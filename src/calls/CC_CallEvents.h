@@ -10,6 +10,7 @@ class CC_EXPORT CC_EvCallObservationEnded : public CC_EventClass<CC_EvCallObserv
 {
 public:
     static constexpr char const* CLASS_NAME = "CC_EvCallObservationEnded";
+    /// Made by the call's destructor.
     explicit CC_EvCallObservationEnded(CC_Call& call) : CC_EventClass(call) {}
     ~CC_EvCallObservationEnded() override;
 };
@@ -19,9 +20,11 @@ class CC_EXPORT CC_EvCallCallLegModified : public CC_EventClass<CC_EvCallCallLeg
 {
 public:
     static constexpr char const* CLASS_NAME = "CC_EvCallCallLegModified";
+    /// The leg that joined or left.
     CC_EvCallCallLegModified(CC_Call& call, CC_CallLeg& leg) : CC_EventClass(call), m_callLeg(&leg) {}
     ~CC_EvCallCallLegModified() override;
 
+    /// Lent for the delivery.
     CC_CallLeg* getCallLeg() const { return m_callLeg; }
 
 private:
@@ -33,11 +36,13 @@ class CC_EXPORT CC_EvCallPropertyChanged : public CC_EventClass<CC_EvCallPropert
 {
 public:
     static constexpr char const* CLASS_NAME = "CC_EvCallPropertyChanged";
+    /// `flags`: the ids, copied, which may need memory.
     CC_EvCallPropertyChanged(CC_Call& call, CC_Flags const& flags) : CC_EventClass(call), m_flags(flags) {}
     /// Takes the flags over, which needs no memory.
     CC_EvCallPropertyChanged(CC_Call& call, CC_Flags&& flags) : CC_EventClass(call), m_flags(std::move(flags)) {}
     ~CC_EvCallPropertyChanged() override;
 
+    /// The ids of the properties that changed.
     CC_Flags const& getFlags() const { return m_flags; }
 
 private:

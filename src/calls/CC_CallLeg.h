@@ -35,6 +35,7 @@ public:
     CC_CallLeg(CC_CallLeg const&) = delete;
     CC_CallLeg& operator=(CC_CallLeg const&) = delete;
 
+    /// From any thread.
     void addReference();
     /// Gives one reference up; the last one destroys the leg. From any thread, except for the last.
     void removeReference();
@@ -46,12 +47,14 @@ public:
 
     /// The leg's number in this process, from 1 on in the order of their making; never used again.
     unsigned long long getSerial() const { return m_serial; }
+    /// Empty until it was named.
     String const& getName() const { return m_name; }
     /// The text after "EP" in the leg's log lines. OK, or FAILURE when memory is out.
     XCode setName(String const& name);
 
     /// OK, or NO_ELEMENT when memory is out. Registrations are counted.
     XCode addCallLegObserver(CC_CallLegObserver* observer);
+    /// Counts one registration less; an observer that was never added is ignored.
     void removeCallLegObserver(CC_CallLegObserver const* observer);
 
     /// The value of the State property (`CC_PropertyCallLegState::State`); RELEASED (-1) when the leg has none.
@@ -59,6 +62,7 @@ public:
     /// The same as the state: IDLE -2, RELEASED -1, DISCONNECTING 0 and upward to CONNECTED 6.
     int getActivityLevel() const { return getState(); }
 
+    /// To be read.
     CC_PropertyContainer const& getProperties() const { return m_properties; }
     /// For who writes to the properties without telling anybody. Whoever keeps a copy of them compares everything from
     /// then on (`mayChangeUntold`), so read through the other.
@@ -102,6 +106,7 @@ public:
     class Reference
     {
     public:
+        /// REQUIRES: somebody else holds a reference meanwhile.
         explicit Reference(CC_CallLeg& leg) : m_leg(leg) { m_leg.addReference(); }
         ~Reference() { m_leg.removeReference(); }
         Reference(Reference const&) = delete;

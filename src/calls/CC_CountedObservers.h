@@ -19,8 +19,10 @@ public:
     /// An observer and how often it is registered.
     struct CountedObserver
     {
+        /// The observer stays its owner's; at count 0 it is skipped. @{
         Observer* m_observer;
         Count m_count;
+        /// @}
     };
 
     /// OK, or NO_ELEMENT when memory is out.

@@ -35,7 +35,9 @@ public:
     Source* getSource() const { return m_source; }
 
 protected:
+    /// REQUIRES: the source outlives the delivery.
     explicit CC_Event(Source& source) : m_source(&source) {}
+    /// For `clone`.
     CC_Event(CC_Event const&) = default;
     CC_Event& operator=(CC_Event const&) = delete;
 
@@ -59,6 +61,7 @@ public:
         return dynamic_cast<Derived const&>(event);
     }
 
+    /// A `Derived`, owned by the caller; null when memory is out.
     CC_Event<Source>* clone() const override
     {
         try
@@ -70,6 +73,7 @@ public:
             return nullptr;
         }
     }
+    /// Appends `CLASS_NAME`.
     String& getInfo(String& out) const override { return out += Derived::CLASS_NAME; }
 
 protected:

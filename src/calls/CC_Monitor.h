@@ -5,6 +5,7 @@
 /// The log channel of call control: monitor 41.
 namespace CC_Monitor
 {
+/// Call control's number among the monitors of RTD::REPOSITORY.
 inline constexpr unsigned int ID = 41;
 
 /// The channel when lines of this level are wanted, else null; nothing is to be formatted then.

@@ -11,11 +11,14 @@ template <class Observer, class Source>
 class CC_ObserverContainer
 {
 public:
+    /// What the observer is told by.
     using Operation = void (Observer::*)(CC_Event<Source> const&);
 
     /// OK, or NO_ELEMENT when memory is out.
     XCode addObserver(Observer* observer) { return m_observers.add(observer); }
+    /// Counts one registration less; an observer that was never added is ignored.
     void removeObserver(Observer const* observer) { m_observers.remove(observer); }
+    /// From now on nobody is told anything.
     void silence() { m_observers.silence(); }
 
     /// Hands the event to `operation` of every observer whose count is not 0.
@@ -23,11 +26,13 @@ public:
     {
         m_observers.forEach([&](Observer& observer) { (observer.*operation)(event); });
     }
+    /// Calls `tell(observer)` for every observer whose count is not 0.
     template <class Tell>
     void forEach(Tell&& tell) const
     {
         m_observers.forEach(tell);
     }
+    /// The number of distinct observers ever added.
     unsigned int getNumberOfEntries() const { return m_observers.getNumberOfEntries(); }
 
 private:

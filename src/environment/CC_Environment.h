@@ -14,17 +14,20 @@ class TYEventLoop;
 /// read what they need here: so no folder includes one above it.
 struct CC_EXPORT CC_Environment
 {
+    /// Null until set. @{
     TYEventLoop* m_ccEventLoop = nullptr;
     TYEventLoop* m_dpEventLoop = nullptr;
     TYPtr<MG_IContextRepository> m_mgContextRepository;
     TYPtr<MG_ITerminationRepository> m_mgTerminationRepository;
+    /// @}
 
-    /// Those of the one CallControl; null before it was made, and as long as the application has not set them.
+    /// Those of the one CallControl; null before it was made, and as long as the application has not set them. @{
     static TYEventLoop* CC_EVENT_LOOP() { return s_current != nullptr ? s_current->m_ccEventLoop : nullptr; }
     static MG_IContextRepository* MG_CONTEXT_REPOSITORY()
     {
         return s_current != nullptr ? s_current->m_mgContextRepository.get() : nullptr;
     }
+    /// @}
 
     /// CallControl's business.
     static CC_Environment const* s_current;

@@ -22,13 +22,16 @@ public:
     /// One stored word: bit n of `bits` stands for the number 32 * `wordIndex` + n.
     struct Entry
     {
+        /// The word's number, 0 to 0x7ffffff, and its bits. @{
         unsigned int wordIndex;
         unsigned int bits;
+        /// @}
     };
     /// What getFirstSet returns when there is none.
     static constexpr unsigned int NONE = 0xffffffff;
 
     CC_Flags() = default; ///< empty, with room for nothing
+    /// As the assignment: without memory words are missing.
     CC_Flags(CC_Flags const& other) { *this = other; }
     /// Leaves `other` empty; needs no memory.
     CC_Flags(CC_Flags&& other) noexcept;
@@ -37,6 +40,7 @@ public:
     /// as many words as fit are copied and the rest is missing; nothing tells so.
     CC_Flags& operator=(CC_Flags const& other);
 
+    /// Whether the number is in the set.
     bool get(unsigned int bit) const
     {
         unsigned int const word = WORD_OF(bit);

@@ -21,6 +21,7 @@ public:
     /// The first call assigns the next free number.
     unsigned int get() { return m_number != NONE ? m_number : assign(); }
 
+    /// What a class holds to which no number was assigned.
     static constexpr unsigned int NONE = 0xffffffff;
 
 private:
@@ -41,8 +42,10 @@ class CC_EXPORT CC_PropertyCount
 {
 protected:
     CC_PropertyCount() noexcept { std::atomic_ref(COUNT()).fetch_add(1, std::memory_order_relaxed); }
+    /// Every object counts, a copy as well; assigning changes nothing. @{
     CC_PropertyCount(CC_PropertyCount const&) noexcept : CC_PropertyCount() {}
     CC_PropertyCount& operator=(CC_PropertyCount const&) = default;
+    /// @}
     ~CC_PropertyCount() { std::atomic_ref(COUNT()).fetch_sub(1, std::memory_order_relaxed); }
 
 private:
@@ -73,6 +76,7 @@ public:
     /// The value of a class's type number as long as none was assigned.
     static constexpr unsigned int NO_TYPE_ID = CC_PropertyTypeNumber::NONE;
 
+    /// `id`: one of CC_PropertyId, or a module's own.
     explicit CC_Property(unsigned int id) noexcept : m_id(id) {}
     /// The copy is in no list.
     CC_Property(CC_Property const& other) noexcept
@@ -109,12 +113,14 @@ public:
     virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const;
 
+    /// What it was made with, or has taken over since.
     unsigned int getId() const { return m_id; }
     /// The long name of the id ("Presentation-Indicator"), "(unknown)" for an id without one. Lives for ever.
     char const* getPropertyName() const;
     /// The name of the id in configuration texts ("pi"), "(unknown)" for an id without one. Lives for ever.
     char const* getPropertyShortName() const;
 
+    /// The number of this base, of which every property is.
     static unsigned int TYPE_ID() { return s_typeId.get(); }
     /// Has `property` take over `other`, as `assign` does, and tells what that has no result for: OK, also when the
     /// classes differ; NO_ELEMENT when memory is out.
@@ -122,7 +128,7 @@ public:
 
     /// Live properties of all classes. Counted exactly whatever threads own them; exact to read when none is at work.
     static unsigned int s_numberOfInstances;
-    static CC_PropertyTypeId<CC_Property> s_typeId;
+    static CC_PropertyTypeId<CC_Property> s_typeId; ///< for `TYPE_ID()`
 
 protected:
     /// Sets `error`, as far as memory allows, and returns FAILURE.

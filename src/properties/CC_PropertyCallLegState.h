@@ -32,8 +32,10 @@ public:
     /// Replaces `out` by STATE_NAME.
     String& getValueString(String& out) const override;
 
+    /// Setting tells nobody: a leg takes its state by `CC_CallLeg::setProperty`. @{
     State getState() const { return m_state; }
     void setState(State state) { m_state = state; }
+    /// @}
     bool hasSameValue(CC_PropertyCallLegState const& other) const { return m_state == other.m_state; }
 
     /// "ADDRESS-INCOMPLETE"; ERROR::INVALID for a number that is no state.

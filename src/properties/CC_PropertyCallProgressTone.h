@@ -11,6 +11,7 @@
 class CC_EXPORT CC_PropertyCallProgressTone : public CC_PropertyClass<CC_PropertyCallProgressTone>
 {
 public:
+    /// NONE: no tone is to be heard.
     using Tone = MG_Tones::ECallProgressTone::Type;
 
     static constexpr char const* TYPE_NAME = "Call-Progress-Tone";
@@ -26,10 +27,12 @@ public:
     /// equal.
     String& getValueString(String& out) const override;
 
+    /// Setting a text throws std::bad_alloc when memory is out; the old one stays. @{
     Tone getTone() const { return m_tone; }
     void setTone(Tone tone) { m_tone = tone; }
     String const& getText() const { return m_text; }
     void setText(String const& text) { m_text = text; }
+    /// @}
 
     bool hasSameValue(CC_PropertyCallProgressTone const& other) const
     {

@@ -8,6 +8,7 @@
 class CC_EXPORT CC_PropertyCallType : public CC_PropertyClass<CC_PropertyCallType>
 {
 public:
+    /// The numbers are the system's own.
     enum _eCallType : int
     {
         NORMAL = 0,
@@ -23,8 +24,10 @@ public:
     /// Replaces `out` by CALL_TYPE_NAME.
     String& getValueString(String& out) const override;
 
+    /// A number that is none of them is kept as it is. @{
     _eCallType getValue() const { return m_value; }
     void setValue(_eCallType value) { m_value = value; }
+    /// @}
     bool hasSameValue(CC_PropertyCallType const& other) const { return m_value == other.m_value; }
 
     /// "normal", "message"; "invalid" for any other number.

@@ -25,12 +25,15 @@ public:
     /// Replaces `out` by the text, or without one by the name of the Q.850 cause; " (486)" follows for a SIP code.
     String& getValueString(String& out) const override;
 
+    /// NONE, 0 and empty for what the signalling side did not supply. Setting a text throws std::bad_alloc when memory
+    /// is out; the old one stays. @{
     QCause getCause() const { return m_cause; }
     void setCause(QCause cause) { m_cause = cause; }
     unsigned int getSipCode() const { return m_sipCode; }
     void setSipCode(unsigned int sipCode) { m_sipCode = sipCode; }
     String const& getText() const { return m_text; }
     void setText(String const& text) { m_text = text; }
+    /// @}
 
     /// Replaces `out` by the value of a SIP Reason header and returns it. The Q.850 form wins whenever there is a cause
     /// (UNSPECIFIED counts as one, 4294967295); otherwise the SIP form with the text or the code's phrase; without

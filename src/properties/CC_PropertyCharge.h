@@ -33,8 +33,10 @@ public:
                 static constexpr char const* TYPE_NAME = "ChargeRecorded";
                 Recorded() { declareRecorded(); }
 
+                /// In money, or in units of one type or several. @{
                 Q956::RecordedCurrency m_currency;
                 AsnSequenceOf<Q956::RecordedUnits> m_unitsList;
+                /// @}
 
             private:
                 void declareRecorded();
@@ -43,8 +45,10 @@ public:
             static constexpr char const* TYPE_NAME = "ChargeSpecific";
             Specific() { declareSpecific(); }
 
+            /// The amount, and whether it is final. @{
             Recorded m_recorded;
             AsnEnumerated<Q956::ETypeOfChargingInfo> m_typeOfChargingInfo;
+            /// @}
             AsnEnumerated<Q956::EAOCEBillingId> m_billingId; ///< optional
 
         private:
@@ -54,9 +58,11 @@ public:
         static constexpr char const* TYPE_NAME = "Charge";
         Charge() { declareCharge(); }
 
+        /// Not known, nothing to pay, or an amount. @{
         AsnPrimitiveDerivedWithTag<AsnNullWrapper, AsnTag::UNIVERSAL, AsnTag::NULL_TYPE> m_chargeNotAvailable;
         AsnPrimitiveDerivedWithTag<AsnNullWrapper, AsnTag::UNIVERSAL, AsnTag::NULL_TYPE> m_freeOfCharge;
         Specific m_specific;
+        /// @}
 
     private:
         void declareCharge();
@@ -68,8 +74,10 @@ public:
     using CC_PropertyClass::CC_PropertyClass; ///< nothing selected, unless a charge is given
     CC_PropertyCharge(unsigned int id, Charge const& charge) : CC_PropertyClass(id), m_charge(charge) {}
 
+    /// Setting copies the record: std::bad_alloc when memory is out. @{
     Charge const& getValue() const { return m_charge; }
     void setValue(Charge const& charge) { m_charge = charge; }
+    /// @}
     bool hasSameValue(CC_PropertyCharge const& other) const { return m_charge == other.m_charge; }
     String& getValueString(String& out) const override;
 

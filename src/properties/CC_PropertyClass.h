@@ -47,6 +47,7 @@ public:
 
     using Base::Base;
 
+    /// The number of the class in this process, which the first call assigns.
     static unsigned int TYPE_ID()
     {
         static_assert(HAS_OWN_TYPE_ID<Derived>, "the class needs a `static TypeId s_typeId;` of its own");
@@ -63,11 +64,13 @@ public:
             return static_cast<Derived const*>(property);
         return dynamic_cast<Derived const*>(property);
     }
+    /// The same, to be changed.
     static Derived* FROM(CC_Property* property)
     {
         return const_cast<Derived*>(FROM(static_cast<CC_Property const*>(property)));
     }
 
+    /// Takes over id and value of a `Derived`; anything else, and memory that is out, changes nothing.
     CC_Property& assign(CC_Property const& other) override
     {
         Derived const* const same = SAME_CLASS(other);
@@ -75,6 +78,7 @@ public:
             this->reportFailedAssignment();
         return *this;
     }
+    /// A `Derived`, owned by the caller; null when memory is out.
     CC_Property* clone() const override
     {
         try
@@ -86,9 +90,13 @@ public:
             return nullptr;
         }
     }
+    /// `TYPE_ID()` of the class.
     unsigned int getTypeId() const override { return TYPE_ID(); }
+    /// `Derived::TYPE_NAME`
     char const* getTypeName() const override { return Derived::TYPE_NAME; }
+    /// True for the number of the class and those of its bases.
     bool isOfType(unsigned int typeId) const override { return typeId == TYPE_ID() || Base::isOfType(typeId); }
+    /// Whether `other` is a `Derived`, too, and `hasSameValue`.
     bool isEqual(CC_Property const& other) const override
     {
         Derived const* const same = SAME_CLASS(other);

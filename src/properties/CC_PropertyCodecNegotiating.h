@@ -9,6 +9,7 @@
 class CC_EXPORT CC_PropertyCodecNegotiating : public CC_PropertyClass<CC_PropertyCodecNegotiating>
 {
 public:
+    /// How far a side has come in agreeing on a codec.
     enum State : int
     {
         NOT_CAPABLE = 0,
@@ -30,10 +31,12 @@ public:
     /// ERROR::INVALID for a number that is no state.
     String& getValueString(String& out) const override;
 
+    /// State and value are set apart; the value is what was agreed on, and says nothing before NEGOTIATED. @{
     State getState() const { return m_state; }
     void setState(State state) { m_state = state; }
     unsigned int getNegotiatedValue() const { return m_negotiatedValue; }
     void setNegotiatedValue(unsigned int negotiatedValue) { m_negotiatedValue = negotiatedValue; }
+    /// @}
 
     bool hasSameValue(CC_PropertyCodecNegotiating const& other) const
     {

@@ -36,11 +36,13 @@ public:
     class BasicIterator
     {
     public:
+        /// What the standard library asks of an iterator. @{
         using iterator_category = std::forward_iterator_tag;
         using value_type = CC_Property;
         using difference_type = std::ptrdiff_t;
         using pointer = Property*;
         using reference = Property&;
+        /// @}
 
         BasicIterator() = default;
         /// A constant one from the other.
@@ -49,6 +51,7 @@ public:
             : m_position(other.m_position)
         {
         }
+        /// As of a standard forward iterator. REQUIRES, but for comparing: it stands on a property. @{
         reference operator*() const { return *m_position; }
         pointer operator->() const { return &*m_position; }
         BasicIterator& operator++()
@@ -66,6 +69,7 @@ public:
         {
             return left.m_position == right.m_position;
         }
+        /// @}
 
     private:
         friend class CC_PropertyContainer;
@@ -77,10 +81,13 @@ public:
 
         Position m_position;
     };
+    /// For walks over properties to be read, and to be changed. @{
     using ConstIterator = BasicIterator<CC_Property const>;
     using Iterator = BasicIterator<CC_Property>;
+    /// @}
 
     CC_PropertyContainer() = default;
+    /// As the assignment: what memory refuses is missing.
     CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
     ~CC_PropertyContainer()
     {
@@ -92,27 +99,32 @@ public:
     /// are taken over where they stand.
     CC_PropertyContainer& operator=(CC_PropertyContainer const& other);
 
-    /// The property of that id, null if there is none. It stays the container's; removing it ends it.
+    /// The property of that id, null if there is none. It stays the container's; removing it ends it. @{
     CC_Property* get(unsigned int id);
     CC_Property const* get(unsigned int id) const;
+    /// @}
     /// The same by a typed key (CC_PropertyKeys.h), none as well when it is of another class than the key's.
     template <class Property>
     CC_FoundProperty<Property> get(CC_PropertyKey<Property> key) const
     {
         return key.in(get(key.getId()));
     }
-    /// The property at that position, null past the end.
+    /// The property at that position, null past the end. @{
     CC_Property* getByIndex(unsigned int index);
     CC_Property const* getByIndex(unsigned int index) const;
+    /// @}
+    /// The positions of `getByIndex` are those below the number. @{
     unsigned int getNumberOfProperties() const { return m_properties.getCount(); }
     bool isEmpty() const { return m_properties.isEmpty(); }
+    /// @}
     /// Whether no operation of any property calls anybody (CC_PropertyKind); also false once there was another.
     bool isSelfContained() const { return m_isSelfContained; }
-    /// In order. Adding properties does not disturb a walk, removing the one it stands on does.
+    /// In order. Adding properties does not disturb a walk, removing the one it stands on does. @{
     ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
     ConstIterator end() const { return ConstIterator(m_properties.end()); }
     Iterator begin() { return Iterator(m_properties.begin()); }
     Iterator end() { return Iterator(m_properties.end()); }
+    /// @}
 
     /// Stores a copy: assigned to the property of that id if there is one, otherwise appended.
     ///
@@ -138,6 +150,7 @@ public:
     bool remove(unsigned int id);
     /// Deletes the property at that position; whether there was one.
     bool removeByIndex(unsigned int index);
+    /// Deletes all properties.
     void clear()
     {
         if (m_isSelfContained)

@@ -29,6 +29,7 @@ public:
 
     /// The side's container, or null.
     CC_PropertyContainer* get(CC_PropertyContainerType type) const { return m_containers.get(type); }
+    /// At most one for each side.
     unsigned int getNumberOfContainers() const { return m_containers.getCount(); }
 
     /// Adds the line "Property Containers" and, unless this dump is already part of such a one, the containers one

@@ -17,6 +17,7 @@ public:
     static constexpr char const* TYPE_NAME = "ContextId";
     static TypeId s_typeId;
 
+    /// Asks the media layer for a new context, as `setContext` does with null.
     explicit CC_PropertyContextId(unsigned int id) : CC_PropertyContextId(id, nullptr) {}
     /// As `setContext`.
     CC_PropertyContextId(unsigned int id, MG_IContext* context);

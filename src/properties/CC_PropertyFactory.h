@@ -25,6 +25,8 @@ public:
     virtual CC_Property* createProperty(unsigned int id) = 0;
 
 protected:
+    /// For derived classes. @{
     CC_PropertyFactory(CC_PropertyFactory const&) = default;
     CC_PropertyFactory& operator=(CC_PropertyFactory const&) = default;
+    /// @}
 };

@@ -19,8 +19,10 @@ class CC_EXPORT CC_PropertyFilter
 {
 public:
     CC_PropertyFilter() = default;
+    /// For derived classes, whose `clone` copies. @{
     CC_PropertyFilter(CC_PropertyFilter const&) = default;
     CC_PropertyFilter& operator=(CC_PropertyFilter const&) = default;
+    /// @}
 
     virtual ~CC_PropertyFilter();
     /// A copy, owned by the caller; null when memory is out.

@@ -25,6 +25,7 @@ public:
     CC_PropertyFilterContainer(CC_PropertyFilterContainer const&) = delete;
     CC_PropertyFilterContainer& operator=(CC_PropertyFilterContainer const&) = delete;
 
+    /// The positions of `getFilter` are those below it.
     unsigned int getNumberOfFilters() const { return m_filters.getCount(); }
     /// The filter at that position (0 is applied first), null past the end, and while the one that it replaces ends. It
     /// stays the container's.

@@ -8,11 +8,12 @@
 ///     leg.setProperty(CC_PropertyString(CC_PropertyId::E164_NUMBER, "49891234"));
 namespace CC_PropertyId
 {
-// the network and the identity of a call leg
+/// The network and the identity of a call leg. @{
 inline constexpr unsigned int NETWORK = 0x400100;
 inline constexpr unsigned int CALL_LEG_ID = 0x400101;
+/// @}
 
-// parties, numbers and what else their signalling exchanges
+/// Parties, numbers and what else their signalling exchanges. @{
 inline constexpr unsigned int E164_NUMBER = 0x400200;
 inline constexpr unsigned int TYPE_OF_NUMBER = 0x400201;
 inline constexpr unsigned int NUMBERING_PLAN = 0x400202;
@@ -54,35 +55,41 @@ inline constexpr unsigned int CURRENT_CODEC = 0x40022b;
 inline constexpr unsigned int CODEC_NEGOTIATING = 0x40022c;
 inline constexpr unsigned int WAIT_FOR_MESSAGE = 0x40022d;
 inline constexpr unsigned int READY_FOR_CODEC_NEGOTIATION = 0x40022e;
+/// @}
 
-// ids that modules may use between themselves: the factory creates them, but they have no name
+/// Ids that modules may use between themselves: the factory creates them, but they have no name. @{
 inline constexpr unsigned int UNNAMED_UNSIGNED = 0x40021f;
 inline constexpr unsigned int UNNAMED_BOOLEAN = 0x400220;
 inline constexpr unsigned int UNNAMED_STRING = 0x400221;
 inline constexpr unsigned int UNNAMED_SECOND_STRING = 0x400222;
 inline constexpr unsigned int UNNAMED_THIRD_STRING = 0x400223;
 inline constexpr unsigned int UNNAMED_SECOND_BOOLEAN = 0x400224;
+/// @}
 
-// the media context and tones
+/// The media context and tones. @{
 inline constexpr unsigned int CONTEXT = 0x400400;
 inline constexpr unsigned int PROVIDES_DATA = 0x400401;
 inline constexpr unsigned int CALL_PROGRESS_TONE = 0x400402;
+/// @}
 
-// what an endpoint announces that it can do, and the tariff
+/// What an endpoint announces that it can do, and the tariff. @{
 inline constexpr unsigned int SUPPORTS_OVERLAP_RECEIVING = 0x400801;
 inline constexpr unsigned int SUPPORTS_OVERLAP_SENDING = 0x400802;
 inline constexpr unsigned int ALLOWS_PUSH_BACK = 0x400803;
 inline constexpr unsigned int TARIFF = 0x400804;
+/// @}
 
-// records and the state of a call leg
+/// Records and the state of a call leg. @{
 inline constexpr unsigned int CHARGE = 0x401000;
 inline constexpr unsigned int CAUSE = 0x401001;
 inline constexpr unsigned int QUALITY_OF_SERVICE = 0x401002;
 inline constexpr unsigned int STATE = 0x401003;
+/// @}
 
-// Set apart for modules, which agree among themselves who takes which. They are a group of their own, of bit 15 alone:
-// the library gives it to none of its ids, and none of its other groups' masks has it, so they are in nobody's way and
-// cross with ALL_GROUPS like all others. Declared names: CC_PropertyTable::DECLARE, or CC_PropertyKey.
+/// Set apart for modules, which agree among themselves who takes which. They are a group of their own, of bit 15 alone:
+/// the library gives it to none of its ids, and none of its other groups' masks has it, so they are in nobody's way and
+/// cross with ALL_GROUPS like all others. Declared names: CC_PropertyTable::DECLARE, or CC_PropertyKey. @{
 inline constexpr unsigned int FIRST_OF_MODULES = 0x408000;
 inline constexpr unsigned int LAST_OF_MODULES = 0x4080ff;
+/// @}
 } // namespace CC_PropertyId

@@ -46,16 +46,20 @@ template <class Property>
 class CC_FoundProperty
 {
 public:
+    /// Of what the property is asked for first.
     using Value = std::remove_cvref_t<decltype(CC_PROPERTY_VALUE(std::declval<Property const&>()))>;
 
+    /// Null: none.
     explicit CC_FoundProperty(Property const* property) : m_property(property) {}
 
+    /// Whether there is one.
     explicit operator bool() const { return m_property != nullptr; }
     /// Null for none.
     Property const* get() const { return m_property; }
-    /// REQUIRES: there is one.
+    /// REQUIRES: there is one. @{
     Property const& operator*() const { return *m_property; }
     Property const* operator->() const { return m_property; }
+    /// @}
     /// A copy of the value, `fallback` for none. Throws std::bad_alloc when a copy needs memory and it is out.
     template <class Fallback>
     requires CC_PropertyValueFrom<Fallback const&, Value> Value getValueOr(Fallback const& fallback)
@@ -86,10 +90,13 @@ template <class Property>
 class CC_PropertyKey
 {
 public:
+    /// Of what a property of the key is asked for first.
     using Value = typename CC_FoundProperty<Property>::Value;
 
+    /// Nothing looks whether properties of the id are of the class; `in` finds none where they are not.
     constexpr explicit CC_PropertyKey(unsigned int id) : m_id(id) {}
 
+    /// One of CC_PropertyId, or a module's own.
     constexpr unsigned int getId() const { return m_id; }
     /// As CC_PropertyTable::DECLARE.
     XCode declare(char const* longName, char const* shortName) const

@@ -36,11 +36,12 @@
 ///     container.set(Key::CAUSE, QCause::USER_BUSY, 486);
 namespace Key
 {
-// the network and the identity of a call leg
+/// The network and the identity of a call leg. @{
 inline constexpr CC_PropertyKey<CC_PropertyString> NETWORK(CC_PropertyId::NETWORK);
 inline constexpr CC_PropertyKey<CC_PropertyUnsigned> CALL_LEG_ID(CC_PropertyId::CALL_LEG_ID);
+/// @}
 
-// parties, numbers and what else their signalling exchanges
+/// Parties, numbers and what else their signalling exchanges. @{
 inline constexpr CC_PropertyKey<CC_PropertyString> E164_NUMBER(CC_PropertyId::E164_NUMBER);
 inline constexpr CC_PropertyKey<CC_PropertyTypeOfNumber> TYPE_OF_NUMBER(CC_PropertyId::TYPE_OF_NUMBER);
 inline constexpr CC_PropertyKey<CC_PropertyNumberingPlan> NUMBERING_PLAN(CC_PropertyId::NUMBERING_PLAN);
@@ -94,30 +95,35 @@ inline constexpr CC_PropertyKey<CC_PropertyCodecNegotiating> CODEC_NEGOTIATING(C
 inline constexpr CC_PropertyKey<CC_PropertyWaitForMessage> WAIT_FOR_MESSAGE(CC_PropertyId::WAIT_FOR_MESSAGE);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean>
     READY_FOR_CODEC_NEGOTIATION(CC_PropertyId::READY_FOR_CODEC_NEGOTIATION);
+/// @}
 
-// ids that modules may use between themselves: the factory creates them, but they have no name
+/// Ids that modules may use between themselves: the factory creates them, but they have no name. @{
 inline constexpr CC_PropertyKey<CC_PropertyUnsigned> UNNAMED_UNSIGNED(CC_PropertyId::UNNAMED_UNSIGNED);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean> UNNAMED_BOOLEAN(CC_PropertyId::UNNAMED_BOOLEAN);
 inline constexpr CC_PropertyKey<CC_PropertyString> UNNAMED_STRING(CC_PropertyId::UNNAMED_STRING);
 inline constexpr CC_PropertyKey<CC_PropertyString> UNNAMED_SECOND_STRING(CC_PropertyId::UNNAMED_SECOND_STRING);
 inline constexpr CC_PropertyKey<CC_PropertyString> UNNAMED_THIRD_STRING(CC_PropertyId::UNNAMED_THIRD_STRING);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean> UNNAMED_SECOND_BOOLEAN(CC_PropertyId::UNNAMED_SECOND_BOOLEAN);
+/// @}
 
-// the media context and tones
+/// The media context and tones. @{
 inline constexpr CC_PropertyKey<CC_PropertyContextId> CONTEXT(CC_PropertyId::CONTEXT);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean> PROVIDES_DATA(CC_PropertyId::PROVIDES_DATA);
 inline constexpr CC_PropertyKey<CC_PropertyCallProgressTone> CALL_PROGRESS_TONE(CC_PropertyId::CALL_PROGRESS_TONE);
+/// @}
 
-// what an endpoint announces that it can do, and the tariff
+/// What an endpoint announces that it can do, and the tariff. @{
 inline constexpr CC_PropertyKey<CC_PropertyBoolean>
     SUPPORTS_OVERLAP_RECEIVING(CC_PropertyId::SUPPORTS_OVERLAP_RECEIVING);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean> SUPPORTS_OVERLAP_SENDING(CC_PropertyId::SUPPORTS_OVERLAP_SENDING);
 inline constexpr CC_PropertyKey<CC_PropertyBoolean> ALLOWS_PUSH_BACK(CC_PropertyId::ALLOWS_PUSH_BACK);
 inline constexpr CC_PropertyKey<CC_PropertyTariff> TARIFF(CC_PropertyId::TARIFF);
+/// @}
 
-// records and the state of a call leg
+/// Records and the state of a call leg. @{
 inline constexpr CC_PropertyKey<CC_PropertyCharge> CHARGE(CC_PropertyId::CHARGE);
 inline constexpr CC_PropertyKey<CC_PropertyCause> CAUSE(CC_PropertyId::CAUSE);
 inline constexpr CC_PropertyKey<CC_PropertyQoS> QUALITY_OF_SERVICE(CC_PropertyId::QUALITY_OF_SERVICE);
 inline constexpr CC_PropertyKey<CC_PropertyCallLegState> STATE(CC_PropertyId::STATE);
+/// @}
 } // namespace Key

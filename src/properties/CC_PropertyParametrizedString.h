@@ -18,18 +18,23 @@ public:
     /// One parameter.
     struct KeyValuePair
     {
+        /// Any two texts. @{
         String key;
         String value;
+        /// @}
+        /// Case matters.
         friend bool operator==(KeyValuePair const&, KeyValuePair const&) = default;
     };
 
     /// A value; copying it throws std::bad_alloc when memory is out.
     struct CC_EXPORT ParametrizedString
     {
+        /// What stands in front of the parameters.
         String content;
         TYVector<KeyValuePair> parameters; ///< in the order in which they were appended; a key may occur again
 
         ParametrizedString() = default;
+        /// Without parameters. Throws std::bad_alloc when memory is out.
         explicit ParametrizedString(String const& mainText) : content(mainText) {}
 
         /// The value of the first parameter with that key, whatever the case of its letters; String::s_empty without
@@ -49,17 +54,21 @@ public:
     static TypeId s_typeId;
 
     using CC_PropertyClass::CC_PropertyClass; ///< empty, counter 0
+    /// With the update counter 0. @{
     CC_PropertyParametrizedString(unsigned int id, String const& content) : CC_PropertyClass(id), m_content(content) {}
     CC_PropertyParametrizedString(unsigned int id, ParametrizedString const& content)
         : CC_PropertyClass(id), m_content(content)
     {
     }
+    /// @}
 
     /// Replaces `out` by the content, followed by " key=value" for each parameter.
     String& getValueString(String& out) const override;
 
+    /// What `setContent` gave last; at first the counter is 0. @{
     ParametrizedString const& getContent() const { return m_content; }
     unsigned int getUpdateCounter() const { return m_updateCounter; }
+    /// @}
     /// Throws std::bad_alloc when memory is out; the value is then unchanged.
     void setContent(unsigned int counter, ParametrizedString const& content);
 

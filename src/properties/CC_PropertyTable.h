@@ -16,6 +16,7 @@ public:
     /// All that belongs to one id.
     struct Row
     {
+        /// One of CC_PropertyId, or a module's own.
         unsigned int id;
         char const* longName;  ///< null: the id has no name
         char const* shortName; ///< null: the id has no name
@@ -25,8 +26,10 @@ public:
         unsigned int listPosition; ///< 1 to NUMBER_OF_LISTED_IDS; 0: the factory does not list the id
     };
 
+    /// The library's ids, and those of them that the built-in factory creates and lists. @{
     static constexpr unsigned int NUMBER_OF_IDS = 60;
     static constexpr unsigned int NUMBER_OF_LISTED_IDS = 57;
+    /// @}
 
     /// The row of the id, of a declared one as well, or null. Lives for ever.
     static Row const* FIND(unsigned int id);

@@ -24,9 +24,11 @@ public:
         static constexpr char const* TYPE_NAME = "Tariff";
         Tariff() { declareTariff(); }
 
+        /// Not known, the rates of the charged items, or an arrangement that the users know by number. @{
         AsnPrimitive m_chargeNotAvailable{AsnTag::UNIVERSAL, AsnTag::NULL_TYPE};
         AsnSequenceOf<Q956::AOCSCurrencyInfo> m_currencyInfoList;
         AsnPrimitiveNativeWithTag<int, AsnTag::UNIVERSAL, AsnTag::INTEGER> m_specialArrInfo;
+        /// @}
 
     private:
         void declareTariff();
@@ -38,8 +40,10 @@ public:
     using CC_PropertyClass::CC_PropertyClass; ///< nothing selected, unless a tariff is given
     CC_PropertyTariff(unsigned int id, Tariff const& tariff) : CC_PropertyClass(id), m_tariff(tariff) {}
 
+    /// Setting copies the record: std::bad_alloc when memory is out. @{
     Tariff const& getValue() const { return m_tariff; }
     void setValue(Tariff const& tariff) { m_tariff = tariff; }
+    /// @}
     bool hasSameValue(CC_PropertyTariff const& other) const { return m_tariff == other.m_tariff; }
     String& getValueString(String& out) const override;
 

@@ -20,8 +20,10 @@ public:
     /// Replaces `out` by "0x" and at least eight lower-case hexadecimal digits.
     String& getValueString(String& out) const override;
 
+    /// A derived class may compute the number, and do with one that is set what it likes. @{
     virtual unsigned long long getValue() const;
     virtual void setValue(unsigned long long value);
+    /// @}
 
     bool hasSameValue(CC_PropertyUnsigned const& other) const { return getValue() == other.getValue(); }
 

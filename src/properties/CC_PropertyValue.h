@@ -22,9 +22,12 @@ public:
     using Argument = std::conditional_t<std::is_scalar_v<Value>, Value, Value const&>;
 
     using CC_PropertyClass<Derived>::CC_PropertyClass;
+    /// A copy of the value: std::bad_alloc when it needs memory that is out.
     CC_PropertyValue(unsigned int id, Argument value) : CC_PropertyClass<Derived>(id), m_value(value) {}
 
+    /// A reference, where it is one, holds as long as the property.
     Argument getValue() const { return m_value; }
+    /// A copy of the value: std::bad_alloc when it needs memory that is out.
     void setValue(Argument value) { m_value = value; }
     bool hasSameValue(CC_PropertyValue const& other) const { return m_value == other.m_value; }
 

@@ -27,14 +27,17 @@ public:
         unsigned int number = 0;       ///< of the notification: the view has heard all if they come one after the other
     };
 
+    /// The copy.
     CC_PropertyContainer const& getProperties() const { return m_properties; }
     /// Whether that notification of the source is the last that was heard, or looked at with everything else.
     bool hasHeard(unsigned int number) const { return m_lastHeard == number; }
+    /// Empties the copy, which is in step with no source then.
     void clear();
 
-    /// Stores into the view alone, as the container's `set` does; the source may or may not follow.
+    /// Stores into the view alone, as the container's `set` does; the source may or may not follow. @{
     XCode write(CC_Property const& property);
     XCode write(CC_PropertyContainer const& properties);
+    /// @}
 
     /// The same for the first properties, which are not copied. REQUIRES: the view is empty.
     void take(CC_PropertyContainer& properties) { m_properties.take(properties); }

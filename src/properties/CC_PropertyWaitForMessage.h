@@ -9,6 +9,7 @@
 class CC_EXPORT CC_PropertyWaitForMessage : public CC_PropertyClass<CC_PropertyWaitForMessage>
 {
 public:
+    /// How far a side's wait has come.
     enum State : int
     {
         NOT_CAPABLE = 0,
@@ -16,6 +17,7 @@ public:
         WAIT_FOR_MESSAGE = 2,
         MESSAGE_ARRIVED = 3
     };
+    /// The message that is waited for.
     enum MessageType : int
     {
         UNDEFINED = 0,
@@ -35,10 +37,12 @@ public:
     /// ERROR::INVALID for a number that is no state.
     String& getValueString(String& out) const override;
 
+    /// State and type are set apart; the type says nothing in NOT_CAPABLE and IDLE. @{
     State getState() const { return m_state; }
     void setState(State state) { m_state = state; }
     MessageType getMessageType() const { return m_messageType; }
     void setMessageType(MessageType messageType) { m_messageType = messageType; }
+    /// @}
 
     bool hasSameValue(CC_PropertyWaitForMessage const& other) const
     {

@@ -36,13 +36,16 @@ public:
                 public:
                     static constexpr char const* TYPE_NAME = "MediaType";
                     MediaType() { declareMediaType(); }
+                    /// From and to the program's own structure, as it is. @{
                     MG_Rtp::MediaType get() const { return {m_codec, m_packetPeriod}; }
                     void set(MG_Rtp::MediaType const& mediaType)
                     {
                         m_codec = mediaType.codec;
                         m_packetPeriod = mediaType.packetPeriod;
                     }
+                    /// @}
 
+                    /// Numbered as in MG_Rtp.
                     AsnPrimitiveNativeWithTag<MG_Rtp::ECodec::Type, AsnTag::UNIVERSAL, AsnTag::INTEGER> m_codec;
                     /// milliseconds
                     AsnPrimitiveNativeWithTag<unsigned int, AsnTag::UNIVERSAL, AsnTag::INTEGER> m_packetPeriod;
@@ -54,6 +57,7 @@ public:
                 static constexpr char const* TYPE_NAME = "RtpCfg";
                 RtpCfg() { declareRtpCfg(); }
 
+                /// The codec and its packet period.
                 MediaType m_mediaType;
 
             private:
@@ -71,6 +75,7 @@ public:
                     static constexpr char const* TYPE_NAME = "Stat";
                     Stat() { declareStat(); }
 
+                    /// As whoever owns the stream has counted; each travels in 32 bits. @{
                     AsnInteger m_rxPackets;
                     AsnInteger m_rxOctets; ///< of payload
                     AsnInteger m_rxPacketsLost;
@@ -78,6 +83,7 @@ public:
                     AsnInteger m_txPackets;
                     AsnInteger m_txOctets;      ///< of payload
                     AsnInteger m_roundTripTime; ///< milliseconds
+                    /// @}
 
                 private:
                     void declareStat();
@@ -96,6 +102,7 @@ public:
             static constexpr char const* TYPE_NAME = "RTP";
             RTP() { declareRTP(); }
 
+            /// How often the stream went over to another codec.
             AsnInteger m_codecChanges;
             RtpCfg m_config;      ///< optional
             RtpStat m_statistics; ///< optional
@@ -107,8 +114,10 @@ public:
         static constexpr char const* TYPE_NAME = "MediaInfo";
         MediaInfo() { declareMediaInfo(); }
 
+        /// Over RTP, or a channel of a trunk, of which no more is told. @{
         RTP m_rtp;
         AsnNull m_ds0;
+        /// @}
 
     private:
         void declareMediaInfo();
@@ -117,8 +126,10 @@ public:
     static constexpr char const* TYPE_NAME = "CC-QoS";
     CC_QoS() { declareCC_QoS(); }
 
+    /// A measure of whoever owns the stream; the library only carries it.
     AsnInteger m_voiceQuality;
     AsnInteger m_meanOpinionScore; ///< in hundredths: 412 means 4.12
+    /// Without a selection the record has no encoding.
     MediaInfo m_mediaInfo;
 
 private:

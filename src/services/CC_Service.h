@@ -36,13 +36,16 @@ public:
                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const = 0;
 
     static unsigned int TYPE();
+    /// What a class's variable holds before it has a number.
     static unsigned int INVALID_TYPE() { return 0xffffffff; }
     /// A number that no class has, counted up from 0.
     static unsigned int ACQUIRE_TYPE();
 
 protected:
+    /// For derived classes. @{
     CC_Service(CC_Service const&) = default;
     CC_Service& operator=(CC_Service const&) = default;
+    /// @}
 
     /// The number in `held`, a class's own variable, acquired while it is INVALID_TYPE().
     static unsigned int KEEP_TYPE(unsigned int& held)

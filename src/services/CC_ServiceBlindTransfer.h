@@ -21,8 +21,10 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// As they were given: the feature code, empty when there was none, and whom to connect to. @{
     String const& getCode() const { return m_code; }
     String const& getNumber() const { return m_number; }
+    /// @}
 
     static unsigned int TYPE();
 

@@ -17,6 +17,7 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// NONE when the transfer succeeded.
     QCause getCause() const { return m_cause; }
 
     static unsigned int TYPE();

@@ -23,7 +23,9 @@ template <class Derived>
 class CC_EXPORT CC_ServiceClass : public CC_Service
 {
 public:
+    /// `Derived::TYPE()`
     unsigned int type() const override { return Derived::TYPE(); }
+    /// True for `Derived::TYPE()` and CC_Service::TYPE().
     bool isOfType(unsigned int type) const override { return type == Derived::TYPE() || type == CC_Service::TYPE(); }
 
 protected:

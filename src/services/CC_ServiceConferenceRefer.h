@@ -16,6 +16,7 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// Where the conference is reached.
     String const& getReferTo() const { return m_referTo; }
 
     static unsigned int TYPE();

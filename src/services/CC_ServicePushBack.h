@@ -17,6 +17,7 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// The Call-Leg-ID property of the leg that is asked.
     unsigned long long getCallLegId() const { return m_callLegId; }
 
     static unsigned int TYPE();

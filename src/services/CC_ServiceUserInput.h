@@ -19,8 +19,10 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// The digits, and the milliseconds for which the key was held, 0 when that is not known. @{
     String const& getInput() const { return m_input; }
     unsigned int getDuration() const { return m_duration; }
+    /// @}
 
     static unsigned int TYPE();
 

@@ -23,6 +23,7 @@ public:
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
 
+    /// Milliseconds so far, 0 when that is not known.
     unsigned int getDuration() const { return m_duration; }
 
     static unsigned int TYPE();

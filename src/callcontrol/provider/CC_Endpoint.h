@@ -35,6 +35,7 @@ public:
         virtual ~Observer();
         /// The endpoint's work is done. Told by the module alone, through NOTIFY_OBSERVER_ABOUT_FINISHED.
         virtual void aboutFinished(CC_Endpoint& endpoint) = 0;
+        /// The endpoint is being destroyed: its own class's part is gone already.
         virtual void aboutDestroy(CC_Endpoint& endpoint) = 0;
     };
 
@@ -47,6 +48,7 @@ public:
     virtual ~CC_Endpoint();
     /// OK, or FAILURE when memory is out. Registrations are counted (CC_CountedObservers).
     virtual XCode addEndpointObserver(Observer& observer);
+    /// Counts one registration less; an observer that was never added is ignored.
     virtual void removeEndpointObserver(Observer& observer);
     /// Offers the call to the endpoint under the called name or number; the properties pass through a copy made by the
     /// output filters. What `handleOffer` returns; FAILURE when memory is out.
@@ -65,15 +67,17 @@ public:
     virtual void actionRejectOfferedCall_WithCause(CC_Call& call, CC_PropertyContainer const& properties, QCause cause);
 
     /// May be null. A dial under way goes on with the input filters that it began with, so they have to stay until it
-    /// has returned.
+    /// has returned. @{
     void setInputFilterContainer(CC_PropertyFilterContainer* filters) { m_inputFilterContainer = filters; }
     void setOutputFilterContainer(CC_PropertyFilterContainer* filters) { m_outputFilterContainer = filters; }
     CC_PropertyFilterContainer* getInputFilterContainer() const { return m_inputFilterContainer; }
     CC_PropertyFilterContainer* getOutputFilterContainer() const { return m_outputFilterContainer; }
+    /// @}
 
-    /// What the observers are called through; call control passes null for `data` and nothing reads it.
+    /// What the observers are called through; call control passes null for `data` and nothing reads it. @{
     static void NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void* data);
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Endpoint& endpoint, void* data);
+    /// @}
 
     /// The number of endpoints alive.
     static unsigned int s_numberOfInstances;

@@ -27,6 +27,7 @@ class CC_PropertyContainer;
 class CC_EXPORT CC_Provider
 {
 public:
+    /// What it is to who configures the gateway; call control treats all alike.
     enum ProviderType : int
     {
         HIDDEN_INTERNAL_INTERFACE = 0,
@@ -44,6 +45,7 @@ public:
     public:
         Observer() = default;
         virtual ~Observer();
+        /// The provider is being destroyed: its own class's part is gone already.
         virtual void aboutDestroy(CC_Provider& provider) = 0;
     };
 
@@ -57,6 +59,7 @@ public:
     virtual ~CC_Provider();
     /// OK, or FAILURE when memory is out. Registrations are counted (CC_CountedObservers).
     virtual XCode addProviderObserver(Observer& observer);
+    /// Counts one registration less; an observer that was never added is ignored.
     virtual void removeProviderObserver(Observer const& observer);
     /// Carry the call to `destination` (in the provider's own notation): offer it to an endpoint. `providerName` is the
     /// name under which the provider was found. OK when the call was offered, also when the endpoint then rejects it
@@ -70,6 +73,7 @@ public:
     ///
     virtual XCode dial(CC_Call& call, String const& providerName, String const& destination,
                        CC_PropertyContainer const& offerProperties) = 0;
+    /// Call control does not ask for it.
     virtual ProviderType getProviderType() const = 0;
     /// Diagnostic dump; returns `info`.
     virtual InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
@@ -77,9 +81,10 @@ public:
 
     /// What the observers are called through; call control passes null for `data` and nothing reads it.
     static void NOTIFY_OBSERVER_ABOUT_DESTROY(Observer& observer, CC_Provider& provider, void* data);
-    /// ERROR::INVALID for other values; the type 6 has a short name and no long one, on purpose: it is not shown.
+    /// ERROR::INVALID for other values; the type 6 has a short name and no long one, on purpose: it is not shown. @{
     static char const* PROVIDER_TYPE_NAME(ProviderType type);
     static char const* PROVIDER_TYPE_SHORT_NAME(ProviderType type);
+    /// @}
 
     /// The number of providers alive.
     static unsigned int s_numberOfInstances;

@@ -19,8 +19,9 @@ public:
     bool isUsed(unsigned int index) const override { return index == m_selected; }
     void use(unsigned int index) override;
 
+    /// False: the value has no encoding.
     bool hasSelection() const { return m_selected != NONE; }
-    // REQUIRES, in both: `alternative` is a declared member of this object
+    /// REQUIRES, as below: `alternative` is a declared member of this object.
     bool isSelected(AsnSyntax const& alternative) const { return isUsed(indexOf(alternative)); }
     /// Selects the alternative, whose value stays, and resets another that was selected before. Returns it.
     template <class Alternative>
@@ -37,12 +38,13 @@ public:
     bool decodeAs(AsnDecoder& decoder, AsnElement const& element, bool isTagged) override;
 
 protected:
-    // copied as the whole that it is part of: another class has other components
+    /// Copied as the whole that it is part of: another class has other components. @{
     ASN_CHOICE() = default;
     ASN_CHOICE(ASN_CHOICE const&) = default;
     ASN_CHOICE(ASN_CHOICE&&) = default;
     ASN_CHOICE& operator=(ASN_CHOICE const&) = default;
     ASN_CHOICE& operator=(ASN_CHOICE&&) = default;
+    /// @}
 
     bool hasSameValue(AsnSyntax const& same) const override;
     bool encodeContents(AsnEncoder& encoder) const override;

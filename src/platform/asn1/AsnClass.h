@@ -21,6 +21,7 @@ class CC_EXPORT AsnClass : public Base
 public:
     using Base::Base;
 
+    /// A `Derived`, owned by the caller; null when memory is out.
     AsnSyntax* clone() const override
     {
         try
@@ -32,9 +33,13 @@ public:
             return nullptr;
         }
     }
+    /// The same with its initial value.
     AsnSyntax* createNew() const override { return new (std::nothrow) Derived(); }
+    /// Back to what a new `Derived` holds.
     void reset() noexcept override { self() = Derived(); }
+    /// Moves the value of `same` here. REQUIRES: it is a `Derived`
     void take(AsnSyntax& same) noexcept override { self() = std::move(static_cast<Derived&>(same)); }
+    /// `Derived::TYPE_NAME`; null when it states none.
     char const* getTypeName() const override
     {
         if constexpr (requires { Derived::TYPE_NAME; })
@@ -42,6 +47,7 @@ public:
         else
             return nullptr;
     }
+    /// `Derived::CONSTRAINT`; empty when it states none.
     char const* getConstraint() const override
     {
         if constexpr (requires { Derived::CONSTRAINT; })

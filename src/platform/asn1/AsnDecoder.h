@@ -9,8 +9,10 @@ class AsnSyntax;
 /// of the whole input, which is octet 0.
 struct AsnElement
 {
+    /// What the identifier octets say. @{
     AsnTag tag;
     bool isConstructed = false;
+    /// @}
     std::size_t offset = 0; ///< of the identifier
     std::size_t begin = 0;  ///< of the contents
     std::size_t end = 0;    ///< behind the contents
@@ -44,12 +46,15 @@ public:
     /// Goes into the contents of a constructed element, unless it is primitive or too deep. Each success is ended by
     /// `close`; after a failure nothing more is decoded.
     bool open(AsnElement const& element);
+    /// Comes out of the contents again.
     void close() { --m_depth; }
     /// Whether the element is primitive, as the types without components must be.
     bool expectPrimitive(AsnElement const& element);
 
+    /// The octet at that position of the input, and its address. REQUIRES: it lies within. @{
     unsigned char getOctet(std::size_t position) const { return m_octets[position]; }
     unsigned char const* getOctets(std::size_t position) const { return m_octets + position; }
+    /// @}
 
     /// Fails with the reason followed by the element's tag: "has no place for [3], octet 7".
     bool failWithTag(char const* reason, AsnElement const& element);

@@ -21,9 +21,11 @@ class CC_EXPORT AsnEncoder : public AsnTrace
 public:
     using AsnTrace::AsnTrace;
 
+    /// Puts one octet before those that are there.
     void prepend(unsigned char octet) { m_reversed.push_back(octet); }
     /// Identifier and length octets before contents of that length.
     void prependHeader(AsnTag tag, bool isConstructed, std::size_t contentLength);
+    /// Octets written so far.
     std::size_t getSize() const { return m_reversed.size(); }
     /// Puts all octets into `out` in their order on the wire; OK, or NO_ELEMENT when memory is out, `out` unchanged.
     XCode finish(AsnOctets& out) const;

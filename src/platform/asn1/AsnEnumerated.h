@@ -9,6 +9,7 @@
 class CC_EXPORT AsnEnumeratedPrimitive : public AsnIntegerPrimitive
 {
 public:
+    /// Names and numbers, in static memory.
     using Identifiers = std::span<NamedValue<int> const>;
 
     using AsnIntegerPrimitive::AsnIntegerPrimitive;
@@ -30,11 +31,13 @@ public:
     static constexpr char const* TYPE_NAME = Enumeration::TYPE_NAME;
 
     AsnEnumerated() : AsnClass<AsnEnumerated, AsnEnumeratedPrimitive>(AsnTag::UNIVERSAL, AsnTag::ENUMERATED) {}
+    /// From the program's value, which need not be one of the enumeration's.
     AsnEnumerated& operator=(typename Enumeration::Type value)
     {
         this->setNumber(value);
         return *this;
     }
+    /// The value on the wire, be it one of the enumeration's or not.
     operator typename Enumeration::Type() const { return static_cast<typename Enumeration::Type>(this->getNumber()); }
     AsnEnumeratedPrimitive::Identifiers getIdentifiers() const override { return Enumeration::IDENTIFIERS(); }
 };

@@ -9,8 +9,10 @@
 /// replaced: there the tag is wrapped around it, as X.680 demands.
 struct AsnImplicit
 {
+    /// The number in the brackets: [3]. At most AsnTag::MAX_NUMBER. @{
     explicit constexpr AsnImplicit(unsigned int tagNumber) : number(tagNumber) {}
     unsigned int number;
+    /// @}
 };
 
 /// Marks a component of a sequence that may be absent.
@@ -29,11 +31,17 @@ struct AsnOptional
 ///     static_assert(AsnField::ARE_DISTINCT(FIELDS));
 struct CC_EXPORT AsnField
 {
+    /// In static memory; what error texts and the notation call it.
     char const* name;
     AsnTag tag; ///< none: the type's own
+    /// Whether it may be absent, which only a sequence allows, and how it is reached in the object that it is part of.
+    /// @{
     bool isOptional;
     AsnSyntax const& (*get)(AsnSyntax const& owner);
+    /// @}
 
+    /// For the member `MEMBER`, a pointer to member: under its type's own tag or a context-specific one, and whether it
+    /// may be absent. @{
     template <auto MEMBER>
     static constexpr AsnField OF(char const* name)
     {
@@ -54,6 +62,7 @@ struct CC_EXPORT AsnField
     {
         return {name, AsnTag(AsnTag::CONTEXT, tag.number), true, GET<MEMBER>};
     }
+    /// @}
 
     /// Whether no name and no context-specific tag occurs twice. Own tags are the types' and not seen here.
     template <std::size_t SIZE>

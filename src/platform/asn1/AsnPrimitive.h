@@ -42,11 +42,13 @@ class CC_EXPORT AsnIA5StringWrapper : public AsnPrimitive
 {
 public:
     using AsnPrimitive::AsnPrimitive;
+    /// Octets of 128 and above are refused only when it is encoded.
     AsnIA5StringWrapper& operator=(String const& text)
     {
         m_text = text;
         return *this;
     }
+    /// The text, which may contain NUL octets.
     String const& get() const { return m_text; }
 
     Kind getKind() const override { return Kind::IA5_STRING; }
@@ -67,8 +69,10 @@ class CC_EXPORT AsnIntegerPrimitive : public AsnPrimitive
 {
 public:
     using AsnPrimitive::AsnPrimitive;
+    /// The number as it stands on the wire, two's complement of 32 bits. @{
     int getNumber() const { return m_number; }
     void setNumber(int number) { m_number = number; }
+    /// @}
 
     Kind getKind() const override { return Kind::INTEGER; }
 
@@ -107,14 +111,19 @@ class CC_EXPORT AsnPrimitiveNativeWithTag
 
 public:
     AsnPrimitiveNativeWithTag() : AsnClass<AsnPrimitiveNativeWithTag, AsnIntegerPrimitive>(FLAGS, NUMBER) {}
+    /// To the wire's 32 bits, bit for bit.
     AsnPrimitiveNativeWithTag& operator=(Native value)
     {
         this->setNumber(static_cast<int>(value));
         return *this;
     }
+    /// From the wire's 32 bits, bit for bit.
     operator Native() const { return static_cast<Native>(this->getNumber()); }
 };
 
+/// The NULL type.
 using AsnNull = AsnPrimitiveDerivedWithTag<AsnNullWrapper, AsnTag::UNIVERSAL, AsnTag::NULL_TYPE>;
+/// The IA5String type.
 using AsnIA5String = AsnPrimitiveDerivedWithTag<AsnIA5StringWrapper, AsnTag::UNIVERSAL, AsnTag::IA5_STRING>;
+/// The INTEGER type, as far as 32 bits go.
 using AsnInteger = AsnPrimitiveNativeWithTag<int, AsnTag::UNIVERSAL, AsnTag::INTEGER>;

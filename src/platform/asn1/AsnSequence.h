@@ -38,7 +38,8 @@ public:
     bool isUsed(unsigned int index) const override;
     void use(unsigned int index) override { m_present |= 1U << index; }
 
-    // REQUIRES, in all three: `component` is a declared member of this object
+    /// True also for a component that is not optional. REQUIRES, as below: `component` is a declared member of this
+    /// object.
     bool isPresent(AsnSyntax const& component) const { return isUsed(indexOf(component)); }
     /// Makes an optional component present; its value stays. Returns it.
     template <class Component>
@@ -51,12 +52,13 @@ public:
     void setAbsent(AsnSyntax& component);
 
 protected:
-    // copied as the whole that it is part of: another class has other components
+    /// Copied as the whole that it is part of: another class has other components. @{
     AsnSequence() = default;
     AsnSequence(AsnSequence const&) = default;
     AsnSequence(AsnSequence&&) = default;
     AsnSequence& operator=(AsnSequence const&) = default;
     AsnSequence& operator=(AsnSequence&&) = default;
+    /// @}
 
     bool hasSameValue(AsnSyntax const& same) const override;
     bool encodeContents(AsnEncoder& encoder) const override;

@@ -30,6 +30,7 @@ struct AsnElement;
 class CC_EXPORT AsnSyntax
 {
 public:
+    /// What a value is made of, with the class to which it may then be cast.
     enum class Kind : unsigned char
     {
         NULL_VALUE,  ///< AsnPrimitive
@@ -50,6 +51,7 @@ public:
     virtual void reset() noexcept = 0;
     /// Takes the value out of `same`. REQUIRES: `same` is of the same class
     virtual void take(AsnSyntax& same) noexcept = 0;
+    /// The same for all objects of a class.
     virtual Kind getKind() const = 0;
     /// The name that the type bears in its module, null for a type that is written out where it is used.
     virtual char const* getTypeName() const = 0;
@@ -61,6 +63,7 @@ public:
     /// Whether `other` is of the same class and has the same value: the same optional components present, the same
     /// alternative selected, and what is present and selected equal. What is not does not matter.
     bool isEqual(AsnSyntax const& other) const;
+    /// As `isEqual`.
     friend bool operator==(AsnSyntax const& left, AsnSyntax const& right) { return left.isEqual(right); }
 
     /// Replaces `out` by the value's DER octets. OK; REFUSED when the value has no encoding (a choice without a
@@ -85,16 +88,20 @@ public:
     virtual bool decodeAs(AsnDecoder& decoder, AsnElement const& element, bool isTagged);
 
 protected:
+    /// For derived classes: a value is copied as one of the class that it is of. @{
     AsnSyntax() = default;
     AsnSyntax(AsnSyntax const&) = default;
     AsnSyntax(AsnSyntax&&) = default;
     AsnSyntax& operator=(AsnSyntax const&) = default;
     AsnSyntax& operator=(AsnSyntax&&) = default;
+    /// @}
 
     /// REQUIRES: `same` is of the same class
     virtual bool hasSameValue(AsnSyntax const& same) const = 0;
+    /// What stands between the header and the end of the element. REQUIRES: who reads has found the tag right. @{
     virtual bool encodeContents(AsnEncoder& encoder) const = 0;
     virtual bool decodeContents(AsnDecoder& decoder, AsnElement const& element) = 0;
+    /// @}
 
 private:
     bool isConstructed() const { return getKind() >= Kind::SEQUENCE; }

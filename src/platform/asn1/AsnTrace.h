@@ -20,8 +20,10 @@ public:
     class Step
     {
     public:
+        /// REQUIRES: the trace and the name outlive it; the step made last ends first. @{
         Step(AsnTrace& trace, char const* name) : m_trace(trace), m_before(trace.m_last), m_name(name) { link(); }
         Step(AsnTrace& trace, std::size_t index) : m_trace(trace), m_before(trace.m_last), m_index(index) { link(); }
+        /// @}
         ~Step() { m_trace.m_last = m_before; }
         Step(Step const&) = delete;
         Step& operator=(Step const&) = delete;

@@ -5,16 +5,18 @@
 /// The bits of identifier and length octets (X.690), for encoder and decoder.
 namespace AsnWire
 {
-// identifier octet
+/// Bits of the identifier octet, X.690 8.1.2. @{
 inline constexpr unsigned int CONSTRUCTED = 0x20;
 inline constexpr unsigned int LONG_TAG = 0x1f; ///< the number follows, seven bits to an octet
 inline constexpr unsigned int MORE = 0x80;     ///< in an octet of such a number: another follows
+/// @}
 
-// length octet
+/// Values of the first length octet, X.690 8.1.3. @{
 inline constexpr unsigned int MAX_SHORT_LENGTH = 0x7f;
 inline constexpr unsigned int LONG_LENGTH = 0x80; ///< the low bits count the octets that hold the length
 inline constexpr unsigned int INDEFINITE_LENGTH = 0x80;
 inline constexpr unsigned int RESERVED_LENGTH = 0xff;
+/// @}
 
 /// The class bits of an identifier octet.
 constexpr unsigned int CLASS_BITS(unsigned int flags)

@@ -75,8 +75,10 @@ public:
     static constexpr char const* TYPE_NAME = "Amount";
     Amount() { declareAmount(); }
 
+    /// The number times the multiplier: 1234 and ONE_HUNDREDTH are 12.34. @{
     CurrencyAmount m_currencyAmount;
     AsnEnumerated<EMultiplier> m_multiplier;
+    /// @}
 
 private:
     void declareAmount();
@@ -89,8 +91,10 @@ public:
     static constexpr char const* TYPE_NAME = "RecordedCurrency";
     RecordedCurrency() { declareRecordedCurrency(); }
 
+    /// The currency, and how much of it. @{
     Currency m_rCurrency;
     Amount m_rAmount;
+    /// @}
 
 private:
     void declareRecordedCurrency();
@@ -106,8 +110,10 @@ public:
     public:
         RecordedNumber() { declareRecordedNumber(); }
 
+        /// The number, or that the network does not know it. @{
         NumberOfUnits m_recordedNumberOfUnits;
         AsnNull m_notAvailable;
+        /// @}
 
     private:
         void declareRecordedNumber();
@@ -116,6 +122,7 @@ public:
     static constexpr char const* TYPE_NAME = "RecordedUnits";
     RecordedUnits() { declareRecordedUnits(); }
 
+    /// How many units; of which type may be told as well.
     RecordedNumber m_recordedNumber;
     TypeOfUnit m_recordedTypeOfUnits; ///< optional
 
@@ -138,8 +145,10 @@ public:
     static constexpr char const* TYPE_NAME = "Time";
     Time() { declareTime(); }
 
+    /// The number times the scale: 90 and ONE_SECOND are a minute and a half. @{
     LengthOfTimeUnit m_lengthOfTimeUnit;
     AsnEnumerated<EScale> m_scale;
+    /// @}
 
 private:
     void declareTime();
@@ -152,10 +161,12 @@ public:
     static constexpr char const* TYPE_NAME = "DurationCurrency";
     DurationCurrency() { declareDurationCurrency(); }
 
+    /// So much of the currency for each `m_dTime`, which grows steadily or in steps. @{
     Currency m_dCurrency;
     Amount m_dAmount;
     AsnEnumerated<EChargingType> m_dChargingType;
     Time m_dTime;
+    /// @}
     Time m_dGranularity; ///< optional
 
 private:
@@ -169,8 +180,10 @@ public:
     static constexpr char const* TYPE_NAME = "FlatRateCurrency";
     FlatRateCurrency() { declareFlatRateCurrency(); }
 
+    /// The currency, and how much of it is charged once. @{
     Currency m_fRCurrency;
     Amount m_fRAmount;
+    /// @}
 
 private:
     void declareFlatRateCurrency();
@@ -183,9 +196,11 @@ public:
     static constexpr char const* TYPE_NAME = "VolumeRateCurrency";
     VolumeRateCurrency() { declareVolumeRateCurrency(); }
 
+    /// So much of the currency for each unit of volume. @{
     Currency m_vRCurrency;
     Amount m_vRAmount;
     AsnEnumerated<EVolumeUnit> m_vRVolumeUnit;
+    /// @}
 
 private:
     void declareVolumeRateCurrency();
@@ -201,9 +216,11 @@ public:
     public:
         SpecificCurrency() { declareSpecificCurrency(); }
 
+        /// By time, once, or by volume. @{
         DurationCurrency m_durationCurrency;
         FlatRateCurrency m_flatRateCurrency;
         VolumeRateCurrency m_volumeRateCurrency;
+        /// @}
 
     private:
         void declareSpecificCurrency();
@@ -215,10 +232,12 @@ public:
     public:
         Info() { declareInfo(); }
 
+        /// In money, by a number that the users know, for nothing, or not known. @{
         SpecificCurrency m_specificCurrency;
         SpecialChargingCode m_specialChargingCode;
         AsnNull m_freeOfCharge;
         AsnNull m_currencyInfoNotAvailable;
+        /// @}
 
     private:
         void declareInfo();
@@ -227,8 +246,10 @@ public:
     static constexpr char const* TYPE_NAME = "AOCSCurrencyInfo";
     AOCSCurrencyInfo() { declareAOCSCurrencyInfo(); }
 
+    /// The item, and what is said about it. @{
     AsnEnumerated<EChargedItem> m_chargedItem;
     Info m_aOCSCurrencyInfo;
+    /// @}
 
 private:
     void declareAOCSCurrencyInfo();

@@ -12,6 +12,7 @@ namespace Q956
 /// By what an amount is to be multiplied.
 struct CC_EXPORT EMultiplier
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         ONE_THOUSANDTH = 0,
@@ -30,6 +31,7 @@ struct CC_EXPORT EMultiplier
 /// Whether a charge is the final one.
 struct CC_EXPORT ETypeOfChargingInfo
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         SUB_TOTAL = 0, ///< so far, during the call
@@ -43,6 +45,7 @@ struct CC_EXPORT ETypeOfChargingInfo
 /// Why these charges arise, during the call. The first numbers of EAOCEBillingId are the same.
 struct CC_EXPORT EAOCDBillingId
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         NORMAL_CHARGING = 0,
@@ -57,6 +60,7 @@ struct CC_EXPORT EAOCDBillingId
 /// Why these charges arise, at the end of the call.
 struct CC_EXPORT EAOCEBillingId
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         NORMAL_CHARGING = 0,
@@ -76,6 +80,7 @@ struct CC_EXPORT EAOCEBillingId
 /// What is charged for.
 struct CC_EXPORT EChargedItem
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         BASIC_COMMUNICATION = 0,
@@ -92,6 +97,7 @@ struct CC_EXPORT EChargedItem
 /// Whether the charge grows steadily or in steps.
 struct CC_EXPORT EChargingType
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         CONTINUOUS_CHARGING = 0,
@@ -105,6 +111,7 @@ struct CC_EXPORT EChargingType
 /// The unit of a length of time.
 struct CC_EXPORT EScale
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         ONE_HUNDREDTH_SECOND = 0,
@@ -123,6 +130,7 @@ struct CC_EXPORT EScale
 /// The unit of a volume of data.
 struct CC_EXPORT EVolumeUnit
 {
+    /// Numbered as in the standard.
     enum Type : int
     {
         OCTET = 0,

@@ -32,10 +32,12 @@ public:
     /// One line of the dump.
     struct Entry
     {
+        /// What `add` was given. @{
         unsigned int level;
         unsigned int detail;
         String key;
         String text;
+        /// @}
     };
 
     /// Adds finished text; nothing is formatted here. When memory is out the entry is dropped and the dump is marked
@@ -46,9 +48,11 @@ public:
     void addWithin(unsigned int maxLevel, unsigned int level, unsigned int maxDetail, unsigned int detail,
                    String const& prefix, char const* label, String const& text);
 
+    /// Lines so far.
     unsigned int getNumberOfEntries() const { return static_cast<unsigned int>(m_entries.getSize()); }
     /// REQUIRES: index < getNumberOfEntries()
     Entry const& getEntry(unsigned int index) const { return m_entries[index]; }
+    /// Whether memory has kept a line out.
     bool isIncomplete() const { return m_isIncomplete; }
     /// For a getInfo that lacked memory before it could add.
     void markIncomplete() { m_isIncomplete = true; }

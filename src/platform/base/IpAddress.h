@@ -22,8 +22,10 @@ public:
 
     IpAddress() = default; ///< unspecified, version 4
 
+    /// Which of the three it is; neither when unspecified. @{
     bool isHostType() const;
     bool isNetType() const { return m_prefixLength != NO_PREFIX; }
+    /// @}
     /// 4 or 6
     unsigned int getVersion() const { return m_version; }
     /// In network order; version 4 uses the first four, the others are 0.

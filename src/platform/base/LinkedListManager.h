@@ -10,9 +10,12 @@ class LinkedListElement_Untyped
 {
 public:
     LinkedListElement_Untyped() = default;
+    /// Links are not copied: a copy is in no list, and what is assigned to stays where it is. @{
     LinkedListElement_Untyped(LinkedListElement_Untyped const&) {}
     LinkedListElement_Untyped& operator=(LinkedListElement_Untyped const&) { return *this; }
+    /// @}
 
+    /// Whether it sits in a list.
     bool isLinked() const { return m_next != nullptr; }
 
 protected:
@@ -42,12 +45,16 @@ public:
     LinkedListManager_Untyped(LinkedListManager_Untyped const&) = delete;
     LinkedListManager_Untyped& operator=(LinkedListManager_Untyped const&) = delete;
 
+    /// Linked elements; their number is kept, not counted anew. @{
     bool isEmpty() const { return m_head.m_next == &m_head; }
     unsigned int getCount() const { return m_count; }
+    /// @}
     /// The first element, or the end.
     LinkedListElement_Untyped* getFirst() const { return m_head.m_next; }
+    /// The element behind, which is the end after the last; the end is no element. @{
     LinkedListElement_Untyped* getNext(LinkedListElement_Untyped const& element) const { return element.m_next; }
     LinkedListElement_Untyped const* getEnd() const { return &m_head; }
+    /// @}
 
     /// Links the element in at the end: OK, or REFUSED when it sits in a list already.
     XCode append(LinkedListElement_Untyped& element)
@@ -105,6 +112,7 @@ public:
     {
     public:
         Iterator() = default; // no position, equal to others like it
+        /// As of a standard forward iterator. REQUIRES, but for comparing: it stands on an element. @{
         explicit Iterator(LinkedListElement_Untyped* element, LinkedListManager_Untyped const& list)
             : m_element(element), m_list(&list)
         {
@@ -120,6 +128,7 @@ public:
         {
             return left.m_element == right.m_element;
         }
+        /// @}
 
     private:
         LinkedListElement_Untyped* m_element = nullptr;
@@ -131,10 +140,13 @@ public:
     LinkedListManager(LinkedListManager const&) = delete;
     LinkedListManager& operator=(LinkedListManager const&) = delete;
 
+    /// The objects in their order. A walk survives what is appended, and removing all but the object that it stands on.
+    /// @{
     bool isEmpty() const { return m_list.isEmpty(); }
     unsigned int getCount() const { return m_list.getCount(); }
     Iterator begin() const { return Iterator(m_list.getFirst(), m_list); }
     Iterator end() const { return Iterator(const_cast<LinkedListElement_Untyped*>(m_list.getEnd()), m_list); }
+    /// @}
 
     /// Takes the object over: OK, or REFUSED when it sits in a list already (it then stays the caller's).
     XCode append(T* object) { return m_list.append(UNTYPED(*object)); }
@@ -150,6 +162,7 @@ public:
         m_list.unlink(UNTYPED(object));
         delete &object;
     }
+    /// Deletes all objects, the first one first.
     void clear()
     {
         while (!m_list.isEmpty())

@@ -12,8 +12,10 @@ inline constexpr char const* INVALID = "(invalid)";
 template <class Value>
 struct NamedValue
 {
+    /// The value, and its name in static memory. @{
     Value value;
     char const* name;
+    /// @}
 };
 
 /// The name of `value` in `table`, or `otherwise`. Tables are short, so the search is linear.

@@ -12,11 +12,13 @@
 class NestingGuard
 {
 public:
+    /// Counts up, and down again at its end. REQUIRES: the counter outlives it.
     explicit NestingGuard(unsigned int& counter) : m_counter(counter) { ++m_counter; }
     ~NestingGuard() { --m_counter; }
     NestingGuard(NestingGuard const&) = delete;
     NestingGuard& operator=(NestingGuard const&) = delete;
 
+    /// Whether nobody else counts: the counter was 0.
     bool isOutermost() const { return m_counter == 1; }
 
 private:

@@ -27,20 +27,22 @@ class CC_EXPORT String
 {
 public:
     String() = default;
-    String(char const* text) ///< here and below a null pointer stands for the empty text
-        : m_text(TEXT_OF(text))
-    {
-    }
+    /// Here and below a null pointer stands for the empty text.
+    String(char const* text) : m_text(TEXT_OF(text)) {}
+    /// So many bytes, NUL among them. REQUIRES: `text` points to as many.
     String(char const* text, std::size_t length) : m_text(text, length) {}
     explicit String(std::string_view text) : m_text(text) {} ///< explicit, for it may need memory; the way back is not
 
+    /// `c_str` and `view` hold until the String changes or ends; the length is in bytes. @{
     char const* c_str() const { return m_text.c_str(); }
     std::size_t length() const { return m_text.size(); }
     bool isEmpty() const { return m_text.empty(); }
     std::string_view view() const { return m_text; }
+    /// @}
     /// For whatever takes any text. The view must not outlive the String, nor a change of it.
     operator std::string_view() const { return m_text; }
 
+    /// Appends. Throws std::bad_alloc, and nothing has changed then. @{
     String& operator+=(String const& other)
     {
         m_text += other.m_text;
@@ -56,6 +58,8 @@ public:
         m_text += text;
         return *this;
     }
+    /// @}
+    /// Makes it empty; needs no memory.
     void clear() { m_text.clear(); }
     /// Makes it that text without throwing: OK; NO_ELEMENT when memory is out, and it stays as it was.
     XCode assign(std::string_view text);
@@ -72,31 +76,38 @@ public:
     /// Equality that takes the letters A to Z and a to z for the same.
     bool equalsIgnoreCase(String const& other) const;
 
+    /// Byte for byte, and the same length. @{
     friend bool operator==(String const& left, String const& right) { return left.m_text == right.m_text; }
     friend bool operator==(String const& left, char const* right) { return left.m_text == TEXT_OF(right); }
     friend bool operator==(String const& left, std::string_view right) { return left.m_text == right; }
-    /// By the bytes, as numbers from 0 to 255.
+    /// @}
+    /// By the bytes, as numbers from 0 to 255; of two that begin alike the shorter comes first. @{
     friend auto operator<=>(String const& left, String const& right) { return left.m_text <=> right.m_text; }
     friend auto operator<=>(String const& left, char const* right) { return left.view() <=> VIEW_OF(right); }
     friend auto operator<=>(String const& left, std::string_view right) { return left.view() <=> right; }
+    /// @}
+    /// The two, one behind the other. Throws std::bad_alloc.
     friend String operator+(String left, String const& right) { return left += right; }
 
     static String stringOf(bool value); ///< "true" or "false"
+    /// In decimals, "-" in front of a negative one. @{
     static String stringOf(int value);
     static String stringOf(unsigned int value);
     static String stringOf(long value);
     static String stringOf(unsigned long value);
     static String stringOf(long long value);
     static String stringOf(unsigned long long value);
+    /// @}
     /// A pointer would silently become a bool; `addressOf` prints one.
     template <class T>
     static String stringOf(T*) = delete;
     /// The address as "%p" prints it.
     static String addressOf(void const* object);
 
-    /// A literal, or another text that TYText takes, as it stands.
+    /// A literal, or another text that TYText takes, as it stands. @{
     static std::string_view VIEW_OF(char const* text) { return TEXT_OF(text); }
     static std::string_view VIEW_OF(std::string_view text) { return text; }
+    /// @}
 
     /// The empty string, for getters that return a reference. Ready before any other static initialiser runs.
     static String const s_empty;

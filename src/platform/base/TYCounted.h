@@ -13,12 +13,14 @@ public:
     TYCounted(TYCounted const&) = delete;
     TYCounted& operator=(TYCounted const&) = delete;
 
+    /// From any thread; giving up the last reference deletes the object there. @{
     void addReference() const { m_references.fetch_add(1, std::memory_order_relaxed); }
     void removeReference() const
     {
         if (m_references.fetch_sub(1, std::memory_order_acq_rel) == 1)
             delete this;
     }
+    /// @}
 
     /// Whether somebody besides the caller, who holds a reference, holds one, too.
     bool isShared() const { return m_references.load(std::memory_order_acquire) > 1; }

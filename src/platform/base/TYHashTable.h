@@ -15,15 +15,19 @@
 template <class Key>
 struct TYHash
 {
+    /// A number is its own hash. @{
     using Argument = Key const&;
     std::size_t operator()(Key const& key) const { return static_cast<std::size_t>(key); }
+    /// @}
 };
 /// Hashes the text.
 template <>
 struct TYHash<String>
 {
+    /// The whole text counts, not that up to a NUL. @{
     using Argument = std::string_view;
     std::size_t operator()(std::string_view key) const { return std::hash<std::string_view>()(key); }
+    /// @}
 };
 
 /// A table with a fixed number of buckets that also keeps its entries in the order in which they were added.
@@ -39,8 +43,10 @@ public:
     class Entry
     {
     public:
+        /// As they were added. @{
         Key const& getKey() const { return m_key; }
         Value const& getValue() const { return m_value; }
+        /// @}
         Entry const* getNext() const { return m_next; } ///< the entry added after this one, or null
 
     private:
@@ -59,9 +65,12 @@ public:
     TYHashTable(TYHashTable const&) = delete;
     TYHashTable& operator=(TYHashTable const&) = delete;
 
+    /// How many entries there are, and the one that was added first; null when there is none. @{
     unsigned int getCount() const { return m_count; }
     Entry const* getFirst() const { return m_first; }
+    /// @}
 
+    /// The entry, null when there is none; it lives until it is removed.
     Entry const* find(Argument key) const
     {
         Entry const* entry = m_buckets[bucketOf(key)];
@@ -115,6 +124,7 @@ public:
         return true;
     }
 
+    /// Ends all entries.
     void clear()
     {
         while (m_first != nullptr)
@@ -149,6 +159,7 @@ private:
     unsigned int m_count = 0;
 };
 
+/// The tables of the library, by the type of their keys. @{
 template <class Value>
 using INStringHashTable = TYHashTable<String, Value>;
 template <class Value>
@@ -157,3 +168,4 @@ template <class Value>
 using TYUInt32HashTable = TYHashTable<unsigned int, Value>;
 template <class Value>
 using TYInt32HashTable = TYHashTable<int, Value>;
+/// @}

@@ -22,6 +22,7 @@ public:
 #pragma GCC diagnostic push
 #pragma GCC diagnostic ignored "-Wdangling-pointer"
 #endif
+        /// REQUIRES: on the stack, so that watches end in the reverse order of their making.
         explicit Watch(TYLifeline const& lifeline) : m_lifeline(&lifeline), m_outer(lifeline.m_innermost)
         {
             lifeline.m_innermost = this;
@@ -37,6 +38,7 @@ public:
         Watch(Watch const&) = delete;
         Watch& operator=(Watch const&) = delete;
 
+        /// False once the lifeline, and so the object that holds it, has ended.
         bool isAlive() const { return m_lifeline != nullptr; }
 
     private:

@@ -13,9 +13,11 @@ public:
     class Element
     {
     public:
+        /// The value may be replaced in its place. Behind the last element comes null. @{
         T const& getValue() const { return m_value; }
         void setValue(T const& value) { m_value = value; }
         Element* getNext() const { return m_next; }
+        /// @}
 
     private:
         friend class TYList;
@@ -30,9 +32,11 @@ public:
     TYList(TYList const&) = delete;
     TYList& operator=(TYList const&) = delete;
 
+    /// The elements in their order; the first is null when there is none. @{
     unsigned int getCount() const { return m_count; }
     bool isEmpty() const { return m_count == 0; }
     Element* getFirst() const { return m_first; }
+    /// @}
 
     /// The first element that holds `value`, or null.
     Element* find(T const& value) const
@@ -65,6 +69,7 @@ public:
         delete element;
     }
 
+    /// Frees all elements.
     void clear()
     {
         while (m_first != nullptr)

@@ -14,8 +14,10 @@ public:
     TYMutex(TYMutex const&) = delete;
     TYMutex& operator=(TYMutex const&) = delete;
 
+    /// Waits for the mutex, and gives it up. REQUIRES: who unlocks holds it. @{
     void lock();
     void unlock();
+    /// @}
 
 private:
     pthread_mutex_t m_mutex;
@@ -28,6 +30,7 @@ template <class Mutex>
 class TYAutoLock
 {
 public:
+    /// Waits for the mutex. REQUIRES: the mutex outlives the lock.
     explicit TYAutoLock(Mutex& mutex) : m_mutex(mutex) { m_mutex.lock(); }
     ~TYAutoLock() { m_mutex.unlock(); }
     TYAutoLock(TYAutoLock const&) = delete;

@@ -12,11 +12,13 @@ class TYPtr
 {
 public:
     TYPtr() = default;
+    /// Takes a reference on the object; null: none.
     explicit TYPtr(T* object) : m_object(object)
     {
         if (m_object != nullptr)
             m_object->addReference();
     }
+    /// A copy takes a reference of its own; what is moved from holds none afterwards. @{
     TYPtr(TYPtr const& other) : TYPtr(other.m_object) {}
     TYPtr(TYPtr&& other) noexcept : m_object(std::exchange(other.m_object, nullptr)) {}
     ~TYPtr() { set(nullptr); }
@@ -31,6 +33,7 @@ public:
         std::swap(m_object, taken.m_object);
         return *this;
     }
+    /// @}
 
     /// Takes a reference on `object` (null: none) and gives up the one held before. The same object: nothing happens.
     void set(T* object)
@@ -44,11 +47,13 @@ public:
             old->removeReference();
     }
 
+    /// The object, null when it holds none; two are equal that hold the same. REQUIRES, in -> and *: it holds one. @{
     T* get() const { return m_object; }
     T* operator->() const { return m_object; }
     T& operator*() const { return *m_object; }
     explicit operator bool() const { return m_object != nullptr; }
     friend bool operator==(TYPtr const& left, TYPtr const& right) { return left.m_object == right.m_object; }
+    /// @}
 
 private:
     T* m_object = nullptr;
@@ -63,15 +68,18 @@ class TYPPtr
 {
 public:
     TYPPtr() = default;
+    /// Holds the object that the other holds at this moment.
     TYPPtr(TYPPtr const& other) : m_pointer(other.copy()) {}
     TYPPtr& operator=(TYPPtr const&) = delete;
 
+    /// As `TYPtr::set`, under the lock; the old reference is given up after it.
     void set(T* object)
     {
         TYPtr<T> replaced(object); // given up after the lock
         TYAutoLock<TYMutex> const lock(m_mutex);
         std::swap(m_pointer, replaced);
     }
+    /// Whether it held none at this moment; another thread may change that at once.
     bool isEmpty() const { return !copy(); }
 
 private:
@@ -95,6 +103,7 @@ template <class T>
 class TYLockPtr
 {
 public:
+    /// REQUIRES: the holder outlives it. Nothing is locked yet.
     explicit TYLockPtr(TYPPtr<T>& holder) : m_holder(holder) {}
     ~TYLockPtr() { unlock(); }
     TYLockPtr(TYLockPtr const&) = delete;
@@ -107,6 +116,7 @@ public:
             m_holder.m_mutex.lock();
         return m_holder.m_pointer.get();
     }
+    /// Gives the lock up, if it is held; the object is then not to be used any more.
     void unlock()
     {
         if (std::exchange(m_isLocked, false))

@@ -21,15 +21,19 @@
 class CC_EXPORT TYRecycled
 {
 public:
+    /// Blocks of each size that a thread keeps until KEEP_BLOCKS says otherwise; debug builds and those under the
+    /// address sanitizer begin with 0.
     static constexpr unsigned int DEFAULT_BLOCKS = 128;
 
+    /// Throwing or null when memory is out, as those of the language; placement takes and frees nothing. @{
     static void* operator new(std::size_t size);
     static void* operator new(std::size_t size, std::nothrow_t const&) noexcept;
     static void* operator new(std::size_t, void* place) noexcept { return place; }
     static void operator delete(void* block, std::size_t size) noexcept;
     static void operator delete(void* block, std::nothrow_t const&) noexcept;
     static void operator delete(void*, void*) noexcept {}
-    // Objects of an alignment beyond the ordinary come and go by themselves.
+    /// @}
+    /// Objects of an alignment beyond the ordinary come and go by themselves. @{
     static void* operator new(std::size_t size, std::align_val_t alignment) { return ::operator new(size, alignment); }
     static void* operator new(std::size_t size, std::align_val_t alignment, std::nothrow_t const&) noexcept
     {
@@ -43,6 +47,7 @@ public:
     {
         ::operator delete(block, alignment);
     }
+    /// @}
 
     /// How many blocks of each size a thread keeps, for all threads. What this thread has beyond it is given back now;
     /// other threads take what they have before they ask for more.

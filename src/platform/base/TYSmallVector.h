@@ -22,10 +22,12 @@ public:
     TYSmallVector(TYSmallVector const&) = delete;
     TYSmallVector& operator=(TYSmallVector const&) = delete;
 
+    /// The number of values.
     unsigned int getSize() const { return m_size; }
-    /// REQUIRES: index < getSize()
+    /// REQUIRES: index < getSize() @{
     T const& operator[](unsigned int index) const { return m_values[index]; }
     T& operator[](unsigned int index) { return m_values[index]; }
+    /// @}
 
     /// OK, or NO_ELEMENT when memory is out; the array is then unchanged.
     XCode append(T const& value)
@@ -52,8 +54,10 @@ public:
         std::memmove(static_cast<void*>(m_values + index), m_values + index + 1, (m_size - index) * sizeof(T));
     }
 
+    /// For walks in the order of the values. Appending and removing end them. @{
     T const* begin() const { return m_values; }
     T const* end() const { return m_values + m_size; }
+    /// @}
 
 private:
     void release()

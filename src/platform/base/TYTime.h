@@ -19,12 +19,17 @@ struct CC_EXPORT Time
     /// Replaces the system's clocks; null restores them. Tests drive time with it.
     using Clock = Time (*)(unsigned int source);
 
+    /// Since the clock's beginning: whole seconds, and the rest, 0 to 999999999. @{
     long long seconds = 0;
     long nanoseconds = 0;
+    /// @}
 
+    /// The moment by that source; a number that is none stands for MONOTONIC. Any thread.
     static Time NOW(unsigned int source);
+    /// For the whole process, at once. Any thread.
     static void SET_CLOCK(Clock clock);
 
+    /// The same moment; the sources are not told apart.
     friend bool operator==(Time const&, Time const&) = default;
 };
 } // namespace TY

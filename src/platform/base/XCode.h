@@ -18,13 +18,18 @@ class [[nodiscard]] XCode
 {
 public:
     constexpr XCode() = default;
+    /// For results that come as numbers; named results are written by their names.
     constexpr explicit XCode(unsigned int value) : m_value(value) {}
 
+    /// Whether it is 0, and the number itself. @{
     constexpr bool isOk() const { return m_value == 0; }
     constexpr unsigned int getValue() const { return m_value; }
+    /// @}
     /// The name of the constant below, or ERROR::INVALID for any other value.
     constexpr char const* getName() const { return NAME(*this); }
+    /// As `getName`.
     static constexpr char const* NAME(XCode result);
+    /// The same number.
     friend constexpr bool operator==(XCode, XCode) = default;
 
     static XCode const OK;         ///< 0: done

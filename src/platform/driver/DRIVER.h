@@ -16,6 +16,7 @@
 class CC_EXPORT DRIVER
 {
 public:
+    /// The one of the process, made when it is first asked for.
     static DRIVER& INSTANCE();
 
     /// OK; REFUSED for a null interface; NO_ELEMENT when memory is out. The caller keeps a reference of its own

@@ -12,6 +12,7 @@ class TYEventLoop;
 /// The priorities of events and of a loop's synchronisation events. A lower value runs earlier in a turn.
 struct EventPrio
 {
+    /// From the first to run to the last, and how many there are. @{
     enum Type : unsigned int
     {
         HIGHEST = 0,
@@ -20,6 +21,7 @@ struct EventPrio
         LOW = 3
     };
     static constexpr unsigned int COUNT = 4;
+    /// @}
 };
 
 /// Work to be done once on an event loop, however often it was asked for.
@@ -34,6 +36,7 @@ struct EventPrio
 class CC_EXPORT TYEvent : private LinkedListElement_Untyped, public TYRecycled
 {
 public:
+    /// What an event runs, on the loop's thread.
     using Callback = void (*)(void* argument);
 
     /// `callback` is called with `argument` by `handle()`.
@@ -47,9 +50,12 @@ public:
     /// reference. Safe from inside the event's own handler.
     void destroy();
 
+    /// Whether it was posted and has not begun to run. From any thread.
     bool isPending() const { return m_isPending.load(); }
+    /// References besides the creator's, which `destroy` gives up. The last one ends the event. @{
     void addReference();
     void removeReference();
+    /// @}
 
     /// The number of events alive.
     static std::atomic<unsigned int> s_numberOfInstances;

@@ -53,6 +53,7 @@ public:
 
     /// The loop's synchronisation event of that priority; it lives as long as the loop.
     TYSyncEvent& getSyncEvent(EventPrio::Type priority);
+    /// Whether the calling thread is the loop's: the one that created it or the last to run it.
     bool isLoopThread() const { return m_thread.load(std::memory_order_relaxed) == std::this_thread::get_id(); }
 
     /// How many turns have begun; the loop's thread. It tells which turn something belongs to.

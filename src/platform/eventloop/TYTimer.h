@@ -23,6 +23,7 @@ class TYEventLoop;
 class CC_EXPORT TYTimer : private LinkedListElement_Untyped
 {
 public:
+    /// What a timer runs, on the loop's thread.
     using Callback = void (*)(void* argument);
 
     /// `callback` is called with `argument`, in the turn's place of `priority`. It must not throw. Inside it anything

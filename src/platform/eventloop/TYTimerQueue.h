@@ -15,6 +15,7 @@ public:
     TYTimerQueue(TYTimerQueue const&) = delete;
     TYTimerQueue& operator=(TYTimerQueue const&) = delete;
 
+    /// Whether no timer waits.
     bool isEmpty() const { return m_first == nullptr; }
     /// The timer that is due next; null when none waits.
     TYTimer* getFirst() const { return m_first; }

@@ -44,9 +44,11 @@ struct CC_EXPORT MG_Rtp
     /// A codec and its packet period.
     struct MediaType
     {
+        /// NONE: no codec.
         ECodec::Type codec = ECodec::NONE;
         unsigned int packetPeriod = 0; ///< milliseconds of sound in a packet; 0: not known
 
+        /// The same codec and packet period.
         friend bool operator==(MediaType const&, MediaType const&) = default;
     };
 };

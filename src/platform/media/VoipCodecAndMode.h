@@ -22,10 +22,13 @@ public:
     };
 
     VoipCodecAndMode() = default; ///< no codec, in both directions
+    /// `mode`: seen from the side that states it.
     explicit VoipCodecAndMode(VoipCodec const& codec, Mode mode = SEND_RECEIVE) : m_codec(codec), m_mode(mode) {}
 
+    /// The codec, which may be none, and its directions. @{
     VoipCodec const& getCodec() const { return m_codec; }
     Mode getMode() const { return m_mode; }
+    /// @}
 
     /// "send-receive", "send-only", "receive-only", "inactive"; ERROR::INVALID for any other number.
     static char const* MODE_NAME(Mode mode);
@@ -37,6 +40,7 @@ public:
     /// is out.
     String& getShortInfo(String& out) const;
 
+    /// The same codec, packet period and mode.
     friend bool operator==(VoipCodecAndMode const&, VoipCodecAndMode const&) = default;
 
 private:

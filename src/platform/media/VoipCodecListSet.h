@@ -14,19 +14,22 @@
 class CC_EXPORT VoipCodecListSet
 {
 public:
+    /// Seen from the side that supports the codecs.
     enum Direction : unsigned int
     {
         SEND_RECEIVE = 0,
         SEND_ONLY = 1,
         RECEIVE_ONLY = 2
     };
+    /// One for each direction.
     static constexpr unsigned int NUMBER_OF_LISTS = 3;
 
     VoipCodecListSet() = default; ///< three empty lists
 
-    /// REQUIRES: direction < NUMBER_OF_LISTS
+    /// REQUIRES: direction < NUMBER_OF_LISTS @{
     VoipCodecList& getList(Direction direction) { return m_lists[direction]; }
     VoipCodecList const& getList(Direction direction) const { return m_lists[direction]; }
+    /// @}
     bool isEmpty() const; ///< all three are
 
     /// A shared instance without codecs, for getters that return a reference.
@@ -37,6 +40,7 @@ public:
     /// Returns `out`. Throws std::bad_alloc when memory is out.
     String& getShortInfo(String& out) const;
 
+    /// All three lists are.
     friend bool operator==(VoipCodecListSet const&, VoipCodecListSet const&) = default;
 
 private:

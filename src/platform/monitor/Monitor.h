@@ -51,8 +51,10 @@ private:
 class CC_EXPORT REPOSITORY
 {
 public:
+    /// Monitor ids and levels count from 0; those below these numbers exist. @{
     static constexpr unsigned int NUMBER_OF_MONITORS = 64;
     static constexpr unsigned int NUMBER_OF_LEVELS = 6;
+    /// @}
 
     /// The channel when lines of this id and level are wanted, else null; then nothing is to be formatted.
     static Monitor const* GET_MONITOR_IF_ENABLED_FOR_LOGGING(unsigned int id, unsigned int level)
