@@ -8,6 +8,7 @@
 #include "Steps.h"
 #include "platform/base/TYRecycled.h"
 #include "properties/CC_Property.h"
+#include "recorder/CC_Recorder.h"
 #include "testing/DrivenClock.h"
 
 #include <cstdio>
@@ -178,6 +179,10 @@ int main(int argc, char** argv)
         MEASURE_TRANSFER("conference", world, plain, true);
         MEASURE_WHOLE_CALL("whole call", world, plain);
         MEASURE_WHOLE_CALL("whole call, two filters at each end", world, filtering);
+        MUST(CC_Recorder::START(), "start of the recorder");
+        MEASURE_WHOLE_CALL("whole call, recorded", world, plain);
+        MEASURE_WHOLE_CALL("whole call, two filters at each end, recorded", world, filtering);
+        CC_Recorder::CLOSE();
         MEASURE_FLOOR();
         Steps::begin("nothing"); // what a mark itself costs
         Steps::end();

@@ -296,6 +296,8 @@ private:
     XCode writeCopy(CC_PropertyView& view, Target& target, CC_PropertyFilterContainer const& filters);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
+    XCode setOwnPropertyPlainly(CC_Property const& property);
+    XCode setOwnPropertyRecorded(CC_Property const& property);
     template <class Written>
     XCode writeOwn(Written const& written, bool isFiltered);
     template <class Written>

@@ -23,9 +23,7 @@
 #include "recorder/CC_FilterNotes.h"
 #include "recorder/CC_RecordWriter.h"
 
-#include <array>
 #include <cstdint>
-#include <cstdio>
 #include <new>
 #include <tuple>
 
@@ -40,9 +38,12 @@ constexpr char const* CALL_TAKES_NO_LEG = "the call takes no leg";
 void RECORD_DIAL(CC_RecordWriter& recorder, CC_Call const& call, CC_CallLeg const& leg, String const& providerName,
                  String const& destination)
 {
-    std::array<char, CC_RecordFormat::LARGEST_TEXT> text;
-    std::snprintf(text.data(), text.size(), "%s %s", providerName.c_str(), destination.c_str());
-    recorder.addText(Kind::DIALLING, call.getSerial(), leg.getSerial(), 0, text.data());
+    constexpr std::size_t MOST = CC_RecordFormat::LARGEST_TEXT / 2;
+    recorder.begin(Kind::DIALLING, call.getSerial(), leg.getSerial(), 0);
+    recorder.appendText(providerName.view().substr(0, MOST));
+    recorder.appendText(" ");
+    recorder.appendText(destination.view().substr(0, MOST));
+    recorder.end();
 }
 
 /// Copying tells nothing of what memory has refused.

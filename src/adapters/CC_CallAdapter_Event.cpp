@@ -4,7 +4,7 @@
 #include "adapters/CC_CallAdapter_Attempt.h"
 #include "recorder/CC_RecordWriter.h"
 
-#include <array>
+#include <algorithm>
 #include <utility>
 
 CC_CallAdapter::Event::Event(TYEventLoop& loop, EventPrio::Type priority, CC_CallAdapter& adapter)
@@ -19,18 +19,20 @@ XCode CC_CallAdapter::Event::setPeerPropertyChange(unsigned int id)
 
 void CC_CallAdapter::Event::record(CC_RecordWriter& recorder, CC_Flags const& flags) const
 {
-    std::array<unsigned int, CC_RecordFormat::MOST_LISTED_IDS> ids;
+    recorder.begin(CC_RecordFormat::Kind::TOLD, m_adapter.getCallSerial(), m_adapter.getLegSerial(), 0);
+    auto* const listed = reinterpret_cast<unsigned int*>(recorder.getPlace());
     unsigned int count = 0;
     flags.forEachSet(
-        [&](unsigned int id)
+        [listed, &count](unsigned int id)
         {
-            if (count < ids.size())
-                ids[count] = id;
+            if (count < CC_RecordFormat::MOST_LISTED_IDS)
+                listed[count] = id;
             ++count;
             return true;
         });
-    unsigned int next = 0;
-    recorder.addIds(m_adapter.getCallSerial(), m_adapter.getLegSerial(), count, [&] { return ids[next++]; });
+    recorder.skip(std::min(count, CC_RecordFormat::MOST_LISTED_IDS) * sizeof *listed);
+    recorder.setDetail(count);
+    recorder.end();
 }
 
 void CC_CallAdapter::Event::handle()

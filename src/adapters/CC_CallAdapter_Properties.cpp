@@ -109,11 +109,21 @@ XCode CC_CallAdapter::getOwnPropertiesUnfiltered(CC_PropertyContainer& propertie
 
 XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
 {
-    if (m_ownCallLeg == nullptr)
-        return XCode::ABSENT;
+    if (m_ownCallLeg == nullptr || getInputFilters() != nullptr)
+        return writeOwn(property, true);
+    return CC_RecordWriter::ON() == nullptr ? setOwnPropertyPlainly(property) : setOwnPropertyRecorded(property);
+}
+
+/// Apart, so that who does not record does not pay for it.
+__attribute__((noinline)) XCode CC_CallAdapter::setOwnPropertyRecorded(CC_Property const& property)
+{
     CC_Writing const writing(Writer::OWN, *m_ownCallLeg);
-    if (getInputFilters() != nullptr)
-        return writeFiltered(m_ownView, m_ownCallLeg, property);
+    return setOwnPropertyPlainly(property);
+}
+
+/// Without filters.
+XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
+{
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
     XCode const seen = m_ownView.write(property);

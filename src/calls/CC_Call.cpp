@@ -147,12 +147,10 @@ XCode CC_Call::replace(CC_Property const& property)
 __attribute__((noinline)) XCode CC_Call::replaceRecorded(CC_Property const& property)
 {
     unsigned int const id = property.getId();
-    CC_RecordFormat::Brief const before = CC_PropertyBrief::OF(m_properties.get(id));
+    CC_PropertyBrief const before(m_properties.get(id));
     if (!m_properties.set(property).isOk())
         return XCode::REFUSED;
-    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
-        recorder->addChange(CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0, id, before,
-                            CC_PropertyBrief::OF(m_properties.get(id)));
+    before.recordChange(CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0, id, m_properties.get(id));
     return XCode::OK;
 }
 

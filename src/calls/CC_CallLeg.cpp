@@ -8,6 +8,7 @@
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCause.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKind.h"
 #include "recorder/CC_RecordWriter.h"
 #include "services/CC_Service.h"
 
@@ -148,28 +149,39 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
         stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
     if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
         return XCode::REFUSED;
-    if (!replace(stored, property).isOk())
+    XCode const replaced =
+        CC_RecordWriter::ON() == nullptr ? m_properties.replace(stored, property) : replaceRecorded(stored, property);
+    if (!replaced.isOk())
         return XCode::REFUSED;
     changed = true;
     return XCode::OK;
 }
 
-/// `stored`: the property of that id, or null.
-XCode CC_CallLeg::replace(CC_Property* stored, CC_Property const& property)
+/// Apart, so that who does not record does not pay for it.
+__attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property* stored, CC_Property const& property)
 {
-    return CC_RecordWriter::ON() == nullptr ? m_properties.replace(stored, property) : replaceRecorded(property);
+    CC_RecordWriter& recorder = *CC_RecordWriter::ON();
+    CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
+    bool const isUndisturbed = kind != nullptr && kind->isSelfContained && m_properties.isSelfContained() &&
+                               (stored == nullptr || &typeid(*stored) == &typeid(property));
+    if (!isUndisturbed)
+        return replaceOfAnyKind(property);
+    recorder.beginChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, property.getId());
+    CC_PropertyBrief::APPEND(recorder, *kind, stored);
+    CC_PropertyBrief::APPEND(recorder, *kind, &property);
+    XCode const result = m_properties.replace(stored, property);
+    result.isOk() ? recorder.end() : recorder.cancel();
+    return result;
 }
 
-/// Apart, so that who does not record does not pay for it.
-__attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property const& property)
+/// As above, where others are called: they may change what is stored, and end the recording.
+XCode CC_CallLeg::replaceOfAnyKind(CC_Property const& property)
 {
     unsigned int const id = property.getId();
-    CC_RecordFormat::Brief const before = CC_PropertyBrief::OF(m_properties.get(id));
-    if (!m_properties.replace(m_properties.get(id), property).isOk()) // the media layer may have been asked
+    CC_PropertyBrief const before(m_properties.get(id));
+    if (!m_properties.replace(m_properties.get(id), property).isOk())
         return XCode::REFUSED;
-    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
-        recorder->addChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, before,
-                            CC_PropertyBrief::OF(m_properties.get(id)));
+    before.recordChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, m_properties.get(id));
     return XCode::OK;
 }
 
@@ -200,6 +212,7 @@ XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
 /// `result`: that of what was done before.
 XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result)
 {
+    CC_RecordWriter::Batch const together;
     CC_Flags flags;
     CC_Property const* state = nullptr;
     // nearly all that come through filters are known; of the first ones none is, and need not be looked for twice
@@ -249,9 +262,20 @@ XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, boo
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
     ++m_numberOfNotifications;
-    CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
+    CC_RecordWriter::ON() == nullptr ? tell(flags) : tellRecorded(flags);
+}
+
+void CC_CallLeg::tell(CC_Flags& flags)
+{
     m_observers.broadcastEvent(CC_EvCallLegPropertyChanged(*this, std::move(flags)),
                                &CC_CallLegObserver::onCallLegPropertyChanged);
+}
+
+/// Apart, as above.
+__attribute__((noinline)) void CC_CallLeg::tellRecorded(CC_Flags& flags)
+{
+    CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
+    tell(flags);
 }
 
 void CC_CallLeg::invokeSynchronousService(CC_Service& service)

@@ -122,8 +122,10 @@ private:
 
     ~CC_CallLeg();
     XCode store(CC_Property const& property, bool& changed);
-    XCode replace(CC_Property* stored, CC_Property const& property);
-    XCode replaceRecorded(CC_Property const& property);
+    XCode replaceRecorded(CC_Property* stored, CC_Property const& property);
+    XCode replaceOfAnyKind(CC_Property const& property);
+    void tell(CC_Flags& flags);
+    void tellRecorded(CC_Flags& flags);
     unsigned long long getCallSerial() const;
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);

@@ -15,7 +15,7 @@ using CC_RecordFormat::Brief;
 
 std::string RECORDED(CC_Property const& property)
 {
-    return CC_BriefText::OF(property.getId(), CC_PropertyBrief::OF(&property));
+    return CC_BriefText::OF(property.getId(), CC_PropertyBrief(&property).get());
 }
 
 std::string PRINTED(CC_Property const& property)
@@ -99,7 +99,7 @@ TEST(CC_BriefText, OfRecordsAndOfAModulesValuesTheClassIsTold)
     EXPECT_EQ(RECORDED(CC_PropertyCharge(CC_PropertyId::CHARGE)),
               std::string("(") + CC_PropertyCharge::TYPE_NAME + ")");
     EXPECT_EQ(RECORDED(ModulesText(CC_PropertyId::NAME, "secret")), "((anonymous namespace)::ModulesText)");
-    EXPECT_EQ(CC_BriefText::OF(CC_PropertyId::NAME, CC_PropertyBrief::OF(nullptr)), "(none)");
+    EXPECT_EQ(CC_BriefText::OF(CC_PropertyId::NAME, CC_PropertyBrief(nullptr).get()), "(none)");
 }
 
 TEST(CC_BriefText, NumbersOfNoMeaningArePrintedAllTheSame)

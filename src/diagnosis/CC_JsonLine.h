@@ -14,11 +14,14 @@
 class CC_EXPORT CC_JsonLine
 {
 public:
+    /// Adds a member and returns this.
     CC_JsonLine& add(std::string_view name, std::string_view text);
+    /// The same with a number.
     CC_JsonLine& add(std::string_view name, unsigned long long number);
     /// `json`: a value as it is to stand there, such as another line or an array.
     CC_JsonLine& addJson(std::string_view name, std::string_view json);
 
+    /// The whole line, without a line break.
     std::string get() const { return m_text + '}'; }
 
     /// The text in quotation marks.

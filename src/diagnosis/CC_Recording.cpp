@@ -13,6 +13,7 @@
 #include <iterator>
 #include <memory>
 #include <string_view>
+#include <utility>
 
 using namespace CC_RecordFormat;
 
@@ -48,13 +49,13 @@ public:
         brief.textSize = static_cast<std::uint8_t>(
             std::min({std::size_t{brief.textSize}, std::size_t{Brief::MOST_TEXT}, m_octets.size()}));
         std::memcpy(brief.text, m_octets.data(), brief.textSize);
-        m_octets.remove_prefix(brief.textSize);
+        m_octets.remove_prefix(std::min(WORDS_OF(brief.textSize), m_octets.size()));
         return brief;
     }
     std::string takeText(std::size_t size)
     {
         std::string_view const text = m_octets.substr(0, size);
-        m_octets.remove_prefix(text.size());
+        m_octets.remove_prefix(std::min(WORDS_OF(size), m_octets.size()));
         return std::string(text);
     }
     /// All that is left, without the zeros that fill the last group.
@@ -81,9 +82,9 @@ void TAKE_CHANGE(CC_Recording::Event& event, Payload& payload)
     auto const change = payload.take<Change>();
     event.by = change.by;
     event.filterPlace = change.filterPlace;
+    event.filter = DEMANGLED(payload.takeText(change.filterNameSize));
     event.before = payload.takeBrief();
     event.after = payload.takeBrief();
-    event.filter = DEMANGLED(payload.takeText(change.filterNameSize));
 }
 
 void TAKE_IDS(CC_Recording::Event& event, Payload& payload)
@@ -192,14 +193,36 @@ private:
         if (event.record.stamp != static_cast<std::uint32_t>(position / ALIGNMENT) || size % ALIGNMENT != 0 ||
             size == 0 || size > most || offset + size > m_ring.size())
             return 0;
+        bool const followsAChange = std::exchange(m_isBehindAChange, false);
         if (event.record.kind == Kind::PADDING)
             return size;
+        std::string_view const octets = m_ring.substr(offset, size);
+        if (event.record.kind == Kind::ALSO_CHANGED)
+            return followsAChange ? readAlsoChanged(octets) : 0;
         if (size < sizeof(Record) || event.record.kind >= Kind::NUMBER_OF_KINDS)
             return 0;
-        std::memcpy(&event.record, m_ring.data() + offset, sizeof(Record));
-        TAKE(event, Payload(m_ring.substr(offset + sizeof(Record), size - sizeof(Record))));
+        std::memcpy(&event.record, octets.data(), sizeof(Record));
+        TAKE(event, Payload(octets.substr(sizeof(Record))));
+        m_isBehindAChange = event.record.kind == Kind::LEG_CHANGED || event.record.kind == Kind::CALL_CHANGED;
         m_recording.m_events.push_back(std::move(event));
         return size;
+    }
+
+    /// One more property of the event before.
+    std::uint64_t readAlsoChanged(std::string_view octets)
+    {
+        if (octets.size() < sizeof(AlsoChanged))
+            return 0;
+        Event event = m_recording.m_events.back();
+        Payload payload(octets);
+        event.record.detail = payload.take<AlsoChanged>().propertyId;
+        event.before = payload.takeBrief();
+        event.after = payload.takeBrief();
+        event.filterPlace = 0;
+        event.filter.clear();
+        m_isBehindAChange = true;
+        m_recording.m_events.push_back(std::move(event));
+        return octets.size();
     }
 
     /// False.
@@ -213,6 +236,7 @@ private:
     CC_Recording& m_recording;
     std::string_view m_image;
     std::string_view m_ring;
+    bool m_isBehindAChange = false; // the last record that was read is one, or belongs to one
 };
 
 CC_Recording CC_Recording::READ(std::span<std::byte const> image)

@@ -21,24 +21,26 @@
 class CC_EXPORT CC_Recording
 {
 public:
+    /// What an event tells of.
     using Kind = CC_RecordFormat::Kind;
 
     /// A record with what follows it, taken apart. What its kind does not have is empty.
     struct Event
     {
-        CC_RecordFormat::Record record{};
-        std::uint64_t number = 0; ///< the other call or leg, the SIP code
-        std::string text;
-        CC_RecordFormat::Brief before;
-        CC_RecordFormat::Brief after;
-        std::uint64_t by = 0;         ///< the leg whose adapter wrote
-        unsigned int filterPlace = 0; ///< of the filter that made the value different, from 0
-        std::string filter;           ///< the name of its class; empty: none did
-        std::vector<std::uint32_t> ids;
+        CC_RecordFormat::Record record{}; ///< kind, turn, time, serial numbers
+        std::uint64_t number = 0;         ///< the other call or leg, the SIP code
+        std::string text;                 ///< a name, a class, a reason
+        CC_RecordFormat::Brief before;    ///< of a change: the old value
+        CC_RecordFormat::Brief after;     ///< the new one
+        std::uint64_t by = 0;             ///< the leg whose adapter wrote
+        unsigned int filterPlace = 0;     ///< of the filter that made the value different, from 0
+        std::string filter;               ///< the name of its class; empty: none did
+        std::vector<std::uint32_t> ids;   ///< of the properties that the module was told of
     };
 
     /// Of a running process: CC_Recorder::GET_IMAGE().
     static CC_Recording READ(std::span<std::byte const> image);
+    /// Of a file, also while a process writes it.
     static CC_Recording READ_FILE(char const* path);
 
     /// From the oldest to the latest.

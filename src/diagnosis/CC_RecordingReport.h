@@ -23,16 +23,20 @@
 class CC_EXPORT CC_RecordingReport
 {
 public:
+    /// Without line breaks.
     using Lines = std::vector<std::string>;
 
+    /// How numbers and names are shown that were not to be presented.
     enum class Privacy
     {
-        MASKED,
-        WHOLE ///< as they were signalled
+        MASKED, ///< as "(withheld)"
+        WHOLE   ///< as they were signalled
     };
 
+    /// Takes the recording over.
     explicit CC_RecordingReport(CC_Recording recording, Privacy privacy = Privacy::MASKED);
 
+    /// The recording that it tells of.
     CC_Recording const& getRecording() const { return m_recording; }
 
     /// The exchange between the legs of one call, a column for each: time in milliseconds since the call's first event,

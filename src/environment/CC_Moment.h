@@ -1,6 +1,8 @@
 #pragma once
 
+#include "environment/CC_Environment.h"
 #include "platform/base/Export.h"
+#include "platform/eventloop/TYEventLoop.h"
 
 /// When something happened in call control: in which turn of its event loop, and at what time.
 ///
@@ -16,7 +18,12 @@ struct CC_EXPORT CC_Moment
     long long nanoseconds = 0;   ///< of the monotonic clock (TY::Time::MONOTONIC)
 
     /// Turn and time 0 without a call-control loop.
-    static CC_Moment NOW();
+    static CC_Moment NOW()
+    {
+        TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
+        return loop != nullptr ? CC_Moment{loop->getNumberOfTurns(), loop->getTime()} : CC_Moment();
+    }
 
+    /// The same turn and time.
     friend bool operator==(CC_Moment const&, CC_Moment const&) = default;
 };

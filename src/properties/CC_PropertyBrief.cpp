@@ -3,11 +3,13 @@
 #include "platform/media/MG_IContext.h"
 #include "properties/CC_PropertyClasses.h"
 #include "properties/CC_PropertyKind.h"
+#include "recorder/CC_RecordWriter.h"
 
 #include <algorithm>
 #include <array>
 #include <cstring>
 #include <limits>
+#include <new>
 #include <string_view>
 #include <typeinfo>
 
@@ -126,19 +128,43 @@ constexpr std::array<Describe, CC_PropertyClasses::SIZE> DESCRIPTIONS = []
 }();
 } // namespace
 
-Brief CC_PropertyBrief::OF(CC_Property const* property)
+void CC_PropertyBrief::APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* property)
 {
-    Brief brief;
-    if (property == nullptr)
-        return brief;
-    CC_PropertyKind const* const kind = CC_PropertyKind::OF(*property);
-    if (kind == nullptr)
+    auto& brief = *new (recorder.getPlace()) Brief;
+    if (property != nullptr)
+    {
+        brief.place = static_cast<std::uint8_t>(kind.place);
+        DESCRIPTIONS[kind.place](*property, brief);
+    }
+    recorder.skip(brief.getSize());
+}
+
+CC_PropertyBrief::CC_PropertyBrief(CC_Property const* property)
+{
+    auto& brief = *new (m_place.data()) Brief;
+    CC_PropertyKind const* const kind = property != nullptr ? CC_PropertyKind::OF(*property) : nullptr;
+    if (kind != nullptr)
+    {
+        brief.place = static_cast<std::uint8_t>(kind->place);
+        DESCRIPTIONS[kind->place](*property, brief);
+    }
+    else if (property != nullptr)
     {
         brief.place = Brief::OTHER_CLASS;
         SET_TEXT(brief, typeid(*property).name());
-        return brief;
     }
-    brief.place = static_cast<std::uint8_t>(kind->place);
-    DESCRIPTIONS[kind->place](*property, brief);
-    return brief;
+    m_size = brief.getSize();
+}
+
+void CC_PropertyBrief::recordChange(CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg,
+                                    unsigned int propertyId, CC_Property const* after) const
+{
+    CC_PropertyBrief const now(after);
+    CC_RecordWriter* const recorder = CC_RecordWriter::ON();
+    if (recorder == nullptr)
+        return; // whoever was called meanwhile has ended it
+    recorder->beginChange(kind, call, leg, propertyId);
+    recorder->append(m_place.data(), m_size);
+    recorder->append(now.m_place.data(), now.m_size);
+    recorder->end();
 }

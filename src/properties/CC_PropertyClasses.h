@@ -9,6 +9,7 @@
 template <class... Property>
 struct CC_PropertyClassList
 {
+    /// How many they are.
     static constexpr std::size_t SIZE = sizeof...(Property);
 
     /// Calls `function.operator()<Property>()` for each, in order.

@@ -89,46 +89,52 @@ public:
     explicit Before(CC_PropertyContainer const& properties)
     {
         for (CC_Property const& property : properties)
-            if (m_count < m_values.size())
-                m_values[m_count++] = {property.getId(), CC_PropertyBrief::OF(&property)};
+            if (m_count < MOST)
+                new (&m_values[m_count++]) Value{property.getId(), CC_PropertyBrief(&property)};
     }
     bool isDifferent(CC_Property const& property) const
     {
         for (std::size_t i = 0; i < m_count; ++i)
-            if (m_values[i].id == property.getId())
-                return !IS_SAME(m_values[i].brief, CC_PropertyBrief::OF(&property));
-        return m_count < m_values.size();
+            if (m_values[i].value.id == property.getId())
+                return !IS_SAME(m_values[i].value.brief, CC_PropertyBrief(&property));
+        return m_count < MOST;
     }
 
 private:
+    static constexpr std::size_t MOST = 48; // beyond these nothing is noted
     struct Value
     {
         unsigned int id;
-        CC_RecordFormat::Brief brief;
+        CC_PropertyBrief brief;
+    };
+    union Place // of which as many hold a value as were counted
+    {
+        Place() {}
+        Value value;
     };
 
-    static bool IS_SAME(CC_RecordFormat::Brief const& left, CC_RecordFormat::Brief const& right)
+    static bool IS_SAME(CC_PropertyBrief const& left, CC_PropertyBrief const& right)
     {
-        return left.getSize() == right.getSize() && std::memcmp(&left, &right, left.getSize()) == 0;
+        std::size_t const size = CC_RecordFormat::Brief::FIXED_SIZE + left.get().textSize;
+        return left.get().textSize == right.get().textSize && std::memcmp(&left.get(), &right.get(), size) == 0;
     }
 
     std::size_t m_count = 0;
-    std::array<Value, 48> m_values; // beyond these nothing is noted
+    std::array<Place, MOST> m_values;
 };
 
 /// As APPLY, while changes are recorded.
 XCode APPLY_RECORDED(CC_PropertyFilter const& filter, unsigned int place, CC_PropertyContainer& properties,
                      CC_FilterNotes* notes)
 {
+    CC_Writing const pastTheAdapter(CC_RecordFormat::Writer::FILTER);
+    if (notes == nullptr)
+        return APPLY(filter, properties);
     char const* const name = typeid(filter).name(); // the filter may be gone afterwards
     Before const before(properties);
-    XCode result = XCode::OK;
-    {
-        CC_Writing const pastTheAdapter(CC_RecordFormat::Writer::FILTER);
-        result = APPLY(filter, properties);
-    }
+    XCode const result = APPLY(filter, properties);
     for (CC_Property const& property : properties)
-        if (notes != nullptr && before.isDifferent(property))
+        if (before.isDifferent(property))
             notes->add({property.getId(), place, name});
     return result;
 }
@@ -138,7 +144,7 @@ XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties)
 {
     CC_RecordWriter* const recorder = CC_RecordWriter::ON();
     if (recorder != nullptr)
-        return applyRecorded(properties, recorder->getWriting().filters);
+        return applyRecorded(properties, CC_Writing::NOTES(*recorder));
     XCode result = XCode::OK;
     forEach(
         [&](CC_PropertyFilter const& filter)

@@ -15,26 +15,32 @@
 /// and `head` is whole. Numbers have the byte order of the machine that wrote them.
 namespace CC_RecordFormat
 {
+/// A recording begins with these octets.
 inline constexpr char MAGIC[8] = {'c', 'c', 'r', 'e', 'c', 'o', 'r', 'd'};
 /// Of this layout and of what the numbers in it mean (Kind, Writer, CC_PropertyClasses). Adding at the end of these
 /// keeps it.
 inline constexpr std::uint32_t VERSION = 1;
+/// Reads as another number on a machine of another byte order.
 inline constexpr std::uint32_t BYTE_ORDER_MARK = 0x01020304;
 /// Of records and of everything that a position points to.
 inline constexpr std::size_t ALIGNMENT = 8;
+/// Octets of a text at most, a Brief's apart; longer ones are cut short.
 inline constexpr std::size_t LARGEST_TEXT = 200;
+
+/// The octets of the words that hold so many: of all that stands in a record before something else.
+constexpr std::size_t WORDS_OF(std::size_t octets) { return (octets + 3) / 4 * 4; }
 
 struct Header
 {
-    char magic[8];
-    std::uint32_t version;
-    std::uint32_t byteOrder;
-    std::uint64_t capacity; ///< octets of the ring
-    std::uint64_t head;     ///< the position behind the last record
-    std::uint64_t tail;     ///< the position of the oldest record
-    std::int64_t monotonic; ///< when the recording began, in nanoseconds of the clock that the records bear
-    std::int64_t realtime;  ///< the same moment, in nanoseconds since 1970
-    std::uint64_t process;  ///< the number that the system gave the process
+    char magic[8];           ///< MAGIC
+    std::uint32_t version;   ///< VERSION
+    std::uint32_t byteOrder; ///< BYTE_ORDER_MARK
+    std::uint64_t capacity;  ///< octets of the ring
+    std::uint64_t head;      ///< the position behind the last record
+    std::uint64_t tail;      ///< the position of the oldest record
+    std::int64_t monotonic;  ///< when the recording began, in nanoseconds of the clock that the records bear
+    std::int64_t realtime;   ///< the same moment, in nanoseconds since 1970
+    std::uint64_t process;   ///< the number that the system gave the process
 };
 static_assert(sizeof(Header) == 64 && std::is_trivially_copyable_v<Header>);
 
@@ -68,6 +74,7 @@ enum class Kind : std::uint8_t
     PUSHED_BACK,  ///< the leg's module was asked to step back from an internal loop
     LOCK_TAKEN,
     LOCK_GIVEN_BACK,
+    ALSO_CHANGED, ///< AlsoChanged, not Record: one more property in the change before, right behind it
     NUMBER_OF_KINDS
 };
 
@@ -95,47 +102,58 @@ enum class CleanUp : std::uint8_t
 
 struct Record
 {
-    std::uint32_t stamp; ///< the position in units of ALIGNMENT, low part
-    std::uint16_t size;  ///< with all that follows and belongs to it, a multiple of ALIGNMENT
-    Kind kind;
+    std::uint32_t stamp;      ///< the position in units of ALIGNMENT, low part
+    std::uint16_t size;       ///< with all that follows and belongs to it, a multiple of ALIGNMENT
+    Kind kind;                ///< what happened
     Writer writer;            ///< of a change
     std::int64_t nanoseconds; ///< of the monotonic clock
     std::uint64_t call;       ///< serial numbers; 0: none
-    std::uint64_t leg;
-    std::uint32_t turn; ///< of the call-control loop, low part
-    std::uint32_t detail;
+    std::uint64_t leg;        ///< the same
+    std::uint32_t turn;       ///< of the call-control loop, low part
+    std::uint32_t detail;     ///< as the kind says
 };
 static_assert(sizeof(Record) == 40 && std::is_trivially_copyable_v<Record>);
+
+/// One of several properties that were written together: all else is as in the change before.
+struct AlsoChanged
+{
+    std::uint32_t stamp;      ///< as a Record's
+    std::uint16_t size;       ///< as a Record's
+    Kind kind;                ///< ALSO_CHANGED
+    std::uint8_t reserved;    ///< 0
+    std::uint32_t propertyId; ///< the old and the new value follow (Brief)
+};
+static_assert(sizeof(AlsoChanged) == 12 && std::is_trivially_copyable_v<AlsoChanged>);
 
 /// A property's value in little room: up to two numbers and the beginning of a text.
 struct Brief
 {
     static constexpr std::uint8_t NOTHING = 255;     ///< no property
     static constexpr std::uint8_t OTHER_CLASS = 254; ///< a module's class: the text is the class's name
-    static constexpr unsigned int MOST_TEXT = 32;
-    static constexpr unsigned int FIXED_SIZE = 12; ///< of what stands before the text
+    static constexpr unsigned int MOST_TEXT = 32;    ///< octets of a text that are kept
+    static constexpr unsigned int FIXED_SIZE = 12;   ///< of what stands before the text
 
     std::uint8_t place = NOTHING; ///< of the class in CC_PropertyClasses
     std::uint8_t textSize = 0;    ///< octets of the text that are there
     std::uint16_t textLength = 0; ///< of the whole text, 65535 as well when it is longer
-    std::uint32_t first = 0;
-    std::uint32_t second = 0;
-    char text[MOST_TEXT];
+    std::uint32_t first = 0;      ///< the value, or its low half
+    std::uint32_t second = 0;     ///< what belongs to it, or its high half
+    char text[MOST_TEXT];         ///< as far as `textSize` says
 
-    /// Octets in a recording.
-    unsigned int getSize() const { return FIXED_SIZE + textSize; }
+    /// Octets in a recording: whole words.
+    std::size_t getSize() const { return FIXED_SIZE + WORDS_OF(textSize); }
 };
 static_assert(offsetof(Brief, text) == Brief::FIXED_SIZE);
 
-/// What a change begins with; the old and the new value (Brief) follow, and then the name of the filter's class.
+/// What a change begins with; the name of the filter's class follows, then the old and the new value (Brief).
 struct Change
 {
-    std::uint64_t by; ///< the serial number of the writing adapter's leg; 0: none
-    std::uint8_t filterPlace;
+    std::uint64_t by;            ///< the serial number of the writing adapter's leg; 0: none
+    std::uint8_t filterPlace;    ///< in the list of filters, from 0; 255 as well when it is further behind
     std::uint8_t filterNameSize; ///< 0: no filter has made the value different
-    std::uint8_t reserved[6];
+    std::uint8_t reserved[6];    ///< 0
 };
 static_assert(sizeof(Change) == 16);
-inline constexpr unsigned int MOST_FILTER_NAME = 96;
+/// Ids in a TOLD at most.
 inline constexpr unsigned int MOST_LISTED_IDS = 16;
 } // namespace CC_RecordFormat

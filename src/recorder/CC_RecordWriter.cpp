@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <iterator>
 #include <new>
 #include <unistd.h>
 #include <utility>
@@ -27,12 +28,14 @@ long long NANOSECONDS(TY::Time::Source source)
     return now.seconds * NANOSECONDS_IN_SECOND + now.nanoseconds;
 }
 
+/// So many octets are given up at once, where the ring has them before its end.
+constexpr std::size_t ROOM_AT_ONCE = 2048;
+
 void PUBLISH(std::uint64_t& position, std::uint64_t value)
 {
     std::atomic_ref(position).store(value, std::memory_order_release);
 }
 
-std::size_t ALIGNED(std::size_t size) { return (size + ALIGNMENT - 1) / ALIGNMENT * ALIGNMENT; }
 } // namespace
 
 CC_RecordWriter& CC_RecordWriter::INSTANCE()
@@ -45,7 +48,8 @@ void CC_RecordWriter::start(void* image, std::size_t size)
 {
     m_size = size;
     m_capacity = (size - sizeof(Header)) / ALIGNMENT * ALIGNMENT;
-    m_head = m_tail = m_offset = 0;
+    m_head = m_tail = 0;
+    m_left = m_capacity;
     m_header = new (image) Header{};
     m_header->version = VERSION;
     m_header->byteOrder = BYTE_ORDER_MARK;
@@ -54,7 +58,8 @@ void CC_RecordWriter::start(void* image, std::size_t size)
     m_header->realtime = NANOSECONDS(TY::Time::REALTIME);
     m_header->process = static_cast<std::uint64_t>(getpid());
     std::copy(std::begin(MAGIC), std::end(MAGIC), m_header->magic);
-    m_ring = static_cast<char*>(image) + sizeof(Header);
+    m_ring = m_at = static_cast<char*>(image) + sizeof(Header);
+    m_writing = nullptr;
     s_on = this;
 }
 
@@ -74,96 +79,120 @@ Record& CC_RecordWriter::at(std::uint64_t position) const
     return *reinterpret_cast<Record*>(m_ring + position % m_capacity);
 }
 
-/// Begins a record at the head, with room behind it for so many octets.
-void CC_RecordWriter::begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
-                            std::size_t payload)
+void CC_RecordWriter::begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
 {
-    std::size_t const size = ALIGNED(sizeof(Record) + payload);
-    makeRoom(size);
+    if (m_left < LARGEST_RECORD) [[unlikely]]
+        makeRoom();
     CC_Moment const now = CC_Moment::NOW();
-    auto* const record = new (m_ring + m_offset) Record;
-    record->stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
-    record->size = static_cast<std::uint16_t>(size);
-    record->kind = kind;
-    record->writer = m_writing.writer;
-    record->nanoseconds = now.nanoseconds;
-    record->call = call;
-    record->leg = leg;
-    record->turn = static_cast<std::uint32_t>(now.turn);
-    record->detail = detail;
-    m_at = m_ring + m_offset + sizeof(Record);
-    std::memset(m_ring + m_offset + size - ALIGNMENT, 0, payload == 0 ? 0 : ALIGNMENT); // behind what follows
+    m_record = reinterpret_cast<Record*>(m_at);
+    m_record->stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
+    m_record->kind = kind;
+    m_record->writer = m_writing != nullptr ? m_writing->m_writer : Writer::OUTSIDE;
+    m_record->nanoseconds = now.nanoseconds;
+    m_record->call = call;
+    m_record->leg = leg;
+    m_record->turn = static_cast<std::uint32_t>(now.turn);
+    m_record->detail = detail;
+    m_at += sizeof(Record);
+    m_changedLeg = 0;
+}
+
+void CC_RecordWriter::beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
+{
+    bool const mayNote = m_writing != nullptr && m_writing->m_notes != nullptr;
+    if (m_isInBatch && !mayNote && m_changedLeg == leg && m_changedBy == m_writing && m_left >= LARGEST_RECORD)
+        return beginAlsoChanged(propertyId);
+    begin(kind, call, leg, propertyId);
+    auto& change = *new (m_at) Change{};
+    m_at += sizeof change;
+    if (m_writing != nullptr)
+        change.by = m_writing->m_by;
+    if (mayNote)
+        appendFilter(propertyId);
+    m_changedLeg = leg;
+    m_changedBy = m_writing;
+}
+
+inline void CC_RecordWriter::beginAlsoChanged(unsigned int propertyId)
+{
+    m_record = reinterpret_cast<Record*>(m_at);
+    auto& also = reinterpret_cast<AlsoChanged&>(*m_at);
+    also.stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
+    also.kind = Kind::ALSO_CHANGED;
+    also.propertyId = propertyId;
+    m_at += sizeof also;
+}
+
+/// The filter that made the value different, if one did.
+void CC_RecordWriter::appendFilter(unsigned int propertyId)
+{
+    CC_FilterNotes::Note const* const note = m_writing->m_notes->find(propertyId);
+    if (note == nullptr)
+        return;
+    auto& change = reinterpret_cast<Change*>(m_at)[-1];
+    std::string_view const name = std::string_view(note->name).substr(0, LARGEST_TEXT);
+    change.filterPlace = static_cast<std::uint8_t>(std::min(note->place, 255U));
+    change.filterNameSize = static_cast<std::uint8_t>(name.size());
+    std::memcpy(m_at, name.data(), name.size());
+    m_at += WORDS_OF(name.size());
 }
 
 void CC_RecordWriter::end()
 {
-    std::uint16_t const size = at(m_head).size;
+    std::memset(m_at, 0, ALIGNMENT); // of which the last group keeps what it does not need
+    auto const written = static_cast<std::size_t>(m_at - reinterpret_cast<char*>(m_record));
+    std::size_t const size = (written + ALIGNMENT - 1) / ALIGNMENT * ALIGNMENT;
+    m_record->size = static_cast<std::uint16_t>(size);
+    m_at = reinterpret_cast<char*>(m_record) + size;
     m_head += size;
-    m_offset += size;
-    if (m_offset == m_capacity)
-        m_offset = 0;
+    m_left -= size;
     PUBLISH(m_header->head, m_head);
 }
 
-/// Gives up the oldest records for so many octets at the head, which do not wrap.
-void CC_RecordWriter::makeRoom(std::size_t size)
+/// Gives up the oldest records, so that there is room for a record of any size at the head. When the ring's end is too
+/// near, the head moves to its beginning. More than one record's room is made at once, or every record would come here.
+void CC_RecordWriter::makeRoom()
 {
-    std::size_t const rest = m_capacity - m_offset;
-    std::size_t const padding = rest < size ? rest : 0;
-    if (m_head + padding + size > m_tail + m_capacity)
-    {
-        do
-            m_tail += at(m_tail).size;
-        while (m_head + padding + size > m_tail + m_capacity);
-        PUBLISH(m_header->tail, m_tail);
-    }
-    if (padding == 0)
-        return;
-    Record& record = at(m_head); // of which only the first octets are there
+    std::uint64_t const offset = m_head % m_capacity;
+    std::size_t const rest = m_capacity - offset;
+    std::size_t const padding = rest < LARGEST_RECORD ? rest : 0;
+    std::size_t const wanted = std::min(ROOM_AT_ONCE, padding != 0 ? ROOM_AT_ONCE : rest);
+    while (m_tail < m_head && m_tail + m_capacity < m_head + padding + wanted)
+        m_tail += at(m_tail).size;
+    while (m_tail < m_head && at(m_tail).kind == Kind::ALSO_CHANGED)
+        m_tail += at(m_tail).size; // what it belongs to has gone
+    m_changedLeg = 0;
+    PUBLISH(m_header->tail, m_tail);
+    if (padding != 0)
+        pad(padding);
+    m_at = m_ring + m_head % m_capacity;
+    m_left = std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head);
+}
+
+/// Fills the end of the ring.
+void CC_RecordWriter::pad(std::size_t size)
+{
+    Record& record = at(m_head); // of which maybe only the first octets are there
     record.stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
-    record.size = static_cast<std::uint16_t>(padding);
+    record.size = static_cast<std::uint16_t>(size);
     record.kind = Kind::PADDING;
-    m_head += padding;
-    m_offset = 0;
+    m_head += size;
     PUBLISH(m_header->head, m_head);
 }
 
 void CC_RecordWriter::addText(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                               std::string_view text)
 {
-    std::string_view const kept = text.substr(0, LARGEST_TEXT);
-    begin(kind, call, leg, detail, kept.size());
-    append(kept.data(), kept.size());
+    begin(kind, call, leg, detail);
+    append(text.data(), std::min(text.size(), LARGEST_TEXT));
     end();
 }
 
 void CC_RecordWriter::addNumber(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                                 unsigned long long number, std::string_view text)
 {
-    std::string_view const kept = text.substr(0, LARGEST_TEXT);
-    begin(kind, call, leg, detail, sizeof number + kept.size());
+    begin(kind, call, leg, detail);
     append(&number, sizeof number);
-    append(kept.data(), kept.size());
-    end();
-}
-
-void CC_RecordWriter::addChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int id,
-                                Brief const& before, Brief const& after)
-{
-    Change change{};
-    change.by = m_writing.by;
-    std::string_view name;
-    if (m_writing.filters != nullptr)
-        if (CC_FilterNotes::Note const* const note = m_writing.filters->find(id))
-        {
-            name = std::string_view(note->name).substr(0, MOST_FILTER_NAME);
-            change.filterPlace = static_cast<std::uint8_t>(std::min(note->place, 255U));
-            change.filterNameSize = static_cast<std::uint8_t>(name.size());
-        }
-    begin(kind, call, leg, id, sizeof change + before.getSize() + after.getSize() + name.size());
-    append(&change, sizeof change);
-    append(&before, before.getSize());
-    append(&after, after.getSize());
-    append(name.data(), name.size());
+    append(text.data(), std::min(text.size(), LARGEST_TEXT));
     end();
 }

@@ -8,6 +8,7 @@
 #include <string_view>
 
 class CC_FilterNotes;
+class CC_Writing;
 
 /// Writes records into the ring: what the library does where something happens.
 ///
@@ -17,46 +18,48 @@ class CC_RecordWriter
 {
 public:
     using Kind = CC_RecordFormat::Kind;
-    using Brief = CC_RecordFormat::Brief;
-
-    /// Who is writing properties just now.
-    struct Writing
-    {
-        CC_RecordFormat::Writer writer;
-        unsigned long long by;   // the adapter's leg
-        CC_FilterNotes* filters; // what filters did to what is written; null: nothing
-    };
 
     /// Null while nothing is recorded.
-    static CC_RecordWriter* ON() { return s_on; }
+    static CC_RecordWriter* ON()
+    {
+        if (s_on == nullptr) [[likely]]
+            return nullptr;
+        return s_on;
+    }
 
     void add(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail = 0)
     {
-        begin(kind, call, leg, detail, 0);
+        begin(kind, call, leg, detail);
         end();
     }
+    /// What is longer than LARGEST_TEXT is cut short.
     void addText(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                  std::string_view text);
     /// `number` stands before the text.
     void addNumber(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                    unsigned long long number, std::string_view text = {});
-    void addChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int id, Brief const& before,
-                   Brief const& after);
-    /// For a list of ids, of which there are `count`: `next()` gives one after the other.
-    template <class Next>
-    void addIds(unsigned long long call, unsigned long long leg, unsigned int count, Next&& next)
-    {
-        unsigned int const listed = count < CC_RecordFormat::MOST_LISTED_IDS ? count : CC_RecordFormat::MOST_LISTED_IDS;
-        begin(Kind::TOLD, call, leg, count, listed * sizeof(std::uint32_t));
-        for (unsigned int i = 0; i < listed; ++i)
-        {
-            std::uint32_t const id = next();
-            append(&id, sizeof id);
-        }
-        end();
-    }
 
-    Writing& getWriting() { return m_writing; }
+    // A record in pieces: `begin`, then `append` up to MOST_PAYLOAD octets in all, then `end`. Nothing else is recorded
+    // in between.
+
+    void begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail);
+    /// A change with who writes just now; the old and the new value follow. Of several of a Batch the later ones take
+    /// less room.
+    void beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId);
+    void append(void const* octets, std::size_t size)
+    {
+        std::memcpy(m_at, octets, size);
+        m_at += size;
+    }
+    void appendText(std::string_view text) { append(text.data(), text.size()); }
+    /// Where the next octets come, for who writes so many there; a place for whole words as long as only such went
+    /// before.
+    char* getPlace() const { return m_at; }
+    void skip(std::size_t size) { m_at += size; }
+    void setDetail(unsigned int detail) { m_record->detail = detail; }
+    void end();
+    /// In place of `end`: there is no such record.
+    void cancel() { m_at = reinterpret_cast<char*>(m_record); }
 
     // CC_Recorder's business
     void start(void* image, std::size_t size);
@@ -64,31 +67,60 @@ public:
     std::span<std::byte const> getImage() const;
     static CC_RecordWriter& INSTANCE();
 
-private:
-    void begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail, std::size_t payload);
-    void append(void const* octets, std::size_t size)
+    /// While it lives, properties are written together.
+    class Batch
     {
-        std::memcpy(m_at, octets, size);
-        m_at += size;
-    }
-    void end();
-    void makeRoom(std::size_t size);
+    public:
+        Batch() : m_recorder(ON())
+        {
+            if (m_recorder != nullptr)
+                m_recorder->m_isInBatch = true;
+        }
+        ~Batch()
+        {
+            if (m_recorder != nullptr)
+                m_recorder->m_isInBatch = false;
+        }
+        Batch(Batch const&) = delete;
+        Batch& operator=(Batch const&) = delete;
+
+    private:
+        CC_RecordWriter* m_recorder;
+    };
+
+    static constexpr std::size_t MOST_PAYLOAD =
+        sizeof(CC_RecordFormat::Change) + 2 * sizeof(CC_RecordFormat::Brief) + CC_RecordFormat::LARGEST_TEXT;
+
+private:
+    friend class CC_Writing;
+
+    static constexpr std::size_t LARGEST_RECORD = sizeof(CC_RecordFormat::Record) + MOST_PAYLOAD + 8;
+
+    void beginAlsoChanged(unsigned int propertyId);
+    void appendFilter(unsigned int propertyId);
+    void makeRoom();
+    void pad(std::size_t size);
     CC_RecordFormat::Record& at(std::uint64_t position) const;
 
     static CC_RecordWriter* s_on;
 
     CC_RecordFormat::Header* m_header = nullptr;
+    CC_RecordFormat::Record* m_record = nullptr; // that is being written; of an AlsoChanged only the first octets
+    char* m_at = nullptr;                        // the next octet
+    std::uint64_t m_head = 0;
+    std::size_t m_left = 0;                // octets at the head that belong to no record
+    CC_Writing const* m_writing = nullptr; // null: code outside any adapter
+    // of a change that another may follow: nothing has been recorded since
+    unsigned long long m_changedLeg = 0; // 0: there is none
+    CC_Writing const* m_changedBy = nullptr;
+    bool m_isInBatch = false;
     char* m_ring = nullptr;
     std::uint64_t m_capacity = 0;
-    std::uint64_t m_head = 0; // of the header: nobody else writes these
     std::uint64_t m_tail = 0;
-    std::uint64_t m_offset = 0; // of the head in the ring
-    char* m_at = nullptr;       // of the record that is being written
-    std::size_t m_size = 0;     // the whole recording's
-    Writing m_writing{};
+    std::size_t m_size = 0; // the whole recording's
 };
 
-/// Says who writes, for as long as it lives; the one before comes back then.
+/// Says who writes properties, for as long as it lives; the one before comes back then. On the stack.
 ///
 ///     CC_Writing const writing(CC_RecordFormat::Writer::OWN, *m_ownCallLeg);
 class CC_Writing
@@ -97,36 +129,53 @@ public:
     explicit CC_Writing(CC_RecordFormat::Writer writer) : m_recorder(CC_RecordWriter::ON())
     {
         if (m_recorder != nullptr)
-            begin({writer, 0, nullptr});
+            begin(writer, 0, nullptr);
     }
     /// The adapter of that leg writes.
     template <class CallLeg>
     CC_Writing(CC_RecordFormat::Writer writer, CallLeg const& leg) : m_recorder(CC_RecordWriter::ON())
     {
         if (m_recorder != nullptr)
-            begin({writer, leg.getSerial(), nullptr});
+            begin(writer, leg.getSerial(), nullptr);
     }
     /// The same writer as before, through filters, of which `notes` must live longer.
     explicit CC_Writing(CC_FilterNotes& notes) : m_recorder(CC_RecordWriter::ON())
     {
-        if (m_recorder != nullptr)
-            begin({m_recorder->getWriting().writer, m_recorder->getWriting().by, &notes});
+        if (m_recorder == nullptr)
+            return;
+        CC_Writing const* const before = m_recorder->m_writing;
+        begin(before != nullptr ? before->m_writer : CC_RecordFormat::Writer::OUTSIDE,
+              before != nullptr ? before->m_by : 0, &notes);
     }
     ~CC_Writing()
     {
         if (m_recorder != nullptr)
-            m_recorder->getWriting() = m_before; // also when recording has ended meanwhile
+            m_recorder->m_writing = m_outer; // also when recording has ended meanwhile
     }
     CC_Writing(CC_Writing const&) = delete;
     CC_Writing& operator=(CC_Writing const&) = delete;
 
-private:
-    void begin(CC_RecordWriter::Writing const& writing)
+    /// Where filters are to note what they do; null when nobody writes through them.
+    static CC_FilterNotes* NOTES(CC_RecordWriter const& recorder)
     {
-        m_before = m_recorder->getWriting();
-        m_recorder->getWriting() = writing;
+        return recorder.m_writing != nullptr ? recorder.m_writing->m_notes : nullptr;
     }
 
-    CC_RecordWriter* m_recorder;
-    CC_RecordWriter::Writing m_before; // of a recorder that is on
+private:
+    friend class CC_RecordWriter;
+
+    void begin(CC_RecordFormat::Writer writer, unsigned long long by, CC_FilterNotes* notes)
+    {
+        m_outer = m_recorder->m_writing;
+        m_by = by;
+        m_notes = notes;
+        m_writer = writer;
+        m_recorder->m_writing = this;
+    }
+
+    CC_RecordWriter* m_recorder; // null: nothing was recorded, and the rest is not set
+    CC_Writing const* m_outer;
+    unsigned long long m_by;
+    CC_FilterNotes* m_notes;
+    CC_RecordFormat::Writer m_writer;
 };

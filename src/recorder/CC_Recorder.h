@@ -26,8 +26,8 @@
 class CC_EXPORT CC_Recorder
 {
 public:
-    static constexpr std::size_t DEFAULT_SIZE = 4 * 1024 * 1024;
-    static constexpr std::size_t LEAST_SIZE = 4096;
+    static constexpr std::size_t DEFAULT_SIZE = 4 * 1024 * 1024; ///< octets: the last few hundred calls
+    static constexpr std::size_t LEAST_SIZE = 4096;              ///< octets
 
     /// Records in memory, about `octets` of it. OK; REFUSED when it is on, or for less than LEAST_SIZE; NO_ELEMENT when
     /// memory is out.
@@ -39,6 +39,7 @@ public:
     /// Ends the recording. A file stays, what was in memory is lost. Nothing happens when it is off.
     static void CLOSE();
 
+    /// Whether events are recorded.
     static bool IS_ON();
     /// The recording as it is now, as a file would hold it, for readers inside the process; empty when it is off. It
     /// holds until the next event is recorded.

@@ -18,6 +18,7 @@
 class CC_EXPORT IpAddress
 {
 public:
+    /// Those of an address.
     using Octets = std::array<unsigned char, 16>;
 
     IpAddress() = default; ///< unspecified, version 4
