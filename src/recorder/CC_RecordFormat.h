@@ -30,6 +30,7 @@ inline constexpr std::size_t LARGEST_TEXT = 200;
 /// The octets of the words that hold so many: of all that stands in a record before something else.
 constexpr std::size_t WORDS_OF(std::size_t octets) { return (octets + 3) / 4 * 4; }
 
+/// What a recording begins with.
 struct Header
 {
     char magic[8];           ///< MAGIC
@@ -100,6 +101,7 @@ enum class CleanUp : std::uint8_t
     NUMBER_OF_CLEAN_UPS
 };
 
+/// What every event begins with.
 struct Record
 {
     std::uint32_t stamp;      ///< the position in units of ALIGNMENT, low part
