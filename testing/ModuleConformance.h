@@ -32,6 +32,7 @@ class ConformanceSituation;
 class ModuleConformance
 {
 public:
+    /// What a module has to keep.
     struct Rule
     {
         char const* name;
@@ -66,6 +67,7 @@ public:
     };
     static std::vector<Case> const& CASES();
 
+    /// What came of a case.
     struct Outcome
     {
         enum Kind

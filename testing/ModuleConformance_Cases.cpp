@@ -196,6 +196,20 @@ void BOTH_CLEAR_AT_ONCE(Situation& situation, Caller caller, Step step)
     situation.endAsUsual();
 }
 
+/// Nobody is there, or the module that is does not take the call: the dial itself fails.
+void THE_DIAL_FAILS(Situation& situation, bool hasProvider)
+{
+    situation.did(Column::PEER, hasProvider ? "> refuses every dial" : "> is not registered");
+    situation.peer().m_provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&)
+    { return XCode(XCode::FAILURE); };
+    if (!hasProvider)
+        CallControl::REMOVE_PROVIDER("", ModuleDriver::PEER);
+    situation.did(Column::WIRE, std::string("> calls ") + ModuleDriver::PEER_NUMBER);
+    situation.driver().placeCall(ModuleDriver::PEER_NUMBER);
+    situation.expectWireCleared(Suite::CLEARS_THE_WIRE_ONCE);
+    situation.expectDropped(Suite::DROPS_ONCE);
+}
+
 // --- CarriesCauses ---------------------------------------------------------------------------------------------------
 
 std::string TEXT_OF(QCause cause) { return std::to_string(static_cast<int>(cause)); }
@@ -327,14 +341,20 @@ void PROPERTIES_COME_BEFORE_STATES(Situation& situation)
     situation.endAsUsual();
 }
 
-void THE_OFFER_IS_ANSWERED_LATE(Situation& situation)
+/// A call from the wire is offered to the peer, and neither accepted nor rejected yet.
+void CALL_WHO_HOLDS_IT(Situation& situation)
 {
-    situation.need(Caller::WIRE);
     situation.peer().holdOffers();
+    situation.did(Column::WIRE, std::string("> calls ") + ModuleDriver::PEER_NUMBER);
     situation.driver().placeCall(ModuleDriver::PEER_NUMBER);
     situation.await(
         Suite::TELLS_THE_PEER, [&] { return situation.peer().isHolding(); }, "the call did not reach the peer");
     situation.settle();
+}
+
+void THE_OFFER_IS_ANSWERED_LATE(Situation& situation)
+{
+    CALL_WHO_HOLDS_IT(situation);
     situation.expectWireNotCleared(Suite::FOLLOWS_ANY_ORDER);
     situation.did(Column::PEER, "> accepts what it held");
     std::ignore = situation.peer().acceptHeld(); // no memory fails here
@@ -345,12 +365,7 @@ void THE_OFFER_IS_ANSWERED_LATE(Situation& situation)
 
 void THE_WIRE_CLEARS_BEFORE_ANYBODY_ACCEPTS(Situation& situation)
 {
-    situation.need(Caller::WIRE);
-    situation.peer().holdOffers();
-    situation.driver().placeCall(ModuleDriver::PEER_NUMBER);
-    situation.await(
-        Suite::TELLS_THE_PEER, [&] { return situation.peer().isHolding(); }, "the call did not reach the peer");
-    situation.settle();
+    CALL_WHO_HOLDS_IT(situation);
     situation.clearFromWire(QCause::NORMAL_CALL_CLEARING, Suite::FOLLOWS_ANY_ORDER);
 }
 
@@ -392,6 +407,23 @@ void THE_PEER_IS_REPLACED(Situation& situation, Caller caller)
 {
     situation.call(caller, Step::CONNECTED);
     REPLACE_PEER(situation);
+    EXPECT_THE_NEW_PEER(situation);
+}
+
+/// The peer joins a third party to the call and leaves it: two turns later there is another peer.
+void A_THIRD_PARTY_STAYS(Situation& situation, Caller caller)
+{
+    situation.call(caller, Step::CONNECTED);
+    situation.did(Column::PEER, "> confers with third, whom second had called");
+    std::ignore = situation.second().dial(situation.third()); // no memory fails here
+    std::ignore = situation.third().become(State::CONNECTED);
+    situation.settle();
+    std::ignore = situation.peer().m_adapter->transfer(*situation.second().m_adapter, false);
+    situation.second().hangUp();
+    situation.settle();
+    situation.did(Column::PEER, "> hangs up");
+    situation.peer().hangUp();
+    situation.settle();
     EXPECT_THE_NEW_PEER(situation);
 }
 
@@ -456,6 +488,18 @@ void A_LOST_PEER_ENDS_THE_CALL(Situation& situation, Loss loss, Caller caller, S
     situation.call(caller, step);
     LOSE(situation, loss);
     situation.expectWireCleared(Suite::SURVIVES_A_LOST_PEER);
+    situation.expectDropped(Suite::SURVIVES_A_LOST_PEER);
+}
+
+/// The module cannot know: nobody has come yet whom it could miss. But it has to end it when the wire clears.
+void THE_CALL_IS_RELEASED_BEFORE_ANYBODY_ACCEPTS(Situation& situation)
+{
+    CALL_WHO_HOLDS_IT(situation);
+    situation.did(Column::PEER, std::string("> ") + NAME(Loss::CALL_RELEASED));
+    CallControl::RELEASE_CALL("", CallControl::GET_CALL("", 0));
+    situation.settle();
+    situation.did(Column::WIRE, "> clears");
+    situation.driver().clear(QCause::NORMAL_CALL_CLEARING);
     situation.expectDropped(Suite::SURVIVES_A_LOST_PEER);
 }
 
@@ -651,12 +695,25 @@ void ANY_ALLOCATION_MAY_FAIL(Situation& situation, Caller caller)
 
 // --- LeavesNothing ---------------------------------------------------------------------------------------------------
 
-void THE_MODULE_ENDS(Situation& situation, Caller caller, Step step)
+void END_MODULE(Situation& situation)
 {
-    situation.call(caller, step);
     situation.did(Column::MODULE, "> the module ends");
     situation.destroyModule();
     situation.callControl().settle();
+}
+
+void THE_MODULE_ENDS_BEFORE_ANYBODY_ACCEPTS(Situation& situation)
+{
+    CALL_WHO_HOLDS_IT(situation);
+    END_MODULE(situation);
+    situation.expect(Suite::LEAVES_NOTHING, situation.isEverythingGone(),
+                     "the module has ended, and " + situation.whatIsLeft() + " left");
+}
+
+void THE_MODULE_ENDS(Situation& situation, Caller caller, Step step)
+{
+    situation.call(caller, step);
+    END_MODULE(situation);
     std::string const state = situation.peer().getPeerState();
     situation.expect(Suite::LEAVES_NOTHING, state == "RELEASED" || state == "none",
                      "the module has ended, and the peer sees its leg " + state);
@@ -748,6 +805,9 @@ void ADD_ENDS(Cases& cases)
     ADD_ENDS(cases, Suite::WRITES_NOTHING_AFTER_THE_DROP, NOTHING_IS_WRITTEN_AFTERWARDS);
     ADD_ENDS(cases, Suite::CLEARS_THE_WIRE_ONCE, THE_WIRE_IS_CLEARED_ONCE);
     ADD_ALL(cases, Suite::DROPS_ONCE, "BothClearAtOnce", BOTH_CLEAR_AT_ONCE);
+    for (bool const hasProvider : {true, false})
+        ADD_FROM_WIRE(cases, Suite::CLEARS_THE_WIRE_ONCE, hasProvider ? "TheDialIsRefused" : "NobodyIsThere",
+                      [hasProvider](Situation& situation) { THE_DIAL_FAILS(situation, hasProvider); });
     ADD_ALL(cases, Suite::CARRIES_CAUSES, "FromThePeer", CAUSES_REACH_THE_WIRE);
     ADD_ALL(cases, Suite::CARRIES_CAUSES, "FromTheWire", CAUSES_REACH_THE_PEER);
     ADD_FROM_WIRE(cases, Suite::CARRIES_CAUSES, "Rejected", A_REJECTION_REACHES_THE_WIRE);
@@ -766,6 +826,7 @@ void ADD_ORDERS(Cases& cases)
     ADD_FROM_WIRE(cases, rule, "TheWireClearsBeforeAnybodyAccepts", THE_WIRE_CLEARS_BEFORE_ANYBODY_ACCEPTS);
     ADD_ALL(cases, rule, "AServiceThatNobodyKnows", A_SERVICE_THAT_NOBODY_KNOWS);
     ADD_BOTH(cases, rule, "ThePeerIsReplaced", THE_PEER_IS_REPLACED);
+    ADD_BOTH(cases, rule, "AThirdPartyStays", A_THIRD_PARTY_STAYS);
     ADD_FROM_WIRE(cases, rule, "ThePeerIsReplacedByOneThatHasAnswered", THE_PEER_IS_REPLACED_BY_ONE_THAT_HAS_ANSWERED);
 }
 
@@ -775,6 +836,8 @@ void ADD_LOSSES(Cases& cases)
         ADD_ALL(cases, Suite::SURVIVES_A_LOST_PEER, NAME(loss),
                 [loss](Situation& situation, Caller caller, Step step)
                 { A_LOST_PEER_ENDS_THE_CALL(situation, loss, caller, step); });
+    ADD_FROM_WIRE(cases, Suite::SURVIVES_A_LOST_PEER, "TheCallIsReleasedBeforeAnybodyAccepts",
+                  THE_CALL_IS_RELEASED_BEFORE_ANYBODY_ACCEPTS);
     ADD_ALL(cases, Suite::SURVIVES_A_SILENT_WIRE, "ThePeerHangsUp", THE_PEER_HANGS_UP_ON_A_SILENT_WIRE);
     for (Step const step : {Step::OFFERED, Step::RINGING})
         ADD_TO_WIRE(cases, Suite::SURVIVES_A_SILENT_WIRE,
@@ -793,6 +856,8 @@ void ADD_THE_REST(Cases& cases)
     ADD_TO_WIRE(cases, Suite::COMPLETES_NUMBERS, "OneByOne",
                 [](Situation& situation) { LATE_DIGITS_COMPLETE_THE_NUMBER(situation, true); });
     ADD_BOTH(cases, Suite::SURVIVES_NO_MEMORY, "EachAllocation", ANY_ALLOCATION_MAY_FAIL);
+    ADD_FROM_WIRE(cases, Suite::LEAVES_NOTHING, "TheModuleEndsBeforeAnybodyAccepts",
+                  THE_MODULE_ENDS_BEFORE_ANYBODY_ACCEPTS);
     ADD_ALL(cases, Suite::LEAVES_NOTHING, "TheModuleEnds", THE_MODULE_ENDS);
 }
 

@@ -267,7 +267,10 @@ void FaultyModule::drop(QCause cause)
 {
     m_patience.stop();
     if (is(Fault::KEEPS_ITS_LEG) || is(Fault::WRITES_AFTER_RELEASED))
-        std::ignore = m_adapter.setOwn(Key::CAUSE, cause, 0u), m_adapter.setOwn(Key::STATE, State::RELEASED);
+    {
+        std::ignore = m_adapter.setOwn(Key::CAUSE, cause, 0u);
+        std::ignore = m_adapter.setOwn(Key::STATE, State::RELEASED);
+    }
     if (is(Fault::WRITES_AFTER_RELEASED))
         std::ignore = m_adapter.setOwnDisplay("bye");
     if (!is(Fault::KEEPS_ITS_LEG))
