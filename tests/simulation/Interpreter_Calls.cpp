@@ -45,15 +45,27 @@ XCode Interpreter::moveLeg(Operation const& operation)
     CC_Call* const call = m_world.call(operation[1], operation[2]);
     if (leg == nullptr)
         return XCode(NO_RESULT);
-    Memory::Library const library;
     if (operation.code == Code::MOVE_LEG)
-        return CC_Call::TRANSFER_CALL_LEG(operation[3] % 4 == 3 ? nullptr : call, *leg);
+        return transferLeg(*leg, operation[3] % 4 == 3 ? nullptr : call);
     if (call == nullptr)
         return XCode(NO_RESULT);
+    Memory::Library const library;
     if (operation.code == Code::ADD_LEG)
         return call->addCallLeg(*leg);
     call->removeCallLeg(*leg);
     return XCode(NO_RESULT);
+}
+
+/// Who moves a leg into a call without its help has the call looked at.
+XCode Interpreter::transferLeg(CC_CallLeg& leg, CC_Call* to)
+{
+    CallWatch watch;
+    watch.watch(to);
+    Memory::Library const library;
+    XCode const result = CC_Call::TRANSFER_CALL_LEG(to, leg);
+    if (watch.get() != nullptr)
+        watch.get()->defer();
+    return result;
 }
 
 namespace

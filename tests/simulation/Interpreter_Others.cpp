@@ -2,6 +2,7 @@
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "tests/simulation/Interpreter.h"
+#include "tests/simulation/Library.h"
 
 #include <thread>
 
@@ -19,7 +20,7 @@ void Interpreter::changeFilters(Operation const& operation)
     bool const isAdded = operation[2] % 4 != 3;
     if (isAdded && filters.getNumberOfFilters() >= 4)
         return;
-    if (isAdded && isInput && rule.mayHideState())
+    if (MAY_FILTERS_KEEP_CALLS && isAdded && isInput && rule.mayHideState())
         m_world.m_hasFailingFilter = true;
     Memory::Library const library;
     if (operation[2] % 4 == 0)

@@ -210,10 +210,11 @@ private:
     unsigned int writeOne(int adapter, Target target, Property const& property, bool isFiltered = true);
     unsigned int writeThrough(int adapter, Target target, Properties const& properties, bool isOne);
     void updateOwn(int adapter);
-    void updatePeer(int adapter);
+    void updatePeer(int adapter, std::set<unsigned int> const* told);
     void updateCall(int adapter);
-    void follow(int adapter, Container& view, Container const& source);
+    bool follow(int adapter, Container& view, Container const& source);
     void mark(int adapter, unsigned int id);
+    void post(int adapter);
     bool linkPeer(int adapter);
     void unlinkPeer(int adapter);
     void onLegChanged(int adapter, int leg, std::set<unsigned int> const& changed);

@@ -93,6 +93,11 @@ unsigned int Model::write(int index, Target target, Container const& written, bo
                              : adapter.own != NOBODY && m_legs[AT(adapter.own)].call != NOBODY;
     if (!isThere)
         return ABSENT;
+    if (target == Target::PEER && written.find(STATE) != nullptr)
+    {
+        adapter.isPeerToBeChosen = true; // whatever it falls to does not show
+        post(index);
+    }
     Container& view = target == Target::OWN    ? adapter.ownView
                       : target == Target::PEER ? adapter.peerView
                                                : adapter.callView;
@@ -109,8 +114,6 @@ unsigned int Model::write(int index, Target target, Container const& written, bo
         Container copy = view;
         result = apply(*filters, copy) ? writeThrough(index, target, copy.list, false) : FAILURE;
     }
-    if (target == Target::PEER && written.find(STATE) != nullptr)
-        m_adapters[AT(index)].isPeerToBeChosen = true;
     return result;
 }
 
@@ -141,22 +144,26 @@ void Model::updateOwn(int index)
         adapter.ownView = copy;
 }
 
-void Model::updatePeer(int index)
+/// A State that the refresh finds, and nobody tells of, hides a fall: the peer is chosen anew in the next turn.
+void Model::updatePeer(int index, std::set<unsigned int> const* told)
 {
     Adapter& adapter = m_adapters[AT(index)];
-    if (adapter.peer != NOBODY)
-        follow(index, adapter.peerView, m_legs[AT(adapter.peer)].properties);
+    if (adapter.peer != NOBODY && follow(index, adapter.peerView, m_legs[AT(adapter.peer)].properties) &&
+        told != nullptr && told->count(STATE) == 0)
+        adapter.isPeerToBeChosen = true;
 }
 
 void Model::updateCall(int index)
 {
     Adapter& adapter = m_adapters[AT(index)];
     if (adapter.own != NOBODY && m_legs[AT(adapter.own)].call != NOBODY)
-        follow(index, adapter.callView, m_calls[AT(m_legs[AT(adapter.own)].call)].properties);
+        std::ignore = follow(index, adapter.callView, m_calls[AT(m_legs[AT(adapter.own)].call)].properties);
 }
 
-void Model::follow(int index, Container& view, Container const& source)
+/// Whether the State differed.
+bool Model::follow(int index, Container& view, Container const& source)
 {
+    bool isState = false;
     Container copy = source;
     if (std::vector<FilterRule> const* const filters = outputOf(m_adapters[AT(index)]))
         apply(*filters, copy);
@@ -167,15 +174,18 @@ void Model::follow(int index, Container& view, Container const& source)
             continue;
         view.set(property);
         mark(index, property.id);
+        isState = isState || property.id == STATE;
     }
     for (std::size_t i = 0; i < view.list.size();)
         if (unsigned int const id = view.list[i].id; copy.find(id) == nullptr)
         {
             view.remove(id);
             mark(index, id);
+            isState = isState || id == STATE;
         }
         else
             ++i;
+    return isState;
 }
 
 void Model::mark(int index, unsigned int id)
@@ -184,10 +194,13 @@ void Model::mark(int index, unsigned int id)
     if (!adapter.hasEvents)
         return;
     adapter.marked.insert(id);
-    if (adapter.isPending)
-        return;
-    adapter.isPending = true;
-    m_queue.emplace_back(Who::ADAPTER, index);
+    post(index);
+}
+
+void Model::post(int index)
+{
+    if (!std::exchange(m_adapters[AT(index)].isPending, true))
+        m_queue.emplace_back(Who::ADAPTER, index);
 }
 
 bool Model::linkPeer(int index)
@@ -207,7 +220,7 @@ bool Model::linkPeer(int index)
     adapter.peer = chosen;
     if (former != NOBODY)
         giveUp(former);
-    updatePeer(index);
+    updatePeer(index, nullptr);
     return true;
 }
 
@@ -220,9 +233,9 @@ void Model::unlinkPeer(int index)
     adapter.peer = NOBODY;
     Container const view = adapter.peerView;
     adapter.peerView.list.clear();
+    giveUp(former);
     for (Property const& property : view.list)
         mark(index, property.id);
-    giveUp(former);
 }
 
 void Model::onLegChanged(int index, int leg, std::set<unsigned int> const& changed)
@@ -245,7 +258,7 @@ void Model::onLegChanged(int index, int leg, std::set<unsigned int> const& chang
     }
     bool const isToBeChosen = isState && (!hasState || level < seen);
     if (!isToBeChosen || !linkPeer(index))
-        updatePeer(index);
+        updatePeer(index, &changed);
 }
 
 void Model::onRelinked(int index, int leg, int newCall, int oldCall)
@@ -268,7 +281,7 @@ void Model::onRelinked(int index, int leg, int newCall, int oldCall)
 
 void Model::handle(int index)
 {
-    if (std::exchange(m_adapters[AT(index)].isPeerToBeChosen, false))
+    if (m_adapters[AT(index)].peer != NOBODY && std::exchange(m_adapters[AT(index)].isPeerToBeChosen, false))
         linkPeer(index);
     Adapter& adapter = m_adapters[AT(index)];
     std::set<unsigned int> const told = std::exchange(adapter.marked, {});
@@ -374,11 +387,13 @@ void Model::drop(int index, int cause, unsigned int value)
         m_calls[AT(call)].callObservers.remove(Who::ADAPTER, index);
     }
     m_legs[AT(own)].observers.remove(Who::ADAPTER, index);
-    m_legs[AT(own)].isFixed = true;
     writeOne(index, Target::OWN, Values::MAKE_NUMBER(PROVIDES_DATA, Kind::BOOLEAN, 0));
     if (cause != -1 || value != 0)
         writeOne(index, Target::OWN, Values::MAKE_CAUSE(cause, value));
+    m_legs[AT(own)].isFixed = true;
     writeOne(index, Target::OWN, Values::MAKE_STATE(-1));
+    if (m_legs[AT(own)].getState() != -1) // no filter keeps a leg, and with it its call, from its end
+        setOnLeg(own, Values::MAKE_STATE(-1));
     Adapter& adapter = m_adapters[AT(index)];
     adapter.own = NOBODY;
     giveUp(own);

@@ -505,7 +505,10 @@ unsigned int Model::moveLeg(Operation const& operation)
     int const call = callOf(operation[1], operation[2]);
     if (operation.code == Code::MOVE_LEG)
     {
-        transfer(operation[3] % 4 == 3 ? NOBODY : call, leg);
+        int const to = operation[3] % 4 == 3 ? NOBODY : call;
+        transfer(to, leg);
+        if (to != NOBODY)
+            defer(to);
         return OK;
     }
     if (call == NOBODY)
