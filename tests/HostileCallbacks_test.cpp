@@ -153,6 +153,51 @@ TEST_F(HostileCallbacks, TheRebootManagementMayDestroyTheContextThatGivesTheLock
     EXPECT_EQ(reboot.getNumberOfLocks(), 0);
 }
 
+TEST_F(HostileCallbacks, ACallAcquiredWhileTheLockIsBeingTakenLeavesNoSecondLock)
+{
+    FakeRebootMgmt reboot;
+    CC_Call* inside = nullptr;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        inside = CallControl::ACQUIRE_CALL("SWITCH");
+    };
+    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_NE(call, nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", inside);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", call);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, ACallAcquiredAtTheEndOfTheLastOneLeavesNoSecondLock)
+{
+    FakeRebootMgmt reboot;
+    RecordingCallObserver observer("observer");
+    CC_Call* const last = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_EQ(last->addCallObserver(&observer), XCode::OK);
+    CC_Call* next = nullptr;
+    observer.m_onEnded = [&](CC_EvCallObservationEnded const&) { next = CallControl::ACQUIRE_CALL("SWITCH"); };
+    pool().releaseCall(last);
+    ASSERT_NE(next, nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", next);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, TheLockIsGivenBackOnceThoughTheLastCallEndsInsideTheEndOfAnother)
+{
+    FakeRebootMgmt reboot;
+    RecordingCallObserver observer("observer");
+    CC_Call* const first = CallControl::ACQUIRE_CALL("SWITCH");
+    CC_Call* const last = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_EQ(first->addCallObserver(&observer), XCode::OK);
+    observer.m_onEnded = [&](CC_EvCallObservationEnded const&) { pool().releaseCall(last); };
+    pool().releaseCall(first);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
 TEST_F(HostileCallbacks, ACallGivenBackToAnotherContextIsListedNowhereAndNoLockStays)
 {
     FakeRebootMgmt reboot;

@@ -38,8 +38,7 @@ Report& SHARED_REPORT()
 {
     static Report* const report = []
     {
-        void* const memory =
-            mmap(nullptr, sizeof(Report), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+        void* const memory = mmap(nullptr, sizeof(Report), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
         if (memory == MAP_FAILED)
             std::abort();
         return new (memory) Report{};
@@ -50,8 +49,8 @@ Report& SHARED_REPORT()
 Ended ENDED(int status)
 {
     if (WIFSIGNALED(status))
-        return {true, WTERMSIG(status) == SIGALRM ? "it hangs"
-                                                  : std::string("it crashes: ") + strsignal(WTERMSIG(status))};
+        return {true,
+                WTERMSIG(status) == SIGALRM ? "it hangs" : std::string("it crashes: ") + strsignal(WTERMSIG(status))};
     if (WEXITSTATUS(status) == 0)
         return {};
     char const* const failure = SHARED_REPORT().failure;

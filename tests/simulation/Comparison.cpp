@@ -258,8 +258,8 @@ void Comparison::compareStatistics()
 {
     auto const calls = static_cast<unsigned int>(std::count_if(m_model.m_calls.begin(), m_model.m_calls.end(),
                                                                [](Model::Call const& call) { return call.isAlive; }));
-    auto const legs = static_cast<unsigned int>(std::count_if(m_model.m_legs.begin(), m_model.m_legs.end(),
-                                                              [](Model::Leg const& leg) { return leg.isAlive; }));
+    auto const legs = static_cast<unsigned int>(
+        std::count_if(m_model.m_legs.begin(), m_model.m_legs.end(), [](Model::Leg const& leg) { return leg.isAlive; }));
     if (CC_Call::s_numberOfInstances - m_callsBefore != calls)
         differ(std::to_string(CC_Call::s_numberOfInstances - m_callsBefore) + " calls are alive, not " +
                std::to_string(calls));

@@ -9,13 +9,13 @@ struct FilterRule
 {
     enum What : unsigned char
     {
-        RENAME,   // sets Name to a text
-        DROP,     // removes a property
-        DERIVE,   // Display becomes what Name is, if that is a text
+        RENAME,    // sets Name to a text
+        DROP,      // removes a property
+        DERIVE,    // Display becomes what Name is, if that is a text
         TRANSLATE, // replaces a number that is there
-        FAIL,     // changes nothing and says so
-        ADD,      // sets a property
-        THROW,    // as one that lacks memory
+        FAIL,      // changes nothing and says so
+        ADD,       // sets a property
+        THROW,     // as one that lacks memory
         NUMBER_OF_RULES
     };
 

@@ -88,7 +88,8 @@ void Interpreter::perform(Operation const& operation)
     case Code::ANSWER_MODE:
     {
         Module& module = m_world.module(operation[0]);
-        module.answerMode = static_cast<AnswerMode>(operation[1] % static_cast<unsigned int>(AnswerMode::NUMBER_OF_MODES));
+        module.answerMode =
+            static_cast<AnswerMode>(operation[1] % static_cast<unsigned int>(AnswerMode::NUMBER_OF_MODES));
         module.cause = operation[2] % 128;
         break;
     }
@@ -108,7 +109,8 @@ void Interpreter::perform(Operation const& operation)
         if (adapter != nullptr)
         {
             Memory::Library const library;
-            adapter->drop(operation[1] == 0 ? QCause::UNSPECIFIED : static_cast<QCause>(operation[1] % 128), operation[2]);
+            adapter->drop(operation[1] == 0 ? QCause::UNSPECIFIED : static_cast<QCause>(operation[1] % 128),
+                          operation[2]);
         }
         break;
     case Code::CLEANUP:
@@ -252,7 +254,8 @@ void Interpreter::perform(Operation const& operation)
     case Code::SET_DATAPATH:
         if (adapter != nullptr)
         {
-            TYPtr<MG_IContext> const given(operation[1] % 2 != 0 ? new MediaContext(++m_world.m_lastGivenMedia) : nullptr);
+            TYPtr<MG_IContext> const given(operation[1] % 2 != 0 ? new MediaContext(++m_world.m_lastGivenMedia)
+                                                                 : nullptr);
             Memory::Library const library;
             adapter->setDatapathContext(given.get());
         }
@@ -418,9 +421,8 @@ struct Setters
 
 Setters const& SETTERS_OF(Code code)
 {
-    static constexpr Setters OWN = {
-        {&CC_CallAdapter::setOwnProperty, &CC_CallAdapter::setOwnPropertyUnfiltered},
-        {&CC_CallAdapter::setOwnProperties, &CC_CallAdapter::setOwnPropertiesUnfiltered}};
+    static constexpr Setters OWN = {{&CC_CallAdapter::setOwnProperty, &CC_CallAdapter::setOwnPropertyUnfiltered},
+                                    {&CC_CallAdapter::setOwnProperties, &CC_CallAdapter::setOwnPropertiesUnfiltered}};
     static constexpr Setters PEER = {
         {&CC_CallAdapter::setPeerProperty, &CC_CallAdapter::setPeerPropertyUnfiltered},
         {&CC_CallAdapter::setPeerProperties, &CC_CallAdapter::setPeerPropertiesUnfiltered}};

@@ -7,8 +7,8 @@
 
 namespace Simulation
 {
-/// Carries operations out on a world. Whatever one of them means that is not there, or must not be done where it stands,
-/// it leaves out.
+/// Carries operations out on a world. Whatever one of them means that is not there, or must not be done where it
+/// stands, it leaves out.
 class Interpreter
 {
 public:

@@ -34,7 +34,8 @@ void Interpreter::newLeg(Operation const& operation)
     std::ignore = made->setName("guest");
     std::ignore = made->setProperty(CC_PropertyUnsigned(CC_PropertyId::CALL_LEG_ID, operation[1] % 32));
     if (operation[3] % 2 != 0)
-        std::ignore = made->setProperty(CC_PropertyString(CC_PropertyId::NETWORK, operation[3] % 4 == 1 ? "shared" : "x"));
+        std::ignore =
+            made->setProperty(CC_PropertyString(CC_PropertyId::NETWORK, operation[3] % 4 == 1 ? "shared" : "x"));
     Values::WITH(Values::MAKE_STATE(static_cast<int>(operation[2] % 9) - 2),
                  [&](CC_Property const& state) { std::ignore = made->setProperty(state); });
 }

@@ -125,8 +125,8 @@ void Interpreter::observeOther(Operation const& operation, Guest& guest, int cha
 
 // --- disturbance -----------------------------------------------------------------------------------------------------
 
-/// Other threads may read the statistics, and give a reference on a leg up that is not the last. Joined at once, so that
-/// nothing depends on when they run.
+/// Other threads may read the statistics, and give a reference on a leg up that is not the last. Joined at once, so
+/// that nothing depends on when they run.
 void Interpreter::otherThread(Operation const& operation)
 {
     CC_CallLeg* const leg = m_world.leg(operation[1]);
@@ -163,10 +163,9 @@ void Interpreter::dump(Operation const& operation)
 void Interpreter::read(Operation const& operation)
 {
     using Read = XCode (CC_CallAdapter::*)(CC_PropertyContainer&, unsigned int) const;
-    static constexpr Read READS[] = {
-        &CC_CallAdapter::getOwnProperties,  &CC_CallAdapter::getOwnPropertiesUnfiltered,
-        &CC_CallAdapter::getPeerProperties, &CC_CallAdapter::getPeerPropertiesUnfiltered,
-        &CC_CallAdapter::getCallProperties, &CC_CallAdapter::getCallPropertiesUnfiltered};
+    static constexpr Read READS[] = {&CC_CallAdapter::getOwnProperties,  &CC_CallAdapter::getOwnPropertiesUnfiltered,
+                                     &CC_CallAdapter::getPeerProperties, &CC_CallAdapter::getPeerPropertiesUnfiltered,
+                                     &CC_CallAdapter::getCallProperties, &CC_CallAdapter::getCallPropertiesUnfiltered};
     static constexpr unsigned int MASKS[] = {0xff00, 0x100, 0x200, 0x400, 0x800, 0x1000, 0x8000};
     CC_CallAdapter const* const adapter = m_world.line(operation[0]).adapter.get();
     if (adapter == nullptr)

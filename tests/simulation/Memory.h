@@ -42,7 +42,8 @@ public:
     static bool HAS_FAILED() { return s_hasFailed; }
     /// Blocks in use.
     static long NUMBER_OF_BLOCKS() { return s_blocks; }
-    /// What was wrong with a block, null if nothing was; for who looks after it. A fault is fatal unless told otherwise.
+    /// What was wrong with a block, null if nothing was; for who looks after it. A fault is fatal unless told
+    /// otherwise.
     static void CHECK_KEPT_BLOCKS();
 
 private:

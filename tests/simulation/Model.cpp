@@ -1,7 +1,7 @@
 #include "tests/simulation/Model.h"
 
-#include "properties/CC_PropertyId.h"
 #include "platform/base/XCode.h"
+#include "properties/CC_PropertyId.h"
 
 #include <algorithm>
 

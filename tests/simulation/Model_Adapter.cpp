@@ -87,10 +87,9 @@ unsigned int Model::writeOne(int adapter, Target target, Property const& propert
 unsigned int Model::write(int index, Target target, Container const& written, bool isOne, bool isFiltered)
 {
     Adapter& adapter = m_adapters[AT(index)];
-    bool const isThere = target == Target::PEER ? adapter.peer != NOBODY
-                         : target == Target::OWN
-                             ? adapter.own != NOBODY
-                             : adapter.own != NOBODY && m_legs[AT(adapter.own)].call != NOBODY;
+    bool const isThere = target == Target::PEER  ? adapter.peer != NOBODY
+                         : target == Target::OWN ? adapter.own != NOBODY
+                                                 : adapter.own != NOBODY && m_legs[AT(adapter.own)].call != NOBODY;
     if (!isThere)
         return ABSENT;
     if (target == Target::PEER && written.find(STATE) != nullptr)
@@ -309,8 +308,7 @@ bool Model::startOwnLeg(int index, Container& properties, int state)
     if (properties.find(NETWORK) == nullptr)
     {
         bool const isShared = (m_first[2] >> static_cast<unsigned int>(adapter.module) % 8 & 1) != 0;
-        properties.set(
-            Values::MAKE_TEXT(NETWORK, isShared ? "shared" : "net-" + std::to_string(adapter.module)));
+        properties.set(Values::MAKE_TEXT(NETWORK, isShared ? "shared" : "net-" + std::to_string(adapter.module)));
     }
     if (write(index, Target::OWN, properties, false, true) != OK)
         return false;
@@ -462,16 +460,15 @@ unsigned int Model::offer(unsigned int number, int call)
     }
     unsigned int result = FAILURE;
     if (int const adapter = module.adapters[line]; adapter != NOBODY)
-        result = accept(adapter, call, CONTAINER({Values::MAKE_NUMBER(CALL_LEG_ID, Kind::UNSIGNED,
-                                                                      10 + number * 2 + line)}));
+        result = accept(adapter, call,
+                        CONTAINER({Values::MAKE_NUMBER(CALL_LEG_ID, Kind::UNSIGNED, 10 + number * 2 + line)}));
     return module.answerMode == 7 ? REFUSED : result;
 }
 
 void Model::reject(unsigned int module, int call, unsigned int cause)
 {
     int const adapter = newAdapter(NOBODY, static_cast<int>(module));
-    std::ignore = accept(adapter, call,
-                         CONTAINER({Values::MAKE_NUMBER(CALL_LEG_ID, Kind::UNSIGNED, 10 + 0xff)}));
+    std::ignore = accept(adapter, call, CONTAINER({Values::MAKE_NUMBER(CALL_LEG_ID, Kind::UNSIGNED, 10 + 0xff)}));
     drop(adapter, static_cast<int>(cause), 0);
     m_adapters[AT(adapter)].isAlive = false;
 }

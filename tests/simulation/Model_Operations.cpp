@@ -328,18 +328,16 @@ unsigned int Model::dialE164(int adapter, Operation const& operation, Container 
     unsigned int const called = operation[1] % static_cast<unsigned int>(m_modules.size() + 1);
     std::string const number = Values::TEXT(operation[6]);
     bool const isComplete = operation[5] % 8 == 5;
-    Container ownAll = CONTAINER({Values::MAKE_TEXT(E164_NUMBER, "100"),
-                                  Values::MAKE_NUMBER(TYPE_OF_NUMBER, Kind::TYPE_OF_NUMBER, 2),
-                                  Values::MAKE_NUMBER(NUMBERING_PLAN, Kind::NUMBERING_PLAN, 1),
-                                  Values::MAKE_NUMBER(PRESENTATION_INDICATOR, Kind::PRESENTATION, 0),
-                                  Values::MAKE_NUMBER(SCREENING_INDICATOR, Kind::SCREENING, 3),
-                                  Values::MAKE_TEXT(NAME, "Ada"),
-                                  Values::MAKE_NUMBER(SUPPORTS_OVERLAP_SENDING, Kind::BOOLEAN, isComplete ? 0 : 1)});
+    Container ownAll =
+        CONTAINER({Values::MAKE_TEXT(E164_NUMBER, "100"), Values::MAKE_NUMBER(TYPE_OF_NUMBER, Kind::TYPE_OF_NUMBER, 2),
+                   Values::MAKE_NUMBER(NUMBERING_PLAN, Kind::NUMBERING_PLAN, 1),
+                   Values::MAKE_NUMBER(PRESENTATION_INDICATOR, Kind::PRESENTATION, 0),
+                   Values::MAKE_NUMBER(SCREENING_INDICATOR, Kind::SCREENING, 3), Values::MAKE_TEXT(NAME, "Ada"),
+                   Values::MAKE_NUMBER(SUPPORTS_OVERLAP_SENDING, Kind::BOOLEAN, isComplete ? 0 : 1)});
     ownAll.setAllOfGroups(own);
-    Container offeredAll = CONTAINER({Values::MAKE_TEXT(E164_NUMBER, number),
-                                      Values::MAKE_NUMBER(TYPE_OF_NUMBER, Kind::TYPE_OF_NUMBER, 0),
-                                      Values::MAKE_NUMBER(NUMBERING_PLAN, Kind::NUMBERING_PLAN, 1),
-                                      Values::MAKE_TEXT(NAME, "")});
+    Container offeredAll =
+        CONTAINER({Values::MAKE_TEXT(E164_NUMBER, number), Values::MAKE_NUMBER(TYPE_OF_NUMBER, Kind::TYPE_OF_NUMBER, 0),
+                   Values::MAKE_NUMBER(NUMBERING_PLAN, Kind::NUMBERING_PLAN, 1), Values::MAKE_TEXT(NAME, "")});
     offeredAll.setAllOfGroups(offered);
     Context const& context = m_contexts[operation[2] % 3];
     Container all = CONTAINER({Values::MAKE_NUMBER(INFORMATION_TRANSFER_CAPABILITY, Kind::TRANSFER_CAPABILITY, 0),

@@ -8,7 +8,8 @@
 
 namespace Simulation
 {
-/// What can be done to call control and by its users. The numbers are what a file of octets holds: append, never insert.
+/// What can be done to call control and by its users. The numbers are what a file of octets holds: append, never
+/// insert.
 enum class Code : std::uint8_t
 {
     WORLD, // only as the first operation; elsewhere it does nothing

@@ -233,8 +233,7 @@ XCode Endpoint::handleOffer(CC_Call& call, String const&, CC_PropertyContainer c
 }
 
 Module::Module(World& world, unsigned int number)
-    : index(number)
-    , lines{{world, number * World::LINES_OF_A_MODULE}, {world, number * World::LINES_OF_A_MODULE + 1}}
+    : index(number), lines{{world, number * World::LINES_OF_A_MODULE}, {world, number * World::LINES_OF_A_MODULE + 1}}
 {
 }
 

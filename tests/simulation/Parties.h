@@ -20,8 +20,8 @@
 #include <memory>
 #include <utility>
 
-// Those who take part in a run: each calls out to the world whenever the library calls it, and the world may do anything
-// there. So whatever such an operation needs after that it has taken to its stack before.
+// Those who take part in a run: each calls out to the world whenever the library calls it, and the world may do
+// anything there. So whatever such an operation needs after that it has taken to its stack before.
 
 namespace Simulation
 {

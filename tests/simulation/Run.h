@@ -10,7 +10,7 @@ namespace Simulation
 /// How a run went.
 struct Outcome
 {
-    std::string failure;           // empty: none
+    std::string failure;          // empty: none
     unsigned long operations = 0; // carried out, the nested ones included
     bool hasFailed() const { return !failure.empty(); }
 };

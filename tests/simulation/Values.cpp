@@ -89,9 +89,18 @@ constexpr Row ROWS[] = {
     {OF_NO_GROUP, Kind::UNSIGNED},
 };
 
-constexpr char const* TEXTS[Values::NUMBER_OF_TEXTS] = {
-    "", "1", "23", "4989123", "Ada", "net-a", "net-b", "bert", "x", "0800", "a text that is longer than any small buffer",
-    "*7"};
+constexpr char const* TEXTS[Values::NUMBER_OF_TEXTS] = {"",
+                                                        "1",
+                                                        "23",
+                                                        "4989123",
+                                                        "Ada",
+                                                        "net-a",
+                                                        "net-b",
+                                                        "bert",
+                                                        "x",
+                                                        "0800",
+                                                        "a text that is longer than any small buffer",
+                                                        "*7"};
 
 constexpr unsigned long long NUMBERS[] = {0, 1, 2, 5, 7, 0xffffffff, 0x100000000};
 
@@ -140,8 +149,8 @@ std::unique_ptr<CC_Property> MAKE(unsigned int id, Kind kind, unsigned int varia
     case Kind::PARAMETRIZED:
         return std::make_unique<CC_PropertyParametrizedString>(id, String(TEXTS[variant * 5]));
     case Kind::CODEC:
-        return std::make_unique<CC_PropertyCodec>(
-            id, variant == 0 ? VoipCodecAndMode() : VoipCodecAndMode(CODEC_OF(variant)));
+        return std::make_unique<CC_PropertyCodec>(id, variant == 0 ? VoipCodecAndMode()
+                                                                   : VoipCodecAndMode(CODEC_OF(variant)));
     case Kind::CODECS:
         return std::make_unique<CC_PropertyCodecs>(id);
     case Kind::TARIFF:
@@ -299,10 +308,7 @@ Properties Values::CHOOSE_SEVERAL(unsigned int seed)
 
 char const* Values::TEXT(unsigned int number) { return TEXTS[number % NUMBER_OF_TEXTS]; }
 
-Property Values::MAKE_STATE(int state)
-{
-    return {STATE, {Kind::STATE, static_cast<unsigned long long>(state + 2)}};
-}
+Property Values::MAKE_STATE(int state) { return {STATE, {Kind::STATE, static_cast<unsigned long long>(state + 2)}}; }
 
 Property Values::MAKE_CAUSE(int cause, unsigned int sipCode)
 {

@@ -142,9 +142,11 @@ void World::makeModule(unsigned int index)
         made.endpoint->setOutputFilterContainer(nullptr);
     }
     for (unsigned int i = 0; i < LINES_OF_A_MODULE; ++i)
-        makeAdapter(made.index * LINES_OF_A_MODULE + i, (m_first[1] >> made.index % 8 & 1) + 2 * (m_first[3] >> made.index % 8 & 1));
+        makeAdapter(made.index * LINES_OF_A_MODULE + i,
+                    (m_first[1] >> made.index % 8 & 1) + 2 * (m_first[3] >> made.index % 8 & 1));
     Memory::Library const library;
-    std::ignore = CallControl::ADD_PROVIDER(CONTEXT_NAME(0), ("p" + std::to_string(made.index)).c_str(), *made.provider);
+    std::ignore =
+        CallControl::ADD_PROVIDER(CONTEXT_NAME(0), ("p" + std::to_string(made.index)).c_str(), *made.provider);
 }
 
 void World::destroyModule(unsigned int index)
@@ -184,9 +186,8 @@ void World::makeAdapter(unsigned int number, unsigned int kind)
     made.isOverriding = (kind & 2) != 0;
     if ((kind & 1) != 0)
     {
-        auto adapter = made.isOverriding
-                           ? std::make_unique<Overriding<CC_CallAdapterE164>>(*this, lineNumber(number))
-                           : std::unique_ptr<CC_CallAdapterE164>(std::make_unique<CC_CallAdapterE164>());
+        auto adapter = made.isOverriding ? std::make_unique<Overriding<CC_CallAdapterE164>>(*this, lineNumber(number))
+                                         : std::unique_ptr<CC_CallAdapterE164>(std::make_unique<CC_CallAdapterE164>());
         made.e164 = adapter.get();
         made.adapter = std::move(adapter);
     }

@@ -69,10 +69,7 @@ public:
     unsigned int getNumberOfModules() const { return static_cast<unsigned int>(m_modules.size()); }
     Module& module(unsigned int index) { return *m_modules[index % m_modules.size()]; }
     Line& line(unsigned int index);
-    unsigned int lineNumber(unsigned int index) const
-    {
-        return index % (getNumberOfModules() * LINES_OF_A_MODULE);
-    }
+    unsigned int lineNumber(unsigned int index) const { return index % (getNumberOfModules() * LINES_OF_A_MODULE); }
     CC_CallLeg*& leg(unsigned int index) { return m_legs[index % NUMBER_OF_LEGS]; }
     Guest& guest(unsigned int index) { return *m_guests[index % NUMBER_OF_GUESTS]; }
     /// A call that is certainly alive, or null.
@@ -113,7 +110,7 @@ public:
     bool m_wasShortOfMemory = false;
     bool m_isTurning = false;
     unsigned int m_lastGivenMedia = 1000; // ids of media contexts that operations bring along
-    unsigned long long m_added = 0; // of the statistics, at the beginning
+    unsigned long long m_added = 0;       // of the statistics, at the beginning
     unsigned long long m_removed = 0;
 
 private:
