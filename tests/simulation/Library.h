@@ -17,11 +17,13 @@ inline CC_PropertyContainer& PROPERTIES_TO_WRITE(CC_CallLeg& leg)
 }
 
 #ifdef SIMULATION_OLD_LIBRARY
+inline void FIX_STATE(CC_CallLeg&) {}
 inline constexpr bool CAN_BE_COMPARED = false;
 inline constexpr bool MAY_FILTERS_KEEP_CALLS = true;
 inline CC_CallLeg const* OWN_LEG(CC_CallAdapter const&) { return nullptr; }
 inline CC_CallLeg const* PEER_LEG(CC_CallAdapter const&) { return nullptr; }
 #else
+inline void FIX_STATE(CC_CallLeg& leg) { leg.fixState(); }
 inline constexpr bool CAN_BE_COMPARED = true;
 inline constexpr bool MAY_FILTERS_KEEP_CALLS = false; // an input filter that hides RELEASED from the leg
 inline CC_CallLeg const* OWN_LEG(CC_CallAdapter const& adapter) { return adapter.getOwnCallLeg(); }

@@ -199,6 +199,7 @@ unsigned int Model::carryOut(Operation const& operation)
         if (guestLeg != NOBODY)
         {
             m_guestLegs[a % m_guestLegs.size()] = NOBODY;
+            m_legs[AT(guestLeg)].isFixed = true;
             setOnLeg(guestLeg, Values::MAKE_STATE(-1));
             removeReference(guestLeg);
         }

@@ -3,6 +3,7 @@
 #include "callcontrol/CC_CallPool.h"
 #include "calls/CC_CallLeg.h"
 #include "properties/CC_PropertyId.h"
+#include "tests/simulation/Library.h"
 
 #include <algorithm>
 
@@ -206,6 +207,7 @@ void World::giveUpLeg(unsigned int index)
     CC_CallLeg* const given = std::exchange(leg(index), nullptr);
     if (given == nullptr)
         return;
+    FIX_STATE(*given);
     Values::WITH(Values::MAKE_STATE(-1),
                  [&](CC_Property const& released)
                  {
