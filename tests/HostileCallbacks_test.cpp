@@ -2,6 +2,7 @@
 // memory or left something behind for ever.
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
+#include "calls/CC_Monitor.h"
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "testing/FakeRebootMgmt.h"
@@ -302,6 +303,31 @@ TEST_F(HostileCallbacks, ADroppedLegIsReleasedThoughItsOwnModuleWritesAnotherSta
     settle();
     EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 0u);
     EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, ALegThatIsDroppedWhileItsNewStateIsLoggedStaysReleased)
+{
+    struct Dropping : RTD::Writer
+    {
+        explicit Dropping(Party& module) : party(module) { RTD::REPOSITORY::SET_WRITER(this); }
+        ~Dropping() override { RTD::REPOSITORY::SET_WRITER(nullptr); }
+        void write(unsigned int, unsigned int, char const*) override
+        {
+            RTD::REPOSITORY::ENABLE(CC_Monitor::ID, RTD::LEVEL_OFF);
+            party.hangUp();
+        }
+        Party& party;
+    };
+    Party anna("anna"), bert("bert");
+    connect(anna, bert);
+    CC_CallLeg& leg = *anna.getCall()->getCallLeg(0);
+    leg.addReference();
+    Dropping writer(anna);
+    RTD::REPOSITORY::ENABLE(CC_Monitor::ID, RTD::LEVEL_CHANGE);
+    EXPECT_EQ(anna.become(State::HELD), XCode::OK) << "left out";
+    EXPECT_EQ(leg.getState(), State::RELEASED);
+    leg.removeReference();
+    expectNothingLeft({&anna, &bert});
 }
 
 TEST_F(HostileCallbacks, ADroppedLegIsReleasedThoughAPeerWritesItsStaleViewBack)
