@@ -232,7 +232,8 @@ void Interpreter::perform(Operation const& operation)
         m_world.m_reboot.m_isRefusing = operation[0] % 2 != 0;
         break;
     case Code::LOG_LEVEL:
-        RTD::REPOSITORY::ENABLE(CC_Monitor::ID, operation[0] % 6);
+        m_world.m_logLevel = operation[0] % 6;
+        RTD::REPOSITORY::ENABLE(CC_Monitor::ID, m_world.m_logLevel);
         break;
     case Code::DUMP:
         dump(operation);

@@ -146,7 +146,8 @@ Endpoint::Endpoint(World& world, unsigned int module, CC_PropertyFilterContainer
 String const& Endpoint::getName() const
 {
     Pin const pin(m_world.module(m_module));
-    World::CALL_OUT(CallOut::ENDPOINT_NAME);
+    if (m_world.m_logLevel == RTD::LEVEL_OFF) // lines that name an adapter do not expect it to go in the middle
+        World::CALL_OUT(CallOut::ENDPOINT_NAME);
     return m_name;
 }
 
