@@ -1,5 +1,6 @@
 // What calls back besides observers: the media layer, the reboot management, filters. Each of these once touched freed
 // memory or left something behind for ever.
+#include "adapters/CC_CallAdapterE164.h"
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
 #include "calls/CC_Monitor.h"
@@ -368,6 +369,30 @@ TEST_F(HostileCallbacks, TheMediaLayerMayDestroyTheAdapterThatAsksItForAContext)
     anna.adapter->setDatapathContext(nullptr);
     EXPECT_EQ(anna.adapter, nullptr);
     EXPECT_EQ(bert.peerState(), "RELEASED");
+    expectNothingLeft({&anna, &bert});
+}
+
+TEST_F(HostileCallbacks, TheEndOfARememberedMediaContextMayDestroyTheAdapterThatDialsAnew)
+{
+    struct Ending : MG_IContext
+    {
+        explicit Ending(std::function<void()> deed) : onEnd(std::move(deed)) {}
+        ~Ending() override { onEnd(); }
+        unsigned int getId() const override { return 1; }
+        std::function<void()> onEnd;
+    };
+    Party anna("anna"), bert("bert");
+    anna.adapter = std::make_unique<CC_CallAdapterE164>();
+    anna.setup();
+    {
+        TYPtr<MG_IContext> const context(new Ending([&] { anna.adapter.reset(); }));
+        ASSERT_EQ(anna.adapter->dial("SWITCH", "bert", "1", {}, {}, {}, context.get()), XCode::OK);
+        anna.hangUp();
+        bert.hangUp();
+        settle();
+    }
+    EXPECT_EQ(anna.dial(bert), XCode::FAILURE);
+    EXPECT_EQ(anna.adapter, nullptr);
     expectNothingLeft({&anna, &bert});
 }
 
