@@ -1,7 +1,9 @@
 // What calls back besides observers: the media layer, the reboot management, filters. Each of these once touched freed
 // memory or left something behind for ever.
+#include "adapters/CC_CallAdapterE164.h"
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
+#include "calls/CC_Monitor.h"
 #include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "testing/FakeRebootMgmt.h"
@@ -153,6 +155,51 @@ TEST_F(HostileCallbacks, TheRebootManagementMayDestroyTheContextThatGivesTheLock
     EXPECT_EQ(reboot.getNumberOfLocks(), 0);
 }
 
+TEST_F(HostileCallbacks, ACallAcquiredWhileTheLockIsBeingTakenLeavesNoSecondLock)
+{
+    FakeRebootMgmt reboot;
+    CC_Call* inside = nullptr;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        inside = CallControl::ACQUIRE_CALL("SWITCH");
+    };
+    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_NE(call, nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", inside);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", call);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, ACallAcquiredAtTheEndOfTheLastOneLeavesNoSecondLock)
+{
+    FakeRebootMgmt reboot;
+    RecordingCallObserver observer("observer");
+    CC_Call* const last = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_EQ(last->addCallObserver(&observer), XCode::OK);
+    CC_Call* next = nullptr;
+    observer.m_onEnded = [&](CC_EvCallObservationEnded const&) { next = CallControl::ACQUIRE_CALL("SWITCH"); };
+    pool().releaseCall(last);
+    ASSERT_NE(next, nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1);
+    CallControl::RELEASE_CALL("SWITCH", next);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, TheLockIsGivenBackOnceThoughTheLastCallEndsInsideTheEndOfAnother)
+{
+    FakeRebootMgmt reboot;
+    RecordingCallObserver observer("observer");
+    CC_Call* const first = CallControl::ACQUIRE_CALL("SWITCH");
+    CC_Call* const last = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_EQ(first->addCallObserver(&observer), XCode::OK);
+    observer.m_onEnded = [&](CC_EvCallObservationEnded const&) { pool().releaseCall(last); };
+    pool().releaseCall(first);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
 TEST_F(HostileCallbacks, ACallGivenBackToAnotherContextIsListedNowhereAndNoLockStays)
 {
     FakeRebootMgmt reboot;
@@ -259,6 +306,31 @@ TEST_F(HostileCallbacks, ADroppedLegIsReleasedThoughItsOwnModuleWritesAnotherSta
     EXPECT_EQ(reboot.getNumberOfLocks(), 0);
 }
 
+TEST_F(HostileCallbacks, ALegThatIsDroppedWhileItsNewStateIsLoggedStaysReleased)
+{
+    struct Dropping : RTD::Writer
+    {
+        explicit Dropping(Party& module) : party(module) { RTD::REPOSITORY::SET_WRITER(this); }
+        ~Dropping() override { RTD::REPOSITORY::SET_WRITER(nullptr); }
+        void write(unsigned int, unsigned int, char const*) override
+        {
+            RTD::REPOSITORY::ENABLE(CC_Monitor::ID, RTD::LEVEL_OFF);
+            party.hangUp();
+        }
+        Party& party;
+    };
+    Party anna("anna"), bert("bert");
+    connect(anna, bert);
+    CC_CallLeg& leg = *anna.getCall()->getCallLeg(0);
+    leg.addReference();
+    Dropping writer(anna);
+    RTD::REPOSITORY::ENABLE(CC_Monitor::ID, RTD::LEVEL_CHANGE);
+    EXPECT_EQ(anna.become(State::HELD), XCode::OK) << "left out";
+    EXPECT_EQ(leg.getState(), State::RELEASED);
+    leg.removeReference();
+    expectNothingLeft({&anna, &bert});
+}
+
 TEST_F(HostileCallbacks, ADroppedLegIsReleasedThoughAPeerWritesItsStaleViewBack)
 {
     FakeRebootMgmt reboot;
@@ -297,6 +369,30 @@ TEST_F(HostileCallbacks, TheMediaLayerMayDestroyTheAdapterThatAsksItForAContext)
     anna.adapter->setDatapathContext(nullptr);
     EXPECT_EQ(anna.adapter, nullptr);
     EXPECT_EQ(bert.peerState(), "RELEASED");
+    expectNothingLeft({&anna, &bert});
+}
+
+TEST_F(HostileCallbacks, TheEndOfARememberedMediaContextMayDestroyTheAdapterThatDialsAnew)
+{
+    struct Ending : MG_IContext
+    {
+        explicit Ending(std::function<void()> deed) : onEnd(std::move(deed)) {}
+        ~Ending() override { onEnd(); }
+        unsigned int getId() const override { return 1; }
+        std::function<void()> onEnd;
+    };
+    Party anna("anna"), bert("bert");
+    anna.adapter = std::make_unique<CC_CallAdapterE164>();
+    anna.setup();
+    {
+        TYPtr<MG_IContext> const context(new Ending([&] { anna.adapter.reset(); }));
+        ASSERT_EQ(anna.adapter->dial("SWITCH", "bert", "1", {}, {}, {}, context.get()), XCode::OK);
+        anna.hangUp();
+        bert.hangUp();
+        settle();
+    }
+    EXPECT_EQ(anna.dial(bert), XCode::FAILURE);
+    EXPECT_EQ(anna.adapter, nullptr);
     expectNothingLeft({&anna, &bert});
 }
 

@@ -343,6 +343,20 @@ TEST_F(HostileProperties, AnEndingPropertyMayDialAnewWithoutLosingTheNewCallsPro
     }
 }
 
+TEST_F(HostileProperties, APropertyMayDialWithTheAdapterThatCopiesItForADial)
+{
+    Party anna("anna"), bert("bert"), carl("carl");
+    CC_PropertyContainer own;
+    ASSERT_EQ(own.set(acting(1)), XCode::OK);
+    XCode inside = XCode::FAILURE;
+    deeds->onClone = [&] { inside = anna.dial(carl); };
+    EXPECT_EQ(anna.dial(bert, own), XCode::REFUSED);
+    EXPECT_EQ(inside, XCode::OK);
+    EXPECT_NE(carl.getCall(), nullptr);
+    EXPECT_EQ(anna.getCall(), carl.getCall()) << "the refused dial has dropped nothing";
+    expectNothingLeft({&anna, &bert, &carl});
+}
+
 TEST_F(HostileProperties, WhatAPropertyWritesInsideADialIsNotThereTwice)
 {
     Party anna("anna"), bert("bert");

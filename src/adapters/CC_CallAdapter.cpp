@@ -101,7 +101,11 @@ char const* CC_CallAdapter::getEndpointName() const
     return m_endpoint != nullptr ? m_endpoint->getName().c_str() : "";
 }
 
-String CC_CallAdapter::makeCallLegName() const { return m_endpoint->getName() + "/" + m_name; }
+String CC_CallAdapter::makeCallLegName() const
+{
+    String const name = String("/") += m_name; // first: the endpoint may destroy us when it is asked for its own
+    return m_endpoint->getName() + name;
+}
 
 String const& CC_CallAdapter::getCallLegName() const
 {

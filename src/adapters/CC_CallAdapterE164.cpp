@@ -159,6 +159,8 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
         if (!isWhole)
             return forgetLastDial();
         m_lastDial = last;
+        if (!self.isAlive()) // what the dial before has held is others' code, too, when it ends
+            return XCode::FAILURE;
     }
     return CC_CallAdapter::dial(contextName, providerName, destination, ownProperties, offerProperties, callProperties,
                                 datapathContext);
@@ -210,6 +212,8 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
     if (!self.isAlive()) // an extra property's clone is a module's code
         return XCode::FAILURE;
     m_lastDial = last;
+    if (!self.isAlive()) // nor the end of what the dial before has held
+        return XCode::FAILURE;
     return OK_OR_FAILURE(dial(last->contextName, last->providerName, last->destination, last->ownProperties,
                               last->offerProperties, last->callProperties, last->datapathContext.get()));
 }

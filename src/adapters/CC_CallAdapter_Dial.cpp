@@ -77,11 +77,12 @@ XCode CC_CallAdapter::dial(String const& contextName, String const& providerName
         result = attempt.fail(NO_MEMORY);
     }
     attempt.record(Kind::DIALLED, result);
-    if (!result.isOk() && !attempt.isOver())
+    if (!result.isOk() && result != XCode::REFUSED && !attempt.isOver())
         dropOwnCallLeg(QCause::NETWORK_OUT_OF_ORDER, 0);
     return result;
 }
 
+/// REFUSED: the leg, if there is one, is not of this attempt.
 XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerName, String const& destination,
                               CC_PropertyContainer const& ownProperties, CC_PropertyContainer const& offerProperties,
                               CC_PropertyContainer const& callProperties, MG_IContext* datapathContext)
@@ -97,7 +98,11 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
         return XCode::FAILURE;
     }
     CC_PropertyContainer own(ownProperties);
-    if (!attempt.survives(WHOLE(own, ownProperties), NO_MEMORY) || !attempt.survives(createEvents(), NO_MEMORY) ||
+    if (!attempt.survives(WHOLE(own, ownProperties), NO_MEMORY))
+        return XCode::FAILURE;
+    if (!isReady()) // a property's clone has begun an attempt of its own
+        return attempt.fail(whyNotReady(), XCode::REFUSED);
+    if (!attempt.survives(createEvents(), NO_MEMORY) ||
         !attempt.survives(setInitialProperties(own, CC_PropertyCallLegState::CONNECTED), NO_MEMORY) ||
         !attempt.survives(createOwnCallLeg(), NO_MEMORY) || !attempt.survives(startOwnCallLeg(own), LEG_TAKES_NOT_ALL))
         return XCode::FAILURE;

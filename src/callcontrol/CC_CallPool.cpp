@@ -71,7 +71,11 @@ CC_Call* CC_CallPool::acquireCall(MG_IContext* mgContext)
         return nullptr;
     CC_Call::Hold const keepCall(call);
     if (m_calls.isEmpty())
+    {
         addReloadGracefulLock(); // the reboot management may destroy us
+        if (self.isAlive() && !m_calls.isEmpty())
+            releaseReloadGracefulLock(); // a call that came inside has taken the pool's
+    }
     if (!self.isAlive() || !list(*call))
     {
         call->destroy();
@@ -109,29 +113,24 @@ void CC_CallPool::giveContext(CC_Call& call, MG_IContext* mgContext)
     std::ignore = call.setProperty(context); // without it: no media
 }
 
-/// The lock of a pool that a call is leaving: given back after the call's end, which may destroy the pool or bring it
-/// another call.
+/// The lock of a pool that its last call is leaving: given back after the call's end, which may destroy the pool, or
+/// bring it another call with a lock of its own.
 class CC_CallPool::Lock
 {
 public:
-    explicit Lock(CC_CallPool const& pool) : m_pool(pool), m_watch(pool.m_lifeline), m_wasLast(pool.m_calls.isEmpty())
+    explicit Lock(CC_CallPool const& pool)
     {
-        if (m_wasLast)
-            m_rebootMgmt.emplace(pool.m_rebootMgmt); // for a pool that its last call's end destroys
+        if (pool.m_calls.isEmpty())
+            m_rebootMgmt.emplace(pool.m_rebootMgmt);
     }
-    void giveBackIfUnused() const
+    void giveBack()
     {
-        if (m_watch.isAlive() && m_pool.m_calls.isEmpty())
-            RELEASE_LOCK(m_pool.m_rebootMgmt);
-        else if (!m_watch.isAlive() && m_wasLast)
+        if (m_rebootMgmt)
             RELEASE_LOCK(*m_rebootMgmt);
     }
 
 private:
-    CC_CallPool const& m_pool;
-    TYLifeline::Watch m_watch;
-    std::optional<TYPPtr<IRebootMgmt>> m_rebootMgmt;
-    bool m_wasLast;
+    std::optional<TYPPtr<IRebootMgmt>> m_rebootMgmt; // none if other calls stay: the last of them gives it back
 };
 
 void CC_CallPool::releaseCall(CC_Call* call)
@@ -142,18 +141,18 @@ void CC_CallPool::releaseCall(CC_Call* call)
     lister.unlist(*call);
     if (&lister == this)
         return end(*call);
-    Lock const ofTheLister(lister); // the call is another pool's
+    Lock ofTheLister(lister); // the call is another pool's
     end(*call);
-    ofTheLister.giveBackIfUnused();
+    ofTheLister.giveBack();
 }
 
 void CC_CallPool::end(CC_Call& call)
 {
-    Lock const lock(*this);
+    Lock lock(*this);
     RECORD(CC_RecordFormat::Kind::CALL_GIVEN_BACK, call.getSerial());
     s_statistics.onCallRemoved();
     call.destroy();
-    lock.giveBackIfUnused();
+    lock.giveBack();
 }
 
 /// Takes the call out of our list if it is there, in constant time.

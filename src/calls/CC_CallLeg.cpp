@@ -143,10 +143,16 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
     CC_Property* stored = m_properties.get(property.getId());
     if (stored != nullptr && stored->isEqual(property))
         return XCode::OK;
-    if (m_isStateFixed && property.getId() == CC_PropertyId::STATE && !IS_RELEASED(property))
+    auto const isLeftOut = [&]
+    { return m_isStateFixed && property.getId() == CC_PropertyId::STATE && !IS_RELEASED(property); };
+    if (isLeftOut())
         return XCode::OK;
     if (LOG_PROPERTY(m_name, property) || !m_properties.isSelfContained())
+    {
         stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
+        if (isLeftOut())
+            return XCode::OK; // let go meanwhile
+    }
     if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
         return XCode::REFUSED;
     XCode const replaced =

@@ -1,0 +1,175 @@
+#include "tests/simulation/Generator.h"
+
+#include "tests/simulation/CallOut.h"
+
+#include <iterator>
+
+namespace Simulation
+{
+namespace
+{
+/// Sebastiano Vigna's splitmix64: small, and the same everywhere.
+class Random
+{
+public:
+    explicit Random(std::uint64_t seed) : m_state(seed * 0x9e3779b97f4a7c15 + 0x1234567) {}
+    std::uint64_t next()
+    {
+        std::uint64_t z = (m_state += 0x9e3779b97f4a7c15);
+        z = (z ^ (z >> 30)) * 0xbf58476d1ce4e5b9;
+        z = (z ^ (z >> 27)) * 0x94d049bb133111eb;
+        return z ^ (z >> 31);
+    }
+    unsigned int below(unsigned int bound) { return static_cast<unsigned int>((next() >> 16) % bound); }
+    bool isOneIn(unsigned int number) { return below(number) == 0; }
+
+private:
+    std::uint64_t m_state;
+};
+
+struct Weight
+{
+    Code code;
+    unsigned int calm;
+    unsigned int hostile;
+};
+
+constexpr Weight WEIGHTS[] = {
+    {Code::TURN, 60, 50},
+    {Code::SETTLE, 30, 30},
+    {Code::ADVANCE_CLOCK, 6, 2},
+    {Code::DIAL, 80, 80},
+    {Code::ACCEPT, 24, 24},
+    {Code::REJECT, 6, 6},
+    {Code::ANSWER_MODE, 10, 8},
+    {Code::BECOME, 80, 60},
+    {Code::SET_OWN, 40, 40},
+    {Code::SET_PEER, 20, 20},
+    {Code::SET_CALL, 20, 20},
+    {Code::SERVICE, 24, 16},
+    {Code::TRANSFER, 24, 24},
+    {Code::DROP, 50, 40},
+    {Code::CLEANUP, 4, 6},
+    {Code::SETUP, 8, 8},
+    {Code::DESTROY_ADAPTER, 4, 8},
+    {Code::MAKE_ADAPTER, 8, 14},
+    {Code::ACQUIRE, 6, 6},
+    {Code::RELEASE, 4, 6},
+    {Code::DROP_CALLS, 3, 4},
+    {Code::NEW_LEG, 16, 16},
+    {Code::ADD_LEG, 16, 16},
+    {Code::MOVE_LEG, 10, 10},
+    {Code::REMOVE_LEG, 6, 6},
+    {Code::SET_LEG, 24, 20},
+    {Code::GIVE_UP_LEG, 10, 10},
+    {Code::LEG_SERVICE, 4, 4},
+    {Code::SET_ON_CALL, 8, 8},
+    {Code::EMPTY_CALL, 2, 3},
+    {Code::CLEAN_UP_CALL, 3, 5},
+    {Code::CREATE_CONTEXT, 4, 5},
+    {Code::DESTROY_CONTEXT, 2, 3},
+    {Code::ADD_PROVIDER, 6, 6},
+    {Code::REMOVE_PROVIDER, 3, 3},
+    {Code::DESTROY_MODULE, 2, 3},
+    {Code::MAKE_MODULE, 4, 6},
+    {Code::CHANGE_FILTERS, 14, 14},
+    {Code::USE_FILTERS, 8, 6},
+    {Code::OBSERVE, 24, 40},
+    {Code::STOP_OBSERVING, 8, 8},
+    {Code::WHEN, 0, 80},
+    {Code::FAIL_ALLOCATION, 0, 0}, // in runs of their own
+    {Code::OTHER_THREAD, 1, 1},
+    {Code::MEDIA_MODE, 2, 2},
+    {Code::REBOOT_MODE, 1, 1},
+    {Code::LOG_LEVEL, 2, 4},
+    {Code::DUMP, 2, 3},
+    {Code::READ, 6, 8},
+    {Code::RESET_STATISTICS, 1, 1},
+    {Code::SET_NAME, 2, 2},
+    {Code::SET_DATAPATH, 4, 6},
+    {Code::OFFER, 6, 6},
+    {Code::ANSWER_HELD, 8, 8},
+    {Code::NEW_CALL, 3, 3},
+    {Code::CHANGE_UNTOLD, 4, 4},
+    {Code::ACCESSOR, 10, 6},
+    {Code::KEEP_BLOCKS, 1, 0},
+    {Code::SET_OPTIONS, 1, 1},
+};
+
+class Generator
+{
+public:
+    explicit Generator(std::uint64_t seed) : m_random(seed), m_isHostile(seed % 2 != 0), m_isShort(seed % 16 == 5) {}
+
+    Operations generate()
+    {
+        unsigned int const length = 20 + m_random.below(m_random.isOneIn(4) ? 400 : 120);
+        Operations operations{world()};
+        while (operations.size() < length)
+            operations.push_back(next());
+        return operations;
+    }
+
+private:
+    Operation world()
+    {
+        Operation operation = filled(Code::WORLD);
+        if (!m_random.isOneIn(6))
+            operation.arguments[0] = static_cast<std::uint8_t>(m_random.below(4)); // few, so that they meet
+        if (m_random.isOneIn(2))
+            operation.arguments[5] = 0; // without filters
+        return operation;
+    }
+    Operation filled(Code code)
+    {
+        Operation operation;
+        operation.code = code;
+        for (std::uint8_t& argument : operation.arguments)
+            argument = static_cast<std::uint8_t>(m_random.below(256));
+        return operation;
+    }
+    Operation next()
+    {
+        if (m_isShort && m_random.isOneIn(12))
+        {
+            Operation failing = filled(Code::FAIL_ALLOCATION);
+            failing.arguments[0] = static_cast<std::uint8_t>(m_random.below(m_random.isOneIn(3) ? 120 : 20));
+            return failing;
+        }
+        Operation operation = filled(chooseCode());
+        if (operation.code == Code::WHEN)
+            operation.arguments[1] = static_cast<std::uint8_t>(m_random.below(m_random.isOneIn(3) ? 16 : 3));
+        if (operation.code == Code::BECOME && m_random.isOneIn(2))
+            operation.arguments[1] = static_cast<std::uint8_t>(6 + m_random.below(3)); // up
+        if (operation.code == Code::MAKE_ADAPTER && m_random.isOneIn(2))
+            operation.arguments[0] = m_random.isOneIn(2) ? m_last : operation.arguments[0];
+        if (m_random.isOneIn(3))
+            operation.arguments[0] = m_last; // somebody does several things
+        m_last = operation.arguments[0];
+        return operation;
+    }
+    Code chooseCode()
+    {
+        unsigned int sum = 0;
+        for (Weight const& weight : WEIGHTS)
+            sum += m_isHostile ? weight.hostile : weight.calm;
+        unsigned int chosen = m_random.below(sum);
+        for (Weight const& weight : WEIGHTS)
+        {
+            unsigned int const own = m_isHostile ? weight.hostile : weight.calm;
+            if (chosen < own)
+                return weight.code;
+            chosen -= own;
+        }
+        return Code::TURN;
+    }
+
+    Random m_random;
+    bool const m_isHostile;
+    bool const m_isShort; // of memory
+    std::uint8_t m_last = 0;
+};
+} // namespace
+
+Operations GENERATE(std::uint64_t seed) { return Generator(seed).generate(); }
+} // namespace Simulation

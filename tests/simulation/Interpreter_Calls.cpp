@@ -1,0 +1,177 @@
+#include "callcontrol/CC_CallPool.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "tests/simulation/Interpreter.h"
+#include "tests/simulation/Library.h"
+
+// What the operations do to calls and to the legs that no adapter drives.
+
+namespace Simulation
+{
+void Interpreter::acquire(Operation const& operation)
+{
+    TYPtr<MG_IContext> const media(operation[1] % 3 == 1 ? new MediaContext(++m_world.m_lastGivenMedia) : nullptr);
+    String const context(World::CONTEXT_NAME(operation[0]));
+    CC_Call* acquired = nullptr;
+    {
+        Memory::Library const library;
+        acquired = CallControl::ACQUIRE_CALL(context, media.get());
+    }
+    if (acquired != nullptr)
+        m_world.m_blankCalls.push_back(std::make_unique<CallWatch>(*acquired));
+}
+
+void Interpreter::newLeg(Operation const& operation)
+{
+    CC_CallLeg*& place = m_world.leg(operation[0]);
+    if (place != nullptr)
+        return;
+    auto* const made = new CC_CallLeg;
+    place = made;
+    std::ignore = made->setName("guest");
+    std::ignore = made->setProperty(CC_PropertyUnsigned(CC_PropertyId::CALL_LEG_ID, operation[1] % 32));
+    if (operation[3] % 2 != 0)
+        std::ignore =
+            made->setProperty(CC_PropertyString(CC_PropertyId::NETWORK, operation[3] % 4 == 1 ? "shared" : "x"));
+    Values::WITH(Values::MAKE_STATE(static_cast<int>(operation[2] % 9) - 2),
+                 [&](CC_Property const& state) { std::ignore = made->setProperty(state); });
+}
+
+XCode Interpreter::moveLeg(Operation const& operation)
+{
+    CC_CallLeg* const leg = m_world.leg(operation[0]);
+    CC_Call* const call = m_world.call(operation[1], operation[2]);
+    if (leg == nullptr)
+        return XCode(NO_RESULT);
+    if (operation.code == Code::MOVE_LEG)
+        return transferLeg(*leg, operation[3] % 4 == 3 ? nullptr : call);
+    if (call == nullptr)
+        return XCode(NO_RESULT);
+    Memory::Library const library;
+    if (operation.code == Code::ADD_LEG)
+        return call->addCallLeg(*leg);
+    call->removeCallLeg(*leg);
+    return XCode(NO_RESULT);
+}
+
+/// Who moves a leg into a call without its help has the call looked at.
+XCode Interpreter::transferLeg(CC_CallLeg& leg, CC_Call* to)
+{
+    CallWatch watch;
+    watch.watch(to);
+    Memory::Library const library;
+    XCode const result = CC_Call::TRANSFER_CALL_LEG(to, leg);
+    if (watch.get() != nullptr)
+        watch.get()->defer();
+    return result;
+}
+
+namespace
+{
+Property WRITTEN(unsigned int which, unsigned int variant)
+{
+    if (which % 4 == 3)
+        return Values::MAKE_STATE(static_cast<int>(variant % 9) - 2);
+    return Values::CHOOSE(which / 4 * 3 + which % 4, variant);
+}
+
+/// One property or several, as the way says.
+template <class Target>
+XCode WRITE(Target& target, unsigned int which, unsigned int variant, unsigned int way, unsigned int others)
+{
+    XCode result;
+    Property const written = WRITTEN(which, variant);
+    if (way % 2 == 0)
+    {
+        Values::WITH(written,
+                     [&](CC_Property const& property)
+                     {
+                         Memory::Library const library;
+                         result = target.setProperty(property);
+                     });
+        return result;
+    }
+    CC_PropertyContainer several;
+    Values::STORE(several, {written});
+    Values::STORE(several, Values::CHOOSE_SEVERAL(others));
+    Memory::Library const library;
+    return target.setProperties(several);
+}
+} // namespace
+
+XCode Interpreter::setOfLeg(Operation const& operation)
+{
+    CC_CallLeg* const leg = m_world.leg(operation[0]);
+    if (leg == nullptr)
+        return XCode(NO_RESULT);
+    return WRITE(*leg, operation[1], operation[2], operation[3], operation[4]);
+}
+
+XCode Interpreter::setOnCall(Operation const& operation)
+{
+    CC_Call* const call = m_world.call(operation[0], operation[1]);
+    if (call == nullptr)
+        return XCode(NO_RESULT);
+    return WRITE(*call, operation[2] / 4 * 4, operation[3], operation[4], operation[5]); // a call has no State
+}
+
+void Interpreter::emptyCall(Operation const& operation)
+{
+    CC_Call* const call = m_world.call(operation[0], operation[1]);
+    if (call == nullptr)
+        return;
+    Memory::Library const library;
+    if (operation.code == Code::EMPTY_CALL)
+    {
+        CallWatch watch;
+        {
+            Memory::Ours const ours;
+            watch.watch(call);
+        }
+        call->destroyParticipatingCallLegs();
+        if (watch.get() != nullptr)
+            watch.get()->defer(); // who empties a call asks for its clean-up
+    }
+    else if (operation[2] % 2 != 0)
+        call->deferred();
+    else
+        call->defer();
+}
+
+/// It belongs to nobody: its end is that of its legs.
+void Interpreter::newCall(Operation const& operation)
+{
+    CC_CallLeg* const leg = m_world.leg(operation[0]);
+    if (leg == nullptr || leg->getState() < 0)
+        return;
+    auto* const call = new CC_Call;
+    Memory::Library const library;
+    if (!call->addCallLeg(*leg).isOk())
+        call->destroy();
+}
+
+/// What is changed without telling anybody; never a State or Network, by which calls live.
+void Interpreter::changeUntold(Operation const& operation)
+{
+    CC_CallLeg* const leg = m_world.leg(operation[0]);
+    Property const changed = Values::CHOOSE(operation[1], operation[2]);
+    if (leg == nullptr || changed.id == CC_PropertyId::NETWORK)
+        return;
+    if (operation[3] % 2 == 0)
+    {
+        Memory::Library const library;
+        PROPERTIES_TO_WRITE(*leg).remove(changed.id);
+        return;
+    }
+    Values::WITH(changed,
+                 [&](CC_Property const& property)
+                 {
+                     bool isChanged = false;
+                     Memory::Library const library;
+                     std::ignore = leg->setPropertyNoNotification(property, isChanged);
+                 });
+}
+} // namespace Simulation

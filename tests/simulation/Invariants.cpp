@@ -1,0 +1,163 @@
+#include "tests/simulation/Invariants.h"
+
+#include "callcontrol/CC_CallPool.h"
+#include "calls/CC_Call.h"
+#include "calls/CC_CallLeg.h"
+#include "tests/simulation/Library.h"
+#include "tests/simulation/World.h"
+
+#include <algorithm>
+
+namespace Simulation
+{
+namespace
+{
+template <class Visit>
+void FOR_EACH_CALL(Visit const& visit)
+{
+    for (unsigned int i = 0; i < World::NUMBER_OF_CONTEXTS; ++i)
+    {
+        CC_Context* const context = CallControl::GET_CONTEXT(String(World::CONTEXT_NAME(i)));
+        for (unsigned int j = 0; context != nullptr && j < context->getNumberOfCalls(); ++j)
+            visit(*context->getCall(j), i);
+    }
+}
+
+bool IS_LIVE(CC_Call const& call)
+{
+    for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
+        if (call.getCallLeg(i)->getState() != -1)
+            return true;
+    return false;
+}
+
+/// A leg that a call lists says so, too.
+void CHECK_MEMBERSHIP(World& world, CC_Call const& call)
+{
+    for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
+        if (call.getCallLeg(i)->getCall() != &call)
+            return world.fail("a call lists a leg that names another call, or none");
+}
+
+void CHECK_LINE(World& world, unsigned int number, Line const& line)
+{
+    CC_CallAdapter const& adapter = *line.adapter;
+    CC_CallLeg const* const own = OWN_LEG(adapter);
+    CC_CallLeg const* const peer = PEER_LEG(adapter);
+    std::string const name = "line " + std::to_string(number);
+    if (peer == nullptr)
+        return;
+    if (own == nullptr || own == peer)
+        return world.fail(name + " has a peer without a leg of its own, or its own leg for one");
+    if (own->getCall() == nullptr || peer->getCall() != own->getCall())
+        return world.fail(name + " has a peer that is not in its call");
+}
+
+bool HAS_SAME(Properties const& left, Properties const& right)
+{
+    return std::all_of(left.begin(), left.end(),
+                       [&](Property const& property)
+                       {
+                           return std::any_of(right.begin(), right.end(),
+                                              [&](Property const& other)
+                                              {
+                                                  // a class once stored stays, whatever comes after it
+                                                  return other.id == property.id &&
+                                                         (other.value == property.value ||
+                                                          other.value.kind != property.value.kind);
+                                              });
+                       });
+}
+
+/// The view of the peer is what the output filters make of its properties.
+void CHECK_VIEW(World& world, unsigned int number, Line const& line)
+{
+    CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
+    CC_Endpoint const* const endpoint = line.adapter->getEndpoint();
+    if (peer == nullptr || endpoint == nullptr || peer->mayChangeUntold())
+        return;
+    CC_PropertyContainer expected(peer->getProperties());
+    if (CC_PropertyFilterContainer const* const filters = endpoint->getOutputFilterContainer())
+        std::ignore = filters->applyFilters(expected);
+    CC_PropertyContainer seen;
+    std::ignore = line.adapter->getPeerProperties(seen, ~0U);
+    Properties const left = Values::READ(expected);
+    Properties const right = Values::READ(seen);
+    if (!HAS_SAME(left, right) || !HAS_SAME(right, left))
+        world.fail("line " + std::to_string(number) + " sees" + Values::PRINT(right) + " of a peer that shows" +
+                   Values::PRINT(left));
+}
+
+template <class Visit>
+void FOR_EACH_LINE(World& world, Visit const& visit)
+{
+    for (unsigned int i = 0; i < world.getNumberOfModules() * World::LINES_OF_A_MODULE; ++i)
+        if (world.line(i).adapter != nullptr)
+            visit(i, world.line(i));
+}
+
+void FORGET_BLANK_CALLS(World& world)
+{
+    std::erase_if(world.m_blankCalls, [](auto const& watch)
+                  { return watch->get() == nullptr || watch->get()->getNumberOfCallLegs() != 0; });
+}
+
+void CHECK_CALL_AT_REST(World& world, CC_Call const& call, unsigned int context)
+{
+    if (IS_LIVE(call) || world.m_hasFailingFilter)
+        return;
+    if (call.getNumberOfCallLegs() != 0 || !world.isBlank(call))
+        world.fail("a call of context " + std::to_string(context) + " stays without a live leg, " +
+                   std::to_string(call.getNumberOfCallLegs()) + " legs");
+}
+
+void CHECK_LOCKS(World& world)
+{
+    int pools = 0;
+    for (unsigned int i = 0; i < World::NUMBER_OF_CONTEXTS; ++i)
+        pools += CallControl::GET_NUMBER_OF_CALLS(String(World::CONTEXT_NAME(i))) != 0 ? 1 : 0;
+    int const locks = world.m_reboot.m_locks;
+    if (world.m_wasShortOfMemory)
+        return; // a lock may not have been had
+    if (locks < pools || (locks != pools && !world.m_hasLostContext))
+        world.fail(std::to_string(locks) + " reload locks are held while " + std::to_string(pools) +
+                   " pools have calls");
+}
+
+void CHECK_STATISTICS(World& world)
+{
+    CC_CallPool::s_statistics.prepareGet();
+    unsigned long long const added = CC_CallPool::s_statistics.m_callsAdded - world.m_added;
+    unsigned long long const removed = CC_CallPool::s_statistics.m_callsRemoved - world.m_removed;
+    unsigned long long calls = 0;
+    FOR_EACH_CALL([&](CC_Call const&, unsigned int) { ++calls; });
+    if (added - removed != calls)
+        world.fail("the statistics count " + std::to_string(added - removed) + " calls, there are " +
+                   std::to_string(calls));
+}
+} // namespace
+
+void CHECK_AFTER_OPERATION(World& world)
+{
+    FORGET_BLANK_CALLS(world);
+    FOR_EACH_CALL([&](CC_Call const& call, unsigned int) { CHECK_MEMBERSHIP(world, call); });
+    FOR_EACH_LINE(world, [&](unsigned int number, Line const& line) { CHECK_LINE(world, number, line); });
+}
+
+void CHECK_AT_REST(World& world)
+{
+    FOR_EACH_CALL([&](CC_Call const& call, unsigned int context) { CHECK_CALL_AT_REST(world, call, context); });
+    CHECK_LOCKS(world);
+    CHECK_STATISTICS(world);
+    std::ignore = CHECK_VIEW;
+}
+
+void CHECK_AT_THE_END(World& world)
+{
+    if (world.m_loop.settle(1000) == 1000)
+        return world.fail("the loop does not come to rest");
+    FORGET_BLANK_CALLS(world);
+    CHECK_AT_REST(world);
+    Memory::CHECK_KEPT_BLOCKS();
+}
+} // namespace Simulation

@@ -1,0 +1,3 @@
+#include "tests/simulation/Ladder.h"
+
+void Simulation::PRINT_LADDER(World const&) {}
