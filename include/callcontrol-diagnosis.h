@@ -4,6 +4,7 @@
 
 #include "callcontrol.h"
 #include "diagnosis/CC_BriefText.h"
+#include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_JsonLine.h"
 #include "diagnosis/CC_Recording.h"
 #include "diagnosis/CC_RecordingReport.h"

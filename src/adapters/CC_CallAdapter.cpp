@@ -19,14 +19,20 @@
 #include <utility>
 
 unsigned int CC_CallAdapter::s_numberOfInstances = 0;
+TYInstances<CC_CallAdapter> CC_CallAdapter::s_instances;
 
 CC_CallAdapterObserver::~CC_CallAdapterObserver() = default;
 
-CC_CallAdapter::CC_CallAdapter() { ++s_numberOfInstances; }
+CC_CallAdapter::CC_CallAdapter()
+{
+    ++s_numberOfInstances;
+    s_instances.add(*this);
+}
 
 CC_CallAdapter::~CC_CallAdapter()
 {
     CC_CallAdapter::cleanup();
+    s_instances.remove(*this);
     --s_numberOfInstances;
 }
 

@@ -5,6 +5,7 @@
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
+#include "platform/base/TYInstances.h"
 #include "platform/base/TYLifeline.h"
 #include "platform/base/XCode.h"
 #include "platform/signalling/QCause.h"
@@ -256,6 +257,8 @@ protected:
     bool isReady() const;
 
 private:
+    friend class CC_Inside;
+    friend class TYInstances<CC_CallAdapter>;
     class Event;
     class Attempt;
     class Copy;
@@ -327,6 +330,8 @@ private:
     void onPeerPropertyChanged(CC_Flags const& flags);
     void onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags const& flags);
 
+    static TYInstances<CC_CallAdapter> s_instances;
+
     CC_CallAdapterObserver* m_observer = nullptr;
     String m_name;
     CC_Endpoint* m_endpoint = nullptr;
@@ -347,4 +352,5 @@ private:
     bool m_isPeerToBeChosen = false; // its fall did not show: choose anew before the module is told
     unsigned int m_refreshes = 0;    // of views through filters, to tell whether one came inside another
     TYLifeline m_lifeline;
+    TYInstances<CC_CallAdapter>::Links m_links;
 };

@@ -33,6 +33,8 @@ protected:
     void handle() override;
 
 private:
+    friend class CC_Inside;
+
     void record(CC_RecordWriter& recorder, CC_Flags const& flags) const;
 
     CC_CallAdapter& m_adapter;

@@ -18,6 +18,7 @@
 #include <utility>
 
 unsigned int CC_Call::s_numberOfInstances = 0;
+TYInstances<CC_Call> CC_Call::s_instances;
 
 namespace
 {
@@ -46,8 +47,11 @@ void LOG_PROPERTY(String const& callName, CC_Property const& property)
 CC_Call::CC_Call()
     : m_name(String::addressOf(this)) // short enough to need no memory
     , m_serial(++s_lastSerial)
+    , m_start(CC_Moment::NOW())
+    , m_stateSince(m_start)
 {
     ++s_numberOfInstances;
+    s_instances.add(*this);
     TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
     TY_ASSERT(loop != nullptr, "a call before CallControl::SET_CC_EVENT_LOOP");
     TY_ASSERT(loop->isLoopThread(), "a call made off the call-control loop's thread");
@@ -70,6 +74,7 @@ CC_Call::~CC_Call()
     m_callPool = nullptr;
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
         recorder->add(CC_RecordFormat::Kind::CALL_ENDED, m_serial, 0);
+    s_instances.remove(*this);
     --s_numberOfInstances;
 }
 
@@ -260,6 +265,16 @@ CC_Call::State CC_Call::getState() const
         if (leg->getActivityLevel() >= CC_PropertyCallLegState::DISCONNECTING)
             ++active;
     return active < 2 ? INACTIVE : active == 2 ? ACTIVE : CONFERENCE;
+}
+
+/// An active leg has joined or left, or a leg has become active or ceased to be.
+void CC_Call::noticeState()
+{
+    State const state = getState();
+    if (state == m_noticedState)
+        return;
+    m_noticedState = state;
+    m_stateSince = CC_Moment::NOW();
 }
 
 void CC_Call::onCallLegObservationEnded(CC_Event<CC_CallLeg> const&) {}

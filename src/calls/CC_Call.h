@@ -3,9 +3,11 @@
 #include "calls/CC_CallLegObserver.h"
 #include "calls/CC_CallObserver.h"
 #include "calls/CC_ObserverContainer.h"
+#include "environment/CC_Moment.h"
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
+#include "platform/base/TYInstances.h"
 #include "platform/base/TYList.h"
 #include "platform/base/TYRecycled.h"
 #include "platform/base/TYSmallVector.h"
@@ -60,6 +62,10 @@ public:
     String const& getName() const { return m_name; }
     /// The call's number in this process, from 1 on in the order of their making; never used again.
     unsigned long long getSerial() const { return m_serial; }
+    /// When the call was made.
+    CC_Moment const& getStart() const { return m_start; }
+    /// When its state last changed: a leg became active or ceased to be, joined or left. Its start before that.
+    CC_Moment const& getStateSince() const { return m_stateSince; }
     /// The pool that handed the call out and takes it back; null: the call destroys itself when it is over. @{
     CC_CallOwner* getCallPool() const { return m_callPool; }
     void setCallPool(CC_CallOwner* callPool) { m_callPool = callPool; }
@@ -165,13 +171,17 @@ public:
     };
 
 private:
+    friend class CC_CallLeg;
     friend class CC_CallPool;
+    friend class CC_Inside;
+    friend class TYInstances<CC_Call>;
 
     /// Whether the call takes part in nothing any more: it is in its destructor, or will be when the last hold ends.
     bool isOver() const { return m_isEnding || m_isReleased; }
     XCode replace(CC_Property const& property);
     XCode replaceRecorded(CC_Property const& property);
     void tellChange(CC_Flags& flags);
+    void noticeState();
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     static XCode MOVE(CC_Call* to, CC_CallLeg& leg);
     XCode addLegObserver(CC_CallLeg& leg, CC_CallLegObserver* observer);
@@ -191,6 +201,8 @@ private:
     void pushBackOnLoop();
     CC_CallLeg* findPushBackTarget() const;
 
+    static TYInstances<CC_Call> s_instances;
+
     String m_name;
     CC_CallOwner* m_callPool = nullptr;
     CC_PropertyContainer m_properties;
@@ -204,5 +216,9 @@ private:
     bool m_isReleased = false;   // delete when the last hold ends
     bool m_isEnding = false;     // in the destructor: takes no leg any more
     bool m_isCleaningUp = false; // looks itself whether a live leg is left
+    State m_noticedState = INACTIVE;
     unsigned long long const m_serial;
+    CC_Moment const m_start;
+    CC_Moment m_stateSince; // of m_noticedState
+    TYInstances<CC_Call>::Links m_links;
 };

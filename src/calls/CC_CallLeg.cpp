@@ -19,6 +19,7 @@
 #include <utility>
 
 unsigned int CC_CallLeg::s_numberOfInstances = 0;
+TYInstances<CC_CallLeg> CC_CallLeg::s_instances;
 
 namespace
 {
@@ -53,13 +54,6 @@ bool LOG_PROPERTY(String const& legName, CC_Property const& property)
 
 using State = CC_PropertyCallLegState;
 
-/// Whether the property may become a leg's State: never IDLE again, and never another class.
-bool IS_STATE_ACCEPTED(CC_Property const& property)
-{
-    auto const* const state = State::FROM(&property);
-    return state != nullptr && state->getState() != State::IDLE;
-}
-
 bool IS_RELEASED(CC_Property const& property)
 {
     auto const* const state = State::FROM(&property);
@@ -67,14 +61,16 @@ bool IS_RELEASED(CC_Property const& property)
 }
 } // namespace
 
-CC_CallLeg::CC_CallLeg() : m_serial(++s_lastSerial)
+CC_CallLeg::CC_CallLeg() : m_serial(++s_lastSerial), m_start(CC_Moment::NOW()), m_stateSince(m_start)
 {
     ++s_numberOfInstances;
+    s_instances.add(*this);
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
         recorder->add(CC_RecordFormat::Kind::LEG_MADE, 0, m_serial);
     // straight into the container: this is the one time that the state is IDLE. What memory refuses is absent, and a
     // leg without State counts as released.
     m_properties.append<CC_PropertyCallLegState>(CC_PropertyId::STATE, CC_PropertyCallLegState::IDLE);
+    m_state = m_properties.get(CC_PropertyId::STATE) != nullptr ? State::IDLE : State::RELEASED;
     m_properties.append<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
     m_properties.append<CC_PropertyCause>(CC_PropertyId::CAUSE);
 }
@@ -94,6 +90,7 @@ CC_CallLeg::~CC_CallLeg()
     m_observers.silence();
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
         recorder->add(CC_RecordFormat::Kind::LEG_ENDED, 0, m_serial);
+    s_instances.remove(*this);
     --s_numberOfInstances;
 }
 
@@ -124,7 +121,7 @@ XCode CC_CallLeg::addCallLegObserver(CC_CallLegObserver* observer) { return m_ob
 
 void CC_CallLeg::removeCallLegObserver(CC_CallLegObserver const* observer) { m_observers.removeObserver(observer); }
 
-int CC_CallLeg::getState() const
+int CC_CallLeg::findState() const
 {
     auto const* const state = CC_PropertyCallLegState::FROM(m_properties.get(CC_PropertyId::STATE));
     return state != nullptr ? state->getState() : CC_PropertyCallLegState::RELEASED;
@@ -153,14 +150,35 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
         if (isLeftOut())
             return XCode::OK; // let go meanwhile
     }
-    if (property.getId() == CC_PropertyId::STATE && !IS_STATE_ACCEPTED(property))
+    bool const isState = property.getId() == CC_PropertyId::STATE;
+    XCode const result = isState ? replaceState(stored, property) : replace(stored, property);
+    changed = result.isOk();
+    return changed ? XCode::OK : XCode::REFUSED;
+}
+
+/// A leg never goes back to IDLE, and its State is of no other class. The state of the call is that of its legs: it
+/// changes where one becomes active or ceases to be.
+XCode CC_CallLeg::replaceState(CC_Property* stored, CC_Property const& property)
+{
+    auto const* const state = State::FROM(&property);
+    if (state == nullptr || state->getState() == State::IDLE)
         return XCode::REFUSED;
-    XCode const replaced =
-        CC_RecordWriter::ON() == nullptr ? m_properties.replace(stored, property) : replaceRecorded(stored, property);
-    if (!replaced.isOk())
+    bool const wasActive = isActive();
+    int const level = state->getState();
+    if (!replace(stored, property).isOk())
         return XCode::REFUSED;
-    changed = true;
+    if (m_state != State::IDLE || m_observers.getNumberOfEntries() != 0)
+        m_stateSince = CC_Moment::NOW();
+    m_state = level;
+    if (m_call != nullptr && isActive() != wasActive)
+        m_call->noticeState();
     return XCode::OK;
+}
+
+XCode CC_CallLeg::replace(CC_Property* stored, CC_Property const& property)
+{
+    return CC_RecordWriter::ON() == nullptr ? m_properties.replace(stored, property)
+                                            : replaceRecorded(stored, property);
 }
 
 /// Apart, so that who does not record does not pay for it.

@@ -2,9 +2,11 @@
 
 #include "calls/CC_CallLegObserver.h"
 #include "calls/CC_ObserverContainer.h"
+#include "environment/CC_Moment.h"
 #include "platform/base/Export.h"
 #include "platform/base/InfoContainer.h"
 #include "platform/base/String.h"
+#include "platform/base/TYInstances.h"
 #include "platform/base/TYRecycled.h"
 #include "platform/base/XCode.h"
 #include "properties/CC_PropertyContainer.h"
@@ -47,6 +49,11 @@ public:
 
     /// The leg's number in this process, from 1 on in the order of their making; never used again.
     unsigned long long getSerial() const { return m_serial; }
+    /// When the leg was made.
+    CC_Moment const& getStart() const { return m_start; }
+    /// When its State was last stored by an operation of the leg. The first one counts from the leg's start as long as
+    /// nobody observes the leg: who makes one says at once how far it is.
+    CC_Moment const& getStateSince() const { return m_stateSince; }
     /// Empty until it was named.
     String const& getName() const { return m_name; }
     /// The text after "EP" in the leg's log lines. OK, or FAILURE when memory is out.
@@ -58,7 +65,7 @@ public:
     void removeCallLegObserver(CC_CallLegObserver const* observer);
 
     /// The value of the State property (`CC_PropertyCallLegState::State`); RELEASED (-1) when the leg has none.
-    int getState() const;
+    int getState() const { return m_mayChangeUntold || !m_properties.isSelfContained() ? findState() : m_state; }
     /// The same as the state: IDLE -2, RELEASED -1, DISCONNECTING 0 and upward to CONNECTED 6.
     int getActivityLevel() const { return getState(); }
 
@@ -118,10 +125,16 @@ public:
 
 private:
     friend class CC_Call;
+    friend class CC_Inside;
+    friend class TYInstances<CC_CallLeg>;
     struct Move;
 
     ~CC_CallLeg();
     XCode store(CC_Property const& property, bool& changed);
+    int findState() const;
+    bool isActive() const { return getState() >= 0; } // from DISCONNECTING on
+    XCode replaceState(CC_Property* stored, CC_Property const& property);
+    XCode replace(CC_Property* stored, CC_Property const& property);
     XCode replaceRecorded(CC_Property* stored, CC_Property const& property);
     XCode replaceOfAnyKind(CC_Property const& property);
     void tell(CC_Flags& flags);
@@ -130,6 +143,8 @@ private:
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
     void notifyPropertyChange(CC_Flags& flags);
+
+    static TYInstances<CC_CallLeg> s_instances;
 
     std::atomic<int> m_referenceCount{1};
     CC_Call* m_call = nullptr;
@@ -142,7 +157,11 @@ private:
     bool m_isEnding = false;               // in the destructor: goes into no call any more
     bool m_mayChangeUntold = false;        // for good
     bool m_isStateFixed = false;           // at RELEASED, for good
+    int m_state;                           // of the State property, unless it may have changed past us
     unsigned int m_numberOfNotifications = 0;
     unsigned long long m_lastWalk = 0; // the last of a call's walks over its legs that took this one out
     unsigned long long const m_serial;
+    CC_Moment const m_start;
+    CC_Moment m_stateSince;
+    TYInstances<CC_CallLeg>::Links m_links;
 };

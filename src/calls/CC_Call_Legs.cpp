@@ -9,7 +9,7 @@
 //   (`m_observedBy`). Who is added to the call's in between is added to the leg at once and not again (`given`).
 // - A call whose last live leg has left has itself looked at: nobody else would.
 #include "calls/CC_Call.h"
-#include "calls/CC_CallLeg.h"
+#include "calls/CC_CallLeg_Move.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "recorder/CC_RecordWriter.h"
 
@@ -42,14 +42,6 @@ bool CONTAINS(List const& list, Value const* value)
 }
 } // namespace
 
-/// A leg's move between calls, while it is under way; on the stack of the outermost one.
-struct CC_CallLeg::Move
-{
-    CC_Call::Hold target; // of the move that was asked for meanwhile
-    bool isAskedAgain = false;
-    TYSmallVector<CC_CallLegObserver const*, 4> given; // the leg observers of the new call that it has already
-};
-
 XCode CC_Call::TRANSFER_CALL_LEG(CC_Call* to, CC_CallLeg& leg)
 {
     if (to == leg.m_call && leg.m_move == nullptr)
@@ -69,8 +61,7 @@ XCode CC_Call::TRANSFER_CALL_LEG(CC_Call* to, CC_CallLeg& leg)
     XCode result = XCode::OK;
     for (bool isFirst = true;; isFirst = false)
     {
-        Hold const source(leg.m_call);
-        CC_CallLeg::Move move;
+        CC_CallLeg::Move move(leg.m_call);
         leg.m_move = &move;
         XCode const moved = MOVE(target.get(), leg);
         leg.m_move = nullptr;
@@ -93,12 +84,16 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         if (to->isOver() || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
             return XCode::NO_ELEMENT;
         leg.addReference(); // the new call's
+        if (leg.isActive())
+            to->noticeState();
         RECORD(Kind::LEG_JOINED, *to, leg);
     }
     if (from != nullptr)
     {
         from->takeObserversFrom(leg);
         from->unlist(leg);
+        if (leg.isActive())
+            from->noticeState();
         RECORD(Kind::LEG_LEFT, *from, leg);
         from->m_callObservers.broadcastEvent(CC_EvCallCallLegModified(*from, leg),
                                              &CC_CallObserver::onCallCallLegRemoved);

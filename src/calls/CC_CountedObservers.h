@@ -67,6 +67,15 @@ public:
                 tell(*m_entries[i].m_observer);
     }
 
+    /// Calls `visit(entry)` for every entry, those of count 0, too. An observer may have ended without being removed:
+    /// who is not known to be alive must not be touched.
+    template <class Visit>
+    void forEachEntry(Visit&& visit) const
+    {
+        for (CountedObserver const& entry : m_entries)
+            visit(entry);
+    }
+
     /// The number of distinct observers ever added.
     unsigned int getNumberOfEntries() const { return m_entries.getSize(); }
 

@@ -32,6 +32,12 @@ public:
     {
         m_observers.forEach(tell);
     }
+    /// As CC_CountedObservers::forEachEntry.
+    template <class Visit>
+    void forEachEntry(Visit&& visit) const
+    {
+        m_observers.forEachEntry(visit);
+    }
     /// The number of distinct observers ever added.
     unsigned int getNumberOfEntries() const { return m_observers.getNumberOfEntries(); }
 

@@ -30,6 +30,7 @@
 #include "platform/base/String.h"
 #include "platform/base/TYCounted.h"
 #include "platform/base/TYHashTable.h"
+#include "platform/base/TYInstances.h"
 #include "platform/base/TYLifeline.h"
 #include "platform/base/TYList.h"
 #include "platform/base/TYMutex.h"
