@@ -120,6 +120,8 @@ private:
     toml::table const& m_table;
 };
 
+constexpr unsigned int LEAST_RECORDED = 4096; // octets
+constexpr unsigned int MOST_RECORDED = 1024 * 1024 * 1024;
 constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 
 Configuration::Interface READ_INTERFACE(Section const& section)
@@ -159,14 +161,18 @@ void FOR_EACH_TABLE(Section const& root, toml::table const& table, std::string c
 
 void READ_GATEWAY(Section const& section, Configuration& configuration)
 {
-    section.allow(
-        {"context", "log-level", "call-control-log-level", "max-calls", "max-calls-per-second", "clear-after"});
+    section.allow({"context", "log-level", "call-control-log-level", "max-calls", "max-calls-per-second", "clear-after",
+                   "recording", "recording-size"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
     configuration.callControlLogLevel = section.number("call-control-log-level", 1, 0, 5);
     configuration.maxCalls = section.number("max-calls", 0, 0, UNLIMITED);
     configuration.maxCallsPerSecond = section.number("max-calls-per-second", 0, 0, UNLIMITED);
     configuration.clearAfter = section.number("clear-after", configuration.clearAfter, 0, 86400);
+    configuration.recording = section.text("recording", {});
+    configuration.recordingSize = section.number("recording-size", configuration.recordingSize, 0, MOST_RECORDED);
+    if (configuration.recordingSize != 0 && configuration.recordingSize < LEAST_RECORDED)
+        section.refuse("recording-size", "expected 0, or at least " + std::to_string(LEAST_RECORDED));
 }
 
 Configuration READ_TABLE(toml::table const& table, std::string const& file)

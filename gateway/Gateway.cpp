@@ -7,7 +7,10 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "diagnosis/CC_Explanation.h"
+#include "diagnosis/CC_RecordingReport.h"
 #include "platform/eventloop/TYEvent.h"
+#include "recorder/CC_Recorder.h"
 #include "sip/SipCause.h"
 #include "sip/SipPropertyId.h"
 
@@ -68,6 +71,7 @@ unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
 
 Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
     : m_configuration(configuration)
+    , m_recording(configuration)
     , m_host(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration))
     , m_environment{m_stack,
                     m_host.getContextName(),
@@ -175,6 +179,13 @@ void Gateway::printState() const
     InfoContainer info;
     CallControl::GET_PROVIDER_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
     CallControl::GET_CALL_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
+    // why each call is still up, and what became of those before
+    info.add(0, 0, "holders", String::s_empty);
+    CC_Explanation::OF_CALLS_OLDER_THAN(0).getInfo(info, EVERYTHING, 1, EVERYTHING, 0, String::s_empty);
+    CC_Explanation::OF_LEGS_WITHOUT_CALL().getInfo(info, EVERYTHING, 1, EVERYTHING, 0, String::s_empty);
+    info.add(0, 0, "recorded", String::s_empty);
+    if (CC_Recorder::IS_ON())
+        CC_RecordingReport::ADD(info, 1, CC_RecordingReport(CC_Recording::READ(CC_Recorder::GET_IMAGE())).getCalls());
     CC_CallPool::Statistics& pool = CC_CallPool::s_statistics;
     pool.prepareGet();
     Counters const& counters = m_environment.counters;

@@ -2,6 +2,7 @@
 
 #include "CallControlHost.h"
 #include "Configuration.h"
+#include "Recording.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 #include "sip/SipEnvironment.h"
@@ -72,6 +73,7 @@ private:
     TYEventLoop m_datapathLoop;
     SipStack m_stack;
     Signals m_signals;
+    Recording m_recording;
     CallControlHost m_host;
     SipEnvironment m_environment;
     TYTimer m_clearTimer;

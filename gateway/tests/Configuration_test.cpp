@@ -45,6 +45,8 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(configuration.maxCalls, 0u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 0u);
     EXPECT_EQ(configuration.clearAfter, 10u);
+    EXPECT_EQ(configuration.recording, "");
+    EXPECT_EQ(configuration.recordingSize, 4194304u);
     EXPECT_TRUE(configuration.routes.empty());
     ASSERT_EQ(configuration.interfaces.size(), 2u);
     Configuration::Interface const& a = configuration.interfaces[0];
@@ -60,7 +62,7 @@ TEST(Configuration, EveryKeyIsRead)
 {
     Configuration const configuration = Configuration::PARSE(
         std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-calls = 7\n"
-                    "max-calls-per-second = 8\nclear-after = 9\n") +
+                    "max-calls-per-second = 8\nclear-after = 9\nrecording = \"/r\"\nrecording-size = 4096\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -69,6 +71,8 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.maxCalls, 7u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 8u);
     EXPECT_EQ(configuration.clearAfter, 9u);
+    EXPECT_EQ(configuration.recording, "/r");
+    EXPECT_EQ(configuration.recordingSize, 4096u);
     Configuration::Interface const* const b = configuration.findInterface("b");
     ASSERT_NE(b, nullptr);
     EXPECT_TRUE(b->usesTcp);
@@ -105,6 +109,8 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {"[gateway]\nmax-calls = 1.5\n" + good, "f: gateway.max-calls: expected a whole number"},
         {"[gateway]\nclear-after = -1\n" + good, "f: gateway.clear-after: must be from 0 to 86400"},
         {"[gateway]\ncall-control-log-level = 6\n" + good, "f: gateway.call-control-log-level: must be from 0 to 5"},
+        {"[gateway]\nrecording-size = 100\n" + good,
+         "f: gateway.recording-size: expected 0, or at least 4096"},
         {first, "f: interface[0].listen: is missing"},
         {first + "listen = 5060", "f: interface[0].listen: expected a text"},
         {first + "listen = \"\"", "f: interface[0].listen: must not be empty"},

@@ -1,10 +1,24 @@
 #pragma once
 
+#include <string>
+
 namespace Simulation
 {
-class World;
+/// What happened in a run, told even of one that crashes: while it lives, call control is recorded into a file that
+/// forked processes share.
+class Ladder
+{
+public:
+    /// Records into `path`, which is taken away at the end; without it there is no ladder.
+    explicit Ladder(std::string path);
+    ~Ladder();
+    Ladder(Ladder const&) = delete;
+    Ladder& operator=(Ladder const&) = delete;
 
-/// A run has failed and its world still stands: the place to print what happened, in the order in which it happened, as
-/// whoever records it can tell. Nobody records yet.
-void PRINT_LADDER(World const& world);
+    /// The ladders of all calls.
+    std::string getText() const;
+
+private:
+    std::string m_path;
+};
 } // namespace Simulation

@@ -5,7 +5,6 @@
 #include "tests/simulation/Comparison.h"
 #include "tests/simulation/Interpreter.h"
 #include "tests/simulation/Invariants.h"
-#include "tests/simulation/Ladder.h"
 #include "tests/simulation/Values.h"
 
 namespace Simulation
@@ -54,8 +53,6 @@ void CARRY_OUT(Operations const& operations, std::atomic<std::size_t>* progress,
         *progress = operations.size();
     if (!world.hasFailed())
         CHECK_AT_THE_END(world);
-    if (world.hasFailed())
-        PRINT_LADDER(world);
     world.takeDown();
     outcome.operations = interpreter.getNumberOfOperations();
     outcome.failure = world.getFailure();

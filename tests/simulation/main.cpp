@@ -2,6 +2,7 @@
 // docs/testing.md.
 #include "tests/simulation/Attempts.h"
 #include "tests/simulation/Generator.h"
+#include "tests/simulation/Ladder.h"
 #include "tests/simulation/Run.h"
 #include "tests/simulation/Shrinker.h"
 
@@ -97,12 +98,15 @@ int TELL(Operations const& operations, Ended const& ended, Arguments const& argu
     std::printf("FAILED: %s\n", ended.how.c_str());
     Operations const smallest =
         arguments.isToShrink ? Shrinker(std::chrono::seconds(50)).shrink(operations) : operations;
+    Ladder const ladder(arguments.output + ".ring");
     Ended const again = ATTEMPT(smallest, false);
     std::string const how = again.hasFailed ? again.how : ended.how;
     std::string const text = TO_TEXT(smallest, how + "\n" + remarks);
     std::ofstream(arguments.output) << text;
-    std::printf("%zu of %zu operations are left:\n\n%s\nwritten to %s; run it again with --replay\n", smallest.size(),
-                operations.size(), text.c_str(), arguments.output.c_str());
+    std::ofstream(arguments.output + ".ladder") << ladder.getText();
+    std::printf("%zu of %zu operations are left:\n\n%s\n%s\nwritten to %s and %s.ladder; run it again with --replay\n",
+                smallest.size(), operations.size(), text.c_str(), ladder.getText().c_str(), arguments.output.c_str(),
+                arguments.output.c_str());
     return 1;
 }
 
