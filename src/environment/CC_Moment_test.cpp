@@ -51,6 +51,24 @@ TEST(CC_Moment, BetweenTurnsTimeGoesOn)
     EXPECT_EQ(moments.second.turn, 0u) << "no turn has begun yet";
 }
 
+TEST(CC_Moment, TimeDoesNotGoBackBehindATurn)
+{
+    DrivenLoop loop;
+    TY::Time::SET_CLOCK(
+        [](unsigned int source) {
+            return source == TY::Time::MONOTONIC_COARSE ? TY::Time{7, 0} : TY::Time{7, 4000000};
+        });
+    CC_Moment inTurn;
+    auto* const event = new TYEvent(
+        loop, EventPrio::HIGH, [](void* moment) { *static_cast<CC_Moment*>(moment) = CC_Moment::NOW(); }, &inTurn);
+    std::ignore = event->setIfNotPending();
+    loop.turn();
+    EXPECT_EQ(inTurn.nanoseconds, 7004 * MILLISECOND);
+    EXPECT_EQ(CC_Moment::NOW().nanoseconds, 7004 * MILLISECOND) << "though the system's last tick was before";
+    TY::Time::SET_CLOCK(nullptr);
+    event->destroy();
+}
+
 TEST(CC_Moment, WithoutALoopIsNoMoment) { EXPECT_EQ(CC_Moment::NOW(), CC_Moment()); }
 
 TEST(CC_Moment, TheSystemsCoarseClockIsTheMonotonicOneOfAMomentAgo)

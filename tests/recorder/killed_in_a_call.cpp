@@ -5,7 +5,7 @@
 #include "testing/FakeModule.h"
 
 #include <csignal>
-#include <cstdio>
+#include <cstdlib>
 #include <tuple>
 
 namespace
@@ -17,9 +17,8 @@ public:
     CC_PropertyFilter* clone() const override { return new International(*this); }
     XCode apply(CC_PropertyContainer& properties) const override
     {
-        String const* const number = properties.get(Key::E164_NUMBER).get() != nullptr
-                                         ? &properties.get(Key::E164_NUMBER)->getValue()
-                                         : nullptr;
+        String const* const number =
+            properties.get(Key::E164_NUMBER).get() != nullptr ? &properties.get(Key::E164_NUMBER)->getValue() : nullptr;
         if (number == nullptr || !number->view().starts_with("0"))
             return XCode::OK;
         std::string const international = "49" + std::string(number->view().substr(1));
@@ -43,7 +42,8 @@ XCode DIAL(FakeModule& from, char const* number, QPresentationIndicator indicato
 
 int main(int count, char** values)
 {
-    if (count != 2 || !CC_Recorder::OPEN(values[1], 65536).isOk())
+    std::size_t const octets = count == 3 ? std::strtoul(values[2], nullptr, 10) : 65536;
+    if (count < 2 || !CC_Recorder::OPEN(values[1], octets).isOk())
         return 1;
     CallControlFixture callControl;
     DrivenClock clock;

@@ -32,6 +32,6 @@ tell calls "$WORK/calls.ring" '^ +1  up +[0-9.]+ s  4420 - '
 tell ladder "$WORK/calls.ring" 'leg 1 a/.* leg 2 b/'
 tell ladder "$WORK/calls.ring" 'State: .* -> CONNECTED'
 start_gateway
-stop_gateway "0 calls placed"
+stop_gateway "0 calls placed, 0 answered, 0 cleared, 0 failed"
 tell calls "$WORK/calls.ring.previous" '^ +1  up '
 finish

@@ -147,7 +147,11 @@ void TYEventLoop::runFirstEvent()
     event.removeReference();
 }
 
-void TYEventLoop::readTime() { m_turnTime = NOW(m_isInTurn ? TY::Time::MONOTONIC : TY::Time::MONOTONIC_COARSE); }
+// Between turns the coarse clock may be behind what the turn before has read; time does not go back.
+void TYEventLoop::readTime()
+{
+    m_turnTime = m_isInTurn ? NOW(TY::Time::MONOTONIC) : std::max(m_turnTime, NOW(TY::Time::MONOTONIC_COARSE));
+}
 
 void TYEventLoop::takeTurn()
 {
