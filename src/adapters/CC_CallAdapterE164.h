@@ -301,6 +301,7 @@ public:
 
 private:
     struct LastDial;
+    class NewProperties;
 
     TYPtr<LastDial> lastDialToChange();
     XCode forgetLastDial();

@@ -11,6 +11,7 @@
 #include "properties/CC_PropertyId.h"
 
 #include <tuple>
+#include <type_traits>
 #include <utility>
 
 namespace
@@ -60,9 +61,13 @@ __attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view,
                                                           CC_PropertyFilterContainer const& filters)
 {
     Attempt const attempt(*this);
-    Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view.getProperties());
-    bool const isFiltered = copy.isWhole() && filters.applyFilters(copy.get()).isOk();
-    return isFiltered && !attempt.isOver() ? WRITE(target, copy.get()) : XCode::FAILURE;
+    Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view);
+    if (!copy.isWhole() || !filters.applyFilters(copy.get()).isOk() || attempt.isOver())
+        return XCode::FAILURE;
+    if constexpr (std::is_same_v<Target, CC_CallLeg>)
+        return OK_OR_FAILURE(copy.writeTo(target));
+    else
+        return WRITE(target, copy.get());
 }
 
 template <class Target, class Written>

@@ -113,12 +113,21 @@ public:
 
 private:
     friend class CC_Call;
+    friend class CC_CallAdapter;
     struct Move;
+    using Marks = CC_PropertyContainer::Marks;
 
     ~CC_CallLeg();
-    XCode store(CC_Property const& property, bool& changed);
-    XCode storeAll(CC_PropertyContainer const& properties, XCode result);
-    XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
+    /// As `setProperties`, for who has written nearly the same before and knows that nobody has written to the leg
+    /// since: at most the marked ones differ. `marks` becomes what is to be marked the next time at least.
+    XCode setMarked(CC_PropertyContainer const& properties, Marks& marks);
+    bool storeMarked(CC_PropertyContainer const& properties, Marks& marks, CC_Flags& flags, XCode& result);
+    Marks differencesTo(CC_PropertyContainer const& properties) const;
+    XCode storeAny(CC_PropertyContainer const& properties, CC_Flags& flags);
+    XCode store(CC_Property const& property, bool& changed, bool isNew = false);
+    XCode storeAll(CC_PropertyContainer const& properties, XCode result, CC_Flags& flags);
+    XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed, bool isNew = false);
+    void markChanged(unsigned int id, CC_Flags& flags);
     void notifyPropertyChange(CC_Flags& flags);
 
     std::atomic<int> m_referenceCount{1};

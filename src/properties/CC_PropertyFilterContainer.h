@@ -55,4 +55,5 @@ private:
     XCode insert(CC_PropertyFilter* owned, unsigned int index);
 
     TYList<CC_PropertyFilter*> m_filters;
+    unsigned int m_changes = 0; // of the list: whoever walks over it finds its place again only after one
 };
