@@ -313,15 +313,16 @@ private:
     void observeCall(CC_Call& call);
     void unobserveCall();
     void updateOwnCallLeg(CC_Flags const& changed);
-    void filterOwnCallLeg(CC_PropertyFilterContainer const& filters);
+    void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
     template <class OnDifference>
-    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
-                    OnDifference const& onDifference);
+    void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
+                    CC_PropertyView::Told const& told, OnDifference const& onDifference);
     template <class OnDifference>
-    void filterView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
-                    OnDifference const& onDifference, CC_PropertyFilterContainer const& filters);
+    void filterView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
+                    CC_PropertyView::Told const& told, OnDifference const& onDifference,
+                    CC_PropertyFilterContainer const& filters);
     void mark(unsigned int id);
     bool linkPeerCallLeg();
     void unlinkPeerCallLeg();

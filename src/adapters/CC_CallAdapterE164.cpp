@@ -25,33 +25,41 @@
 #include <new>
 #include <tuple>
 
+/// Properties of a container that is new, made where they stay: storing copies costs 2 % of a call's instructions.
+class CC_CallAdapterE164::NewProperties
+{
+public:
+    /// REQUIRES: the container is empty.
+    explicit NewProperties(CC_PropertyContainer& container) : m_container(container) {}
+
+    /// No id twice. Throws std::bad_alloc when memory for the value is out.
+    template <class Property, class... Values>
+    void add(unsigned int id, Values const&... values)
+    {
+        m_areAllThere = m_container.append<Property>(id, values...) && m_areAllThere;
+    }
+    void addNumber(String const& number, QTypeOfNumber type, QNumberingPlan plan)
+    {
+        add<CC_PropertyString>(CC_PropertyId::E164_NUMBER, number);
+        add<CC_PropertyTypeOfNumber>(CC_PropertyId::TYPE_OF_NUMBER, type);
+        add<CC_PropertyNumberingPlan>(CC_PropertyId::NUMBERING_PLAN, plan);
+    }
+    void addIndicators(QPresentationIndicator presentation, QScreeningIndicator screening)
+    {
+        add<CC_PropertyPresentationIndicator>(CC_PropertyId::PRESENTATION_INDICATOR, presentation);
+        add<CC_PropertyScreeningIndicator>(CC_PropertyId::SCREENING_INDICATOR, screening);
+    }
+    void addName(String const& name) { add<CC_PropertyString>(CC_PropertyId::NAME, name); }
+    /// Otherwise memory is out.
+    bool areAllThere() const { return m_areAllThere; }
+
+private:
+    CC_PropertyContainer& m_container;
+    bool m_areAllThere = true;
+};
+
 namespace
 {
-/// Stores them in their order, up to the first that is refused; whether none was.
-template <class... Properties>
-bool SET(CC_PropertyContainer& container, Properties const&... properties)
-{
-    return (container.set(properties).isOk() && ...);
-}
-
-bool SET_NUMBER(CC_PropertyContainer& container, String const& number, QTypeOfNumber type, QNumberingPlan plan)
-{
-    return SET(container, CC_PropertyString(CC_PropertyId::E164_NUMBER, number),
-               CC_PropertyTypeOfNumber(CC_PropertyId::TYPE_OF_NUMBER, type),
-               CC_PropertyNumberingPlan(CC_PropertyId::NUMBERING_PLAN, plan));
-}
-
-bool SET_INDICATORS(CC_PropertyContainer& container, QPresentationIndicator presentation, QScreeningIndicator screening)
-{
-    return SET(container, CC_PropertyPresentationIndicator(CC_PropertyId::PRESENTATION_INDICATOR, presentation),
-               CC_PropertyScreeningIndicator(CC_PropertyId::SCREENING_INDICATOR, screening));
-}
-
-bool SET_NAME(CC_PropertyContainer& container, String const& name)
-{
-    return SET(container, CC_PropertyString(CC_PropertyId::NAME, name));
-}
-
 /// What the caller adds overrides; as much of it as memory allows.
 void MERGE(CC_PropertyContainer& container, CC_PropertyContainer const* extra)
 {
@@ -187,19 +195,19 @@ XCode CC_CallAdapterE164::dial(String const& contextName, String const& provider
     try
     {
         last = TYPtr<LastDial>(new LastDial(contextName, providerName, destination, datapathContext));
-        CC_PropertyContainer& own = last->ownProperties;
-        CC_PropertyContainer& offer = last->offerProperties;
-        CC_PropertyContainer& call = last->callProperties;
-        bool const isSet = SET_NUMBER(own, callingNumber, callingTypeOfNumber, callingNumberingPlan) &&
-                           SET_INDICATORS(own, callingPresentation, callingScreening) && SET_NAME(own, callingName) &&
-                           SET(own, CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_SENDING, !sendingComplete)) &&
-                           SET_NUMBER(offer, calledNumber, calledTypeOfNumber, calledNumberingPlan) &&
-                           SET_NAME(offer, calledName) &&
-                           SET(call,
-                               CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
-                                                                        informationTransferCapability),
-                               CC_PropertyUnsigned(CC_PropertyId::HOPS, CallControl::GET_MAX_HOPS(contextName)));
-        if (!isSet)
+        NewProperties own(last->ownProperties);
+        own.addNumber(callingNumber, callingTypeOfNumber, callingNumberingPlan);
+        own.addIndicators(callingPresentation, callingScreening);
+        own.addName(callingName);
+        own.add<CC_PropertyBoolean>(CC_PropertyId::SUPPORTS_OVERLAP_SENDING, !sendingComplete);
+        NewProperties offer(last->offerProperties);
+        offer.addNumber(calledNumber, calledTypeOfNumber, calledNumberingPlan);
+        offer.addName(calledName);
+        NewProperties call(last->callProperties);
+        call.add<CC_PropertyInformationTransferCapability>(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
+                                                           informationTransferCapability);
+        call.add<CC_PropertyUnsigned>(CC_PropertyId::HOPS, CallControl::GET_MAX_HOPS(contextName));
+        if (!own.areAllThere() || !offer.areAllThere() || !call.areAllThere())
             return forgetLastDial();
     }
     catch (std::bad_alloc const&)
@@ -242,8 +250,11 @@ XCode CC_CallAdapterE164::accept(CC_Call& call, String const& number, QTypeOfNum
     CC_PropertyContainer own;
     try
     {
-        if (!SET_NUMBER(own, number, typeOfNumber, numberingPlan) || !SET_INDICATORS(own, presentation, screening) ||
-            !SET_NAME(own, name))
+        NewProperties properties(own);
+        properties.addNumber(number, typeOfNumber, numberingPlan);
+        properties.addIndicators(presentation, screening);
+        properties.addName(name);
+        if (!properties.areAllThere())
             return XCode::FAILURE;
     }
     catch (std::bad_alloc const&)

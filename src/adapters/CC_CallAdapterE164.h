@@ -317,6 +317,7 @@ public:
 
 private:
     struct LastDial;
+    class NewProperties;
 
     TYPtr<LastDial> lastDialToChange();
     XCode forgetLastDial();

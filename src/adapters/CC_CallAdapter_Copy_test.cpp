@@ -167,6 +167,36 @@ TEST_F(CC_CallAdapter_Copy_Test, AnOutputFilterThatBringsAboutAnotherRefreshKeep
     EXPECT_EQ(a.peer(NAME) + a.peer(DISPLAY), "3last");
 }
 
+TEST_F(CC_CallAdapter_Copy_Test, WhatAFilterHasHadForWritingIsLookedAtEveryTime)
+{
+    CC_Property* kept = nullptr;
+    String text = "first";
+    a.say(NAME, "Ada");
+    for (TestLine* const line : {&a, &b})
+        line->filterOutput([](CC_PropertyContainer&) { return XCode::OK; });
+    a.filterInput(
+        [&](CC_PropertyContainer& properties)
+        {
+            String error;
+            if (isArmed && kept == nullptr)
+                kept = properties.get(NAME);
+            return kept != nullptr ? kept->setValueString(error, text) : XCode(XCode::OK);
+        });
+    for (char const* const display : {"1", "2", "3"})
+        a.say(DISPLAY, display); // from now on the copy is in step
+    isArmed = true;
+    a.say(DISPLAY, "4");
+    EXPECT_EQ(a.leg(NAME), "first");
+    text = "second"; // by the pointer alone
+    a.say(DISPLAY, "5");
+    EXPECT_EQ(a.leg(NAME) + b.peer(NAME), "secondsecond");
+    a.say(DISPLAY, "6");
+    text = "third";
+    a.say(DISPLAY, "7");
+    EXPECT_EQ(a.leg(NAME) + a.leg(DISPLAY), "third7");
+    a.endpoint.setInputFilterContainer(nullptr);
+}
+
 TEST_F(CC_CallAdapter_Copy_Test, AnIdleAdapterKeepsNothingOfWhatItsFiltersWorkedOn)
 {
     a.drop();

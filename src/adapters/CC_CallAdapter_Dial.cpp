@@ -246,14 +246,14 @@ XCode CC_CallAdapter::createOwnCallLeg()
 XCode CC_CallAdapter::startOwnCallLeg(CC_PropertyContainer& properties)
 {
     Attempt const attempt(*this);
-    if (properties.get(CC_PropertyId::NETWORK) == nullptr &&
-        !properties.set(CC_PropertyString(CC_PropertyId::NETWORK, m_endpoint->getNetwork())).isOk())
+    if (properties.find(CC_PropertyId::NETWORK) == nullptr &&
+        !properties.append<CC_PropertyString>(CC_PropertyId::NETWORK, m_endpoint->getNetwork()))
         return XCode::FAILURE;
     if (attempt.isOver())
         return XCode::FAILURE;
     auto const id = static_cast<std::uint32_t>(reinterpret_cast<std::uintptr_t>(m_ownCallLeg));
-    if (properties.get(CC_PropertyId::CALL_LEG_ID) == nullptr &&
-        !properties.set(CC_PropertyUnsigned(CC_PropertyId::CALL_LEG_ID, id)).isOk())
+    if (properties.find(CC_PropertyId::CALL_LEG_ID) == nullptr &&
+        !properties.append<CC_PropertyUnsigned>(CC_PropertyId::CALL_LEG_ID, id))
         return XCode::FAILURE;
     XCode const written = writeFirstProperties(properties);
     if (!written.isOk() || attempt.isOver() || !m_ownCallLeg->addCallLegObserver(this).isOk())

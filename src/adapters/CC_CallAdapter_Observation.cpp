@@ -164,20 +164,22 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
             m_ownView.assign(leg.getProperties(), told);
         return;
     }
-    filterOwnCallLeg(*filters);
+    filterOwnCallLeg(changed, *filters);
 }
 
 /// Apart, so that a call without filters does not pay for it.
-__attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_PropertyFilterContainer const& filters)
+__attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& changed,
+                                                                CC_PropertyFilterContainer const& filters)
 {
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
-    Copy const copy(attempt, *this, Kept::OWN_OUTPUT, m_ownCallLeg->getProperties());
+    CC_CallLeg const& leg = *m_ownCallLeg;
+    Copy const copy(attempt, *this, Kept::OWN_OUTPUT, leg.getProperties(), leg.getSerial(), TOLD(leg, &changed));
     if (!copy.isWhole())
         return;
     XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
-        m_ownView.assign(copy.get(), {});
+        m_ownView.assignMarked(copy.get(), copy.settle(), 0);
 }
 
 /// `changed`: the ids of which the peer tells; null when the peer is another.
@@ -192,19 +194,20 @@ void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
             m_isPeerToBeChosen = true; // when the state itself is told, its fall does not show any more
         mark(id);
     };
-    updateView(m_peerView, m_peerCallLeg->getProperties(), TOLD(*m_peerCallLeg, changed), onDifference);
+    updateView(m_peerView, m_peerCallLeg->getProperties(), m_peerCallLeg->getSerial(), TOLD(*m_peerCallLeg, changed),
+               onDifference);
 }
 
 void CC_CallAdapter::updateCall()
 {
     if (CC_Call const* const call = getCall())
-        updateView(m_callView, call->getProperties(), {}, [this](unsigned int id) { mark(id); });
+        updateView(m_callView, call->getProperties(), 0, {}, [this](unsigned int id) { mark(id); });
 }
 
 /// Brings a view up to date with its source and tells the ids that differ. When a filter brings about another refresh,
 /// that one is the later.
 template <class OnDifference>
-void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source,
+void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
                                 CC_PropertyView::Told const& told, OnDifference const& onDifference)
 {
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
@@ -213,22 +216,23 @@ void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer cons
         view.follow(source, told, onDifference);
         return;
     }
-    filterView(view, source, told, onDifference, *filters);
+    filterView(view, source, serial, told, onDifference, *filters);
 }
 
 template <class OnDifference>
-__attribute__((noinline)) void
-CC_CallAdapter::filterView(CC_PropertyView& view, CC_PropertyContainer const& source, CC_PropertyView::Told const& told,
-                           OnDifference const& onDifference, CC_PropertyFilterContainer const& filters)
+__attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view, CC_PropertyContainer const& source,
+                                                          unsigned long long serial, CC_PropertyView::Told const& told,
+                                                          OnDifference const& onDifference,
+                                                          CC_PropertyFilterContainer const& filters)
 {
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
-    Copy const copy(attempt, *this, &view == &m_peerView ? Kept::PEER_OUTPUT : Kept::CALL_OUTPUT, source);
+    Copy const copy(attempt, *this, &view == &m_peerView ? Kept::PEER_OUTPUT : Kept::CALL_OUTPUT, source, serial, told);
     if (!copy.isWhole())
         return; // memory is out: better the view of before than one that calls what is there gone
     std::ignore = filters.applyFilters(copy.get()); // what the filters leave is what the module sees
     if (!attempt.isOver() && refresh == m_refreshes)
-        view.follow(copy.get(), {nullptr, told.number}, onDifference);
+        view.followMarked(copy.get(), copy.settle(), told.number, onDifference);
 }
 
 void CC_CallAdapter::mark(unsigned int id)

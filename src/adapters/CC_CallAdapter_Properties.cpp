@@ -13,6 +13,7 @@
 #include "recorder/CC_RecordWriter.h"
 
 #include <tuple>
+#include <type_traits>
 #include <utility>
 
 namespace
@@ -65,9 +66,13 @@ __attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view,
     Attempt const attempt(*this);
     CC_FilterNotes notes;
     CC_Writing const throughFilters(notes);
-    Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view.getProperties());
-    bool const isFiltered = copy.isWhole() && filters.applyFilters(copy.get()).isOk();
-    return isFiltered && !attempt.isOver() ? WRITE(target, copy.get()) : XCode::FAILURE;
+    Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view);
+    if (!copy.isWhole() || !filters.applyFilters(copy.get()).isOk() || attempt.isOver())
+        return XCode::FAILURE;
+    if constexpr (std::is_same_v<Target, CC_CallLeg>)
+        return OK_OR_FAILURE(copy.writeTo(target));
+    else
+        return WRITE(target, copy.get());
 }
 
 template <class Target, class Written>

@@ -52,6 +52,8 @@ bool LOG_PROPERTY(String const& legName, CC_Property const& property)
     return true;
 }
 
+bool IS_LOGGED() { return CC_Monitor::FOR(RTD::LEVEL_CHANGE) != nullptr; }
+
 using State = CC_PropertyCallLegState;
 
 bool IS_RELEASED(CC_Property const& property)
@@ -134,10 +136,11 @@ XCode CC_CallLeg::setPropertyNoNotification(CC_Property const& property, bool& c
     return store(property, changed);
 }
 
-XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
+/// `isNew`: there is none of that id, and nobody was called since that was known.
+XCode CC_CallLeg::store(CC_Property const& property, bool& changed, bool isNew)
 {
     changed = false;
-    CC_Property* stored = m_properties.get(property.getId());
+    CC_Property* stored = isNew ? nullptr : m_properties.find(property.getId());
     if (stored != nullptr && stored->isEqual(property))
         return XCode::OK;
     auto const isLeftOut = [&]
@@ -146,7 +149,7 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
         return XCode::OK;
     if (LOG_PROPERTY(m_name, property) || !m_properties.isSelfContained())
     {
-        stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
+        stored = m_properties.find(property.getId()); // a monitor is the host's code, a comparison maybe a module's
         if (isLeftOut())
             return XCode::OK; // let go meanwhile
     }
@@ -202,10 +205,10 @@ __attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property* stored,
 XCode CC_CallLeg::replaceOfAnyKind(CC_Property const& property)
 {
     unsigned int const id = property.getId();
-    CC_PropertyBrief const before(m_properties.get(id));
-    if (!m_properties.replace(m_properties.get(id), property).isOk())
+    CC_PropertyBrief const before(m_properties.find(id));
+    if (!m_properties.replace(m_properties.find(id), property).isOk())
         return XCode::REFUSED;
-    before.recordChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, m_properties.get(id));
+    before.recordChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, m_properties.find(id));
     return XCode::OK;
 }
 
@@ -226,30 +229,110 @@ XCode CC_CallLeg::setProperty(CC_Property const& property)
 XCode CC_CallLeg::setProperties(CC_PropertyContainer const& properties)
 {
     Reference const self(*this);
+    CC_Flags flags;
+    XCode const result = storeAny(properties, flags);
+    notifyPropertyChange(flags);
+    return result;
+}
+
+XCode CC_CallLeg::setMarked(CC_PropertyContainer const& properties, Marks& marks)
+{
+    Reference const self(*this);
+    CC_Flags flags;
+    XCode result = XCode::OK;
+    if (!storeMarked(properties, marks, flags, result))
+    {
+        result = storeAny(properties, flags);
+        marks = differencesTo(properties);
+    }
+    notifyPropertyChange(flags);
+    return result;
+}
+
+/// Whether the leg and the properties have the same ids at the marked places, and nobody is called; otherwise nothing,
+/// or not all, is stored.
+bool CC_CallLeg::storeMarked(CC_PropertyContainer const& properties, Marks& marks, CC_Flags& flags, XCode& result)
+{
+    if (marks == CC_PropertyContainer::ALL_MARKED || IS_LOGGED() || CC_RecordWriter::ON() != nullptr ||
+        !m_properties.isSelfContained() || !properties.isSelfContained() ||
+        properties.getNumberOfProperties() != m_properties.getNumberOfProperties())
+        return false;
+    unsigned int differing = 0;
+    CC_Property const* state = nullptr;
+    auto const storeNext = [&](CC_Property& stored, CC_Property const& property, unsigned int mark)
+    {
+        CC_PropertyKind const* const kind = CC_PropertyKind::OF_BOTH(stored, property);
+        if (kind == nullptr)
+            return false; // the long way knows what to do with another class
+        if (kind->isEqual(stored, property))
+            return true;
+        differing |= mark;
+        if (property.getId() == CC_PropertyId::STATE)
+            state = &property;
+        else if (kind->assign(stored, property))
+            markChanged(property.getId(), flags);
+        else if (result.isOk())
+            result = XCode::REFUSED;
+        return true;
+    };
+    if (!m_properties.forEachMarked(properties, marks, storeNext))
+        return false;
+    bool changed = false;
+    if (state != nullptr)
+        if (XCode const stored = storeAndMark(*state, flags, changed); result.isOk())
+            result = stored;
+    marks = static_cast<Marks>(differing);
+    return true;
+}
+
+/// What is to be compared the next time, after all was written: everything, unless both have the same order.
+CC_CallLeg::Marks CC_CallLeg::differencesTo(CC_PropertyContainer const& properties) const
+{
+    if (!m_properties.isSelfContained() || !properties.isSelfContained() ||
+        properties.getNumberOfProperties() != m_properties.getNumberOfProperties())
+        return CC_PropertyContainer::ALL_MARKED;
+    unsigned int differing = 0;
+    auto const compare = [&](CC_Property const& stored, CC_Property const& property, unsigned int mark)
+    {
+        if (!stored.isEqual(property))
+            differing |= mark;
+        return true;
+    };
+    bool const areAlike = m_properties.forEachMarked(properties, CC_PropertyContainer::ALL_MARKED, compare);
+    return areAlike ? static_cast<Marks>(differing) : CC_PropertyContainer::ALL_MARKED;
+}
+
+XCode CC_CallLeg::storeAny(CC_PropertyContainer const& properties, CC_Flags& flags)
+{
     if (m_properties.takesUndisturbed(properties))
-        return storeAll(properties, XCode::OK);
+        return storeAll(properties, XCode::OK, flags);
     CC_PropertyContainer kept; // a module's classes may change or end the given ones meanwhile
     XCode const isWhole = kept.copy(properties);
-    return storeAll(kept, isWhole.isOk() ? XCode::OK : XCode::REFUSED);
+    return storeAll(kept, isWhole.isOk() ? XCode::OK : XCode::REFUSED, flags);
 }
 
 /// `result`: that of what was done before.
-XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result)
+XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result, CC_Flags& flags)
 {
     CC_RecordWriter::Batch const together;
-    CC_Flags flags;
     CC_Property const* state = nullptr;
     // nearly all that come through filters are known; of the first ones none is, and need not be looked for twice
     CC_PropertyContainer::Cursor formers(m_properties);
     auto const areOurs = [&] { return m_properties.isSelfContained() && properties.isSelfContained(); };
     bool areKnown = properties.getNumberOfProperties() <= m_properties.getNumberOfProperties() && areOurs();
+    bool const areFirst = !areKnown && !IS_LOGGED(); // who logs may write to the leg
+    CC_PropertyContainer::Met ids;                   // of the leg
+    if (areFirst)
+        for (CC_Property const& property : m_properties)
+            std::ignore = ids.meets(property.getId());
     auto const storeNext = [&](CC_Property const& property)
     {
         CC_Property const* const former = areKnown ? formers.find(property.getId()) : nullptr;
         if (former != nullptr && former->isEqual(property))
             return;
         bool changed = false;
-        if (XCode const stored = storeAndMark(property, flags, changed); result.isOk())
+        bool const isNew = areFirst && !ids.meets(property.getId()) && areOurs();
+        if (XCode const stored = storeAndMark(property, flags, changed, isNew); result.isOk())
             result = stored;
         areKnown = former != nullptr && areOurs();
         formers = CC_PropertyContainer::Cursor(m_properties); // who logs it may have written to the leg
@@ -263,23 +346,26 @@ XCode CC_CallLeg::storeAll(CC_PropertyContainer const& properties, XCode result)
     }
     if (state != nullptr)
         storeNext(*state);
-    notifyPropertyChange(flags);
     return result;
 }
 
 /// Stores one property and marks it in the flags if it changed.
-XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed)
+XCode CC_CallLeg::storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed, bool isNew)
 {
-    XCode const result = store(property, changed);
-    if (!changed)
-        return result;
-    bool const isTold = flags.set(property.getId(), true).isOk();
+    XCode const result = store(property, changed, isNew);
+    if (changed)
+        markChanged(property.getId(), flags);
+    return result;
+}
+
+void CC_CallLeg::markChanged(unsigned int id, CC_Flags& flags)
+{
+    bool const isTold = flags.set(id, true).isOk();
     if (!isTold)
         m_mayChangeUntold = true;
     // a change that memory keeps from being told must not keep the call from being cleaned up
     if ((!isTold || m_isMissedByCall) && m_call != nullptr)
         m_call->defer();
-    return result;
 }
 
 /// Hands the flags over: a copy could lack memory, and the call must hear of a State.

@@ -125,12 +125,23 @@ public:
 
 private:
     friend class CC_Call;
+    friend class CC_CallAdapter;
     friend class CC_Inside;
     friend class TYInstances<CC_CallLeg>;
     struct Move;
+    using Marks = CC_PropertyContainer::Marks;
 
     ~CC_CallLeg();
-    XCode store(CC_Property const& property, bool& changed);
+    /// As `setProperties`, for who has written nearly the same before and knows that nobody has written to the leg
+    /// since: at most the marked ones differ. `marks` becomes what is to be marked the next time at least.
+    XCode setMarked(CC_PropertyContainer const& properties, Marks& marks);
+    bool storeMarked(CC_PropertyContainer const& properties, Marks& marks, CC_Flags& flags, XCode& result);
+    Marks differencesTo(CC_PropertyContainer const& properties) const;
+    XCode storeAny(CC_PropertyContainer const& properties, CC_Flags& flags);
+    XCode store(CC_Property const& property, bool& changed, bool isNew = false);
+    XCode storeAll(CC_PropertyContainer const& properties, XCode result, CC_Flags& flags);
+    XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed, bool isNew = false);
+    void markChanged(unsigned int id, CC_Flags& flags);
     int findState() const;
     bool isActive() const { return getState() >= 0; } // from DISCONNECTING on
     XCode replaceState(CC_Property* stored, CC_Property const& property);
@@ -140,8 +151,6 @@ private:
     void tell(CC_Flags& flags);
     void tellRecorded(CC_Flags& flags);
     unsigned long long getCallSerial() const;
-    XCode storeAll(CC_PropertyContainer const& properties, XCode result);
-    XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed);
     void notifyPropertyChange(CC_Flags& flags);
 
     static TYInstances<CC_CallLeg> s_instances;

@@ -11,10 +11,10 @@ namespace
 unsigned int s_infoDepth = 0;                  // of all containers' dumps
 constexpr unsigned int MOST_REMOVALS = 100000; // of one `clear`, should ending properties always bring others
 
+/// REQUIRES: the same id.
 bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
 {
-    CC_PropertyKind const* const kind =
-        stored.getId() == property.getId() ? CC_PropertyKind::OF_BOTH(stored, property) : nullptr;
+    CC_PropertyKind const* const kind = CC_PropertyKind::OF_BOTH(stored, property);
     return kind != nullptr && kind->assign(stored, property);
 }
 } // namespace
@@ -89,7 +89,8 @@ CC_PropertyContainer& CC_PropertyContainer::operator=(CC_PropertyContainer const
         return *this;
     if (m_isSelfContained && other.m_isSelfContained)
     {
-        takeOver(other);
+        markAll();
+        std::ignore = takeOver(other);
         return *this;
     }
     std::ignore = copy(other); // what memory refuses is missing
@@ -110,30 +111,79 @@ XCode CC_PropertyContainer::copy(CC_PropertyContainer const& other)
     return self.isAlive() ? result : XCode::FAILURE;
 }
 
-/// The same where nobody is called, who could tell it from all being deleted and copied anew.
-void CC_PropertyContainer::takeOver(CC_PropertyContainer const& other)
+bool CC_PropertyContainer::takeMarked(CC_PropertyContainer const& other, Marks marks)
 {
+    auto const takeOne = [](CC_Property& stored, CC_Property const& source, unsigned int)
+    { return IS_MADE_A_COPY(stored, source); };
+    return marks != ALL_MARKED && m_properties.getCount() == other.m_properties.getCount() &&
+           forEachMarked(other, marks, takeOne);
+}
+
+/// The same where nobody is called, who could tell it from all being deleted and copied anew.
+unsigned int CC_PropertyContainer::takeOver(CC_PropertyContainer const& other)
+{
+    unsigned int kept = 0;
     Position stored = m_properties.begin();
     Position source = other.m_properties.begin();
-    while (stored != m_properties.end() && source != other.m_properties.end() && IS_MADE_A_COPY(*stored, *source))
+    while (stored != m_properties.end() && source != other.m_properties.end() && stored->getId() == source->getId() &&
+           IS_MADE_A_COPY(*stored, *source))
     {
         ++stored;
         ++source;
+        ++kept;
     }
     removeFrom(stored);
     for (; source != other.m_properties.end(); ++source)
         std::ignore = appendCopy(*source); // what memory refuses is missing
+    return kept;
 }
 
-CC_Property* CC_PropertyContainer::get(unsigned int id) { return find(id); }
+CC_PropertyContainer::Marks CC_PropertyContainer::findMark(unsigned int id) const
+{
+    unsigned int index = 0;
+    for (CC_Property const& property : m_properties)
+    {
+        if (property.getId() == id)
+            return MARK_AT(index);
+        ++index;
+    }
+    return 0;
+}
+
+CC_Property* CC_PropertyContainer::get(unsigned int id)
+{
+    unsigned int index = 0;
+    for (CC_Property& property : m_properties)
+    {
+        if (property.getId() == id)
+        {
+            mark(MARK_AT(index));
+            return &property;
+        }
+        ++index;
+    }
+    return nullptr;
+}
 
 CC_Property const* CC_PropertyContainer::get(unsigned int id) const { return find(id); }
 
-CC_Property* CC_PropertyContainer::getByIndex(unsigned int index) { return findByIndex(index); }
+CC_Property* CC_PropertyContainer::getByIndex(unsigned int index)
+{
+    CC_Property* const property = findByIndex(index);
+    if (property != nullptr)
+        mark(MARK_AT(index));
+    return property;
+}
 
 CC_Property const* CC_PropertyContainer::getByIndex(unsigned int index) const { return findByIndex(index); }
 
-XCode CC_PropertyContainer::set(CC_Property const& property) { return replace(find(property.getId()), property); }
+XCode CC_PropertyContainer::set(CC_Property const& property)
+{
+    CC_Property* const stored = get(property.getId()); // which marks it
+    if (stored == nullptr)
+        markAll();
+    return replace(stored, property);
+}
 
 XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& property)
 {
@@ -233,12 +283,14 @@ void CC_PropertyContainer::take(CC_PropertyContainer& other)
         if ((property.getId() & ALL_GROUPS) != 0)
             other.m_properties.moveTo(m_properties, property);
     }
+    markAll();
     m_isSelfContained = m_isSelfContained && other.m_isSelfContained;
     m_hasForeign = m_hasForeign || other.m_hasForeign;
 }
 
 bool CC_PropertyContainer::remove(unsigned int id)
 {
+    markAll();
     CC_Property* const property = find(id);
     if (property != nullptr)
         m_properties.remove(*property);
@@ -247,6 +299,7 @@ bool CC_PropertyContainer::remove(unsigned int id)
 
 bool CC_PropertyContainer::removeByIndex(unsigned int index)
 {
+    markAll();
     CC_Property* const property = findByIndex(index);
     if (property != nullptr)
         m_properties.remove(*property);

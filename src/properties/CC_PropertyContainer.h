@@ -7,7 +7,9 @@
 #include "properties/CC_Property.h"
 #include "properties/CC_PropertyKey.h"
 
+#include <bit>
 #include <cstddef>
+#include <cstdint>
 #include <iterator>
 #include <new>
 #include <tuple>
@@ -122,7 +124,11 @@ public:
     /// In order. Adding properties does not disturb a walk, removing the one it stands on does. @{
     ConstIterator begin() const { return ConstIterator(m_properties.begin()); }
     ConstIterator end() const { return ConstIterator(m_properties.end()); }
-    Iterator begin() { return Iterator(m_properties.begin()); }
+    Iterator begin()
+    {
+        markAll();
+        return Iterator(m_properties.begin());
+    }
     Iterator end() { return Iterator(m_properties.end()); }
     /// @}
 
@@ -153,6 +159,7 @@ public:
     /// Deletes all properties.
     void clear()
     {
+        markAll();
         if (m_isSelfContained)
             m_properties.clear();
         else
@@ -171,10 +178,83 @@ private:
     // what the library does with containers of its own
     friend class CC_Call;
     friend class CC_CallAdapter;
+    friend class CC_CallAdapterE164;
     friend class CC_CallLeg;
     friend class CC_PropertyView;
+    friend class CC_PropertyWorkingCopy;
     class Walk;
     using Position = LinkedListManager<CC_Property>::Iterator;
+
+    /// Positions as bits, the last bit for all from there on; all of them: whatever may have changed, the ids as well.
+    using Marks = std::uint16_t;
+    static constexpr Marks ALL_MARKED = 0xffff;
+    static constexpr Marks LAST_MARK = 0x8000;
+    static constexpr Marks MARK_AT(unsigned int index)
+    {
+        return index < 15 ? static_cast<Marks>(1U << index) : LAST_MARK;
+    }
+    /// What was added, removed, stored or handed out for writing since the marks were last taken. Whoever writes in
+    /// another way marks it, unless nobody takes the marks of that container.
+    Marks takeMarks() { return std::exchange(m_marks, Marks{0}); }
+    void mark(Marks marks) { m_marks = static_cast<Marks>(m_marks | marks); }
+    void markAll() { m_marks = ALL_MARKED; }
+    /// Calls `visit(ours, theirs, mark)` for the marked positions of two containers, as long as that returns true and
+    /// both have the same id there; whether that was always so. REQUIRES: they have the same number of properties.
+    template <class Visit>
+    bool forEachMarked(CC_PropertyContainer const& other, Marks marks, Visit const& visit) const
+    {
+        Position ours = m_properties.begin();
+        Position theirs = other.m_properties.begin();
+        unsigned int const count = m_properties.getCount();
+        unsigned int index = 0;
+        auto const goTo = [&](unsigned int next)
+        {
+            for (; index < next; ++index)
+            {
+                ++ours;
+                ++theirs;
+            }
+        };
+        auto const visitHere = [&]
+        { return ours->getId() == theirs->getId() && visit(*ours, *theirs, MARK_AT(index)); };
+        for (unsigned int rest = marks; rest != 0; rest &= rest - 1)
+        {
+            auto const next = static_cast<unsigned int>(std::countr_zero(rest));
+            if (next >= count)
+                return true;
+            goTo(next);
+            if (!visitHere())
+                return false;
+        }
+        for (unsigned int next = index + 1; (marks & LAST_MARK) != 0 && next < count; ++next)
+        {
+            goTo(next);
+            if (!visitHere())
+                return false;
+        }
+        return true;
+    }
+    /// The mark of the property of that id, 0 if there is none.
+    Marks findMark(unsigned int id) const;
+
+    /// Ids that were met. It may say so of one that was not; nearly all others need not be looked for.
+    class Met
+    {
+    public:
+        /// From now on it was; whether it was before.
+        bool meets(unsigned int id)
+        {
+            unsigned int const bit = 1U << INDEX(id);
+            bool const isMet = (m_bits & bit) != 0;
+            m_bits |= bit;
+            return isMet;
+        }
+
+    private:
+        /// Such that the ids which most legs have do not meet.
+        static constexpr unsigned int INDEX(unsigned int id) { return (id ^ (id >> 8)) % 32; }
+        unsigned int m_bits = 0;
+    };
 
     /// Finds properties that are asked for in nearly the order in which they are stored, as they are in two containers
     /// of which one follows the other: the property behind the one found last is looked at first.
@@ -208,13 +288,15 @@ private:
         Position m_next;
     };
 
-    /// Makes a property of the library's own at the end, for who knows that there is none of its id. Without memory
-    /// there is none afterwards either.
+    /// Makes a self-contained property at the end, for who knows that there is none of its id, and marks nothing;
+    /// whether memory sufficed.
     template <class Property, class... Values>
-    void append(unsigned int id, Values const&... values)
+    bool append(unsigned int id, Values const&... values)
     {
-        if (auto* const made = new (std::nothrow) Property(id, values...))
+        auto* const made = new (std::nothrow) Property(id, values...);
+        if (made != nullptr)
             std::ignore = m_properties.append(made); // it is in no list
+        return made != nullptr;
     }
     /// Tells who has called a module's class whether the container still exists. On the stack; one thread only. Where
     /// all are self-contained nobody watches, and nobody pays.
@@ -241,7 +323,8 @@ private:
     /// A copy that stays as it is, whatever happens to the other, and whether it is whole.
     [[gnu::noinline]] XCode copy(CC_PropertyContainer const& other);
 
-    /// As `set`, for who has looked the property up: `stored` is what `get` gave for its id, null included.
+    /// As `set`, for who has looked the property up, but marks nothing: `stored` is what was found by its id, null
+    /// included.
     XCode replace(CC_Property* stored, CC_Property const& property);
     /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.
     void take(CC_PropertyContainer& other);
@@ -249,8 +332,8 @@ private:
     CC_Property* find(unsigned int id) const;
     CC_Property* findByIndex(unsigned int index) const;
 
-    /// As `set` for an id that is not there; whether memory sufficed. REQUIRES: the property is of our own classes; who
-    /// appends one that is not self-contained notes it.
+    /// As `set` for an id that is not there, but marks nothing; whether memory sufficed. REQUIRES: the property is of
+    /// our own classes; who appends one that is not self-contained notes it.
     bool appendCopy(CC_Property const& property)
     {
         CC_Property* const copy = property.clone();
@@ -258,7 +341,12 @@ private:
             std::ignore = m_properties.append(copy); // it is in no list
         return copy != nullptr;
     }
-    void takeOver(CC_PropertyContainer const& other);
+    /// Makes a copy of the other, in which at most the marked ones differ, a whole one again, and whether that was all.
+    /// Otherwise anything may differ. REQUIRES: both are self-contained.
+    bool takeMarked(CC_PropertyContainer const& other, Marks marks);
+    /// Makes it a copy of the other; how many at the beginning are the objects that they were before. REQUIRES: as
+    /// above.
+    unsigned int takeOver(CC_PropertyContainer const& other);
     [[gnu::noinline]] XCode appendForeign(CC_Property const& property);
     [[gnu::noinline]] void clearOfAnyKind();
     [[gnu::noinline]] XCode setDisturbed(CC_PropertyContainer const& other, unsigned int mask);
@@ -266,6 +354,7 @@ private:
 
     LinkedListManager<CC_Property> m_properties;
     bool m_isSelfContained = true;
-    bool m_hasForeign = false;        // properties of a module's class, or had once
-    mutable bool m_isWatched = false; // or was once
+    bool m_hasForeign : 1 = false;        // properties of a module's class, or had once
+    mutable bool m_isWatched : 1 = false; // or was once
+    Marks m_marks = 0;                    // with them the object is no larger than without
 };

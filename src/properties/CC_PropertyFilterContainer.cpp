@@ -62,6 +62,7 @@ void CC_PropertyFilterContainer::removeFilter(unsigned int index)
     if (element == nullptr)
         return;
     CC_PropertyFilter const* const removed = element->getValue();
+    ++m_changes;
     m_filters.remove(element);
     delete removed;
 }
@@ -192,8 +193,15 @@ void CC_PropertyFilterContainer::forEach(Visit const& visit) const
     unsigned int index = 0;
     for (Element const* element = m_filters.getFirst(); element != nullptr;)
     {
+        unsigned int const changes = m_changes;
         if (element->getValue() != nullptr)
             visit(*element->getValue());
+        if (m_changes == changes)
+        {
+            ++index;
+            element = element->getNext();
+            continue;
+        }
         unsigned int place = 0;
         Element const* found = m_filters.getFirst();
         for (; found != nullptr && found != element; found = found->getNext())
@@ -223,6 +231,7 @@ CC_PropertyFilterContainer::Element* CC_PropertyFilterContainer::find(unsigned i
 /// Takes the filter over, also when it fails.
 XCode CC_PropertyFilterContainer::insert(CC_PropertyFilter* owned, unsigned int index)
 {
+    ++m_changes;
     Element* const added = m_filters.append(nullptr);
     if (added == nullptr)
     {

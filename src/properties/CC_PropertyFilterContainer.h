@@ -59,4 +59,5 @@ private:
     XCode applyRecorded(CC_PropertyContainer& properties, CC_FilterNotes* notes) const;
 
     TYList<CC_PropertyFilter*> m_filters;
+    unsigned int m_changes = 0; // of the list: whoever walks over it finds its place again only after one
 };

@@ -20,13 +20,15 @@ XCode CC_PropertyView::write(CC_PropertyContainer const& properties)
     return m_properties.set(properties);
 }
 
+bool CC_PropertyView::ASSIGN_ONE(CC_Property& former, CC_Property const& current)
+{
+    CC_PropertyKind const* const kind = CC_PropertyKind::OF_BOTH(former, current);
+    return kind != nullptr && kind->isSelfContained && kind->assign(former, current);
+}
+
 void CC_PropertyView::assign(CC_PropertyContainer const& source, Told const& told)
 {
-    auto const take = [](CC_Property& former, CC_Property const& current)
-    {
-        CC_PropertyKind const* const kind = CC_PropertyKind::OF_BOTH(former, current);
-        return kind != nullptr && kind->isSelfContained && kind->assign(former, current);
-    };
+    auto const take = [](CC_Property& former, CC_Property const& current) { return ASSIGN_ONE(former, current); };
     if (takeChanged(source, told, take))
         return;
     bool const isUndisturbed = m_properties.isSelfContained() && source.isSelfContained();
@@ -36,6 +38,14 @@ void CC_PropertyView::assign(CC_PropertyContainer const& source, Told const& tol
     m_properties = source; // a module's class may destroy us meanwhile
     if (isUndisturbed && m_properties.getNumberOfProperties() == source.getNumberOfProperties())
         m_inStepWith = &source;
+}
+
+void CC_PropertyView::assignMarked(CC_PropertyContainer const& copy, CC_PropertyContainer::Marks marks,
+                                   unsigned int number)
+{
+    auto const take = [](CC_Property& former, CC_Property const& current) { return ASSIGN_ONE(former, current); };
+    if (!takeMarked(copy, marks, number, take))
+        assign(copy, {nullptr, number});
 }
 
 bool CC_PropertyView::hasAllOfOwnKinds(CC_PropertyContainer const& copy, CC_PropertyContainer const& source)

@@ -33,6 +33,8 @@ public:
     bool hasHeard(unsigned int number) const { return m_lastHeard == number; }
     /// Empties the copy, which is in step with no source then.
     void clear();
+    /// What may have changed since this was asked last.
+    CC_PropertyContainer::Marks takeMarks() { return m_properties.takeMarks(); }
 
     /// Stores into the view alone, as the container's `set` does; the source may or may not follow. @{
     XCode write(CC_Property const& property);
@@ -56,6 +58,9 @@ public:
 
     /// Makes the view a copy of the source.
     void assign(CC_PropertyContainer const& source, Told const& told);
+    /// The same for a copy that filters have worked on, in which at most the marked ones have changed since it was
+    /// followed last.
+    void assignMarked(CC_PropertyContainer const& copy, CC_PropertyContainer::Marks marks, unsigned int number);
 
     /// Takes over what differs from the source and calls `onDifference(id)` for each id that does, in the source's
     /// order, and after these for what the source no longer has. Properties that stay keep their place.
@@ -67,8 +72,24 @@ public:
         if (!takeChanged(source, told, take) && !takeAll(source, told, take, onDifference))
             followCopy(source, onDifference);
     }
+    /// The same for a copy that filters have worked on, in which at most the marked ones have changed since it was
+    /// followed last.
+    template <class OnDifference>
+    void followMarked(CC_PropertyContainer const& copy, CC_PropertyContainer::Marks marks, unsigned int number,
+                      OnDifference&& onDifference)
+    {
+        auto const take = [&](CC_Property& former, CC_Property const& current)
+        { return takeOne(former, current, onDifference); };
+        if (takeMarked(copy, marks, number, take))
+            return;
+        bool const areOurs = copy.isSelfContained() && m_properties.isSelfContained(); // else it may destroy us
+        follow(copy, {nullptr, number}, onDifference);
+        if (areOurs)
+            stayInStepWith(copy);
+    }
 
 private:
+    using Container = CC_PropertyContainer;
     static constexpr unsigned int NONE = CC_Flags::NONE;
 
     /// Whether all that can differ is known, in both, and was taken by `take(former, current)`.
@@ -80,15 +101,57 @@ private:
         m_lastHeard = told.number;
         auto const takeOne = [&](unsigned int id)
         {
-            CC_Property* const former = m_properties.get(id);
-            CC_Property const* const current = source.get(id);
+            CC_Property* const former = m_properties.find(id);
+            CC_Property const* const current = source.find(id);
             return former != nullptr && current != nullptr && take(*former, *current);
         };
         if (!told.ids->forEachSet(takeOne))
             return false;
+        m_properties.markAll();
         unsigned int const written = std::exchange(m_written, NONE);
         return written == NONE || told.ids->get(written) || takeOne(written);
     }
+
+    /// Whether the view was written from the copy last, and those that can differ were taken by
+    /// `take(former, current)`.
+    template <class Take>
+    bool takeMarked(Container const& copy, Container::Marks marks, unsigned int number, Take const& take)
+    {
+        if (m_inStepWith != &copy || marks == Container::ALL_MARKED || !areAlike(copy))
+            return false;
+        m_lastHeard = number;
+        unsigned int written = std::exchange(m_written, NONE);
+        auto const takeOne = [&](CC_Property& former, CC_Property const& current, unsigned int)
+        {
+            if (current.getId() == written)
+                written = NONE;
+            return take(former, current);
+        };
+        m_properties.mark(marks);
+        if (!m_properties.forEachMarked(copy, marks, takeOne))
+            return false;
+        if (written == NONE)
+            return true;
+        Container::Marks const mark = m_properties.findMark(written);
+        m_properties.mark(mark);
+        return mark != 0 && m_properties.forEachMarked(copy, mark, takeOne);
+    }
+
+    /// Whether both are as many, and nobody is called when they are compared, assigned or ended.
+    bool areAlike(Container const& copy) const
+    {
+        return copy.isSelfContained() && m_properties.isSelfContained() &&
+               copy.getNumberOfProperties() == m_properties.getNumberOfProperties();
+    }
+    /// After all was taken from the copy: only as long as both have the same order can they be told apart by marks.
+    void stayInStepWith(Container const& copy)
+    {
+        auto const isThere = [](CC_Property const&, CC_Property const&, unsigned int) { return true; };
+        if (!areAlike(copy) || !m_properties.forEachMarked(copy, Container::ALL_MARKED, isThere))
+            m_inStepWith = nullptr;
+    }
+
+    static bool ASSIGN_ONE(CC_Property& former, CC_Property const& current);
 
     /// Whether both are of our own classes, so that nothing but the value has changed by now.
     template <class OnDifference>
@@ -115,12 +178,16 @@ private:
         m_inStepWith = &source;
         m_lastHeard = told.number;
         m_written = NONE;
+        m_properties.markAll();
         unsigned int kept = 0;
         bool const isSelfContained = source.isSelfContained();
-        CC_PropertyContainer::Cursor formers(m_properties);
+        bool const isFirst = m_properties.isEmpty(); // then nobody need be looked for
+        Container::Met met;
+        Container::Cursor formers(m_properties);
         for (CC_Property const& current : source)
         {
-            CC_Property* const former = formers.find(current.getId());
+            unsigned int const id = current.getId();
+            CC_Property* const former = isFirst && !met.meets(id) ? nullptr : formers.find(id);
             if (former != nullptr)
             {
                 if (!take(*former, current))
