@@ -31,12 +31,22 @@ bool IS_LIVE(CC_Call const& call)
     return false;
 }
 
-/// A leg that a call lists says so, too.
+/// A leg that a call lists says so, too, and the call's state is that of its legs.
 void CHECK_MEMBERSHIP(World& world, CC_Call const& call)
 {
-    for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
-        if (call.getCallLeg(i)->getCall() != &call)
+    unsigned int const legs = call.getNumberOfCallLegs();
+    unsigned int active = 0;
+    for (unsigned int i = 0; i < legs; ++i)
+    {
+        CC_CallLeg const& leg = *call.getCallLeg(i);
+        if (leg.getCall() != &call)
             return world.fail("a call lists a leg that names another call, or none");
+        if (call.getNumberOfOtherCallLegs(leg) != legs - 1)
+            return world.fail("a call counts the other legs wrong");
+        active += leg.getActivityLevel() >= 0 ? 1 : 0;
+    }
+    if (static_cast<unsigned int>(call.getState()) != std::min(active, 3U) - std::min(active, 1U))
+        world.fail("a call's state is not that of its legs");
 }
 
 void CHECK_LINE(World& world, unsigned int number, Line const& line)
