@@ -54,7 +54,8 @@ Ended ENDED(int status)
     if (WEXITSTATUS(status) == 0)
         return {};
     char const* const failure = SHARED_REPORT().failure;
-    return {true, *failure != '\0' ? failure : "a sanitizer ends it"};
+    bool const isTold = *failure != '\0';
+    return {true, isTold ? failure : "a sanitizer ends it", !isTold};
 }
 
 Ended ATTEMPT(Operations const& operations, bool isSilent)

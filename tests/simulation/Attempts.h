@@ -28,7 +28,8 @@ Report& SHARED_REPORT();
 struct Ended
 {
     bool hasFailed = false;
-    std::string how; // the failure, or the signal
+    std::string how{};    // the failure, or the signal
+    bool isCrash = false; // the run did not end by itself
 };
 
 /// Runs the operations in a forked process, silently if `isSilent`. One that takes longer than a few seconds hangs.

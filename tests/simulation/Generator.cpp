@@ -99,14 +99,20 @@ constexpr Weight WEIGHTS[] = {
 class Generator
 {
 public:
-    explicit Generator(std::uint64_t seed) : m_random(seed), m_isHostile(seed % 2 != 0), m_isShort(seed % 16 == 5) {}
+    explicit Generator(std::uint64_t seed)
+        : m_random(seed), m_isHostile(seed % 2 != 0), m_isShort(seed % 16 == 5), m_isNarrow(seed % 4 > 1)
+    {
+    }
 
     Operations generate()
     {
         unsigned int const length = 20 + m_random.below(m_random.isOneIn(4) ? 400 : 120);
         Operations operations{world()};
         while (operations.size() < length)
-            operations.push_back(next());
+            if (m_isHostile && m_random.isOneIn(24))
+                sendOnTheWay(operations);
+            else
+                operations.push_back(next());
         return operations;
     }
 
@@ -119,6 +125,27 @@ private:
         if (m_random.isOneIn(2))
             operation.arguments[5] = 0; // without filters
         return operation;
+    }
+    /// A leg that is sent elsewhere while it is on its way.
+    void sendOnTheWay(Operations& operations)
+    {
+        static constexpr CallOut PLACES[] = {CallOut::LEG_ADDED, CallOut::LEG_REMOVED, CallOut::LEG_RELINKED,
+                                             CallOut::LEG_CHANGED};
+        Operation when = filled(Code::WHEN);
+        when.arguments[0] = static_cast<std::uint8_t>(PLACES[m_random.below(std::size(PLACES))]);
+        when.arguments[1] = static_cast<std::uint8_t>(m_random.below(2));
+        when.arguments[2] = static_cast<std::uint8_t>(m_random.below(2));
+        auto const leg = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::OBSERVE));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::NEW_LEG));
+        operations.back().arguments[0] = leg;
+        operations.push_back(when);
+        for (int i = 0; i < 4; ++i)
+        {
+            operations.push_back(filled(m_random.isOneIn(3) ? Code::ADD_LEG : Code::MOVE_LEG));
+            operations.back().arguments[0] = leg;
+        }
     }
     Operation filled(Code code)
     {
@@ -145,6 +172,8 @@ private:
             operation.arguments[0] = m_random.isOneIn(2) ? m_last : operation.arguments[0];
         if (m_random.isOneIn(3))
             operation.arguments[0] = m_last; // somebody does several things
+        if (m_isNarrow && operation.code != Code::WHEN)
+            operation.arguments[0] %= 4; // few do everything
         m_last = operation.arguments[0];
         return operation;
     }
@@ -167,6 +196,7 @@ private:
     Random m_random;
     bool const m_isHostile;
     bool const m_isShort; // of memory
+    bool const m_isNarrow;
     std::uint8_t m_last = 0;
 };
 } // namespace

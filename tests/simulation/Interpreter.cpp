@@ -37,6 +37,30 @@ std::size_t Interpreter::announce(std::size_t place, std::size_t end)
     return behind;
 }
 
+namespace
+{
+/// Whether it may take a guest's leg along, other than by that guest's will.
+bool MAY_MOVE_OTHER_LEGS(Code code)
+{
+    switch (code)
+    {
+    case Code::TURN:
+    case Code::SETTLE:
+    case Code::TRANSFER:
+    case Code::RELEASE:
+    case Code::DROP_CALLS:
+    case Code::GIVE_UP_LEG:
+    case Code::EMPTY_CALL:
+    case Code::CLEAN_UP_CALL:
+    case Code::NEW_CALL:
+    case Code::FAIL_ALLOCATION:
+        return true;
+    default:
+        return false;
+    }
+}
+} // namespace
+
 std::size_t Interpreter::carryOut(std::size_t place, std::size_t end)
 {
     Operation const& operation = m_operations[place];
@@ -46,6 +70,7 @@ std::size_t Interpreter::carryOut(std::size_t place, std::size_t end)
     ++m_count;
     if (operation.code == Code::WHEN)
         return announce(place, end);
+    m_world.m_areLegsDisturbed = m_world.m_areLegsDisturbed || MAY_MOVE_OTHER_LEGS(operation.code);
     bool const isToFail = std::exchange(m_isToFail, false);
     if (isToFail && operation.code == Code::DUMP)
         Memory::FAIL_NTH(0); // dumps throw

@@ -48,7 +48,7 @@ private:
     void acquire(Operation const& operation);
     void newLeg(Operation const& operation);
     XCode moveLeg(Operation const& operation);
-    static XCode transferLeg(CC_CallLeg& leg, CC_Call* to);
+    XCode transferLeg(unsigned int number, CC_CallLeg& leg, CC_Call* to);
     void newCall(Operation const& operation);
     void emptyCall(Operation const& operation);
     void changeFilters(Operation const& operation);

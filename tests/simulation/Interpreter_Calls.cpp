@@ -46,24 +46,33 @@ XCode Interpreter::moveLeg(Operation const& operation)
     CC_Call* const call = m_world.call(operation[1], operation[2]);
     if (leg == nullptr)
         return XCode(NO_RESULT);
+    CC_Call* const to = operation.code == Code::REMOVE_LEG || operation[3] % 4 == 3 ? nullptr : call;
     if (operation.code == Code::MOVE_LEG)
-        return transferLeg(*leg, operation[3] % 4 == 3 ? nullptr : call);
+        return transferLeg(operation[0], *leg, to);
     if (call == nullptr)
         return XCode(NO_RESULT);
+    XCode result(NO_RESULT);
+    m_world.noteMove(operation[0], operation.code == Code::ADD_LEG ? call : nullptr);
     Memory::Library const library;
-    if (operation.code == Code::ADD_LEG)
-        return call->addCallLeg(*leg);
-    call->removeCallLeg(*leg);
-    return XCode(NO_RESULT);
+    if (operation.code == Code::REMOVE_LEG)
+        call->removeCallLeg(*leg);
+    else
+        result = call->addCallLeg(*leg);
+    if (!result.isOk() && result != XCode(NO_RESULT))
+        m_world.m_areLegsDisturbed = true; // it stays where it is, and what was asked for before holds
+    return result;
 }
 
 /// Who moves a leg into a call without its help has the call looked at.
-XCode Interpreter::transferLeg(CC_CallLeg& leg, CC_Call* to)
+XCode Interpreter::transferLeg(unsigned int number, CC_CallLeg& leg, CC_Call* to)
 {
     CallWatch watch;
     watch.watch(to);
+    m_world.noteMove(number, to);
     Memory::Library const library;
     XCode const result = CC_Call::TRANSFER_CALL_LEG(to, leg);
+    if (!result.isOk())
+        m_world.m_areLegsDisturbed = true;
     if (watch.get() != nullptr)
         watch.get()->defer();
     return result;

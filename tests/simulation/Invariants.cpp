@@ -31,12 +31,22 @@ bool IS_LIVE(CC_Call const& call)
     return false;
 }
 
-/// A leg that a call lists says so, too.
+/// A leg that a call lists says so, too, and the call's state is that of its legs.
 void CHECK_MEMBERSHIP(World& world, CC_Call const& call)
 {
-    for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
-        if (call.getCallLeg(i)->getCall() != &call)
+    unsigned int const legs = call.getNumberOfCallLegs();
+    unsigned int active = 0;
+    for (unsigned int i = 0; i < legs; ++i)
+    {
+        CC_CallLeg const& leg = *call.getCallLeg(i);
+        if (leg.getCall() != &call)
             return world.fail("a call lists a leg that names another call, or none");
+        if (call.getNumberOfOtherCallLegs(leg) != legs - 1)
+            return world.fail("a call counts the other legs wrong");
+        active += leg.getActivityLevel() >= 0 ? 1 : 0;
+    }
+    if (static_cast<unsigned int>(call.getState()) != std::min(active, 3U) - std::min(active, 1U))
+        world.fail("a call's state is not that of its legs");
 }
 
 void CHECK_LINE(World& world, unsigned int number, Line const& line)
@@ -137,8 +147,30 @@ void CHECK_STATISTICS(World& world)
 }
 } // namespace
 
+namespace
+{
+/// A leg that was sent on while it was on its way is where it was sent last.
+void CHECK_SENT_LEGS(World& world)
+{
+    for (unsigned int i = 0; i < World::NUMBER_OF_LEGS; ++i)
+    {
+        World::Sent& sent = world.m_sent[i];
+        CC_CallLeg const* const leg = world.leg(i);
+        bool const isThere = !sent.isIntoCall || sent.to.get() != nullptr;
+        if (sent.isSent && isThere && leg != nullptr && !world.m_areLegsDisturbed && !world.m_wasShortOfMemory &&
+            leg->getCall() != sent.to.get())
+            world.fail("guest leg " + std::to_string(i) + " is not where it was sent last");
+        sent.isSent = false;
+        sent.to.watch(nullptr);
+    }
+    world.m_areLegsDisturbed = false;
+}
+} // namespace
+
 void CHECK_AFTER_OPERATION(World& world)
 {
+    if (CAN_BE_COMPARED)
+        CHECK_SENT_LEGS(world);
     FORGET_BLANK_CALLS(world);
     FOR_EACH_CALL([&](CC_Call const& call, unsigned int) { CHECK_MEMBERSHIP(world, call); });
     FOR_EACH_LINE(world, [&](unsigned int number, Line const& line) { CHECK_LINE(world, number, line); });

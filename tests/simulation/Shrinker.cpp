@@ -8,10 +8,15 @@ namespace Simulation
 {
 using Distance = Operations::difference_type;
 
-bool Shrinker::stillFails(Operations const& operations) { return ATTEMPT(operations, true).hasFailed; }
+bool Shrinker::stillFails(Operations const& operations)
+{
+    Ended const ended = ATTEMPT(operations, true);
+    return ended.hasFailed && ended.isCrash == m_isCrash;
+}
 
 Operations Shrinker::shrink(Operations operations)
 {
+    m_isCrash = ATTEMPT(operations, true).isCrash;
     cutOff(operations);
     for (std::size_t size = operations.size() / 2; size > 0; size /= 2)
         removePieces(operations, size);

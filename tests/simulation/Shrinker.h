@@ -7,8 +7,9 @@
 
 namespace Simulation
 {
-/// Makes operations that fail fewer and simpler, as long as they go on failing: first what comes after the failure is
-/// cut off, then pieces are taken out, from halves down to single operations, then arguments become 0 or smaller.
+/// Makes operations that fail fewer and simpler, as long as they go on failing (a crash stays one): first what comes
+/// after the failure is cut off, then pieces are taken out, from halves down to single operations, then arguments
+/// become 0 or smaller.
 ///
 ///     Operations const smallest = Shrinker(std::chrono::seconds(50)).shrink(operations);
 class Shrinker
@@ -28,5 +29,6 @@ private:
     bool simplifyArgument(Operations& operations, std::size_t place, std::size_t argument);
 
     std::chrono::steady_clock::time_point m_end;
+    bool m_isCrash = false;
 };
 } // namespace Simulation

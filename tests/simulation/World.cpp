@@ -125,6 +125,15 @@ CC_CallLeg* World::anyLeg(unsigned int way, unsigned int index)
     return of->getCallLeg(way / 8 % of->getNumberOfCallLegs());
 }
 
+void World::noteMove(unsigned int index, CC_Call* to)
+{
+    Memory::Ours const ours;
+    Sent& sent = m_sent[index % NUMBER_OF_LEGS];
+    sent.isSent = true;
+    sent.isIntoCall = to != nullptr;
+    sent.to.watch(to);
+}
+
 // --- modules ---------------------------------------------------------------------------------------------------------
 
 void World::makeModule(unsigned int index)
@@ -261,6 +270,8 @@ void World::takeDown()
     Memory::Library const library;
     for (auto const& leaving : m_modules)
         leaving->held.watch(nullptr);
+    for (Sent& sent : m_sent)
+        sent.to.watch(nullptr);
     for (auto const& leaving : m_modules)
         for (Line& line : leaving->lines)
             line.adapter.reset();

@@ -84,6 +84,8 @@ public:
     void makeAdapter(unsigned int line, unsigned int kind);
     void giveUpLeg(unsigned int index);
     bool isBlank(CC_Call const& call) const;
+    /// A guest leg was sent into the call (null: into none), and the library said that this is done, or will be.
+    void noteMove(unsigned int leg, CC_Call* to);
     /// Ends everything of the run, so that nothing may be left.
     void takeDown();
 
@@ -102,6 +104,16 @@ public:
     std::vector<unsigned long long> m_heard;
     /// Carries the operations [begin, end) of the stream out inside a call-out.
     std::function<void(std::size_t begin, std::size_t end)> m_carryOut;
+
+    /// Where guest legs were sent last since the operation of the stream began; the last that is asked for is made.
+    struct Sent
+    {
+        bool isSent = false;
+        bool isIntoCall = false;
+        CallWatch to;
+    };
+    std::array<Sent, NUMBER_OF_LEGS> m_sent;
+    bool m_areLegsDisturbed = false; // somebody else moved legs, too
 
     unsigned int m_depth = 0;        // of call-outs with a reaction
     unsigned int m_strikes = 0;      // reactions so far
