@@ -2,9 +2,11 @@
 #include "testing/ModuleConformanceTests.h"
 #include "tests/support/FaultyModule.h"
 
+#include <fstream>
 #include <gmock/gmock.h>
 #include <gtest/gtest-spi.h>
 #include <gtest/gtest.h>
+#include <iterator>
 #include <memory>
 #include <set>
 #include <string>
@@ -162,6 +164,14 @@ TEST(ModuleConformance, HasAFaultyModuleForEachRule)
     for (Broken const& fault : FAULTS)
         broken.insert(fault.rule);
     EXPECT_EQ(broken, std::set<Suite::Rule const*>(Suite::RULES().begin(), Suite::RULES().end()));
+}
+
+TEST(ModuleConformance, HasItsRulesInTheGuide)
+{
+    std::ifstream file(GUIDE);
+    std::string const guide(std::istreambuf_iterator<char>(file), {});
+    for (Suite::Rule const* const rule : Suite::RULES())
+        EXPECT_THAT(guide, testing::HasSubstr(std::string("| ") + rule->name + " | " + rule->sentence + " |\n"));
 }
 
 TEST(ModuleConformance, HasACaseForEachRuleAndNoTwoOfOneName)
