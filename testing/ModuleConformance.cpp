@@ -102,7 +102,7 @@ Outcome PLAY(ModuleConformance::Case const& tried, ConformanceSituation& situati
         Rule const& rule = ModuleConformance::SURVIVES_NO_MEMORY;
         std::string const text =
             TEXT_OF(tried, rule, std::string("an exception left the module: ") + error.what(), situation.ladder());
-        std::fputs(text.c_str(), stderr); // the loop through which it went may not survive our end
+        std::fputs(text.c_str(), stderr);
         return {Outcome::BROKEN, &rule, text};
     }
 }
