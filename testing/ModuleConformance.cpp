@@ -1,5 +1,6 @@
 #include "testing/ModuleConformance.h"
 
+#include "testing/ConformanceCases.h"
 #include "testing/ConformanceSituation.h"
 #include "testing/FailingAllocator.h"
 #include "testing/LeakCheck.h"
@@ -101,7 +102,7 @@ Outcome PLAY(ModuleConformance::Case const& tried, ConformanceSituation& situati
         Rule const& rule = ModuleConformance::SURVIVES_NO_MEMORY;
         std::string const text =
             TEXT_OF(tried, rule, std::string("an exception left the module: ") + error.what(), situation.ladder());
-        std::fputs(text.c_str(), stderr); // the loop through which it went may not survive our end
+        std::fputs(text.c_str(), stderr);
         return {Outcome::BROKEN, &rule, text};
     }
 }
@@ -120,4 +121,18 @@ Outcome ModuleConformance::RUN(Case const& tried, Factory const& makeDriver)
         outcome = {Outcome::BROKEN, &LEAVES_NOTHING,
                    TEXT_OF(tried, LEAVES_NOTHING, "left behind: " + leaked, ConformanceLadder())};
     return outcome;
+}
+
+std::vector<ModuleConformance::Case> const& ModuleConformance::CASES()
+{
+    using namespace ConformanceCases;
+    static auto const s_cases = []
+    {
+        Cases cases;
+        for (auto* const addGroup : {ADD_OFFERS, ADD_ENDS, ADD_CAUSES, ADD_ORDERS, ADD_LOSSES, ADD_SILENCE,
+                                     ADD_NEIGHBOURS, ADD_DIGITS, ADD_MEMORY})
+            addGroup(cases);
+        return cases;
+    }();
+    return s_cases;
 }

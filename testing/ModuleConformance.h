@@ -82,5 +82,7 @@ public:
         Rule const* broken = nullptr;
         std::string text{};
     };
+    /// An exception that leaves the module on its way through a loop breaks SURVIVES_NO_MEMORY. It is told on the
+    /// standard error stream, too, since a loop that was left like this may end the program afterwards.
     static Outcome RUN(Case const& tried, Factory const& makeDriver);
 };

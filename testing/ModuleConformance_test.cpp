@@ -2,6 +2,7 @@
 #include "testing/ModuleConformanceTests.h"
 #include "tests/support/FaultyModule.h"
 
+#include <cstdlib>
 #include <fstream>
 #include <gmock/gmock.h>
 #include <gtest/gtest-spi.h>
@@ -141,6 +142,18 @@ TEST(ModuleConformance, FailsATestWithTheRuleAndTheLadder)
         "                                      | RELEASED         |\n"
         "                                      | leaves the call  |\n"
         "                                      |                  | peer/line leaves the call\n");
+}
+
+TEST(ModuleConformance, SaysThatAModuleLetsAnExceptionOutBeforeItIsTooLate)
+{
+    auto const run = []
+    {
+        Suite::RUN(CASE("SurvivesNoMemory_EachAllocation_CallFromTheWire"),
+                   [] { return std::make_unique<FaultyDriver>(Fault::THROWS_WITHOUT_MEMORY); });
+        std::exit(0); // a release build comes as far as this, a debug build's loop does not
+    };
+    EXPECT_EXIT(
+        run(), [](int) { return true; }, "rule SurvivesNoMemory: .*\n.*an exception left the module");
 }
 
 TEST(ModuleConformance, SkipsWhatTheModuleCannotDoAndSaysWhy)

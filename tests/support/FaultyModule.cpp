@@ -203,6 +203,8 @@ void FaultyModule::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const&)
 {
     if (m_isLeftBehind)
         return;
+    if (is(Fault::THROWS_WITHOUT_MEMORY))
+        m_needed = std::make_unique<int>();
     auto const state = m_adapter.getPeer(Key::STATE);
     bool const isLost = !state && m_hadPeer && !is(Fault::WAITS_FOR_RELEASED);
     if (isLost || state == State::RELEASED)

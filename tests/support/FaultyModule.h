@@ -40,6 +40,7 @@ enum class Fault
     LOSES_LATE_DIGITS,
     OFFERS_BEFORE_ALL_DIGITS,
     STAYS_BROKEN_WITHOUT_MEMORY,
+    THROWS_WITHOUT_MEMORY,
     LEAVES_ITS_LEG_BEHIND
 };
 
@@ -119,6 +120,7 @@ private:
     bool m_isEnding = false;
     bool m_isLeftBehind = false;
     unsigned long long m_peerId = 0;
+    std::unique_ptr<int> m_needed; // what a fault does with memory that it does not get
     CC_CallAdapterE164 m_adapter;
 };
 
