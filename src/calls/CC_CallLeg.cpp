@@ -120,7 +120,12 @@ XCode CC_CallLeg::addCallLegObserver(CC_CallLegObserver* observer) { return m_ob
 
 void CC_CallLeg::removeCallLegObserver(CC_CallLegObserver const* observer) { m_observers.removeObserver(observer); }
 
-int CC_CallLeg::findState() const
+int CC_CallLeg::getState() const
+{
+    return m_mayChangeUntold || !m_properties.isSelfContained() ? findState() : m_state;
+}
+
+__attribute__((noinline)) int CC_CallLeg::findState() const
 {
     auto const* const state = CC_PropertyCallLegState::FROM(m_properties.get(CC_PropertyId::STATE));
     return state != nullptr ? state->getState() : CC_PropertyCallLegState::RELEASED;
@@ -144,8 +149,7 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed)
     if (LOG_PROPERTY(m_name, property) || !m_properties.isSelfContained())
         stored = m_properties.get(property.getId()); // a monitor is the host's code, a comparison maybe a module's
     bool const isState = property.getId() == CC_PropertyId::STATE;
-    XCode const result = isState ? replaceState(stored, property) : replace(stored, property);
-    changed = result.isOk();
+    changed = (isState ? replaceState(stored, property) : replace(stored, property)).isOk();
     return changed ? XCode::OK : XCode::REFUSED;
 }
 
@@ -156,15 +160,15 @@ XCode CC_CallLeg::replaceState(CC_Property* stored, CC_Property const& property)
     auto const* const state = State::FROM(&property);
     if (state == nullptr || state->getState() == State::IDLE)
         return XCode::REFUSED;
-    bool const wasActive = isActive();
     int const level = state->getState();
     if (!replace(stored, property).isOk())
         return XCode::REFUSED;
     if (m_state != State::IDLE || m_observers.getNumberOfEntries() != 0)
         m_stateSince = CC_Moment::NOW();
+    bool const wasActive = isSeenActive();
     m_state = level;
-    if (m_call != nullptr && isActive() != wasActive)
-        m_call->noticeState();
+    if (m_call != nullptr && isSeenActive() != wasActive)
+        m_call->noticeState(&m_stateSince);
     return XCode::OK;
 }
 

@@ -6,5 +6,8 @@
 CC_Moment CC_Moment::NOW()
 {
     TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
-    return loop != nullptr ? CC_Moment{loop->getNumberOfTurns(), loop->getTime()} : CC_Moment();
+    if (loop == nullptr)
+        return {};
+    long long const time = loop->getTime();
+    return {loop->getNumberOfTurns(), time};
 }

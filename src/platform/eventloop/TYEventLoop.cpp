@@ -147,7 +147,9 @@ void TYEventLoop::runFirstEvent()
     event.removeReference();
 }
 
-void TYEventLoop::readTime() { m_turnTime = NOW(m_isInTurn ? TY::Time::MONOTONIC : TY::Time::MONOTONIC_COARSE); }
+void TYEventLoop::readTime() { m_turnTime = NOW(); }
+
+long long TYEventLoop::TIME_BETWEEN_TURNS() { return NOW(TY::Time::MONOTONIC_COARSE); }
 
 void TYEventLoop::takeTurn()
 {

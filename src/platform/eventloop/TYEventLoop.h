@@ -64,7 +64,9 @@ public:
     /// so that all that a turn does has one time; between turns that of the system's last tick, at most 10 ms ago.
     long long getTime()
     {
-        if (!m_isInTurn || m_turnTime == NEVER)
+        if (!m_isInTurn)
+            return TIME_BETWEEN_TURNS();
+        if (m_turnTime == NEVER)
             readTime();
         return m_turnTime;
     }
@@ -76,6 +78,7 @@ private:
 
     static constexpr long long NEVER = -1; // no moment of the clock, in nanoseconds
 
+    static long long TIME_BETWEEN_TURNS();
     void readTime();
     void takeTurn();
     void runFirstEvent();
@@ -124,5 +127,5 @@ private:
     bool m_isEnded = false;
     bool m_isInTurn = false;
     unsigned long long m_turns = 0; // that have begun
-    long long m_turnTime = NEVER;   // what the turn has read, or who asked last between turns
+    long long m_turnTime = NEVER;   // what the turn has read
 };
