@@ -258,23 +258,33 @@ CC_CallLeg* CC_Call::getOtherMostActiveCallLeg(CC_CallLeg const& excluded, CC_Ca
     return MOST_ACTIVE(m_callLegs, &excluded, preferred);
 }
 
-CC_Call::State CC_Call::getState() const
+namespace
+{
+template <class IsActive>
+CC_Call::State STATE_OF(TYSmallVector<CC_CallLeg*, 4> const& legs, IsActive const& isActive)
 {
     unsigned int active = 0;
-    for (CC_CallLeg const* const leg : m_callLegs)
-        if (leg->getActivityLevel() >= CC_PropertyCallLegState::DISCONNECTING)
+    for (CC_CallLeg const* const leg : legs)
+        if (isActive(*leg))
             ++active;
-    return active < 2 ? INACTIVE : active == 2 ? ACTIVE : CONFERENCE;
+    return active < 2 ? CC_Call::INACTIVE : active == 2 ? CC_Call::ACTIVE : CC_Call::CONFERENCE;
+}
+} // namespace
+
+CC_Call::State CC_Call::getState() const
+{
+    return STATE_OF(m_callLegs, [](CC_CallLeg const& leg)
+                    { return leg.getActivityLevel() >= CC_PropertyCallLegState::DISCONNECTING; });
 }
 
-/// An active leg has joined or left, or a leg has become active or ceased to be.
-void CC_Call::noticeState()
+/// An active leg has joined or left, or a leg has become active or ceased to be, at that moment (null: now).
+void CC_Call::noticeState(CC_Moment const* moment)
 {
-    State const state = getState();
+    State const state = STATE_OF(m_callLegs, [](CC_CallLeg const& leg) { return leg.isSeenActive(); });
     if (state == m_noticedState)
         return;
     m_noticedState = state;
-    m_stateSince = CC_Moment::NOW();
+    m_stateSince = moment != nullptr ? *moment : CC_Moment::NOW();
 }
 
 void CC_Call::onCallLegObservationEnded(CC_Event<CC_CallLeg> const&) {}

@@ -181,7 +181,7 @@ private:
     XCode replace(CC_Property const& property);
     XCode replaceRecorded(CC_Property const& property);
     void tellChange(CC_Flags& flags);
-    void noticeState();
+    void noticeState(CC_Moment const* moment = nullptr);
     XCode storeAll(CC_PropertyContainer const& properties, XCode result);
     static XCode MOVE(CC_Call* to, CC_CallLeg& leg);
     XCode addLegObserver(CC_CallLeg& leg, CC_CallLegObserver* observer);

@@ -123,7 +123,12 @@ XCode CC_CallLeg::addCallLegObserver(CC_CallLegObserver* observer) { return m_ob
 
 void CC_CallLeg::removeCallLegObserver(CC_CallLegObserver const* observer) { m_observers.removeObserver(observer); }
 
-int CC_CallLeg::findState() const
+int CC_CallLeg::getState() const
+{
+    return m_mayChangeUntold || !m_properties.isSelfContained() ? findState() : m_state;
+}
+
+__attribute__((noinline)) int CC_CallLeg::findState() const
 {
     auto const* const state = CC_PropertyCallLegState::FROM(m_properties.get(CC_PropertyId::STATE));
     return state != nullptr ? state->getState() : CC_PropertyCallLegState::RELEASED;
@@ -154,8 +159,7 @@ XCode CC_CallLeg::store(CC_Property const& property, bool& changed, bool isNew)
             return XCode::OK; // let go meanwhile
     }
     bool const isState = property.getId() == CC_PropertyId::STATE;
-    XCode const result = isState ? replaceState(stored, property) : replace(stored, property);
-    changed = result.isOk();
+    changed = (isState ? replaceState(stored, property) : replace(stored, property)).isOk();
     return changed ? XCode::OK : XCode::REFUSED;
 }
 
@@ -166,15 +170,15 @@ XCode CC_CallLeg::replaceState(CC_Property* stored, CC_Property const& property)
     auto const* const state = State::FROM(&property);
     if (state == nullptr || state->getState() == State::IDLE)
         return XCode::REFUSED;
-    bool const wasActive = isActive();
     int const level = state->getState();
     if (!replace(stored, property).isOk())
         return XCode::REFUSED;
     if (m_state != State::IDLE || m_observers.getNumberOfEntries() != 0)
         m_stateSince = CC_Moment::NOW();
+    bool const wasActive = isSeenActive();
     m_state = level;
-    if (m_call != nullptr && isActive() != wasActive)
-        m_call->noticeState();
+    if (m_call != nullptr && isSeenActive() != wasActive)
+        m_call->noticeState(&m_stateSince);
     return XCode::OK;
 }
 

@@ -65,7 +65,7 @@ public:
     void removeCallLegObserver(CC_CallLegObserver const* observer);
 
     /// The value of the State property (`CC_PropertyCallLegState::State`); RELEASED (-1) when the leg has none.
-    int getState() const { return m_mayChangeUntold || !m_properties.isSelfContained() ? findState() : m_state; }
+    int getState() const;
     /// The same as the state: IDLE -2, RELEASED -1, DISCONNECTING 0 and upward to CONNECTED 6.
     int getActivityLevel() const { return getState(); }
 
@@ -143,7 +143,8 @@ private:
     XCode storeAndMark(CC_Property const& property, CC_Flags& flags, bool& changed, bool isNew = false);
     void markChanged(unsigned int id, CC_Flags& flags);
     int findState() const;
-    bool isActive() const { return getState() >= 0; } // from DISCONNECTING on
+    /// Whether the State that was last stored is an active one: enough to notice when that changes.
+    bool isSeenActive() const { return m_state >= 0; } // from DISCONNECTING on
     XCode replaceState(CC_Property* stored, CC_Property const& property);
     XCode replace(CC_Property* stored, CC_Property const& property);
     XCode replaceRecorded(CC_Property* stored, CC_Property const& property);

@@ -84,7 +84,7 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
         if (to->isOver() || leg.m_isEnding || !to->m_callLegs.append(&leg).isOk())
             return XCode::NO_ELEMENT;
         leg.addReference(); // the new call's
-        if (leg.isActive())
+        if (leg.isSeenActive())
             to->noticeState();
         RECORD(Kind::LEG_JOINED, *to, leg);
     }
@@ -92,7 +92,7 @@ XCode CC_Call::MOVE(CC_Call* to, CC_CallLeg& leg)
     {
         from->takeObserversFrom(leg);
         from->unlist(leg);
-        if (leg.isActive())
+        if (leg.isSeenActive())
             from->noticeState();
         RECORD(Kind::LEG_LEFT, *from, leg);
         from->m_callObservers.broadcastEvent(CC_EvCallCallLegModified(*from, leg),

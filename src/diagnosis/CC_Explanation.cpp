@@ -255,6 +255,7 @@ std::vector<CC_Explanation::Call> EXPLAIN_CALLS(IsAsked const& isAsked)
         });
     survey.look();
     std::vector<CC_Explanation::Call> calls;
+    std::reverse(asked.begin(), asked.end()); // in the order of their making
     for (CC_Call const* const call : asked)
     {
         calls.push_back(survey.of(*call));
@@ -309,6 +310,7 @@ CC_Explanation CC_Explanation::OF_LEGS_WITHOUT_CALL(unsigned int seconds)
         });
     survey.look();
     CC_Explanation explanation;
+    std::reverse(asked.begin(), asked.end());
     for (CC_CallLeg const* const leg : asked)
     {
         explanation.m_legs.push_back(survey.of(*leg));

@@ -2,9 +2,9 @@
 // else?
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CC_Context.h"
-#include "diagnosis/ExplanationTest.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/ExplanationTest.h"
 
 namespace
 {

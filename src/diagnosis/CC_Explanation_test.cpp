@@ -1,7 +1,7 @@
 #include "diagnosis/CC_Explanation.h"
 
-#include "diagnosis/ExplanationTest.h"
 #include "testing/FailingAllocator.h"
+#include "tests/support/ExplanationTest.h"
 
 #include <array>
 #include <map>
@@ -313,7 +313,7 @@ TEST(CC_Explanation_Random_Test, PutsEveryReferenceDownToWhoHasIt)
     CallControlFixture fixture;
     {
         RandomCalls calls;
-        for (int step = 0; step < 3000 && !testing::Test::HasFailure(); ++step)
+        for (int step = 0; step < 1000 && !testing::Test::HasFailure(); ++step)
         {
             calls.step();
             if (calls.draw(3) == 0)

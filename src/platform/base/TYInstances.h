@@ -1,7 +1,6 @@
 #pragma once
 
-/// The objects of a class that are alive, in the order of their making, for who has to find them without having been
-/// told of each.
+/// The objects of a class that are alive, for who has to find them without having been told of each.
 ///
 /// Each object bears its two links itself: coming and going costs a few stores and no memory, and an object may go at
 /// any time, unless somebody is just walking. It owns nothing. One thread only.
@@ -21,33 +20,35 @@ class TYInstances
 public:
     struct Links
     {
-        T* previous = nullptr;
-        T* next = nullptr;
+        T* older = nullptr;
+        T** fromNewer = nullptr; // the pointer that leads here: a newer one's `older`, or the list's
     };
 
     void add(T& object)
     {
-        object.m_links.previous = m_last;
-        (m_last != nullptr ? m_last->m_links.next : m_first) = &object;
-        m_last = &object;
+        object.m_links.older = m_newest;
+        object.m_links.fromNewer = &m_newest;
+        if (m_newest != nullptr)
+            m_newest->m_links.fromNewer = &object.m_links.older;
+        m_newest = &object;
     }
     /// REQUIRES: it was added.
     void remove(T& object)
     {
         Links const& links = object.m_links;
-        (links.previous != nullptr ? links.previous->m_links.next : m_first) = links.next;
-        (links.next != nullptr ? links.next->m_links.previous : m_last) = links.previous;
+        *links.fromNewer = links.older;
+        if (links.older != nullptr)
+            links.older->m_links.fromNewer = links.fromNewer;
     }
 
-    /// Calls `visit(object)` for each. REQUIRES: none comes or goes meanwhile.
+    /// Calls `visit(object)` for each, the newest first. REQUIRES: none comes or goes meanwhile.
     template <class Visit>
     void forEach(Visit&& visit) const
     {
-        for (T* object = m_first; object != nullptr; object = object->m_links.next)
+        for (T* object = m_newest; object != nullptr; object = object->m_links.older)
             visit(*object);
     }
 
 private:
-    T* m_first = nullptr;
-    T* m_last = nullptr;
+    T* m_newest = nullptr;
 };

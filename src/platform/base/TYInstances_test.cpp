@@ -29,18 +29,18 @@ private:
 TYInstances<Counted> Counted::s_instances;
 } // namespace
 
-TEST(TYInstances, AreThoseAliveInTheOrderOfTheirMaking)
+TEST(TYInstances, AreThoseAliveTheNewestFirst)
 {
     EXPECT_EQ(Counted::ALL(), "");
     auto a = std::make_unique<Counted>('a');
     auto b = std::make_unique<Counted>('b');
     auto c = std::make_unique<Counted>('c');
-    EXPECT_EQ(Counted::ALL(), "abc");
+    EXPECT_EQ(Counted::ALL(), "cba");
     b.reset(); // in the middle
-    EXPECT_EQ(Counted::ALL(), "ac");
+    EXPECT_EQ(Counted::ALL(), "ca");
     c.reset(); // the last
     auto const d = std::make_unique<Counted>('d');
-    EXPECT_EQ(Counted::ALL(), "ad");
+    EXPECT_EQ(Counted::ALL(), "da");
     a.reset(); // the first
     EXPECT_EQ(Counted::ALL(), "d");
 }
