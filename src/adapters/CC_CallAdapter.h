@@ -262,6 +262,7 @@ private:
     class Event;
     class Attempt;
     class Copy;
+    class OnDifference;
     struct Kept;
 
     char const* getEndpointName() const;
@@ -316,10 +317,8 @@ private:
     void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);
     void updateCall();
-    template <class OnDifference>
     void updateView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
                     CC_PropertyView::Told const& told, OnDifference const& onDifference);
-    template <class OnDifference>
     void filterView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
                     CC_PropertyView::Told const& told, OnDifference const& onDifference,
                     CC_PropertyFilterContainer const& filters);

@@ -34,7 +34,7 @@ public:
 
     /// No id twice. Throws std::bad_alloc when memory for the value is out.
     template <class Property, class... Values>
-    void add(unsigned int id, Values const&... values)
+    [[gnu::noinline]] void add(unsigned int id, Values const&... values)
     {
         m_areAllThere = m_container.append<Property>(id, values...) && m_areAllThere;
     }

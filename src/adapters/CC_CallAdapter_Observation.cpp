@@ -182,31 +182,43 @@ __attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& 
         m_ownView.assignMarked(copy.get(), copy.settle(), 0);
 }
 
+/// Tells the module. One class for the views of peer and call, so that what follows them is there once.
+class CC_CallAdapter::OnDifference
+{
+public:
+    /// `changed`: the ids of which the peer tells; null when it is another, and for the call.
+    OnDifference(CC_CallAdapter& adapter, CC_Flags const* changed) : m_adapter(adapter), m_changed(changed) {}
+
+    void operator()(unsigned int id) const
+    {
+        if (id == CC_PropertyId::STATE && m_changed != nullptr && !m_changed->get(id))
+            m_adapter.m_isPeerToBeChosen = true; // when the state itself is told, its fall does not show any more
+        m_adapter.mark(id);
+    }
+
+private:
+    CC_CallAdapter& m_adapter;
+    CC_Flags const* m_changed;
+};
+
 /// `changed`: the ids of which the peer tells; null when the peer is another.
 void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 {
     if (m_peerCallLeg == nullptr)
         return;
     CC_CallLeg::Reference const keepPeer(*m_peerCallLeg);
-    auto const onDifference = [this, changed](unsigned int id)
-    {
-        if (id == CC_PropertyId::STATE && changed != nullptr && !changed->get(id))
-            m_isPeerToBeChosen = true; // when the state itself is told, its fall does not show any more
-        mark(id);
-    };
     updateView(m_peerView, m_peerCallLeg->getProperties(), m_peerCallLeg->getSerial(), TOLD(*m_peerCallLeg, changed),
-               onDifference);
+               {*this, changed});
 }
 
 void CC_CallAdapter::updateCall()
 {
     if (CC_Call const* const call = getCall())
-        updateView(m_callView, call->getProperties(), 0, {}, [this](unsigned int id) { mark(id); });
+        updateView(m_callView, call->getProperties(), 0, {}, {*this, nullptr});
 }
 
 /// Brings a view up to date with its source and tells the ids that differ. When a filter brings about another refresh,
 /// that one is the later.
-template <class OnDifference>
 void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
                                 CC_PropertyView::Told const& told, OnDifference const& onDifference)
 {
@@ -219,7 +231,7 @@ void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer cons
     filterView(view, source, serial, told, onDifference, *filters);
 }
 
-template <class OnDifference>
+/// Apart, so that a call without filters does not pay for it.
 __attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view, CC_PropertyContainer const& source,
                                                           unsigned long long serial, CC_PropertyView::Told const& told,
                                                           OnDifference const& onDifference,

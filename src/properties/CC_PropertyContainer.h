@@ -199,7 +199,8 @@ private:
     void mark(Marks marks) { m_marks = static_cast<Marks>(m_marks | marks); }
     void markAll() { m_marks = ALL_MARKED; }
     /// Calls `visit(ours, theirs, mark)` for the marked positions of two containers, as long as that returns true and
-    /// both have the same id there; whether that was always so. REQUIRES: they have the same number of properties.
+    /// both have the same id there; whether that was always so, and they are no more than 32. REQUIRES: they are as
+    /// many.
     template <class Visit>
     bool forEachMarked(CC_PropertyContainer const& other, Marks marks, Visit const& visit) const
     {
@@ -207,29 +208,20 @@ private:
         Position theirs = other.m_properties.begin();
         unsigned int const count = m_properties.getCount();
         unsigned int index = 0;
-        auto const goTo = [&](unsigned int next)
+        unsigned int rest = (marks & LAST_MARK) == 0 ? marks : marks | 0xffff0000;
+        if (count > 32)
+            return false; // so many are looked at in another way
+        for (; rest != 0; rest &= rest - 1)
         {
+            auto const next = static_cast<unsigned int>(std::countr_zero(rest));
+            if (next >= count)
+                return true;
             for (; index < next; ++index)
             {
                 ++ours;
                 ++theirs;
             }
-        };
-        auto const visitHere = [&]
-        { return ours->getId() == theirs->getId() && visit(*ours, *theirs, MARK_AT(index)); };
-        for (unsigned int rest = marks; rest != 0; rest &= rest - 1)
-        {
-            auto const next = static_cast<unsigned int>(std::countr_zero(rest));
-            if (next >= count)
-                return true;
-            goTo(next);
-            if (!visitHere())
-                return false;
-        }
-        for (unsigned int next = index + 1; (marks & LAST_MARK) != 0 && next < count; ++next)
-        {
-            goTo(next);
-            if (!visitHere())
+            if (ours->getId() != theirs->getId() || !visit(*ours, *theirs, MARK_AT(index)))
                 return false;
         }
         return true;
