@@ -148,7 +148,7 @@ TEST(ModuleConformance, SaysThatAModuleLetsAnExceptionOutBeforeItIsTooLate)
 {
     auto const run = []
     {
-        Suite::RUN(CASE("SurvivesNoMemory_EachAllocation_CallFromTheWire"),
+        Suite::RUN(CASE("SurvivesNoMemory_EachAllocationUntilThePeerClears_CallFromTheWire"),
                    [] { return std::make_unique<FaultyDriver>(Fault::THROWS_WITHOUT_MEMORY); });
         std::exit(0); // a release build comes as far as this, a debug build's loop does not
     };

@@ -48,7 +48,7 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
 void SipEndpoint::ON_TIMER(void* endpoint)
 {
     auto& self = *static_cast<SipEndpoint*>(endpoint);
-    self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout();
+    self.handle([&] { self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout(); });
 }
 
 SipEndpoint::~SipEndpoint()
@@ -81,6 +81,11 @@ InfoContainer& SipEndpoint::getInfo(InfoContainer& info, unsigned int maxLevel, 
 
 void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& flags)
 {
+    handle([&] { followCall(flags); });
+}
+
+void SipEndpoint::followCall(CC_Flags const& flags)
+{
     traceFlags(flags);
     if (isPeerReleased())
         onPeerReleased();
@@ -94,7 +99,7 @@ void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& flag
 void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter&, CC_Service&)
 {
     if (isTraced())
-        trace("told a service, not taken");
+        handle([&] { trace("told a service, not taken"); });
 }
 
 /// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
@@ -114,8 +119,23 @@ void SipEndpoint::onPeerReleased()
 
 void SipEndpoint::clear(SipCause const& cause)
 {
-    endDialog(cause);
-    leaveCall(cause);
+    try
+    {
+        endDialog(cause);
+        leaveCall(cause);
+    }
+    catch (std::bad_alloc const&)
+    {
+        endWithoutWords();
+    }
+}
+
+/// Not even the words of an end can be had: our end gives up what the SIP stack has, and that says what it can.
+void SipEndpoint::endWithoutWords()
+{
+    if (std::exchange(m_isInCall, false))
+        m_adapter.drop(QCause::RESOURCE_UNAVAILABLE, 0);
+    setDialog(Dialog::OVER);
 }
 
 /// Takes the leg out of the call, with the cause in the peer's words.
@@ -126,13 +146,7 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         finishIfDone();
         return;
     }
-    recordQuality();
-    CC_PropertyContainer last;
-    std::ignore = last.set(cause.getProperty()); // without memory the leg is released without words
-    std::ignore = writeOwn(last);
-    if (isTraced())
-        trace("did  drop, State=RELEASED");
-    m_adapter.drop(QCause::UNSPECIFIED, 0); // the cause is written already, with its text
+    m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);
     if (m_isCalling)
     {
         Counters& counters = m_interface.getEnvironment().counters;
@@ -142,6 +156,24 @@ void SipEndpoint::leaveCall(SipCause const& cause)
                  m_isCalling ? "calling" : "called", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
                  cause.sipCode, cause.text.empty() ? "" : ", \"", cause.text, cause.text.empty() ? "" : "\"");
     finishIfDone();
+}
+
+/// Whether the cause is written, with the peer's words; without memory for these only the drop says it.
+bool SipEndpoint::sayWhy(SipCause const& cause)
+{
+    try
+    {
+        recordQuality();
+        CC_PropertyContainer last;
+        bool const isWritten = last.set(cause.getProperty()).isOk() && writeOwn(last).isOk();
+        if (isTraced())
+            trace("did  drop, State=RELEASED");
+        return isWritten;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return false;
+    }
 }
 
 /// While the leg is still in the call, so that the other side sees it.

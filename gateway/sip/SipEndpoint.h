@@ -13,6 +13,7 @@
 #include <spdlog/fmt/fmt.h>
 
 #include <memory>
+#include <new>
 #include <optional>
 #include <string>
 
@@ -37,7 +38,7 @@ public:
     /// which the transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                       SipParty const& called);
-    /// Clears the call for a reason of the gateway's own.
+    /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
 
     // --- CC_Endpoint
@@ -70,6 +71,8 @@ private:
     static char const* DIALOG_NAME(Dialog dialog);
 
     // calling side: SipEndpoint_Calling.cpp
+    int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                   SipParty const& called);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
     void onDialFailed();
@@ -85,6 +88,7 @@ private:
     void forgetTransaction();
 
     // called side: SipEndpoint_Called.cpp
+    XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
     bool startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards);
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
@@ -99,6 +103,25 @@ private:
     void forgetInvite();
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
+
+    /// Runs what something that happened asks for. When memory is out in the middle of it the call is cleared, since
+    /// the other side would not hear of it; nothing is thrown to whoever called us.
+    template <class Handler>
+    void handle(Handler const& handler)
+    {
+        try
+        {
+            handler();
+        }
+        catch (std::bad_alloc const&)
+        {
+            clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        }
+    }
+    void endWithoutWords();
+    int onRequest(nta_incoming_t* transaction, sip_t const* request);
+    void followCall(CC_Flags const& flags);
+    bool sayWhy(SipCause const& cause);
     static void ON_TIMER(void* endpoint);
     int onBye(sip_t const* request);
     void sendBye(SipCause const& cause);
@@ -140,7 +163,7 @@ private:
     TYTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
-    bool m_isAckLate = false;              // the ACK must carry the answer, which the other side does not have yet
+    bool m_isAckLate = false;              // the ACK is still to be sent: it must carry an answer that is not here yet
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_wasAnswered = false;

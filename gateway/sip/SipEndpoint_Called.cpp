@@ -50,6 +50,21 @@ void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
 
 XCode SipEndpoint::handleOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
 {
+    try
+    {
+        return acceptOffer(call, name, properties);
+    }
+    catch (std::bad_alloc const&)
+    {
+        if (!m_isInCall)
+            return XCode::FAILURE;
+        clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        return XCode::OK;
+    }
+}
+
+XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
+{
     m_ladder = m_interface.getEnvironment().trace.find(m_callNumber);
     if (isTraced())
         trace("told offer " + std::string(name.view()) + (properties.isEmpty() ? "" : ", ") + TEXT_OF(properties));
@@ -116,12 +131,16 @@ bool SipEndpoint::startInvite(std::string const& uri, std::string const& identit
 int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)
 {
     int const status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
-    if (status < 200)
-        endpoint->onProvisional(static_cast<unsigned int>(status), response);
-    else if (status < 300 && response != nullptr && response->sip_to != nullptr)
-        endpoint->onAnswer(response);
-    else
-        endpoint->onRejected(static_cast<unsigned int>(status), response);
+    endpoint->handle(
+        [&]
+        {
+            if (status < 200)
+                endpoint->onProvisional(static_cast<unsigned int>(status), response);
+            else if (status < 300 && response != nullptr && response->sip_to != nullptr)
+                endpoint->onAnswer(response);
+            else
+                endpoint->onRejected(static_cast<unsigned int>(status), response);
+        });
     return 0;
 }
 
@@ -163,12 +182,10 @@ void SipEndpoint::onAnswer(sip_t const* response)
     }
     m_timer.stop();
     confirmDialog(response);
-    std::string const session = SESSION_OF(response);
-    m_isAckLate = !m_hasOffer && !session.empty();
-    if (!m_isAckLate)
-        acknowledge({});
-    m_dialog = Dialog::UP;
     m_wasAnswered = true;
+    std::string const session = SESSION_OF(response);
+    if (m_hasOffer || session.empty())
+        acknowledge({});
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     CC_PropertyContainer own;
@@ -182,11 +199,11 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 {
     bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
-    trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     if (m_dialog != Dialog::INVITE_SENT && m_dialog != Dialog::CANCELLED)
         return;
+    m_dialog = Dialog::OVER;
+    trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     forgetInvite();
-    setDialog(Dialog::OVER);
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else
@@ -213,6 +230,8 @@ void SipEndpoint::confirmDialog(sip_t const* response)
 {
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
+    m_dialog = Dialog::UP;
+    m_isAckLate = true; // whatever comes in between
 }
 
 void SipEndpoint::acknowledge(std::string const& sessionDescription)
@@ -220,8 +239,8 @@ void SipEndpoint::acknowledge(std::string const& sessionDescription)
     // a BYE may have gone out since, but the ACK bears the INVITE's number
     std::string const sequence = std::to_string(m_inviteSequence) + " ACK";
     bool const hasSession = !sessionDescription.empty();
-    m_isAckLate = false;
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
+    m_isAckLate = false;
     if (m_ack != nullptr)
         nta_outgoing_destroy(m_ack);
     m_ack = nta_outgoing_tcreate(m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr,
@@ -244,8 +263,8 @@ void SipEndpoint::cancel(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
     trace("-> CANCEL, Reason: " + reason);
-    m_dialog = Dialog::CANCELLED;
     m_byeAfterAck = cause; // should it be answered all the same
+    m_dialog = Dialog::CANCELLED;
     nta_outgoing_tcancel(m_invite, nullptr, nullptr, SIPTAG_REASON_STR(reason.c_str()), TAG_END());
     m_timer.start(m_interface.getConfiguration().t1x64);
 }

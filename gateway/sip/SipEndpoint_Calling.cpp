@@ -35,9 +35,29 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
                                SipParty const& called)
 {
     m_isCalling = true;
+    m_isInCall = true;
+    try
+    {
+        return takeInvite(transaction, request, provider, called);
+    }
+    catch (std::bad_alloc const&)
+    {
+        if (m_transaction != nullptr)
+        {
+            m_timer.start(0); // as below
+            return 0;
+        }
+        m_dialog = Dialog::OVER;
+        leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        return 503;
+    }
+}
+
+int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                            SipParty const& called)
+{
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
-    m_isInCall = true;
     if (!makeServerDialog(transaction, request))
     {
         m_dialog = Dialog::OVER;
@@ -97,12 +117,16 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
 {
-    if (request == nullptr)
-        endpoint->onAckMissing();
-    else if (request->sip_request->rq_method == sip_method_cancel)
-        endpoint->onCancel(request);
-    else
-        endpoint->onAck(request);
+    endpoint->handle(
+        [&]
+        {
+            if (request == nullptr)
+                endpoint->onAckMissing();
+            else if (request->sip_request->rq_method == sip_method_cancel)
+                endpoint->onCancel(request);
+            else
+                endpoint->onAck(request);
+        });
     return 0;
 }
 
@@ -110,9 +134,9 @@ void SipEndpoint::onAck(sip_t const* request)
 {
     if (m_dialog != Dialog::ANSWERED)
         return;
-    trace("<- ACK");
-    forgetTransaction(); // it would live on for half a minute
     m_dialog = Dialog::UP;
+    forgetTransaction(); // it would live on for half a minute
+    trace("<- ACK");
     if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
     {
         m_quality.noteAnswer(session);
@@ -128,8 +152,9 @@ void SipEndpoint::onAckMissing()
 {
     if (m_dialog != Dialog::ANSWERED)
         return;
-    trace("the 200 was not acknowledged");
+    m_dialog = Dialog::UP;
     forgetTransaction();
+    trace("the 200 was not acknowledged");
     SipCause const cause = m_byeAfterAck.value_or(SipCause{QCause::RECOVERY_ON_TIMER_EXPIRY, 0, {}});
     sendBye(cause);
     leaveCall(cause);
@@ -172,10 +197,10 @@ void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasDa
 
 void SipEndpoint::answer()
 {
+    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
     m_dialog = Dialog::ANSWERED;
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
-    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
 }
 
 /// With the called party's identity, as far as the network vouches for it.

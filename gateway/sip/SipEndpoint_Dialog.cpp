@@ -4,6 +4,13 @@
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
 {
+    int status = 500; // what memory kept from being done
+    handle([&] { status = onRequest(transaction, request); });
+    return status;
+}
+
+int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
+{
     switch (request->sip_request->rq_method)
     {
     case sip_method_bye:
@@ -93,10 +100,12 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
     if (status < 200)
         return 0;
     bool const isOurs = response == nullptr || nta_sip_is_internal(response);
-    endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE");
     nta_outgoing_destroy(transaction);
     endpoint->m_bye = nullptr;
-    endpoint->setDialog(Dialog::OVER);
+    endpoint->m_dialog = Dialog::OVER;
+    endpoint->handle(
+        [&] { endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE"); });
+    endpoint->finishIfDone();
     return 0;
 }
 

@@ -14,6 +14,7 @@
 
 #include <spdlog/spdlog.h>
 
+#include <new>
 #include <stdexcept>
 #include <strings.h>
 #include <tuple>
@@ -50,11 +51,18 @@ XCode SipInterface::dial(CC_Call& call, String const&, String const& destination
 {
     auto const* const number =
         dynamic_cast<CC_PropertyUnsigned const*>(call.getProperties().get(SipPropertyId::CALL_NUMBER));
-    SipEndpoint& endpoint = makeEndpoint(number != nullptr ? static_cast<unsigned int>(number->getValue()) : 0);
-    XCode const result = endpoint.offer(call, destination, offerProperties);
-    if (!result.isOk())
-        finish(endpoint);
-    return result;
+    try
+    {
+        SipEndpoint& endpoint = makeEndpoint(number != nullptr ? static_cast<unsigned int>(number->getValue()) : 0);
+        XCode const result = endpoint.offer(call, destination, offerProperties);
+        if (!result.isOk())
+            finish(endpoint);
+        return result;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE;
+    }
 }
 
 InfoContainer& SipInterface::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
@@ -68,6 +76,18 @@ InfoContainer& SipInterface::getInfo(InfoContainer& info, unsigned int maxLevel,
 }
 
 int SipInterface::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
+{
+    try
+    {
+        return onRequest(transaction, request);
+    }
+    catch (std::bad_alloc const&)
+    {
+        return 503;
+    }
+}
+
+int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
     sip_method_t const method = request->sip_request->rq_method;
     if (method == sip_method_ack)
@@ -99,22 +119,35 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         return refused;
     if (int const refused = admit(transaction); refused != 0)
         return refused;
-    unsigned int const callNumber = ++m_environment.lastCallNumber;
-    ++m_environment.counters.placed;
     SipParty const called = SipIdentity::READ_CALLED(request);
     std::string const number = called.getUser();
+    unsigned int const callNumber = ++m_environment.lastCallNumber;
+    ++m_environment.counters.placed;
     std::string const* const to = m_environment.routing.find(m_configuration.name, number);
     if (to == nullptr)
+        return refuseUnrouted(transaction, callNumber, number);
+    SipEndpoint* endpoint = nullptr;
+    try
     {
-        SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
-        ++m_environment.counters.failed;
-        spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
-                     m_configuration.name, number);
-        nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
-                            TAG_END());
-        return 404;
+        endpoint = &makeEndpoint(callNumber);
     }
-    return makeEndpoint(callNumber).receiveInvite(transaction, request, *to, called);
+    catch (std::bad_alloc const&)
+    {
+        ++m_environment.counters.failed;
+        return 503;
+    }
+    return endpoint->receiveInvite(transaction, request, *to, called);
+}
+
+int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
+{
+    SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
+    ++m_environment.counters.failed;
+    spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
+                 m_configuration.name, number);
+    nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
+                        TAG_END());
+    return 404;
 }
 
 /// What keeps an INVITE from being a call, whatever it asks for.
@@ -159,6 +192,8 @@ void SipInterface::clearCalls(SipCause const& cause)
 
 SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber)
 {
+    if (m_finished.capacity() <= m_endpoints.size()) // so that an end needs no memory
+        m_finished.reserve(2 * (m_endpoints.size() + 1));
     auto owner = std::make_unique<SipEndpoint>(*this, callNumber);
     SipEndpoint& endpoint = *owner;
     m_endpoints.emplace(&endpoint, std::move(owner));
@@ -175,8 +210,9 @@ void SipInterface::CLEAN_UP(void* interface) { static_cast<SipInterface*>(interf
 
 void SipInterface::cleanUp()
 {
-    for (SipEndpoint* const endpoint : std::exchange(m_finished, {}))
-        m_endpoints.erase(endpoint);
+    for (std::size_t i = 0; i < m_finished.size(); ++i) // ending one may finish another
+        m_endpoints.erase(m_finished[i]);
+    m_finished.clear();
     if (m_environment.onEndpointGone)
         m_environment.onEndpointGone();
 }

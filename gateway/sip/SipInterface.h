@@ -56,8 +56,10 @@ public:
     void finish(SipEndpoint& endpoint);
 
 private:
+    int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
+    int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
     int admit(nta_incoming_t* transaction);
     SipEndpoint& makeEndpoint(unsigned int callNumber);
     static void CLEAN_UP(void* interface);
