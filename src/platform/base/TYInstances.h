@@ -18,12 +18,14 @@ template <class T>
 class TYInstances
 {
 public:
+    /// A member of each object, `m_links`.
     struct Links
     {
-        T* older = nullptr;
-        T** fromNewer = nullptr; // the pointer that leads here: a newer one's `older`, or the list's
+        T* older = nullptr;      ///< the one made before
+        T** fromNewer = nullptr; ///< the pointer that leads here: a newer one's `older`, or the list's
     };
 
+    /// As the newest.
     void add(T& object)
     {
         object.m_links.older = m_newest;
