@@ -111,6 +111,8 @@ public:
         while (operations.size() < length)
             if (m_isHostile && m_random.isOneIn(24))
                 sendOnTheWay(operations);
+            else if (m_isHostile && m_random.isOneIn(8))
+                strikeInside(operations);
             else
                 operations.push_back(next());
         return operations;
@@ -146,6 +148,30 @@ private:
             operations.push_back(filled(m_random.isOneIn(3) ? Code::ADD_LEG : Code::MOVE_LEG));
             operations.back().arguments[0] = leg;
         }
+    }
+    /// Something is done to somebody inside what is done to the same.
+    void strikeInside(Operations& operations)
+    {
+        static constexpr Code OUTSIDE[] = {
+            Code::SET_LEG,      Code::SET_OWN,      Code::SET_PEER, Code::SET_CALL, Code::BECOME,  Code::DIAL,
+            Code::ACCEPT,       Code::DROP,         Code::ADD_LEG,  Code::SERVICE,  Code::SETUP,   Code::LEG_SERVICE,
+            Code::SET_DATAPATH, Code::SET_ON_CALL,  Code::TRANSFER, Code::CLEANUP,  Code::ACQUIRE, Code::RELEASE,
+            Code::DROP_CALLS,   Code::ADD_PROVIDER, Code::OFFER,    Code::MOVE_LEG};
+        static constexpr Code INSIDE[] = {
+            Code::GIVE_UP_LEG, Code::MOVE_LEG,        Code::SET_LEG,    Code::DROP,          Code::DESTROY_ADAPTER,
+            Code::CLEANUP,     Code::SETUP,           Code::DIAL,       Code::RELEASE,       Code::DESTROY_CONTEXT,
+            Code::EMPTY_CALL,  Code::CLEAN_UP_CALL,   Code::TRANSFER,   Code::OBSERVE,       Code::STOP_OBSERVING,
+            Code::BECOME,      Code::REMOVE_PROVIDER, Code::DROP_CALLS, Code::DESTROY_MODULE};
+        auto const whom = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::OBSERVE));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::WHEN));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.back().arguments[2] = 0;
+        operations.push_back(filled(INSIDE[m_random.below(std::size(INSIDE))]));
+        operations.back().arguments[0] = whom;
+        operations.push_back(filled(OUTSIDE[m_random.below(std::size(OUTSIDE))]));
+        operations.back().arguments[0] = whom;
     }
     Operation filled(Code code)
     {

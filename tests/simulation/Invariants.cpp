@@ -55,6 +55,8 @@ void CHECK_LINE(World& world, unsigned int number, Line const& line)
     CC_CallLeg const* const own = OWN_LEG(adapter);
     CC_CallLeg const* const peer = PEER_LEG(adapter);
     std::string const name = "line " + std::to_string(number);
+    if (!adapter.getCallLegName().isEmpty() && adapter.getEndpoint() == nullptr)
+        return world.fail(name + " has a leg and is not set up");
     if (peer == nullptr)
         return;
     if (own == nullptr || own == peer)

@@ -109,6 +109,8 @@ CC_Call* World::call(unsigned int way, unsigned int index)
     case 2:
         return line(index).adapter != nullptr ? line(index).adapter->getCall() : nullptr;
     case 3:
+        if (way % 8 == 7)
+            return m_telling;
         return leg(index) != nullptr ? leg(index)->getCall() : nullptr;
     default:
         return CALL_OF_CONTEXT(index);

@@ -114,6 +114,7 @@ public:
     };
     std::array<Sent, NUMBER_OF_LEGS> m_sent;
     bool m_areLegsDisturbed = false; // somebody else moved legs, too
+    CC_Call* m_telling = nullptr;    // the call that tells of its end
 
     unsigned int m_depth = 0;        // of call-outs with a reaction
     unsigned int m_strikes = 0;      // reactions so far
