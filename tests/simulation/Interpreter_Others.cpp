@@ -150,8 +150,7 @@ void Interpreter::dump(Operation const& operation)
 {
     CC_CallAdapter const* const adapter = m_world.line(operation[1]).adapter.get();
     CC_Call const* const call = m_world.call(operation[2], operation[3]);
-    InfoContainer info;
-    Memory::Library const library;
+    InfoContainer info; // nobody strikes inside: a dump walks through what its text may change
     if (operation[0] % 3 == 0 && adapter != nullptr)
         adapter->getInfo(info, 9, 0, 9, 0, "");
     else if (operation[0] % 3 == 1 && call != nullptr)
