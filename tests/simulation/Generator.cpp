@@ -168,10 +168,14 @@ private:
         operations.push_back(filled(Code::WHEN));
         operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
         operations.back().arguments[2] = 0;
-        operations.push_back(filled(INSIDE[m_random.below(std::size(INSIDE))]));
-        operations.back().arguments[0] = whom;
-        operations.push_back(filled(OUTSIDE[m_random.below(std::size(OUTSIDE))]));
-        operations.back().arguments[0] = whom;
+        for (Code const code : {INSIDE[m_random.below(std::size(INSIDE))], OUTSIDE[m_random.below(std::size(OUTSIDE))]})
+        {
+            operations.push_back(filled(code));
+            bool const isOfContext = code == Code::RELEASE || code == Code::DESTROY_CONTEXT ||
+                                     code == Code::DROP_CALLS || code == Code::ACQUIRE;
+            if (!isOfContext && code != Code::SET_ON_CALL && code != Code::EMPTY_CALL && code != Code::CLEAN_UP_CALL)
+                operations.back().arguments[0] = whom;
+        }
     }
     Operation filled(Code code)
     {
@@ -179,7 +183,47 @@ private:
         operation.code = code;
         for (std::uint8_t& argument : operation.arguments)
             argument = static_cast<std::uint8_t>(m_random.below(256));
+        if (!m_random.isOneIn(4))
+            aim(operation);
         return operation;
+    }
+    /// At the first context, which is always there, and its calls.
+    void aim(Operation& operation)
+    {
+        switch (operation.code)
+        {
+        case Code::DIAL:
+            operation.arguments[2] = 0;
+            break;
+        case Code::ACQUIRE:
+        case Code::RELEASE:
+        case Code::DROP_CALLS:
+        case Code::CREATE_CONTEXT:
+        case Code::DESTROY_CONTEXT:
+            operation.arguments[0] = 0;
+            break;
+        case Code::SET_ON_CALL:
+        case Code::EMPTY_CALL:
+        case Code::CLEAN_UP_CALL:
+            return aimAtCall(operation, 0);
+        case Code::ACCEPT:
+        case Code::REJECT:
+        case Code::OFFER:
+        case Code::ADD_LEG:
+        case Code::MOVE_LEG:
+        case Code::REMOVE_LEG:
+            return aimAtCall(operation, 1);
+        case Code::OBSERVE:
+        case Code::STOP_OBSERVING:
+            return aimAtCall(operation, 2);
+        default:
+            break;
+        }
+    }
+    void aimAtCall(Operation& operation, std::size_t way)
+    {
+        operation.arguments[way] = static_cast<std::uint8_t>(operation[way] & ~3U);
+        operation.arguments[way + 1] = static_cast<std::uint8_t>(3 * m_random.below(4));
     }
     Operation next()
     {
