@@ -153,6 +153,7 @@ void World::makeModule(unsigned int index)
         made.endpoint->setInputFilterContainer(nullptr);
         made.endpoint->setOutputFilterContainer(nullptr);
     }
+    m_hadOutputFilters = m_hadOutputFilters || made.endpoint->getOutputFilterContainer() != nullptr;
     for (unsigned int i = 0; i < LINES_OF_A_MODULE; ++i)
         makeAdapter(made.index * LINES_OF_A_MODULE + i,
                     (m_first[1] >> made.index % 8 & 1) + 2 * (m_first[3] >> made.index % 8 & 1));
