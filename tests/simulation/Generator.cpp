@@ -113,6 +113,8 @@ public:
                 sendOnTheWay(operations);
             else if (m_isHostile && m_random.isOneIn(8))
                 strikeInside(operations);
+            else if (m_random.isOneIn(40))
+                keyIn(operations);
             else
                 operations.push_back(next());
         return operations;
@@ -148,6 +150,18 @@ private:
             operations.push_back(filled(m_random.isOneIn(3) ? Code::ADD_LEG : Code::MOVE_LEG));
             operations.back().arguments[0] = leg;
         }
+    }
+    /// Digits for a callee that wants the number en bloc and has not enough of it.
+    void keyIn(Operations& operations)
+    {
+        auto const caller = static_cast<std::uint8_t>(m_random.below(4));
+        auto const callee = static_cast<std::uint8_t>(m_random.below(2));
+        auto const line = static_cast<std::uint8_t>(2 * callee + m_random.below(2));
+        auto const media = static_cast<std::uint8_t>(m_random.below(8));
+        operations.push_back({Code::DIAL, {caller, callee, 0, 0, 0, media, 2}});
+        operations.push_back({Code::SET_OWN, {line, 29, 0}}); // Supports Overlap-Receiving: false
+        operations.push_back({Code::BECOME, {line, 4}});      // ADDRESS_INCOMPLETE
+        operations.push_back({Code::SERVICE, {caller, 0, static_cast<std::uint8_t>(m_random.below(12))}});
     }
     /// Something is done to somebody inside what is done to the same.
     void strikeInside(Operations& operations)

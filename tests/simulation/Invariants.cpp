@@ -58,7 +58,8 @@ void CHECK_LINE(World& world, unsigned int number, Line const& line)
     std::string const name = "line " + std::to_string(number);
     if (!adapter.getCallLegName().isEmpty() && adapter.getEndpoint() == nullptr)
         return world.fail(name + " has a leg and is not set up");
-    bool const isIdle = CAN_BE_COMPARED && own == nullptr;
+    // a property that drops the adapter while it is copied into a view stays there until the next call
+    bool const isIdle = CAN_BE_COMPARED && own == nullptr && !world.m_hasPropertyActed;
     if (isIdle && (adapter.getOwnProperty(CC_PropertyId::STATE) != nullptr ||
                    adapter.getPeerProperty(CC_PropertyId::STATE) != nullptr ||
                    adapter.getCallProperty(CC_PropertyId::CONTEXT) != nullptr))

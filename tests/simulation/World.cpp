@@ -238,6 +238,7 @@ void World::strike(CallOut kind)
     Memory::Ours const ours;
     if (!m_reactions.take(kind, due) || m_depth > 8 || hasFailed())
         return;
+    m_hasPropertyActed = m_hasPropertyActed || (kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END);
     ++m_depth;
     ++m_strikes;
     m_carryOut(due.begin, due.end);

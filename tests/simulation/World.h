@@ -121,6 +121,7 @@ public:
     bool m_hasFailingFilter = false; // an input filter that keeps RELEASED from a leg: such a call may stay
     bool m_hasLostContext = false;   // a context was destroyed, maybe with calls
     bool m_wasShortOfMemory = false;
+    bool m_hasPropertyActed = false; // a property's operation did something
     bool m_hadOutputFilters = false; // somebody's, at some time
     unsigned int m_logLevel = 0;
     unsigned int m_lastGivenMedia = 1000; // ids of media contexts that operations bring along
