@@ -111,6 +111,10 @@ public:
         while (operations.size() < length)
             if (m_isHostile && m_random.isOneIn(24))
                 sendOnTheWay(operations);
+            else if (m_isHostile && m_random.isOneIn(8))
+                strikeInside(operations);
+            else if (m_random.isOneIn(40))
+                keyIn(operations);
             else
                 operations.push_back(next());
         return operations;
@@ -147,13 +151,93 @@ private:
             operations.back().arguments[0] = leg;
         }
     }
+    /// Digits for a callee that wants the number en bloc and has not enough of it.
+    void keyIn(Operations& operations)
+    {
+        auto const caller = static_cast<std::uint8_t>(m_random.below(4));
+        auto const callee = static_cast<std::uint8_t>(m_random.below(2));
+        auto const line = static_cast<std::uint8_t>(2 * callee + m_random.below(2));
+        auto const media = static_cast<std::uint8_t>(m_random.below(8));
+        operations.push_back({Code::DIAL, {caller, callee, 0, 0, 0, media, 2}});
+        operations.push_back({Code::SET_OWN, {line, 29, 0}}); // Supports Overlap-Receiving: false
+        operations.push_back({Code::BECOME, {line, 4}});      // ADDRESS_INCOMPLETE
+        operations.push_back({Code::SERVICE, {caller, 0, static_cast<std::uint8_t>(m_random.below(12))}});
+    }
+    /// Something is done to somebody inside what is done to the same.
+    void strikeInside(Operations& operations)
+    {
+        static constexpr Code OUTSIDE[] = {
+            Code::SET_LEG,      Code::SET_OWN,      Code::SET_PEER, Code::SET_CALL, Code::BECOME,  Code::DIAL,
+            Code::ACCEPT,       Code::DROP,         Code::ADD_LEG,  Code::SERVICE,  Code::SETUP,   Code::LEG_SERVICE,
+            Code::SET_DATAPATH, Code::SET_ON_CALL,  Code::TRANSFER, Code::CLEANUP,  Code::ACQUIRE, Code::RELEASE,
+            Code::DROP_CALLS,   Code::ADD_PROVIDER, Code::OFFER,    Code::MOVE_LEG};
+        static constexpr Code INSIDE[] = {
+            Code::GIVE_UP_LEG, Code::MOVE_LEG,        Code::SET_LEG,    Code::DROP,          Code::DESTROY_ADAPTER,
+            Code::CLEANUP,     Code::SETUP,           Code::DIAL,       Code::RELEASE,       Code::DESTROY_CONTEXT,
+            Code::EMPTY_CALL,  Code::CLEAN_UP_CALL,   Code::TRANSFER,   Code::OBSERVE,       Code::STOP_OBSERVING,
+            Code::BECOME,      Code::REMOVE_PROVIDER, Code::DROP_CALLS, Code::DESTROY_MODULE};
+        auto const whom = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::OBSERVE));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::WHEN));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.back().arguments[2] = 0;
+        for (Code const code : {INSIDE[m_random.below(std::size(INSIDE))], OUTSIDE[m_random.below(std::size(OUTSIDE))]})
+        {
+            operations.push_back(filled(code));
+            bool const isOfContext = code == Code::RELEASE || code == Code::DESTROY_CONTEXT ||
+                                     code == Code::DROP_CALLS || code == Code::ACQUIRE;
+            if (!isOfContext && code != Code::SET_ON_CALL && code != Code::EMPTY_CALL && code != Code::CLEAN_UP_CALL)
+                operations.back().arguments[0] = whom;
+        }
+    }
     Operation filled(Code code)
     {
         Operation operation;
         operation.code = code;
         for (std::uint8_t& argument : operation.arguments)
             argument = static_cast<std::uint8_t>(m_random.below(256));
+        if (!m_random.isOneIn(4))
+            aim(operation);
         return operation;
+    }
+    /// At the first context, which is always there, and its calls.
+    void aim(Operation& operation)
+    {
+        switch (operation.code)
+        {
+        case Code::DIAL:
+            operation.arguments[2] = 0;
+            break;
+        case Code::ACQUIRE:
+        case Code::RELEASE:
+        case Code::DROP_CALLS:
+        case Code::CREATE_CONTEXT:
+        case Code::DESTROY_CONTEXT:
+            operation.arguments[0] = 0;
+            break;
+        case Code::SET_ON_CALL:
+        case Code::EMPTY_CALL:
+        case Code::CLEAN_UP_CALL:
+            return aimAtCall(operation, 0);
+        case Code::ACCEPT:
+        case Code::REJECT:
+        case Code::OFFER:
+        case Code::ADD_LEG:
+        case Code::MOVE_LEG:
+        case Code::REMOVE_LEG:
+            return aimAtCall(operation, 1);
+        case Code::OBSERVE:
+        case Code::STOP_OBSERVING:
+            return aimAtCall(operation, 2);
+        default:
+            break;
+        }
+    }
+    void aimAtCall(Operation& operation, std::size_t way)
+    {
+        operation.arguments[way] = static_cast<std::uint8_t>(operation[way] & ~3U);
+        operation.arguments[way + 1] = static_cast<std::uint8_t>(3 * m_random.below(4));
     }
     Operation next()
     {

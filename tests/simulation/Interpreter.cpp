@@ -32,8 +32,8 @@ void Interpreter::carryOutAll(std::size_t begin, std::size_t end)
 std::size_t Interpreter::announce(std::size_t place, std::size_t end)
 {
     Operation const& operation = m_operations[place];
-    std::size_t const behind = std::min(place + 2 + operation[2] % 4, end);
-    m_world.m_reactions.add({CALL_OUT_OF(operation[0]), operation[1] % 64, place + 1, behind});
+    std::size_t const behind = std::min(place + 2 + operation[2] % MOST_INSIDE, end);
+    m_world.m_reactions.add({CALL_OUT_OF(operation[0]), operation[1] % MOST_OTHERS, place + 1, behind});
     return behind;
 }
 

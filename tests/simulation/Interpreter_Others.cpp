@@ -38,6 +38,7 @@ void Interpreter::useFilters(Operation const& operation)
     Module& module = m_world.module(operation[0]);
     if (module.endpoint == nullptr)
         return;
+    m_world.m_hadOutputFilters = m_world.m_hadOutputFilters || operation[1] % 2 != 0;
     if (operation[1] % 2 == 0)
         module.endpoint->setInputFilterContainer(operation[2] % 2 != 0 ? &module.inputFilters : nullptr);
     else
@@ -150,8 +151,7 @@ void Interpreter::dump(Operation const& operation)
 {
     CC_CallAdapter const* const adapter = m_world.line(operation[1]).adapter.get();
     CC_Call const* const call = m_world.call(operation[2], operation[3]);
-    InfoContainer info;
-    Memory::Library const library;
+    InfoContainer info; // nobody strikes inside: a dump walks through what its text may change
     if (operation[0] % 3 == 0 && adapter != nullptr)
         adapter->getInfo(info, 9, 0, 9, 0, "");
     else if (operation[0] % 3 == 1 && call != nullptr)

@@ -3,6 +3,7 @@
 #include "callcontrol/CC_CallPool.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "properties/CC_PropertyId.h"
 #include "tests/simulation/Library.h"
 #include "tests/simulation/World.h"
 
@@ -55,6 +56,14 @@ void CHECK_LINE(World& world, unsigned int number, Line const& line)
     CC_CallLeg const* const own = OWN_LEG(adapter);
     CC_CallLeg const* const peer = PEER_LEG(adapter);
     std::string const name = "line " + std::to_string(number);
+    if (!adapter.getCallLegName().isEmpty() && adapter.getEndpoint() == nullptr)
+        return world.fail(name + " has a leg and is not set up");
+    // a property that drops the adapter while it is copied into a view stays there until the next call
+    bool const isIdle = CAN_BE_COMPARED && own == nullptr && !world.m_hasPropertyActed;
+    if (isIdle && (adapter.getOwnProperty(CC_PropertyId::STATE) != nullptr ||
+                   adapter.getPeerProperty(CC_PropertyId::STATE) != nullptr ||
+                   adapter.getCallProperty(CC_PropertyId::CONTEXT) != nullptr))
+        return world.fail(name + " is idle and still sees something");
     if (peer == nullptr)
         return;
     if (own == nullptr || own == peer)
@@ -63,39 +72,17 @@ void CHECK_LINE(World& world, unsigned int number, Line const& line)
         return world.fail(name + " has a peer that is not in its call");
 }
 
-bool HAS_SAME(Properties const& left, Properties const& right)
+/// Without filters that may hide a State, the peer is the most active of the others.
+void CHECK_PEER(World& world, unsigned int number, Line const& line)
 {
-    return std::all_of(left.begin(), left.end(),
-                       [&](Property const& property)
-                       {
-                           return std::any_of(right.begin(), right.end(),
-                                              [&](Property const& other)
-                                              {
-                                                  // a class once stored stays, whatever comes after it
-                                                  return other.id == property.id &&
-                                                         (other.value == property.value ||
-                                                          other.value.kind != property.value.kind);
-                                              });
-                       });
-}
-
-/// The view of the peer is what the output filters make of its properties.
-void CHECK_VIEW(World& world, unsigned int number, Line const& line)
-{
+    CC_CallLeg const* const own = OWN_LEG(*line.adapter);
     CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
     CC_Endpoint const* const endpoint = line.adapter->getEndpoint();
-    if (peer == nullptr || endpoint == nullptr || peer->mayChangeUntold())
+    if (own == nullptr || peer == nullptr || endpoint == nullptr || endpoint->getOutputFilterContainer() != nullptr ||
+        world.m_hadOutputFilters || world.m_wasShortOfMemory)
         return;
-    CC_PropertyContainer expected(peer->getProperties());
-    if (CC_PropertyFilterContainer const* const filters = endpoint->getOutputFilterContainer())
-        std::ignore = filters->applyFilters(expected);
-    CC_PropertyContainer seen;
-    std::ignore = line.adapter->getPeerProperties(seen, ~0U);
-    Properties const left = Values::READ(expected);
-    Properties const right = Values::READ(seen);
-    if (!HAS_SAME(left, right) || !HAS_SAME(right, left))
-        world.fail("line " + std::to_string(number) + " sees" + Values::PRINT(right) + " of a peer that shows" +
-                   Values::PRINT(left));
+    if (own->getCall()->getOtherMostActiveCallLeg(*own, peer) != peer)
+        world.fail("line " + std::to_string(number) + " has a peer that is not the most active leg");
 }
 
 template <class Visit>
@@ -181,7 +168,7 @@ void CHECK_AT_REST(World& world)
     FOR_EACH_CALL([&](CC_Call const& call, unsigned int context) { CHECK_CALL_AT_REST(world, call, context); });
     CHECK_LOCKS(world);
     CHECK_STATISTICS(world);
-    std::ignore = CHECK_VIEW;
+    FOR_EACH_LINE(world, [&](unsigned int number, Line const& line) { CHECK_PEER(world, number, line); });
 }
 
 void CHECK_AT_THE_END(World& world)

@@ -84,7 +84,7 @@ public:
     struct LastDial
     {
         unsigned int context = 0;
-        unsigned int called = 0;
+        unsigned int called = 0xffffffff; // nobody
         Container own{};
         Container offered{};
         Container ofCall{};

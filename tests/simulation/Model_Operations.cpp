@@ -63,6 +63,8 @@ int Model::callOf(unsigned int way, unsigned int index) const
         int const own = adapter != NOBODY ? m_adapters[AT(adapter)].own : NOBODY;
         return own != NOBODY ? m_legs[AT(own)].call : NOBODY;
     }
+    if (way % 8 == 7)
+        return NOBODY; // a call that is telling of its end
     if (way % 4 == 3)
     {
         int const leg = m_guestLegs[index % m_guestLegs.size()];

@@ -15,7 +15,7 @@ constexpr auto NUMBER_OF_CODES = static_cast<std::size_t>(Code::NUMBER_OF_CODES)
 struct Row
 {
     char const* name;
-    char const* meaning; // %0 to %6: the arguments; %k: the kind of call-out
+    char const* meaning; // %0 to %6: the arguments; %k, %o, %n: of `when`
 };
 
 constexpr Row ROWS[] = {
@@ -61,7 +61,7 @@ constexpr Row ROWS[] = {
     {"use-filters", "module %0, direction %1, in use %2"},
     {"observe", "guest %0 observes the kind %1, object %2/%3"},
     {"stop-observing", "guest %0, the kind %1, object %2/%3"},
-    {"when", "at the coming call-out %k, after %1 others, the next %2 operations are carried out inside"},
+    {"when", "at the coming call-out %k, after %o others, the next %n operations are carried out inside"},
     {"fail-allocation", "of the next operation, the one after %0 others"},
     {"other-thread", "does %0 with guest leg %1 and is joined"},
     {"media-mode", "%0"},
@@ -91,6 +91,10 @@ std::string MEANING(Operation const& operation)
             text += *letter;
         else if (*++letter == 'k')
             text += NAME_OF(CALL_OUT_OF(operation[0]));
+        else if (*letter == 'o')
+            text += std::to_string(operation[1] % MOST_OTHERS);
+        else if (*letter == 'n')
+            text += std::to_string(1 + operation[2] % MOST_INSIDE);
         else
             text += std::to_string(operation[static_cast<std::size_t>(*letter - '0')]);
     }

@@ -89,6 +89,10 @@ struct Operation
     friend bool operator==(Operation const&, Operation const&) = default;
 };
 
+/// Of `when`: the call-outs that are let pass, and the operations that are carried out inside.
+constexpr unsigned int MOST_OTHERS = 64;
+constexpr unsigned int MOST_INSIDE = 4;
+
 using Operations = std::vector<Operation>;
 
 Operations FROM_OCTETS(std::uint8_t const* octets, std::size_t size);

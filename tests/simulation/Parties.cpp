@@ -60,8 +60,23 @@ void Guest::hear(void const* source, CallOut what, unsigned long long with, Last
     World::CALL_OUT(what);
 }
 
+/// While it lives that call can be meant, though nothing lists it any more.
+class Guest::Telling
+{
+public:
+    Telling(World& world, CC_Call* call) : m_world(world), m_before(std::exchange(world.m_telling, call)) {}
+    ~Telling() { m_world.m_telling = m_before; }
+    Telling(Telling const&) = delete;
+    Telling& operator=(Telling const&) = delete;
+
+private:
+    World& m_world;
+    CC_Call* m_before;
+};
+
 void Guest::onCallObservationEnded(CC_Event<CC_Call> const& event)
 {
+    Telling const telling(m_world, event.getSource());
     hear(event.getSource(), CallOut::CALL_ENDED, 0, Last::YES);
 }
 

@@ -85,6 +85,7 @@ public:
     bool m_isInRegistry = false;
 
 private:
+    class Telling;
     enum class Last : bool
     {
         NO,

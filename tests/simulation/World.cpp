@@ -109,6 +109,8 @@ CC_Call* World::call(unsigned int way, unsigned int index)
     case 2:
         return line(index).adapter != nullptr ? line(index).adapter->getCall() : nullptr;
     case 3:
+        if (way % 8 == 7)
+            return m_telling;
         return leg(index) != nullptr ? leg(index)->getCall() : nullptr;
     default:
         return CALL_OF_CONTEXT(index);
@@ -151,6 +153,7 @@ void World::makeModule(unsigned int index)
         made.endpoint->setInputFilterContainer(nullptr);
         made.endpoint->setOutputFilterContainer(nullptr);
     }
+    m_hadOutputFilters = m_hadOutputFilters || made.endpoint->getOutputFilterContainer() != nullptr;
     for (unsigned int i = 0; i < LINES_OF_A_MODULE; ++i)
         makeAdapter(made.index * LINES_OF_A_MODULE + i,
                     (m_first[1] >> made.index % 8 & 1) + 2 * (m_first[3] >> made.index % 8 & 1));
@@ -235,6 +238,7 @@ void World::strike(CallOut kind)
     Memory::Ours const ours;
     if (!m_reactions.take(kind, due) || m_depth > 8 || hasFailed())
         return;
+    m_hasPropertyActed = m_hasPropertyActed || (kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END);
     ++m_depth;
     ++m_strikes;
     m_carryOut(due.begin, due.end);

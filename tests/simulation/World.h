@@ -114,12 +114,15 @@ public:
     };
     std::array<Sent, NUMBER_OF_LEGS> m_sent;
     bool m_areLegsDisturbed = false; // somebody else moved legs, too
+    CC_Call* m_telling = nullptr;    // the call that tells of its end
 
     unsigned int m_depth = 0;        // of call-outs with a reaction
     unsigned int m_strikes = 0;      // reactions so far
     bool m_hasFailingFilter = false; // an input filter that keeps RELEASED from a leg: such a call may stay
     bool m_hasLostContext = false;   // a context was destroyed, maybe with calls
     bool m_wasShortOfMemory = false;
+    bool m_hasPropertyActed = false; // a property's operation did something
+    bool m_hadOutputFilters = false; // somebody's, at some time
     unsigned int m_logLevel = 0;
     unsigned int m_lastGivenMedia = 1000; // ids of media contexts that operations bring along
     unsigned long long m_added = 0;       // of the statistics, at the beginning
