@@ -196,7 +196,8 @@ private:
         bool const followsAChange = std::exchange(m_isBehindAChange, false);
         if (event.record.kind == Kind::PADDING)
             return size;
-        std::string_view const octets = m_ring.substr(offset, size);
+        // both lie inside the ring that is there
+        std::string_view const octets = m_ring.substr(static_cast<std::size_t>(offset), static_cast<std::size_t>(size));
         if (event.record.kind == Kind::ALSO_CHANGED)
             return followsAChange ? readAlsoChanged(octets) : 0;
         if (size < sizeof(Record) || event.record.kind >= Kind::NUMBER_OF_KINDS)

@@ -322,7 +322,7 @@ std::string CC_RecordingReport::textOf(Event const& event) const
 std::string CC_RecordingReport::timeOf(Event const& event) const
 {
     long long const realtime = m_recording.getRealtime(event);
-    std::time_t const seconds = realtime / NANOSECONDS_IN_SECOND;
+    auto const seconds = static_cast<std::time_t>(realtime / NANOSECONDS_IN_SECOND);
     std::tm parts{};
     if (realtime < 0 || gmtime_r(&seconds, &parts) == nullptr)
         return "(no time)";

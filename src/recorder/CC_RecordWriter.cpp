@@ -153,7 +153,7 @@ void CC_RecordWriter::end()
 /// near, the head moves to its beginning. More than one record's room is made at once, or every record would come here.
 void CC_RecordWriter::makeRoom()
 {
-    std::uint64_t const offset = m_head % m_capacity;
+    auto const offset = static_cast<std::size_t>(m_head % m_capacity);
     std::size_t const rest = m_capacity - offset;
     std::size_t const padding = rest < LARGEST_RECORD ? rest : 0;
     std::size_t const wanted = std::min(ROOM_AT_ONCE, padding != 0 ? ROOM_AT_ONCE : rest);
@@ -166,7 +166,7 @@ void CC_RecordWriter::makeRoom()
     if (padding != 0)
         pad(padding);
     m_at = m_ring + m_head % m_capacity;
-    m_left = std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head);
+    m_left = static_cast<std::size_t>(std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head));
 }
 
 /// Fills the end of the ring.

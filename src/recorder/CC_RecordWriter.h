@@ -115,7 +115,7 @@ private:
     CC_Writing const* m_changedBy = nullptr;
     bool m_isInBatch = false;
     char* m_ring = nullptr;
-    std::uint64_t m_capacity = 0;
+    std::size_t m_capacity = 0;
     std::uint64_t m_tail = 0;
     std::size_t m_size = 0; // the whole recording's
 };
