@@ -35,9 +35,11 @@ public:
     /// What a module has to keep.
     struct Rule
     {
-        char const* name;
-        char const* sentence;
+        char const* name;     ///< as filters of tests take it
+        char const* sentence; ///< what the module has to do
     };
+    /// The rules, each told by its sentence.
+    /// @{
     static Rule const ANSWERS_EACH_OFFER;
     static Rule const TELLS_THE_WIRE;
     static Rule const TELLS_THE_PEER;
@@ -53,6 +55,8 @@ public:
     static Rule const COMPLETES_NUMBERS;
     static Rule const SURVIVES_NO_MEMORY;
     static Rule const LEAVES_NOTHING;
+    /// @}
+    /// All of them.
     static std::vector<Rule const*> const& RULES();
 
     /// Makes a driver, with the module in it.
@@ -61,28 +65,31 @@ public:
     /// One way to try a rule.
     struct Case
     {
-        Rule const* rule;
-        std::string name; ///< "DropsOnce_ThePeerClearsAfterTheAnswer_CallFromTheWire"
-        std::function<void(ConformanceSituation&)> play;
+        Rule const* rule;                                ///< that it tries first of all
+        std::string name;                                ///< "DropsOnce_ThePeerClearsAfterTheAnswer_CallFromTheWire"
+        std::function<void(ConformanceSituation&)> play; ///< what happens in it
     };
+    /// All of them.
     static std::vector<Case> const& CASES();
 
     /// What came of a case.
     struct Outcome
     {
+        /// How it ended.
         enum Kind
         {
             KEPT,
             SKIPPED, ///< the driver says that the module cannot do it; `text` says why
             BROKEN   ///< `text` says all
         };
-        Kind kind = KEPT;
+        Kind kind = KEPT; ///< how it ended
         /// What was broken, which need not be the rule that the case is about: a call that does not even come up breaks
         /// a rule of its own. Null unless BROKEN.
         Rule const* broken = nullptr;
-        std::string text{};
+        std::string text{}; ///< of what is not KEPT: why
     };
-    /// An exception that leaves the module on its way through a loop breaks SURVIVES_NO_MEMORY. It is told on the
-    /// standard error stream, too, since a loop that was left like this may end the program afterwards.
+    /// Plays the case with a driver of its own. An exception that leaves the module on its way through a loop breaks
+    /// SURVIVES_NO_MEMORY. It is told on the standard error stream, too, since a loop that was left like this may end
+    /// the program afterwards.
     static Outcome RUN(Case const& tried, Factory const& makeDriver);
 };

@@ -11,11 +11,13 @@
 class ModuleConformanceTest : public testing::Test
 {
 public:
+    /// `tried` outlives the test; each test makes a driver.
     ModuleConformanceTest(ModuleConformance::Case const& tried, ModuleConformance::Factory makeDriver)
         : m_case(tried), m_makeDriver(std::move(makeDriver))
     {
     }
 
+    /// Plays the case.
     void TestBody() override
     {
         ModuleConformance::Outcome const outcome = ModuleConformance::RUN(m_case, m_makeDriver);

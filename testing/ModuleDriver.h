@@ -42,11 +42,13 @@ class ModuleDriver
 public:
     /// The provider that stands for the other side of call control: the module routes PEER_NUMBER to it.
     static constexpr char const* PEER = "peer";
+    /// The number at which the other side is called.
     static constexpr char const* PEER_NUMBER = "4930123456";
 
     /// What the far side saw the module do.
     struct Seen
     {
+        /// What it was.
         enum What
         {
             OFFERED,  ///< a call to `text`, the whole number
@@ -56,10 +58,10 @@ public:
                       ///< clearing
             DIGITS    ///< `text` was keyed in at the other side
         };
-        What what;
-        std::string text{};
-        QCause cause = QCause::NONE;
-        unsigned int call = 1; ///< which call on the wire, for a wire that has several at a time
+        What what;                   ///< what it was
+        std::string text{};          ///< the number or the digits
+        QCause cause = QCause::NONE; ///< of CLEARED
+        unsigned int call = 1;       ///< which call on the wire, for a wire that has several at a time
 
         /// "cleared 17 (User busy)"
         std::string getText() const;
@@ -91,7 +93,7 @@ public:
     virtual char const* whyNot(Ability ability) const;
     /// The causes with which the wire can clear, and those that it can be told; ALL_CAUSES() unless it has no more.
     virtual std::vector<QCause> getCausesFromWire() const;
-    virtual std::vector<QCause> getCausesToWire() const;
+    virtual std::vector<QCause> getCausesToWire() const; ///< see above
     /// The causes from 1 to 127 that Q.850 names.
     static std::vector<QCause> ALL_CAUSES();
 
@@ -123,6 +125,7 @@ public:
 
     // --- for the suite -----------------------------------------------------------------------------------------------
 
+    /// All that the far side saw, in order.
     std::vector<Seen> const& getSeen() const { return m_seen; }
     /// Runs inside `saw`.
     Hook<void(Seen const&)> m_onSeen;
@@ -134,6 +137,7 @@ protected:
     void saw(Seen const& seen);
     /// The same, of call 1, without a thought for memory.
     void saw(Seen::What what, String const& text = String::s_empty);
+    /// The same of CLEARED.
     void sawCleared(QCause cause);
 
 private:
