@@ -25,6 +25,6 @@ install(DIRECTORY examples/line DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol
 install(FILES examples/two_modules.cpp DESTINATION ${CMAKE_INSTALL_DATADIR}/callcontrol/examples)
 install(FILES README.md LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR})
 install(FILES docs/writing-a-module.md docs/event-loop.md docs/architecture.md docs/objects-of-a-call.svg
-    docs/performance.md
+    docs/performance.md docs/diagnosis.md docs/testing.md
     DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs) # where the README and they themselves look for each other
 install(DIRECTORY docs/decisions DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs)

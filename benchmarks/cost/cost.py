@@ -15,6 +15,7 @@ import tempfile
 CALLS = {"x86_64": [1, 100, 10000, 100000], "arm": [1, 100, 10000]}
 TOLERANCE = 0.02
 FLOOR_RATIO = 2.8  # a whole call may cost as many times the instructions of the memory work that it cannot avoid
+RECORDED_RATIO = 1.2  # a call that is recorded may cost as many times the instructions of one that is not
 RESIDENT_LIMIT = 8192  # octets of a call that is up, both adapters included
 GROWTH_LIMIT = 1.5  # of what a step costs with the most calls up, against a hundred
 PROGRAM = "benchmarks/cost/call_cost"
@@ -96,6 +97,9 @@ def targets(measured):
                 print(f"\n{machine}: a whole call costs {ratio:.2f} times the instructions of its floor")
             if ratio > FLOOR_RATIO and machine == "x86_64":
                 complaints.append(f"{machine}, {calls} calls: a whole call costs {ratio:.2f} floors, not {FLOOR_RATIO}")
+            recorded = steps["whole call, recorded"]["instructions"] / steps["whole call"]["instructions"]
+            if recorded > RECORDED_RATIO:
+                complaints.append(f"{machine}, {calls} calls: recording costs {recorded:.2f} times the call")
             if calls != "1" and steps["resident octets"]["number"] > RESIDENT_LIMIT:
                 complaints.append(f"{machine}, {calls} calls: {steps['resident octets']['number']} octets for each")
         most = list(by_calls)[-1]
