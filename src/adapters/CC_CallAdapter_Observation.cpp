@@ -91,13 +91,14 @@ void CC_CallAdapter::onCallLegSynchronousService(CC_Event<CC_CallLeg> const& eve
     auto const& service = CC_EvCallLegSynchronousService::FROM(event);
     if (m_ownCallLeg == nullptr || service.getSource() == m_ownCallLeg)
         return;
+    CC_Service& asked = *service.getService();
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
         recorder->addNumber(CC_RecordFormat::Kind::SERVICE_TOLD, getCallSerial(), getLegSerial(), 0,
-                            service.getSource()->getSerial(), typeid(*service.getService()).name());
+                            service.getSource()->getSerial(), typeid(asked).name());
     if (m_observer != nullptr)
-        m_observer->notifyPeerSynchronousService(*this, *service.getService());
+        m_observer->notifyPeerSynchronousService(*this, asked);
     else
-        notifyPeerSynchronousService(*service.getService());
+        notifyPeerSynchronousService(asked);
 }
 
 /// A peer that falls below the state in which the module last saw it may have to make way for another leg.
