@@ -94,8 +94,8 @@ TEST_F(CC_Recording_Test, OneThatIsCutOffIsReadAsFarAsItGoes)
 TEST_F(CC_Recording_Test, ATornRecordIsLeftOutAndTheOthersAreRead)
 {
     Header const before = header();
-    std::size_t const end = sizeof(Header) + (before.head - 8) % before.capacity + 8;
-    std::size_t const middle = sizeof(Header) + before.capacity / 16 * 8;
+    auto const end = static_cast<std::size_t>(sizeof(Header) + (before.head - 8) % before.capacity + 8);
+    auto const middle = static_cast<std::size_t>(sizeof(Header) + before.capacity / 16 * 8);
     for (std::size_t const behind : {end, middle})
     {
         Image torn = image;

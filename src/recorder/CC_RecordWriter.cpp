@@ -184,7 +184,7 @@ void CC_RecordWriter::addText(Kind kind, unsigned long long call, unsigned long 
                               std::string_view text)
 {
     begin(kind, call, leg, detail);
-    append(text.data(), std::min(text.size(), LARGEST_TEXT));
+    appendText(text.substr(0, LARGEST_TEXT));
     end();
 }
 
@@ -193,6 +193,6 @@ void CC_RecordWriter::addNumber(Kind kind, unsigned long long call, unsigned lon
 {
     begin(kind, call, leg, detail);
     append(&number, sizeof number);
-    append(text.data(), std::min(text.size(), LARGEST_TEXT));
+    appendText(text.substr(0, LARGEST_TEXT));
     end();
 }

@@ -51,7 +51,11 @@ public:
         std::memcpy(m_at, octets, size);
         m_at += size;
     }
-    void appendText(std::string_view text) { append(text.data(), text.size()); }
+    void appendText(std::string_view text)
+    {
+        if (!text.empty()) // one without characters may point nowhere
+            append(text.data(), text.size());
+    }
     /// Where the next octets come, for who writes so many there; a place for whole words as long as only such went
     /// before.
     char* getPlace() const { return m_at; }

@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <fcntl.h>
+#include <limits>
 #include <new>
 #include <string>
 #include <sys/mman.h>
@@ -35,6 +36,8 @@ XCode BEGIN(std::size_t octets, int file)
 /// A file of that size, all of it on the disk: a ring that the disk has no room for would end the process later.
 XCode MAKE_FILE(char const* path, std::size_t octets, int& file)
 {
+    if (octets > static_cast<std::size_t>(std::numeric_limits<off_t>::max()))
+        return XCode::NO_ELEMENT;
     file = open(path, O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
     if (file < 0)
         return XCode::FAILURE;

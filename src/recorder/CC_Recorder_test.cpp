@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <fstream>
 #include <gtest/gtest.h>
+#include <limits>
 #include <string>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -21,6 +22,9 @@
 namespace
 {
 using Kind = CC_RecordFormat::Kind;
+
+/// Octets that neither a disk nor a machine has.
+constexpr std::size_t TOO_MUCH = std::numeric_limits<std::size_t>::max() / 8 * (sizeof(std::size_t) == 8 ? 1 : 7);
 
 class CC_Recorder_Test : public testing::Test
 {
@@ -93,10 +97,10 @@ TEST_F(CC_Recorder_Test, AFileThatCannotBeMadeIsAFailure)
 
 TEST_F(CC_Recorder_Test, AFullDiskIsFoundAtTheStartAndNotLater)
 {
-    EXPECT_EQ(open(std::size_t{1} << 60), XCode::NO_ELEMENT);
+    EXPECT_EQ(open(TOO_MUCH), XCode::NO_ELEMENT);
     EXPECT_FALSE(CC_Recorder::IS_ON());
     EXPECT_NE(access(path.c_str(), F_OK), 0);
-    EXPECT_EQ(CC_Recorder::START(std::size_t{1} << 60), XCode::NO_ELEMENT) << "nor is there that much memory";
+    EXPECT_EQ(CC_Recorder::START(TOO_MUCH), XCode::NO_ELEMENT) << "nor is there that much memory";
 }
 
 TEST_F(CC_Recorder_Test, TheFileIsForItsOwnerAlone)
