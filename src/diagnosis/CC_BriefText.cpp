@@ -16,7 +16,7 @@ using CC_RecordFormat::Brief;
 
 std::string_view TEXT_OF(Brief const& brief) { return {brief.text, brief.textSize}; }
 
-std::string WITH_ELLIPSIS(std::string text, Brief const& brief)
+std::string WITH_ELLIPSIS(std::string const& text, Brief const& brief)
 {
     return brief.textSize < brief.textLength ? text + "..." : text;
 }

@@ -86,7 +86,7 @@ std::string READ_ARGUMENTS(std::vector<char const*> const& given, Arguments& arg
         {
             bool tookValue = false;
             char const* const value = i + 1 < given.size() ? given[i + 1] : nullptr;
-            if (std::string const wrong = READ_OPTION(argument, value, arguments, tookValue); !wrong.empty())
+            if (std::string wrong = READ_OPTION(argument, value, arguments, tookValue); !wrong.empty())
                 return wrong;
             i += tookValue ? 1 : 0;
         }
