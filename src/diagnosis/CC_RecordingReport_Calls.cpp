@@ -17,6 +17,13 @@ using Event = CC_Recording::Event;
 
 constexpr std::size_t COLUMN_WIDTH = 28;
 
+/// Unsigned in between, since the times of a damaged recording may be any.
+double NANOSECONDS_BETWEEN(long long earlier, long long later)
+{
+    return static_cast<double>(
+        static_cast<long long>(static_cast<unsigned long long>(later) - static_cast<unsigned long long>(earlier)));
+}
+
 bool CONTAINS(std::vector<std::uint64_t> const& list, std::uint64_t serial)
 {
     return std::find(list.begin(), list.end(), serial) != list.end();
@@ -47,7 +54,7 @@ bool IS_SAID_ALREADY(Event const& event)
 std::string TIME_AND_TURN(Event const& event, long long start)
 {
     std::array<char, 64> text;
-    std::snprintf(text.data(), text.size(), "%11.3f %7u  ", static_cast<double>(event.record.nanoseconds - start) / 1e6,
+    std::snprintf(text.data(), text.size(), "%11.3f %7u  ", NANOSECONDS_BETWEEN(start, event.record.nanoseconds) / 1e6,
                   event.record.turn);
     return text.data();
 }
@@ -139,7 +146,7 @@ public:
         std::array<char, 128> text;
         char const* const state = m_hasEnded ? "ended" : m_hasBeginning ? "up" : "up (beginning lost)";
         std::snprintf(text.data(), text.size(), "%8llu  %-20s %10.3f s  ", static_cast<unsigned long long>(call), state,
-                      static_cast<double>((m_hasEnded ? m_last : now) - m_first) / 1e9);
+                      NANOSECONDS_BETWEEN(m_first, m_hasEnded ? m_last : now) / 1e9);
         return text.data() + PADDED(getNumbers(numbers), 36) + m_cause;
     }
 
