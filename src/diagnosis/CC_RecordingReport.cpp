@@ -2,6 +2,7 @@
 
 #include "diagnosis/CC_BriefText.h"
 #include "diagnosis/CC_JsonLine.h"
+#include "diagnosis/SafeText.h"
 #include "platform/base/NameOf.h"
 #include "platform/base/XCode.h"
 #include "platform/signalling/QCause.h"
@@ -64,25 +65,6 @@ Party PARTY_OF(Table const& table, unsigned int id)
     auto const* const found =
         std::find_if(std::begin(table), std::end(table), [id](Personal const& row) { return row.id == id; });
     return found != std::end(table) ? found->party : NOBODY;
-}
-
-/// No character of it steers a terminal.
-std::string SAFE(std::string_view text)
-{
-    std::string out;
-    for (char const c : text)
-    {
-        auto const octet = static_cast<unsigned char>(c);
-        if (octet >= 0x20 && octet != 0x7f)
-        {
-            out += c;
-            continue;
-        }
-        std::array<char, 8> escape;
-        std::snprintf(escape.data(), escape.size(), "\\x%02x", unsigned{octet});
-        out += escape.data();
-    }
-    return out;
 }
 
 std::string NAME_OF_PROPERTY(unsigned int id)
@@ -219,14 +201,14 @@ std::string CC_RecordingReport::valueOf(Event const& event, Brief const& brief) 
     bool const isThere = brief.place != Brief::NOTHING && (brief.textLength != 0 || brief.place == Brief::OTHER_CLASS);
     if (isThere && event.record.kind == Kind::LEG_CHANGED && isWithheld(event.record.leg, event.record.detail))
         return "(withheld)";
-    return SAFE(CC_BriefText::OF(event.record.detail, brief));
+    return SAFE_TEXT(CC_BriefText::OF(event.record.detail, brief));
 }
 
 std::string CC_RecordingReport::nameOf(std::uint64_t leg) const
 {
     Leg const* const found = find(leg);
     std::string const serial = "leg " + std::to_string(leg);
-    return found != nullptr && !found->name.empty() ? serial + " " + SAFE(found->name) : serial;
+    return found != nullptr && !found->name.empty() ? serial + " " + SAFE_TEXT(found->name) : serial;
 }
 
 /// Empty for the ordinary case: a leg's own adapter, no filter.
@@ -241,7 +223,8 @@ std::string CC_RecordingReport::writerOf(Event const& event) const
             text += ", " + nameOf(event.by);
     }
     if (!event.filter.empty())
-        (text += text.empty() ? "" : ", ") += "filter " + std::to_string(event.filterPlace) + " " + SAFE(event.filter);
+        (text += text.empty() ? "" : ", ") +=
+            "filter " + std::to_string(event.filterPlace) + " " + SAFE_TEXT(event.filter);
     return text;
 }
 
@@ -272,7 +255,7 @@ std::string CC_RecordingReport::textOf(Event const& event) const
     case Kind::LEG_MADE:
         return "leg made";
     case Kind::LEG_NAMED:
-        return "named " + SAFE(event.text);
+        return "named " + SAFE_TEXT(event.text);
     case Kind::LEG_JOINED:
         return "joins call " + std::to_string(event.record.call);
     case Kind::LEG_LEFT:
@@ -283,26 +266,26 @@ std::string CC_RecordingReport::textOf(Event const& event) const
     case Kind::LEG_ENDED:
         return "leg ended";
     case Kind::DIALLING:
-        return "dials " + SAFE(event.text);
+        return "dials " + SAFE_TEXT(event.text);
     case Kind::DIALLED:
         return "dialled: " + RESULT(detail);
     case Kind::OFFERED:
-        return "offered to a " + SAFE(event.text);
+        return "offered to a " + SAFE_TEXT(event.text);
     case Kind::OFFER_TAKEN:
-        return "the " + SAFE(event.text) + " says " + RESULT(detail);
+        return "the " + SAFE_TEXT(event.text) + " says " + RESULT(detail);
     case Kind::ACCEPTED:
         return "accepted: " + RESULT(detail);
     case Kind::TRANSFERRED:
-        return SAFE(event.text) + " of the other legs of call " + std::to_string(event.number) +
+        return SAFE_TEXT(event.text) + " of the other legs of call " + std::to_string(event.number) +
                " to here: " + RESULT(detail);
     case Kind::DROPPED:
         return "drops " + CAUSE(event);
     case Kind::FAILED:
-        return SAFE(event.text);
+        return SAFE_TEXT(event.text);
     case Kind::SERVICE:
-        return "asks " + SAFE(event.text);
+        return "asks " + SAFE_TEXT(event.text);
     case Kind::SERVICE_TOLD:
-        return "<- " + SAFE(event.text) + " from leg " + std::to_string(event.number);
+        return "<- " + SAFE_TEXT(event.text) + " from leg " + std::to_string(event.number);
     case Kind::TOLD:
         return "<- told: " + IDS(event);
     case Kind::CLEANED_UP:
