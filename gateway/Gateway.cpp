@@ -1,6 +1,5 @@
 #include "Gateway.h"
 
-#include "MediaContexts.h"
 #include "adapters/CC_CallAdapter.h"
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CallControl.h"
@@ -9,10 +8,11 @@
 #include "calls/CC_CallLeg.h"
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
+#include "host/MediaContexts.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
-#include "sip/SipCause.h"
-#include "sip/SipPropertyId.h"
+#include "sip/message/SipCause.h"
+#include "sip/message/SipPropertyId.h"
 
 #include <spdlog/spdlog.h>
 

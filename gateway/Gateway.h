@@ -1,13 +1,13 @@
 #pragma once
 
-#include "CallControlHost.h"
-#include "Configuration.h"
-#include "Recording.h"
+#include "configuration/Configuration.h"
+#include "host/CallControlHost.h"
+#include "operation/Recording.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
-#include "sip/SipEnvironment.h"
-#include "sip/SipInterface.h"
-#include "sip/SipStack.h"
+#include "sip/endpoint/SipEnvironment.h"
+#include "sip/endpoint/SipInterface.h"
+#include "sip/stack/SipStack.h"
 
 #include <memory>
 #include <vector>

@@ -1,6 +1,6 @@
 // callcontrol-gateway: SIP clients call each other through the call-control library. README.md tells how it is used.
 #include "Gateway.h"
-#include "Log.h"
+#include "operation/Log.h"
 
 #include <CLI/CLI.hpp>
 

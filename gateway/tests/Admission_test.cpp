@@ -1,4 +1,4 @@
-#include "Admission.h"
+#include "host/Admission.h"
 
 #include "testing/DrivenClock.h"
 

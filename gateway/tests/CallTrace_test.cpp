@@ -1,4 +1,4 @@
-#include "CallTrace.h"
+#include "host/CallTrace.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "Configuration.h"
+#include "configuration/Configuration.h"
 
 #include <gtest/gtest.h>
 

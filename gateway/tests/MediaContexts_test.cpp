@@ -1,4 +1,4 @@
-#include "MediaContexts.h"
+#include "host/MediaContexts.h"
 
 #include <gtest/gtest.h>
 

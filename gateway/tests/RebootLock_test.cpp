@@ -1,4 +1,4 @@
-#include "RebootLock.h"
+#include "host/RebootLock.h"
 
 #include "platform/base/TYPtr.h"
 

@@ -1,6 +1,6 @@
-#include "Recording.h"
+#include "operation/Recording.h"
 
-#include "Configuration.h"
+#include "configuration/Configuration.h"
 #include "recorder/CC_Recorder.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-#include "Routing.h"
+#include "host/Routing.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "sip/SipAddress.h"
+#include "sip/message/SipAddress.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "sip/SipCause.h"
+#include "sip/message/SipCause.h"
 
 #include "properties/CC_PropertyId.h"
 

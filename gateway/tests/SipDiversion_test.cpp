@@ -1,4 +1,4 @@
-#include "sip/SipDiversion.h"
+#include "sip/message/SipDiversion.h"
 
 #include "SipMessage.h"
 

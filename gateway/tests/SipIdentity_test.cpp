@@ -1,4 +1,4 @@
-#include "sip/SipIdentity.h"
+#include "sip/message/SipIdentity.h"
 
 #include "SipMessage.h"
 

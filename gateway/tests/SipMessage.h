@@ -1,6 +1,6 @@
 #pragma once
 
-#include "sip/Sofia.h"
+#include "sip/stack/Sofia.h"
 
 #include <sofia-sip/sip_util.h>
 

@@ -1,4 +1,4 @@
-#include "sip/SipParty.h"
+#include "sip/message/SipParty.h"
 
 #include "properties/CC_PropertyContainer.h"
 

@@ -1,4 +1,4 @@
-#include "sip/SipPropertyId.h"
+#include "sip/message/SipPropertyId.h"
 
 #include "properties/CC_PropertyString.h"
 

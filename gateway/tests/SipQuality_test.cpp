@@ -1,4 +1,4 @@
-#include "sip/SipQuality.h"
+#include "sip/message/SipQuality.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "sip/SipReason.h"
+#include "sip/message/SipReason.h"
 
 #include <gtest/gtest.h>
 

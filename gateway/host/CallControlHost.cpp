@@ -1,0 +1,48 @@
+#include "host/CallControlHost.h"
+
+#include "callcontrol/CallControl.h"
+#include "host/MediaContexts.h"
+#include "platform/driver/DRIVER.h"
+
+#include <stdexcept>
+
+CallControlHost::CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName)
+    : m_callControl(callControl), m_contextName(contextName), m_rebootLock(new RebootLock)
+{
+    CallControl::SET_CC_EVENT_LOOP(&callControl);
+    CallControl::SET_DP_EVENT_LOOP(&datapath);
+    CallControl::SET_MG_CONTEXT_REPOSITORY(new MediaContextRepository);
+    CallControl::SET_MG_TERMINATION_REPOSITORY(new MediaTerminationRepository);
+    if (!DRIVER::INSTANCE().addDriverInterface(m_rebootLock.get(), TY::UUID::INVALID(), "reboot").isOk() ||
+        !CallControl::ADD_PROPERTY_FACTORY(&m_factory).isOk() || !CallControl::CREATE_CONTEXT(contextName).isOk())
+        throw std::runtime_error("call control cannot be set up");
+}
+
+CallControlHost::~CallControlHost()
+{
+    runPending(); // calls that ended a moment ago go back to their pool
+    CallControl::DESTROY_CONTEXT(m_contextName);
+    runPending();
+    CallControl::REMOVE_PROPERTY_FACTORY(&m_factory);
+    DRIVER::INSTANCE().removeDriverInterface(m_rebootLock.get());
+    CallControl::SET_MG_TERMINATION_REPOSITORY(nullptr);
+    CallControl::SET_MG_CONTEXT_REPOSITORY(nullptr);
+    CallControl::SET_DP_EVENT_LOOP(nullptr);
+    CallControl::SET_CC_EVENT_LOOP(nullptr);
+}
+
+void CallControlHost::runPending()
+{
+    while (m_callControl.runTurn())
+    {
+    }
+}
+
+CallControlHost::Registration::Registration(CallControlHost const& host, String const& name, CC_Provider& provider)
+    : m_contextName(host.getContextName()), m_name(name)
+{
+    if (!CallControl::ADD_PROVIDER(m_contextName, m_name, provider).isOk())
+        throw std::runtime_error("the name is taken");
+}
+
+CallControlHost::Registration::~Registration() { CallControl::REMOVE_PROVIDER(m_contextName, m_name); }

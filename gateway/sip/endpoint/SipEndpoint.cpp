@@ -1,0 +1,282 @@
+#include "sip/endpoint/SipEndpoint.h"
+
+#include "callcontrol/CallControl.h"
+#include "properties/CC_Cause.h"
+#include "properties/CC_Flags.h"
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyQoS.h"
+#include "properties/CC_PropertyString.h"
+#include "sip/endpoint/SipInterface.h"
+#include "sip/message/SipPropertyId.h"
+
+#include <spdlog/spdlog.h>
+
+#include <tuple>
+#include <utility>
+
+namespace
+{
+/// Texts of several lines, and of columns, as the one line that a trace has for them.
+std::string ON_ONE_LINE(std::string_view text)
+{
+    std::string line;
+    char const* separator = "";
+    for (char const c : text)
+        if (c == '\n')
+            separator = ", ";
+        else if (c == ' ')
+            separator = *separator == '\0' ? " " : separator;
+        else
+        {
+            char const* const before = std::exchange(separator, "");
+            line.append(line.empty() ? "" : before).append(1, c);
+        }
+    return line;
+}
+} // namespace
+
+SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
+    : CC_Endpoint(nullptr, nullptr)
+    , m_interface(interface)
+    , m_callNumber(callNumber)
+    , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+{
+}
+
+void SipEndpoint::ON_TIMER(void* endpoint)
+{
+    auto& self = *static_cast<SipEndpoint*>(endpoint);
+    self.handle([&] { self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout(); });
+}
+
+SipEndpoint::~SipEndpoint()
+{
+    m_adapter.cleanup();
+    forgetTransaction();
+    forgetInvite();
+    if (m_bye != nullptr)
+    {
+        nta_outgoing_bind(m_bye, nullptr, nullptr);
+        nta_outgoing_destroy(m_bye);
+    }
+    if (m_leg != nullptr)
+        nta_leg_destroy(m_leg);
+}
+
+String const& SipEndpoint::getName() const { return m_interface.getName(); }
+
+String const& SipEndpoint::getNetwork() const { return m_interface.getName(); }
+
+InfoContainer& SipEndpoint::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                    unsigned int maxDetail, unsigned int detail, String const& prefix) const
+{
+    String text;
+    text.format("%s/%u, %s side, dialog %s", getName().c_str(), m_callNumber, m_isCalling ? "calling" : "called",
+                DIALOG_NAME(m_dialog));
+    info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Endpoint", text);
+    return info;
+}
+
+void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& flags)
+{
+    handle([&] { followCall(flags); });
+}
+
+void SipEndpoint::followCall(CC_Flags const& flags)
+{
+    traceFlags(flags);
+    if (isPeerReleased())
+        onPeerReleased();
+    else if (m_isCalling)
+        followPeer();
+    else if (m_isAckLate && flags.get(SipPropertyId::SESSION_DESCRIPTION))
+        acknowledgeLate();
+}
+
+/// Nothing is asked of a SIP side yet: whoever asks sees that nobody took the service.
+void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter&, CC_Service&)
+{
+    if (isTraced())
+        handle([&] { trace("told a service, not taken"); });
+}
+
+/// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
+bool SipEndpoint::isPeerReleased() const
+{
+    auto const* const state = getPeer<CC_PropertyCallLegState>(CC_PropertyId::STATE);
+    return state != nullptr ? state->getState() == CC_PropertyCallLegState::RELEASED : m_hadPeer;
+}
+
+void SipEndpoint::onPeerReleased()
+{
+    SipCause const cause =
+        SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
+    endDialog(cause);
+    leaveCall(cause);
+}
+
+void SipEndpoint::clear(SipCause const& cause)
+{
+    try
+    {
+        endDialog(cause);
+        leaveCall(cause);
+    }
+    catch (std::bad_alloc const&)
+    {
+        endWithoutWords();
+    }
+}
+
+/// Not even the words of an end can be had: our end gives up what the SIP stack has, and that says what it can.
+void SipEndpoint::endWithoutWords()
+{
+    if (std::exchange(m_isInCall, false))
+        m_adapter.drop(QCause::RESOURCE_UNAVAILABLE, 0);
+    setDialog(Dialog::OVER);
+}
+
+/// Takes the leg out of the call, with the cause in the peer's words.
+void SipEndpoint::leaveCall(SipCause const& cause)
+{
+    if (!std::exchange(m_isInCall, false))
+    {
+        finishIfDone();
+        return;
+    }
+    m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);
+    if (m_isCalling)
+    {
+        Counters& counters = m_interface.getEnvironment().counters;
+        ++(m_wasAnswered ? counters.cleared : counters.failed);
+    }
+    spdlog::info("call {} {} ({} side) released: cause {} ({}), SIP {}{}{}{}", m_callNumber, getName().view(),
+                 m_isCalling ? "calling" : "called", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
+                 cause.sipCode, cause.text.empty() ? "" : ", \"", cause.text, cause.text.empty() ? "" : "\"");
+    finishIfDone();
+}
+
+/// Whether the cause is written, with the peer's words; without memory for these only the drop says it.
+bool SipEndpoint::sayWhy(SipCause const& cause)
+{
+    try
+    {
+        recordQuality();
+        CC_PropertyContainer last;
+        bool const isWritten = last.set(cause.getProperty()).isOk() && writeOwn(last).isOk();
+        if (isTraced())
+            trace("did  drop, State=RELEASED");
+        return isWritten;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return false;
+    }
+}
+
+/// While the leg is still in the call, so that the other side sees it.
+void SipEndpoint::recordQuality()
+{
+    std::optional<CC_QoS> const record = m_quality.getRecord();
+    if (!record)
+        return;
+    if (isTraced())
+        trace("did  " + TEXT_OF(CC_PropertyQoS(CC_PropertyId::QUALITY_OF_SERVICE, *record)));
+    std::ignore = m_adapter.setOwnQoS(*record); // without memory the call ends without a record
+}
+
+void SipEndpoint::setDialog(Dialog dialog)
+{
+    m_dialog = dialog;
+    finishIfDone();
+}
+
+void SipEndpoint::finishIfDone()
+{
+    if (m_dialog != Dialog::OVER || m_isInCall || std::exchange(m_isFinished, true))
+        return;
+    m_timer.stop();
+    m_interface.finish(*this);
+}
+
+XCode SipEndpoint::writeOwn(CC_PropertyContainer const& properties)
+{
+    if (isTraced())
+        trace("did  " + TEXT_OF(properties));
+    return m_adapter.setOwnProperties(properties);
+}
+
+std::string SipEndpoint::getPeerText(unsigned int id) const
+{
+    auto const* const property = getPeer<CC_PropertyString>(id);
+    return property != nullptr ? std::string(property->getValue().view()) : std::string();
+}
+
+char const* SipEndpoint::DIALOG_NAME(Dialog dialog)
+{
+    switch (dialog)
+    {
+    case Dialog::NONE:
+        return "none";
+    case Dialog::INVITE_RECEIVED:
+        return "INVITE received";
+    case Dialog::ANSWERED:
+        return "answered";
+    case Dialog::INVITE_SENT:
+        return "INVITE sent";
+    case Dialog::CANCELLED:
+        return "cancelled";
+    case Dialog::UP:
+        return "up";
+    case Dialog::BYE_SENT:
+        return "BYE sent";
+    case Dialog::OVER:
+        return "over";
+    }
+    return "(unknown)";
+}
+
+// --- trace -----------------------------------------------------------------------------------------------------------
+
+void SipEndpoint::trace(std::string text) const
+{
+    if (isTraced())
+        m_ladder->add(m_isCalling ? CallTrace::LEFT : CallTrace::RIGHT, std::move(text));
+}
+
+void SipEndpoint::traceFlags(CC_Flags const& flags) const
+{
+    if (!isTraced())
+        return;
+    for (unsigned int id = flags.getFirstSet(0); id != CC_Flags::NONE; id = flags.getFirstSet(id + 1))
+    {
+        CC_Property const* const ofPeer = m_adapter.getPeerProperty(id);
+        CC_Property const* const ofCall = m_adapter.getCallProperty(id);
+        if (ofPeer != nullptr)
+            trace("told peer " + TEXT_OF(*ofPeer));
+        else if (ofCall != nullptr)
+            trace("told call " + TEXT_OF(*ofCall));
+        else
+            trace(std::string("told gone ") + SipPropertyId::NAME(id));
+    }
+}
+
+std::string SipEndpoint::TEXT_OF(CC_Property const& property)
+{
+    String value;
+    property.getValueString(value);
+    std::string const name = SipPropertyId::NAME(property.getId());
+    if (property.getId() == SipPropertyId::SESSION_DESCRIPTION)
+        return name + fmt::format(" ({} bytes)", value.length());
+    return name + "=" + ON_ONE_LINE(value.view());
+}
+
+std::string SipEndpoint::TEXT_OF(CC_PropertyContainer const& properties)
+{
+    std::string text;
+    for (CC_Property const& property : properties)
+        text += (text.empty() ? "" : ", ") + TEXT_OF(property);
+    return text;
+}

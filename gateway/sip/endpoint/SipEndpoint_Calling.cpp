@@ -1,0 +1,235 @@
+// The calling side: the INVITE was received, the peer leg says how it is answered.
+#include "sip/endpoint/SipEndpoint.h"
+
+#include "properties/CC_PropertyBoolean.h"
+#include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "sip/endpoint/SipInterface.h"
+#include "sip/message/SipDiversion.h"
+#include "sip/message/SipIdentity.h"
+#include "sip/message/SipProperty.h"
+#include "sip/message/SipPropertyId.h"
+
+#include <tuple>
+
+using namespace SipProperty;
+
+namespace
+{
+constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
+
+/// What the INVITE tells of its side beyond the party that calls.
+void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, std::string const& session)
+{
+    if (!second.number.empty())
+        second.addAsSecondTo(own);
+    SipDiversion::READ(request).addTo(own);
+    if (!session.empty())
+        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, !session.empty())); // else a new leg's: none
+}
+} // namespace
+
+int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                               SipParty const& called)
+{
+    m_isCalling = true;
+    m_isInCall = true;
+    try
+    {
+        return takeInvite(transaction, request, provider, called);
+    }
+    catch (std::bad_alloc const&)
+    {
+        if (m_transaction != nullptr)
+        {
+            m_timer.start(0); // as below
+            return 0;
+        }
+        m_dialog = Dialog::OVER;
+        leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        return 503;
+    }
+}
+
+int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
+                            SipParty const& called)
+{
+    m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
+    trace("<- INVITE to " + called.getUser());
+    if (!makeServerDialog(transaction, request))
+    {
+        m_dialog = Dialog::OVER;
+        leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+        return 503;
+    }
+    nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
+    trace("-> 100");
+    // the stack still holds the transaction, which must not end under it: a failure waits until it has let go
+    if (!dial(request, provider, called).isOk())
+        m_timer.start(0);
+    return 0;
+}
+
+void SipEndpoint::onDialFailed() { clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}}); }
+
+bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* request)
+{
+    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(request->sip_call_id),
+                            SIPTAG_FROM(request->sip_to), SIPTAG_TO(request->sip_from), TAG_END());
+    if (m_leg == nullptr)
+        return false;
+    nta_leg_tag(m_leg, nta_incoming_tag(transaction, nullptr));
+    nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
+    m_transaction = transaction;
+    nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
+    m_dialog = Dialog::INVITE_RECEIVED;
+    return true;
+}
+
+XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipParty const& called)
+{
+    std::string const session = SESSION_OF(request);
+    m_hasOffer = !session.empty();
+    SipIdentity const caller = SipIdentity::READ_CALLER(request);
+    CC_PropertyContainer own;
+    ADD_CALLING(own, caller.second, request, session);
+    CC_PropertyContainer offer;
+    unsigned long const maxForwards =
+        request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;
+    ADD(offer, CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, maxForwards - 1)); // else the default
+    CC_PropertyContainer call;
+    ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
+    if (isTraced())
+        trace("did  dial " + provider + " (" + called.getUser() + ") as " + caller.party.getText() +
+              ", State=CONNECTED, " + TEXT_OF(own));
+    String name;
+    name.format("%u", m_callNumber);
+    if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
+        return bound;
+    SipParty const& party = caller.party;
+    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), STRING(called.getUser()),
+                          STRING(party.number), party.type, party.plan, party.presentation, party.screening,
+                          STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
+                          true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
+}
+
+int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
+{
+    endpoint->handle(
+        [&]
+        {
+            if (request == nullptr)
+                endpoint->onAckMissing();
+            else if (request->sip_request->rq_method == sip_method_cancel)
+                endpoint->onCancel(request);
+            else
+                endpoint->onAck(request);
+        });
+    return 0;
+}
+
+void SipEndpoint::onAck(sip_t const* request)
+{
+    if (m_dialog != Dialog::ANSWERED)
+        return;
+    m_dialog = Dialog::UP;
+    forgetTransaction(); // it would live on for half a minute
+    trace("<- ACK");
+    if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
+    {
+        m_quality.noteAnswer(session);
+        CC_PropertyContainer own;
+        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
+        std::ignore = writeOwn(own); // without memory the called side gives up in its time
+    }
+    if (m_byeAfterAck)
+        sendBye(*m_byeAfterAck);
+}
+
+void SipEndpoint::onAckMissing()
+{
+    if (m_dialog != Dialog::ANSWERED)
+        return;
+    m_dialog = Dialog::UP;
+    forgetTransaction();
+    trace("the 200 was not acknowledged");
+    SipCause const cause = m_byeAfterAck.value_or(SipCause{QCause::RECOVERY_ON_TIMER_EXPIRY, 0, {}});
+    sendBye(cause);
+    leaveCall(cause);
+}
+
+void SipEndpoint::onCancel(sip_t const* request)
+{
+    if (m_dialog != Dialog::INVITE_RECEIVED)
+        return; // answered already: the BYE will follow
+    trace("<- CANCEL");
+    SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
+    answerFinally(487, {});
+    leaveCall(cause);
+}
+
+/// Brings the INVITE's answers up to where the peer leg has come.
+void SipEndpoint::followPeer()
+{
+    auto const* const state = getPeer<CC_PropertyCallLegState>(CC_PropertyId::STATE);
+    if (state == nullptr)
+        return;
+    m_hadPeer = true;
+    if (m_dialog != Dialog::INVITE_RECEIVED)
+        return;
+    auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
+    bool const hasData = data != nullptr && data->getValue();
+    if (state->getState() >= CC_PropertyCallLegState::HELD)
+        answer();
+    else if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
+        answerProvisionally(SIP_180_RINGING, hasData);
+    else if (hasData && !m_hasEarlyMedia)
+        answerProvisionally(SIP_183_SESSION_PROGRESS, hasData);
+}
+
+void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
+{
+    m_hasEarlyMedia = m_hasEarlyMedia || hasData;
+    answerFromPeer(status, phrase, hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string());
+}
+
+void SipEndpoint::answer()
+{
+    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
+    m_dialog = Dialog::ANSWERED;
+    m_wasAnswered = true;
+    ++m_interface.getEnvironment().counters.answered;
+}
+
+/// With the called party's identity, as far as the network vouches for it.
+void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string const& session)
+{
+    std::string const identity =
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+    if (m_hasOffer)
+        m_quality.noteAnswer(session);
+    trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
+    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+                        TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+                        TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+                        TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+}
+
+void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)
+{
+    trace("-> " + std::to_string(status) + (reasonHeader.empty() ? "" : ", Reason: ") + reasonHeader);
+    nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
+                        TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
+    forgetTransaction(); // the stack goes on repeating the answer until its ACK
+    setDialog(Dialog::OVER);
+}
+
+void SipEndpoint::forgetTransaction()
+{
+    if (m_transaction == nullptr)
+        return;
+    nta_incoming_bind(m_transaction, nullptr, nullptr);
+    nta_incoming_destroy(std::exchange(m_transaction, nullptr));
+}

@@ -1,0 +1,132 @@
+// What either side does inside its dialog, and how a dialog ends.
+#include "sip/endpoint/SipEndpoint.h"
+#include "sip/endpoint/SipInterface.h"
+
+int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
+{
+    int status = 500; // what memory kept from being done
+    handle([&] { status = onRequest(transaction, request); });
+    return status;
+}
+
+int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
+{
+    switch (request->sip_request->rq_method)
+    {
+    case sip_method_bye:
+        return onBye(request);
+    case sip_method_ack:
+        return 0; // of a 200 whose transaction is gone
+    case sip_method_options:
+        return m_interface.answerOptions(transaction);
+    case sip_method_invite:
+        trace("<- INVITE in the dialog, -> 488");
+        return 488; // sessions are not renegotiated
+    default:
+        break;
+    }
+    int const refused = m_interface.refuseMethod(transaction, request);
+    return refused != 0 ? refused : 481;
+}
+
+int SipEndpoint::onBye(sip_t const* request)
+{
+    SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
+    trace("<- BYE, -> 200");
+    switch (m_dialog)
+    {
+    case Dialog::INVITE_RECEIVED: // a caller may end its early dialog this way
+        answerFinally(487, {});
+        break;
+    case Dialog::ANSWERED:
+    case Dialog::UP:
+        if (m_isAckLate)
+            acknowledge({});
+        forgetTransaction();
+        setDialog(Dialog::OVER);
+        break;
+    case Dialog::INVITE_SENT:
+    case Dialog::CANCELLED:
+        return 481; // there is no dialog yet
+    default:        // both sides hang up at once: ours is answered as well
+        return 200;
+    }
+    leaveCall(cause);
+    return 200;
+}
+
+/// Ends the SIP side as its state demands; nothing happens when it is ending already.
+void SipEndpoint::endDialog(SipCause const& cause)
+{
+    switch (m_dialog)
+    {
+    case Dialog::INVITE_RECEIVED:
+        answerFinally(cause.getFinalStatus(), cause.getReasonHeader(false));
+        break;
+    case Dialog::ANSWERED: // a BYE must not overtake the 200
+        if (!m_byeAfterAck)
+            m_byeAfterAck = cause;
+        break;
+    case Dialog::INVITE_SENT:
+        cancel(cause);
+        break;
+    case Dialog::UP:
+        if (m_isAckLate)
+            acknowledge({});
+        sendBye(cause);
+        break;
+    case Dialog::NONE:
+        setDialog(Dialog::OVER);
+        break;
+    default:
+        break;
+    }
+}
+
+void SipEndpoint::sendBye(SipCause const& cause)
+{
+    std::string const reason = cause.getReasonHeader(true);
+    trace("-> BYE, Reason: " + reason);
+    m_dialog = Dialog::BYE_SENT;
+    m_bye = nta_outgoing_tcreate(m_leg, HANDLE_BYE_RESPONSE, this, nullptr, SIP_METHOD_BYE, nullptr,
+                                 SIPTAG_REASON_STR(reason.c_str()), TAG_END());
+    if (m_bye == nullptr)
+        setDialog(Dialog::OVER);
+}
+
+int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)
+{
+    int const status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
+    if (status < 200)
+        return 0;
+    bool const isOurs = response == nullptr || nta_sip_is_internal(response);
+    nta_outgoing_destroy(transaction);
+    endpoint->m_bye = nullptr;
+    endpoint->m_dialog = Dialog::OVER;
+    endpoint->handle(
+        [&] { endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE"); });
+    endpoint->finishIfDone();
+    return 0;
+}
+
+/// The Reason header's whole value, empty without one. The stack has split it at its commas.
+std::string SipEndpoint::REASON_OF(sip_t const* message)
+{
+    std::string text;
+    for (sip_reason_t const* reason = message->sip_reason; reason != nullptr; reason = reason->re_next)
+    {
+        text += text.empty() ? "" : ", ";
+        text += reason->re_protocol != nullptr ? reason->re_protocol : "";
+        for (msg_param_t const* parameter = reason->re_params; parameter != nullptr && *parameter != nullptr;
+             ++parameter)
+            text += std::string(";") + *parameter;
+    }
+    return text;
+}
+
+std::string SipEndpoint::SESSION_OF(sip_t const* message)
+{
+    if (message->sip_payload == nullptr || message->sip_payload->pl_data == nullptr)
+        return {};
+    return std::string(message->sip_payload->pl_data, message->sip_payload->pl_len);
+}

@@ -1,0 +1,218 @@
+#include "sip/endpoint/SipInterface.h"
+
+#include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
+#include "platform/eventloop/TYEvent.h"
+#include "properties/CC_PropertyUnsigned.h"
+#include "sip/endpoint/SipEndpoint.h"
+#include "sip/message/SipAddress.h"
+#include "sip/message/SipCause.h"
+#include "sip/message/SipIdentity.h"
+#include "sip/message/SipPropertyId.h"
+#include "sip/stack/SipListener.h"
+#include "sip/stack/SipStack.h"
+
+#include <spdlog/spdlog.h>
+
+#include <new>
+#include <stdexcept>
+#include <strings.h>
+#include <tuple>
+
+namespace
+{
+constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS";
+constexpr char const* RETRY_AFTER_SECONDS = "5";
+} // namespace
+
+SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration)
+    : CC_Provider(configuration.name.c_str(), "sip")
+    , m_environment(environment)
+    , m_configuration(configuration)
+    , m_name(configuration.name.c_str())
+    , m_contact(
+          SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp)))
+    , m_home(su_home_create())
+    , m_allow(sip_allow_make(m_home.get(), ALLOW))
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration))
+    , m_defaultLeg(nta_leg_tcreate(m_agent.get(), HANDLE, this, NTATAG_NO_DIALOG(1), TAG_END()))
+{
+    m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
+}
+
+SipInterface::~SipInterface()
+{
+    m_endpoints.clear();
+    m_cleanUpEvent->destroy();
+}
+
+XCode SipInterface::dial(CC_Call& call, String const&, String const& destination,
+                         CC_PropertyContainer const& offerProperties)
+{
+    auto const* const number =
+        dynamic_cast<CC_PropertyUnsigned const*>(call.getProperties().get(SipPropertyId::CALL_NUMBER));
+    try
+    {
+        SipEndpoint& endpoint = makeEndpoint(number != nullptr ? static_cast<unsigned int>(number->getValue()) : 0);
+        XCode const result = endpoint.offer(call, destination, offerProperties);
+        if (!result.isOk())
+            finish(endpoint);
+        return result;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return XCode::FAILURE;
+    }
+}
+
+InfoContainer& SipInterface::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,
+                                     unsigned int maxDetail, unsigned int detail, String const& prefix) const
+{
+    String text;
+    text.format("%s, listening on %s, peer %s, %zu endpoints", m_name.c_str(), m_configuration.listen.text().c_str(),
+                m_configuration.peer.text().c_str(), m_endpoints.size());
+    info.addWithin(maxLevel, level, maxDetail, detail, prefix, "SIP Interface", text);
+    return info;
+}
+
+int SipInterface::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
+{
+    try
+    {
+        return onRequest(transaction, request);
+    }
+    catch (std::bad_alloc const&)
+    {
+        return 503;
+    }
+}
+
+int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
+{
+    sip_method_t const method = request->sip_request->rq_method;
+    if (method == sip_method_ack)
+        return 0;
+    if (method == sip_method_cancel || (request->sip_to != nullptr && request->sip_to->a_tag != nullptr))
+        return 481;
+    if (method == sip_method_options)
+        return answerOptions(transaction);
+    if (int const refused = refuseMethod(transaction, request); refused != 0)
+        return refused;
+    return method == sip_method_invite ? receiveInvite(transaction, request) : 481;
+}
+
+int SipInterface::refuseMethod(nta_incoming_t* transaction, sip_t const* request) const
+{
+    return nta_check_method(transaction, request, m_allow, SIPTAG_ALLOW(m_allow), TAG_END());
+}
+
+int SipInterface::answerOptions(nta_incoming_t* transaction) const
+{
+    nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_ALLOW(m_allow), SIPTAG_ACCEPT_STR("application/sdp"),
+                        TAG_END());
+    return 200;
+}
+
+int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
+{
+    if (int const refused = checkInvite(transaction, request); refused != 0)
+        return refused;
+    if (int const refused = admit(transaction); refused != 0)
+        return refused;
+    SipParty const called = SipIdentity::READ_CALLED(request);
+    std::string const number = called.getUser();
+    unsigned int const callNumber = ++m_environment.lastCallNumber;
+    ++m_environment.counters.placed;
+    std::string const* const to = m_environment.routing.find(m_configuration.name, number);
+    if (to == nullptr)
+        return refuseUnrouted(transaction, callNumber, number);
+    SipEndpoint* endpoint = nullptr;
+    try
+    {
+        endpoint = &makeEndpoint(callNumber);
+    }
+    catch (std::bad_alloc const&)
+    {
+        ++m_environment.counters.failed;
+        return 503;
+    }
+    return endpoint->receiveInvite(transaction, request, *to, called);
+}
+
+int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
+{
+    SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
+    ++m_environment.counters.failed;
+    spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
+                 m_configuration.name, number);
+    nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
+                        TAG_END());
+    return 404;
+}
+
+/// What keeps an INVITE from being a call, whatever it asks for.
+int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request) const
+{
+    if (request->sip_max_forwards != nullptr && request->sip_max_forwards->mf_count == 0)
+        return 483;
+    if (request->sip_contact == nullptr || request->sip_contact->m_url->url_type == url_any)
+    {
+        nta_incoming_treply(transaction, 400, "Missing Contact Header", TAG_END());
+        return 400;
+    }
+    if (int const refused = nta_check_required(transaction, request, nullptr, TAG_END()); refused != 0)
+        return refused;
+    bool const isSession =
+        request->sip_content_type != nullptr && strcasecmp(request->sip_content_type->c_type, "application/sdp") == 0;
+    if (request->sip_payload != nullptr && !isSession)
+    {
+        nta_incoming_treply(transaction, SIP_415_UNSUPPORTED_MEDIA, SIPTAG_ACCEPT_STR("application/sdp"), TAG_END());
+        return 415;
+    }
+    return 0;
+}
+
+int SipInterface::admit(nta_incoming_t* transaction)
+{
+    if (!m_environment.isEnding && m_environment.admission.admit(CallControl::GET_NUMBER_OF_CALLS()))
+        return 0;
+    ++m_environment.counters.refused;
+    spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
+                  m_environment.isEnding ? "the gateway is ending" : "too many calls");
+    nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
+                        TAG_END());
+    return 503;
+}
+
+void SipInterface::clearCalls(SipCause const& cause)
+{
+    for (auto const& [endpoint, owner] : m_endpoints)
+        endpoint->clear(cause);
+}
+
+SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber)
+{
+    if (m_finished.capacity() <= m_endpoints.size()) // so that an end needs no memory
+        m_finished.reserve(2 * (m_endpoints.size() + 1));
+    auto owner = std::make_unique<SipEndpoint>(*this, callNumber);
+    SipEndpoint& endpoint = *owner;
+    m_endpoints.emplace(&endpoint, std::move(owner));
+    return endpoint;
+}
+
+void SipInterface::finish(SipEndpoint& endpoint)
+{
+    m_finished.push_back(&endpoint);
+    std::ignore = m_cleanUpEvent->setIfNotPending(); // refused only once it is destroyed, with the interface
+}
+
+void SipInterface::CLEAN_UP(void* interface) { static_cast<SipInterface*>(interface)->cleanUp(); }
+
+void SipInterface::cleanUp()
+{
+    for (std::size_t i = 0; i < m_finished.size(); ++i) // ending one may finish another
+        m_endpoints.erase(m_finished[i]);
+    m_finished.clear();
+    if (m_environment.onEndpointGone)
+        m_environment.onEndpointGone();
+}

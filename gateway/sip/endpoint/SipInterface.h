@@ -1,0 +1,79 @@
+#pragma once
+
+#include "callcontrol/provider/CC_Provider.h"
+#include "configuration/Configuration.h"
+#include "sip/endpoint/SipEnvironment.h"
+#include "sip/endpoint/SipRequestHandler.h"
+#include "sip/stack/SipHandles.h"
+
+#include <memory>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+class SipEndpoint;
+class TYEvent;
+struct SipCause;
+
+/// One SIP interface: listens on one address, on UDP and TCP, and sends its calls to one peer. A provider of call
+/// control under the interface's name.
+///
+/// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the gateway;
+/// belongs to the thread of the stack's loop, which is also that of the call-control loop.
+///
+///     SipInterface interface(environment, configuration.interfaces[0]);
+///     std::ignore = CallControl::ADD_PROVIDER("", interface.getName(), interface);
+class SipInterface : public CC_Provider, public SipRequestHandler
+{
+public:
+    /// Throws std::runtime_error with the reason when the address cannot be listened on.
+    SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration);
+    ~SipInterface() override; ///< ends what is still up without a word to the peers
+
+    // --- CC_Provider
+    XCode dial(CC_Call& call, String const& providerName, String const& destination,
+               CC_PropertyContainer const& offerProperties) override;
+    ProviderType getProviderType() const override { return USER_DEFINED_INTERFACE; }
+    InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
+                           unsigned int detail, String const& prefix) const override;
+
+    /// Requests outside of dialogs: new calls above all.
+    int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
+
+    String const& getName() const { return m_name; }
+    Configuration::Interface const& getConfiguration() const { return m_configuration; }
+    SipEnvironment& getEnvironment() const { return m_environment; }
+    nta_agent_t* getAgent() const { return m_agent.get(); }
+    std::string const& getContact() const { return m_contact; }
+    std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
+
+    /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
+    int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
+    int answerOptions(nta_incoming_t* transaction) const;
+    /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
+    void clearCalls(SipCause const& cause);
+    /// The endpoint is done; it is destroyed in the loop's next turn.
+    void finish(SipEndpoint& endpoint);
+
+private:
+    int onRequest(nta_incoming_t* transaction, sip_t const* request);
+    int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
+    int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
+    int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
+    int admit(nta_incoming_t* transaction);
+    SipEndpoint& makeEndpoint(unsigned int callNumber);
+    static void CLEAN_UP(void* interface);
+    void cleanUp();
+
+    SipEnvironment& m_environment;
+    Configuration::Interface m_configuration;
+    String m_name;
+    std::string m_contact;
+    SipHome m_home;
+    sip_allow_t* m_allow; // the home's
+    SipAgent m_agent;
+    SipLeg m_defaultLeg;
+    TYEvent* m_cleanUpEvent = nullptr;
+    std::unordered_map<SipEndpoint*, std::unique_ptr<SipEndpoint>> m_endpoints;
+    std::vector<SipEndpoint*> m_finished;
+};

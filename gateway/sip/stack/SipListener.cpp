@@ -1,0 +1,74 @@
+#include "sip/stack/SipListener.h"
+
+#include "sip/message/SipAddress.h"
+#include "sip/stack/SipStack.h"
+
+#include <arpa/inet.h>
+#include <cerrno>
+#include <cstring>
+#include <netinet/in.h>
+#include <stdexcept>
+#include <string>
+#include <sys/socket.h>
+#include <unistd.h>
+
+namespace
+{
+constexpr unsigned int SOCKET_BUFFER = 4u << 20; // bytes; a burst of calls comes faster than one thread reads
+constexpr unsigned int LARGEST_MESSAGE = 65536;  // bytes
+constexpr unsigned int UDP_MTU = 65535;          // bytes; above it the stack would change to TCP on its own
+
+socklen_t FILL(sockaddr_storage& storage, SocketAddress const& address)
+{
+    storage = {};
+    if (address.isVersion6())
+    {
+        auto& target = reinterpret_cast<sockaddr_in6&>(storage);
+        target.sin6_family = AF_INET6;
+        target.sin6_port = htons(address.port);
+        inet_pton(AF_INET6, address.host.c_str(), &target.sin6_addr);
+        return sizeof target;
+    }
+    auto& target = reinterpret_cast<sockaddr_in&>(storage);
+    target.sin_family = AF_INET;
+    target.sin_port = htons(address.port);
+    inet_pton(AF_INET, address.host.c_str(), &target.sin_addr);
+    return sizeof target;
+}
+
+/// The stack shares a UDP port with whoever has it already and tells nobody, so we ask for it first.
+void CHECK_PORT(SocketAddress const& address, int type, char const* transport)
+{
+    sockaddr_storage storage;
+    socklen_t const length = FILL(storage, address);
+    int const descriptor = socket(storage.ss_family, type, 0);
+    int const on = 1;
+    if (type == SOCK_STREAM) // connections that ended a moment ago do not count
+        setsockopt(descriptor, SOL_SOCKET, SO_REUSEADDR, &on, sizeof on);
+    bool const isFree = descriptor >= 0 && bind(descriptor, reinterpret_cast<sockaddr*>(&storage), length) == 0 &&
+                        (type != SOCK_STREAM || listen(descriptor, 1) == 0);
+    int const error = errno;
+    if (descriptor >= 0)
+        close(descriptor);
+    if (!isFree)
+        throw std::runtime_error("cannot listen on " + address.text() + " (" + transport +
+                                 "): " + std::strerror(error));
+}
+} // namespace
+
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration)
+{
+    CHECK_PORT(configuration.listen, SOCK_DGRAM, "udp");
+    CHECK_PORT(configuration.listen, SOCK_STREAM, "tcp");
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.listen, false);
+    SipAgent agent(nta_agent_create(stack.getRoot(), URL_STRING_MAKE((uri + ";transport=udp").c_str()), nullptr,
+                                    nullptr, NTATAG_UA(1), NTATAG_PASS_100(1), NTATAG_MAXSIZE(LARGEST_MESSAGE),
+                                    NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
+                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1),
+                                    TPTAG_UDP_RMEM(SOCKET_BUFFER), TPTAG_UDP_WMEM(SOCKET_BUFFER), TAG_END()));
+    if (agent == nullptr)
+        throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (udp)");
+    if (nta_agent_add_tport(agent.get(), URL_STRING_MAKE((uri + ";transport=tcp").c_str()), TAG_END()) < 0)
+        throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (tcp)");
+    return agent;
+}
