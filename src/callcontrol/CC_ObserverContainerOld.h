@@ -24,6 +24,9 @@ public:
     /// From now on nobody is told anything.
     void silence() { m_observers.silence(); }
 
+    /// Ends with the container, and so with the owner.
+    TYLifeline const& getLifeline() const { return m_lifeline; }
+
     /// The owner may end inside a notification; the walk then ends with it.
     void notifyObservers(Trampoline trampoline, Owner& owner, void* data) const
     {

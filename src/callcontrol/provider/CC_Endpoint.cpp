@@ -1,6 +1,7 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 
 #include "calls/CC_Call.h"
+#include "platform/base/TYLifeline.h"
 #include "properties/CC_PropertyContainer.h"
 #include "properties/CC_PropertyFilterContainer.h"
 #include "recorder/CC_RecordWriter.h"
@@ -58,11 +59,13 @@ XCode CC_Endpoint::offerFiltered(CC_Call& call, String const& name, CC_PropertyC
 {
     if (m_outputFilterContainer == nullptr)
         return handleOffer(call, name, properties);
+    TYLifeline::Watch const self(m_observers.getLifeline()); // a property's copying or a filter may end this endpoint
     CC_PropertyContainer filtered(properties);
-    if (filtered.getNumberOfProperties() != properties.getNumberOfProperties())
-        return XCode::FAILURE;                                     // memory is out
-    std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
-    return handleOffer(call, name, filtered);
+    if (!self.isAlive() || filtered.getNumberOfProperties() != properties.getNumberOfProperties())
+        return XCode::FAILURE; // gone, or memory is out
+    if (m_outputFilterContainer != nullptr)
+        std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
+    return self.isAlive() ? handleOffer(call, name, filtered) : XCode(XCode::FAILURE);
 }
 
 void CC_Endpoint::NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void*)

@@ -10,6 +10,7 @@
 #include "testing/RecordingEndpoint.h"
 #include "testing/RecordingEndpointObserver.h"
 #include "testing/RecordingPropertyFilter.h"
+#include "tests/support/PropertyTesting.h"
 
 #include <gtest/gtest.h>
 #include <memory>
@@ -120,6 +121,33 @@ TEST_F(CC_Endpoint_Offer_Test, AFilterThatRunsOutOfMemoryDoesNotKeepTheCallFromB
     m_endpoint.setOutputFilterContainer(&m_filters);
     EXPECT_EQ(offer(), XCode::OK);
     EXPECT_NE(m_call, nullptr) << "with what the filters have left";
+}
+
+TEST_F(CC_Endpoint_Offer_Test, AnEndpointThatEndsWhileItsOfferIsCopiedIsOfferedNothing)
+{
+    auto endpoint = std::make_unique<RecordingEndpoint>("line", "network", nullptr, nullptr, &m_filters);
+    endpoint->m_handleOffer = m_endpoint.m_handleOffer;
+    auto const deeds = std::make_shared<ActingProperty::Deeds>();
+    EXPECT_TRUE(m_offered.set(ActingProperty(CC_PropertyId::URI, 1, deeds)).isOk());
+    deeds->onClone = [&endpoint] { endpoint.reset(); };
+    EXPECT_EQ(endpoint->offer(*m_offeredCall, "4989123", m_offered), XCode::FAILURE);
+    EXPECT_EQ(m_call, nullptr);
+}
+
+TEST_F(CC_Endpoint_Offer_Test, AnEndpointThatEndsInsideItsOutputFilterIsOfferedNothing)
+{
+    auto endpoint = std::make_unique<RecordingEndpoint>("line", "network", nullptr, nullptr, &m_filters);
+    endpoint->m_handleOffer = m_endpoint.m_handleOffer;
+    RecordingPropertyFilter filter("f");
+    filter.onApply(
+        [&endpoint](CC_PropertyContainer&)
+        {
+            endpoint.reset();
+            return XCode::OK;
+        });
+    EXPECT_TRUE(m_filters.addFilter(filter).isOk());
+    EXPECT_EQ(endpoint->offer(*m_offeredCall, "4989123", m_offered), XCode::FAILURE);
+    EXPECT_EQ(m_call, nullptr);
 }
 
 TEST(CC_Endpoint, TheFirstFiltersAreForInputTheSecondForOutput)
