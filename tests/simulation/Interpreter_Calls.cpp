@@ -67,7 +67,7 @@ XCode Interpreter::moveLeg(Operation const& operation)
 XCode Interpreter::transferLeg(unsigned int number, CC_CallLeg& leg, CC_Call* to)
 {
     CallWatch watch;
-    watch.watch(to);
+    watch.watch(to == m_world.m_telling ? nullptr : to);
     m_world.noteMove(number, to);
     Memory::Library const library;
     XCode const result = CC_Call::TRANSFER_CALL_LEG(to, leg);

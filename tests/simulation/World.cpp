@@ -131,6 +131,11 @@ void World::noteMove(unsigned int index, CC_Call* to)
 {
     Memory::Ours const ours;
     Sent& sent = m_sent[index % NUMBER_OF_LEGS];
+    if (to != nullptr && to == m_telling) // it takes no leg, and who observes it only now is not told of the end
+    {
+        sent.isSent = false;
+        return sent.to.watch(nullptr);
+    }
     sent.isSent = true;
     sent.isIntoCall = to != nullptr;
     sent.to.watch(to);
@@ -238,11 +243,26 @@ void World::strike(CallOut kind)
     Memory::Ours const ours;
     if (!m_reactions.take(kind, due) || m_depth > 8 || hasFailed())
         return;
-    m_hasPropertyActed = m_hasPropertyActed || (kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END);
+    bool const isOfProperty = kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END;
+    m_hasPropertyActed = m_hasPropertyActed || isOfProperty;
+    bool const mayBeNews = kind == CallOut::LEG_ADDED || isOfProperty; // whose copies are made inside such news, too
+    std::vector<int> const before = mayBeNews ? getActivityLevels() : std::vector<int>();
     ++m_depth;
     ++m_strikes;
     m_carryOut(due.begin, due.end);
     --m_depth;
+    m_hasStateChangedInNews = m_hasStateChangedInNews || (mayBeNews && before != getActivityLevels());
+}
+
+/// Of all legs in calls.
+std::vector<int> World::getActivityLevels() const
+{
+    std::vector<int> levels;
+    for (unsigned int i = 0; i < NUMBER_OF_CONTEXTS; ++i)
+        for (unsigned int j = 0; CC_Call const* const call = CallControl::GET_CALL(CONTEXT_NAME(i), j); ++j)
+            for (unsigned int k = 0; k < call->getNumberOfCallLegs(); ++k)
+                levels.push_back(call->getCallLeg(k)->getActivityLevel());
+    return levels;
 }
 
 bool World::isBlank(CC_Call const& call) const

@@ -123,6 +123,8 @@ public:
     bool m_wasShortOfMemory = false;
     bool m_hasPropertyActed = false; // a property's operation did something
     bool m_hadOutputFilters = false; // somebody's, at some time
+    /// A leg's state changed while its joining was told: who observes the legs of the call hears of that leg only later.
+    bool m_hasStateChangedInNews = false;
     unsigned int m_logLevel = 0;
     unsigned int m_lastGivenMedia = 1000; // ids of media contexts that operations bring along
     unsigned long long m_added = 0;       // of the statistics, at the beginning
@@ -130,6 +132,7 @@ public:
 
 private:
     void strike(CallOut kind);
+    std::vector<int> getActivityLevels() const;
     void releaseWhatMayStay();
 
     static World* s_current;

@@ -59,13 +59,14 @@ XCode CC_Endpoint::offerFiltered(CC_Call& call, String const& name, CC_PropertyC
 {
     if (m_outputFilterContainer == nullptr)
         return handleOffer(call, name, properties);
-    TYLifeline::Watch const self(m_observers.getLifeline()); // a property's copying or a filter may end this endpoint
+    TYLifeline::Watch const self(m_observers.getLifeline()); // a property's copying or a filter may end this endpoint,
+    CC_Call::Hold const held(&call);                         // and the call
     CC_PropertyContainer filtered(properties);
     if (!self.isAlive() || filtered.getNumberOfProperties() != properties.getNumberOfProperties())
         return XCode::FAILURE; // gone, or memory is out
     if (m_outputFilterContainer != nullptr)
         std::ignore = m_outputFilterContainer->applyFilters(filtered); // what the filters leave is what is offered
-    return self.isAlive() ? handleOffer(call, name, filtered) : XCode(XCode::FAILURE);
+    return self.isAlive() && !held.isReleased() ? handleOffer(call, name, filtered) : XCode(XCode::FAILURE);
 }
 
 void CC_Endpoint::NOTIFY_OBSERVER_ABOUT_FINISHED(Observer& observer, CC_Endpoint& endpoint, void*)

@@ -15,6 +15,7 @@
 #include <gtest/gtest.h>
 #include <memory>
 #include <new>
+#include <utility>
 
 namespace
 {
@@ -35,8 +36,13 @@ protected:
             return m_answer;
         };
     }
-    ~CC_Endpoint_Offer_Test() override { m_offeredCall->destroy(); }
+    ~CC_Endpoint_Offer_Test() override { endCall(); }
 
+    void endCall()
+    {
+        if (CC_Call* const call = std::exchange(m_offeredCall, nullptr))
+            call->destroy();
+    }
     XCode offer() { return m_endpoint.offer(*m_offeredCall, "4989123", m_offered); }
     /// Filters that drop the name and, if so told, fail.
     void filterName(XCode result)
@@ -131,6 +137,16 @@ TEST_F(CC_Endpoint_Offer_Test, AnEndpointThatEndsWhileItsOfferIsCopiedIsOfferedN
     EXPECT_TRUE(m_offered.set(ActingProperty(CC_PropertyId::URI, 1, deeds)).isOk());
     deeds->onClone = [&endpoint] { endpoint.reset(); };
     EXPECT_EQ(endpoint->offer(*m_offeredCall, "4989123", m_offered), XCode::FAILURE);
+    EXPECT_EQ(m_call, nullptr);
+}
+
+TEST_F(CC_Endpoint_Offer_Test, ACallThatEndsWhileItsOfferIsCopiedIsNotOffered)
+{
+    m_endpoint.setOutputFilterContainer(&m_filters);
+    auto const deeds = std::make_shared<ActingProperty::Deeds>();
+    EXPECT_TRUE(m_offered.set(ActingProperty(CC_PropertyId::URI, 1, deeds)).isOk());
+    deeds->onClone = [this] { endCall(); };
+    EXPECT_EQ(offer(), XCode::FAILURE);
     EXPECT_EQ(m_call, nullptr);
 }
 
