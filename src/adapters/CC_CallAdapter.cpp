@@ -3,10 +3,10 @@
 #include "adapters/CC_CallAdapterObserver.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
 #include "adapters/CC_CallAdapter_Event.h"
+#include "adapters/CC_CallAdapter_Log.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
-#include "calls/CC_Monitor.h"
 #include "platform/base/NameOf.h"
 #include "platform/base/NestingGuard.h"
 #include "recorder/CC_RecordWriter.h"
@@ -88,13 +88,16 @@ void CC_CallAdapter::setName(String const& name)
         if (newName == m_name)
             return;
         TYLifeline::Watch const self(m_lifeline);
-        if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_NAMING))
-            monitor->debug("[EP %s/%s] Set name: %s", getEndpointName(), m_name.c_str(), newName.c_str());
+        if (Log const log(*this, RTD::LEVEL_NAMING); log.isWanted())
+            log->debug("[EP %s/%s] Set name: %s", log.getEndpointName(), m_name.c_str(), newName.c_str());
         if (!self.isAlive())
             return;
         m_name = std::move(newName);
-        if (m_ownCallLeg != nullptr)
-            std::ignore = m_ownCallLeg->setName(makeCallLegName()); // without memory the leg keeps its old name
+        if (m_ownCallLeg == nullptr)
+            return;
+        String const legName = makeCallLegName(); // the endpoint may end us, or the leg
+        if (self.isAlive() && m_ownCallLeg != nullptr)
+            std::ignore = m_ownCallLeg->setName(legName); // without memory the leg keeps its old name
     }
     catch (std::bad_alloc const&)
     {
@@ -127,9 +130,9 @@ void CC_CallAdapter::invokeSynchronousService(CC_Service& service)
     Attempt const attempt(*this);
     try
     {
-        if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
-            monitor->debug("[EP %s/%s] Invoke service: %s", getEndpointName(), m_name.c_str(),
-                           service.getInfo().c_str());
+        if (Log const log(*this, RTD::LEVEL_FLOW); log.isWanted())
+            if (String const text = service.getInfo(); !attempt.isOver())
+                log->debug("[EP %s/%s] Invoke service: %s", log.getEndpointName(), m_name.c_str(), text.c_str());
     }
     catch (std::bad_alloc const&)
     {
@@ -150,15 +153,21 @@ InfoContainer& CC_CallAdapter::getInfo(InfoContainer& info, unsigned int maxLeve
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Adapter", m_name);
     if (level >= maxLevel || detail > maxDetail || !nesting.isOutermost())
         return info;
+    TYLifeline::Watch const self(m_lifeline); // the endpoint, and what a property says of itself, may end us
+    auto const dump = [&](auto const& what, String const& side)
+    { what.getInfo(info, maxLevel, level + 1, maxDetail, detail, side); };
     if (m_endpoint != nullptr)
-        m_endpoint->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
-    m_ownView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
-    m_peerView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
-    m_callView.getProperties().getInfo(info, maxLevel, level + 1, maxDetail, detail, CALL);
-    if (m_ownCallLeg != nullptr)
-        m_ownCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, NEAR_END);
-    if (m_peerCallLeg != nullptr)
-        m_peerCallLeg->getInfo(info, maxLevel, level + 1, maxDetail, detail, FAR_END);
+        dump(*m_endpoint, NEAR_END);
+    if (self.isAlive())
+        dump(m_ownView.getProperties(), NEAR_END);
+    if (self.isAlive())
+        dump(m_peerView.getProperties(), FAR_END);
+    if (self.isAlive())
+        dump(m_callView.getProperties(), CALL);
+    if (self.isAlive() && m_ownCallLeg != nullptr)
+        dump(*m_ownCallLeg, NEAR_END);
+    if (self.isAlive() && m_peerCallLeg != nullptr)
+        dump(*m_peerCallLeg, FAR_END);
     return info;
 }
 
@@ -171,9 +180,10 @@ XCode CC_CallAdapter::Attempt::fail(char const* reason, XCode result) const
         recorder->addText(CC_RecordFormat::Kind::FAILED, m_adapter.getCallSerial(), m_adapter.getLegSerial(), 0,
                           text.data());
     }
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE); monitor != nullptr && !isOver())
-        monitor->debug("[EP %s/%s] %s failed: %s", m_adapter.getEndpointName(), m_adapter.m_name.c_str(), m_operation,
-                       reason);
+    if (isOver())
+        return result;
+    if (Log const log(m_adapter, RTD::LEVEL_FAILURE); log.isWanted() && !isOver())
+        log->debug("[EP %s/%s] %s failed: %s", log.getEndpointName(), m_adapter.m_name.c_str(), m_operation, reason);
     return result;
 }
 

@@ -261,11 +261,13 @@ private:
     friend class TYInstances<CC_CallAdapter>;
     class Event;
     class Attempt;
+    class Log;
     class Copy;
     class OnDifference;
     struct Kept;
 
     char const* getEndpointName() const;
+    void logDrop() const;
     unsigned long long getLegSerial() const;
     unsigned long long getCallSerial() const;
     String nameOrAddress(String const& name) const;

@@ -7,12 +7,12 @@
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
 #include "adapters/CC_CallAdapter_Event.h"
+#include "adapters/CC_CallAdapter_Log.h"
 #include "callcontrol/CallControl.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "callcontrol/provider/CC_Provider.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
-#include "calls/CC_Monitor.h"
 #include "platform/base/Assert.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCause.h"
@@ -92,9 +92,9 @@ XCode CC_CallAdapter::tryDial(String const& contextName, String const& providerN
     CC_Provider* const provider = CallControl::GET_PROVIDER(contextName, providerName);
     if (provider == nullptr)
     {
-        if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE))
-            monitor->debug("[EP %s/%s] DESTINATION PROVIDER '%s' DOES NOT EXIST", getEndpointName(), m_name.c_str(),
-                           providerName.c_str());
+        if (Log const log(*this, RTD::LEVEL_FAILURE); log.isWanted())
+            log->debug("[EP %s/%s] DESTINATION PROVIDER '%s' DOES NOT EXIST", log.getEndpointName(), m_name.c_str(),
+                       providerName.c_str());
         return XCode::FAILURE;
     }
     CC_PropertyContainer own(ownProperties);
@@ -131,9 +131,9 @@ XCode CC_CallAdapter::joinAndOffer(CC_Provider& provider, CC_Call& call, String 
     XCode const joined = joinNewCall(call, callProperties, filters);
     if (!joined.isOk() || isOver())
         return XCode::FAILURE;
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
-        monitor->debug("[EP %s/%s] Dial to provider %s (%s) using call %s", getEndpointName(), m_name.c_str(),
-                       providerName.c_str(), destination.c_str(), call.getName().c_str());
+    if (Log const log(*this, RTD::LEVEL_FLOW); log.isWanted())
+        log->debug("[EP %s/%s] Dial to provider %s (%s) using call %s", log.getEndpointName(), m_name.c_str(),
+                   providerName.c_str(), destination.c_str(), call.getName().c_str());
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON(); recorder != nullptr && !isOver())
         RECORD_DIAL(*recorder, call, *m_ownCallLeg, providerName, destination);
     CC_PropertyContainer filtered;
@@ -192,8 +192,8 @@ XCode CC_CallAdapter::tryAccept(CC_Call& call, CC_PropertyContainer const& ownPr
     Attempt const attempt(*this, "Accept");
     if (!attempt.survives(createEvents(), NO_MEMORY))
         return XCode::FAILURE;
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
-        monitor->debug("[EP %s/%s] Accept call %s", getEndpointName(), m_name.c_str(), call.getName().c_str());
+    if (Log const log(*this, RTD::LEVEL_FLOW); log.isWanted())
+        log->debug("[EP %s/%s] Accept call %s", log.getEndpointName(), m_name.c_str(), call.getName().c_str());
     CC_PropertyContainer own(ownProperties);
     XCode const isWhole = WHOLE(own, ownProperties);
     if (attempt.isOver() || !attempt.survives(createOwnCallLeg(), NO_MEMORY) || !attempt.survives(isWhole, NO_MEMORY) ||

@@ -2,9 +2,9 @@
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapter_Attempt.h"
 #include "adapters/CC_CallAdapter_Event.h"
+#include "adapters/CC_CallAdapter_Log.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
-#include "calls/CC_Monitor.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCause.h"
@@ -19,12 +19,17 @@ namespace
 bool IS_RELEASED(CC_CallLeg const& leg) { return leg.getState() == CC_PropertyCallLegState::RELEASED; }
 } // namespace
 
+void CC_CallAdapter::logDrop() const
+{
+    if (Log const log(*this, RTD::LEVEL_FLOW); log.isWanted() && getCall() != nullptr)
+        log->debug("[EP %s/%s] Drop call %s", log.getEndpointName(), m_name.c_str(), getCall()->getName().c_str());
+}
+
 void CC_CallAdapter::drop(QCause cause, unsigned int causeValue)
 {
     TYLifeline::Watch const self(m_lifeline);
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW);
-        monitor != nullptr && getCall() != nullptr)
-        monitor->debug("[EP %s/%s] Drop call %s", getEndpointName(), m_name.c_str(), getCall()->getName().c_str());
+    if (getCall() != nullptr)
+        logDrop();
     if (self.isAlive())
         dropOwnCallLeg(cause, causeValue);
 }
@@ -113,9 +118,10 @@ XCode CC_CallAdapter::transfer(CC_CallAdapter const& other, bool removeOwnLeg)
     if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
         recorder->addNumber(CC_RecordFormat::Kind::TRANSFERRED, to, leg, static_cast<unsigned int>(result.getValue()),
                             from, removeOwnLeg ? "transfer" : "conference");
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FAILURE);
-        monitor != nullptr && !result.isOk() && self.isAlive())
-        monitor->debug("[EP %s/%s] TRANSFER FAILED", getEndpointName(), m_name.c_str());
+    if (result.isOk() || !self.isAlive())
+        return result;
+    if (Log const log(*this, RTD::LEVEL_FAILURE); log.isWanted())
+        log->debug("[EP %s/%s] TRANSFER FAILED", log.getEndpointName(), m_name.c_str());
     return result;
 }
 
@@ -131,9 +137,9 @@ XCode CC_CallAdapter::tryTransfer(CC_CallAdapter const& other, bool removeOwnLeg
     CC_CallLeg::Reference const keepOwn(*m_ownCallLeg);
     CC_CallLeg const& staying = *other.m_ownCallLeg;
     CC_CallLeg& own = *m_ownCallLeg;
-    if (RTD::Monitor const* const monitor = CC_Monitor::FOR(RTD::LEVEL_FLOW))
-        monitor->debug("[EP %s/%s] Transfer call %s to %s%s", getEndpointName(), m_name.c_str(),
-                       from->getName().c_str(), to->getName().c_str(), removeOwnLeg ? "" : " ==> conference");
+    if (Log const log(*this, RTD::LEVEL_FLOW); log.isWanted())
+        log->debug("[EP %s/%s] Transfer call %s to %s%s", log.getEndpointName(), m_name.c_str(),
+                   from->getName().c_str(), to->getName().c_str(), removeOwnLeg ? "" : " ==> conference");
     if (removeOwnLeg)
         to->removeCallLeg(own);
     unsigned int index = 0; // above 0: of legs that are on a move of their own and go when that has ended

@@ -166,10 +166,16 @@ void CC_CallPool::unlist(CC_Call& call)
 
 CC_Call* CC_CallPool::getAcquiredCall(unsigned int index)
 {
-    TYList<CC_Call*>::Element const* element = m_calls.getFirst();
+    TYList<CC_Call*>::Element const* const element = getElement(index);
+    return element != nullptr ? element->getValue() : nullptr;
+}
+
+TYList<CC_Call*>::Element* CC_CallPool::getElement(unsigned int index) const
+{
+    TYList<CC_Call*>::Element* element = m_calls.getFirst();
     while (element != nullptr && index-- > 0)
         element = element->getNext();
-    return element != nullptr ? element->getValue() : nullptr;
+    return element;
 }
 
 void CC_CallPool::dropCalls(String const&, String const& callName)
@@ -232,8 +238,19 @@ InfoContainer& CC_CallPool::getInfo(InfoContainer& info, unsigned int maxLevel, 
 {
     NestingGuard const nesting(s_infoDepth);
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Pool", String::addressOf(this));
-    if (maxLevel >= level + 1 && maxDetail >= detail && nesting.isOutermost())
-        for (auto const* element = m_calls.getFirst(); element != nullptr; element = element->getNext())
-            element->getValue()->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
+    if (maxLevel < level + 1 || maxDetail < detail || !nesting.isOutermost())
+        return info;
+    TYLifeline::Watch const self(m_lifeline);
+    unsigned int index = 0;
+    for (auto const* element = m_calls.getFirst(); element != nullptr && self.isAlive();)
+    {
+        CC_Call::Hold const keep(element->getValue());
+        keep.get()->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
+        if (!self.isAlive())
+            return info;
+        bool const isThere = keep.get()->m_listedIn == this;
+        element = isThere ? keep.get()->m_poolElement->getNext() : getElement(index);
+        index += isThere ? 1 : 0;
+    }
     return info;
 }

@@ -104,6 +104,8 @@ private:
     static void giveContext(CC_Call& call, MG_IContext* mgContext);
     static void dropCall(CC_Call& call);
 
+    TYList<CC_Call*>::Element* getElement(unsigned int index) const;
+
     TYList<CC_Call*> m_calls;
     TYPPtr<IRebootMgmt> m_rebootMgmt;
     TYLifeline m_lifeline;

@@ -146,9 +146,11 @@ InfoContainer& CC_Context::getCallInfo(InfoContainer& info, unsigned int maxLeve
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Control", m_name);
     if (maxLevel >= level + 1 && nesting.isOutermost())
     {
+        TYLifeline::Watch const self(m_lifeline); // what a property says of itself may destroy it
         if (m_callPool != nullptr)
             m_callPool->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
-        m_observers.getInfo(info, maxLevel, level + 1, maxDetail, detail + 4, "Context ");
+        if (self.isAlive())
+            m_observers.getInfo(info, maxLevel, level + 1, maxDetail, detail + 4, "Context ");
     }
     return info;
 }

@@ -304,6 +304,7 @@ InfoContainer& CC_Call::getInfo(InfoContainer& info, unsigned int maxLevel, unsi
                                 unsigned int detail, String const& prefix) const
 {
     NestingGuard const nesting(s_infoDepth);
+    Hold const self(const_cast<CC_Call*>(this)); // what a property says of itself may end it, or move legs
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call", m_name);
     if (maxLevel >= level + 1)
     {
@@ -315,8 +316,8 @@ InfoContainer& CC_Call::getInfo(InfoContainer& info, unsigned int maxLevel, unsi
         info.addWithin(maxLevel, level + 1, maxDetail, detail + 1, String::s_empty, "Call Legs", String::s_empty);
     }
     if (nesting.isOutermost() && maxLevel >= level + 2 && maxDetail >= detail + 1)
-        for (CC_CallLeg const* const leg : m_callLegs)
-            leg->getInfo(info, maxLevel, level + 2, maxDetail, detail + 1, String::s_empty);
+        for (unsigned int i = 0; i < m_callLegs.getSize(); ++i)
+            m_callLegs[i]->getInfo(info, maxLevel, level + 2, maxDetail, detail + 1, String::s_empty);
     return info;
 }
 

@@ -409,6 +409,7 @@ InfoContainer& CC_CallLeg::getInfo(InfoContainer& info, unsigned int maxLevel, u
                    m_name.isEmpty() ? String::addressOf(this) : m_name);
     if (level < maxLevel && detail < maxDetail && nesting.isOutermost())
     {
+        Reference const self(const_cast<CC_CallLeg&>(*this)); // what a property says of itself may drop it
         if (m_call != nullptr)
             m_call->getInfo(info, maxLevel, level + 1, maxDetail, detail + 1, String::s_empty);
         m_properties.getInfo(info, maxLevel, level + 1, maxDetail, detail + 1, String::s_empty);

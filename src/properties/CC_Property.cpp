@@ -60,18 +60,20 @@ InfoContainer& CC_Property::getInfo(InfoContainer& info, unsigned int maxLevel, 
 {
     if (level > maxLevel || detail > maxDetail)
         return info; // before anything is formatted
+    char const* const name = getPropertyName(); // both first: a value's text may remove the property
+    char const* const type = getTypeName();
     try
     {
         String text;
         if (getValueString(text).isEmpty())
             text = NO_VALUE;
         if (detail < maxDetail)
-            text.format("%s (%s)", text.c_str(), getTypeName());
-        info.addWithin(maxLevel, level, maxDetail, detail, prefix, getPropertyName(), text);
+            text.format("%s (%s)", text.c_str(), type);
+        info.addWithin(maxLevel, level, maxDetail, detail, prefix, name, text);
     }
     catch (std::bad_alloc const&)
     {
-        info.addWithin(maxLevel, level, maxDetail, detail, prefix, getPropertyName(), NO_MEMORY);
+        info.addWithin(maxLevel, level, maxDetail, detail, prefix, name, NO_MEMORY);
     }
     return info;
 }

@@ -2,12 +2,14 @@
 
 #include "adapters/CC_CallAdapter.h"
 #include "callcontrol/CC_CallPool.h"
+#include "callcontrol/provider/CC_Endpoint.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "calls/CC_Monitor.h"
 #include "platform/base/TYRecycled.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "tests/simulation/Library.h"
 #include "tests/simulation/Services.h"
 
 #include <algorithm>
@@ -459,6 +461,18 @@ Setters const& SETTERS_OF(Code code)
 }
 } // namespace
 
+namespace
+{
+/// Whether what a line writes as its peer's State becomes that leg's; without a peer nothing is written.
+bool STORES_PEERS_STATE(CC_CallAdapter const& adapter)
+{
+    CC_CallLeg const* const peer = PEER_LEG(adapter);
+    CC_Endpoint const* const endpoint = adapter.getEndpoint();
+    return peer == nullptr || endpoint == nullptr ||
+           (peer->getState() != CC_PropertyCallLegState::RELEASED && endpoint->getInputFilterContainer() == nullptr);
+}
+} // namespace
+
 XCode Interpreter::setOfAdapter(Operation const& operation)
 {
     CC_CallAdapter* const adapter = m_world.line(operation[0]).adapter.get();
@@ -468,6 +482,8 @@ XCode Interpreter::setOfAdapter(Operation const& operation)
     bool const isBecoming = operation.code == Code::BECOME;
     unsigned int const way = isBecoming ? 0 : operation[3];
     Property const written = WRITTEN(operation, 1);
+    if (operation.code == Code::SET_PEER && written.id == CC_PropertyId::STATE && !STORES_PEERS_STATE(*adapter))
+        m_world.m_mayPeersBeStale = true;
     XCode result;
     if (way % 4 < 2)
     {

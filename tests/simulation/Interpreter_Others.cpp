@@ -151,13 +151,15 @@ void Interpreter::dump(Operation const& operation)
 {
     CC_CallAdapter const* const adapter = m_world.line(operation[1]).adapter.get();
     CC_Call const* const call = m_world.call(operation[2], operation[3]);
-    InfoContainer info; // nobody strikes inside: a dump walks through what its text may change
+    InfoContainer info;
+    String const context(World::CONTEXT_NAME(operation[1]));
+    Memory::Library const library;
     if (operation[0] % 3 == 0 && adapter != nullptr)
         adapter->getInfo(info, 9, 0, 9, 0, "");
     else if (operation[0] % 3 == 1 && call != nullptr)
         call->getInfo(info, 9, 0, 9, 0, "");
     else if (operation[0] % 3 == 2)
-        CallControl::GET_CALL_INFO(info, String(World::CONTEXT_NAME(operation[1])), 9, 0, 9, 0, "");
+        CallControl::GET_CALL_INFO(info, context, 9, 0, 9, 0, "");
 }
 
 void Interpreter::read(Operation const& operation)

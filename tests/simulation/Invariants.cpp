@@ -79,7 +79,7 @@ void CHECK_PEER(World& world, unsigned int number, Line const& line)
     CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
     CC_Endpoint const* const endpoint = line.adapter->getEndpoint();
     if (own == nullptr || peer == nullptr || endpoint == nullptr || endpoint->getOutputFilterContainer() != nullptr ||
-        world.m_hadOutputFilters || world.m_hasStateChangedInNews || world.m_wasShortOfMemory)
+        world.m_hadOutputFilters || world.m_mayPeersBeStale || world.m_wasShortOfMemory)
         return;
     if (own->getCall()->getOtherMostActiveCallLeg(*own, peer) != peer)
         world.fail("line " + std::to_string(number) + " has a peer that is not the most active leg");

@@ -251,7 +251,7 @@ void World::strike(CallOut kind)
     ++m_strikes;
     m_carryOut(due.begin, due.end);
     --m_depth;
-    m_hasStateChangedInNews = m_hasStateChangedInNews || (mayBeNews && before != getActivityLevels());
+    m_mayPeersBeStale = m_mayPeersBeStale || (mayBeNews && before != getActivityLevels());
 }
 
 /// Of all legs in calls.

@@ -123,8 +123,10 @@ public:
     bool m_wasShortOfMemory = false;
     bool m_hasPropertyActed = false; // a property's operation did something
     bool m_hadOutputFilters = false; // somebody's, at some time
-    /// A leg's state changed while its joining was told: who observes the legs of the call hears of that leg only later.
-    bool m_hasStateChangedInNews = false;
+    /// An adapter may have chosen its peer by a State that is not the leg's: one that changed while the leg's joining
+    /// was told, before the observers of the call's legs hear of that leg; or one that a line wrote into its view of an
+    /// ended peer, or of one behind filters.
+    bool m_mayPeersBeStale = false;
     unsigned int m_logLevel = 0;
     unsigned int m_lastGivenMedia = 1000; // ids of media contexts that operations bring along
     unsigned long long m_added = 0;       // of the statistics, at the beginning
