@@ -82,7 +82,7 @@ constexpr Weight WEIGHTS[] = {
     {Code::MEDIA_MODE, 2, 2},
     {Code::REBOOT_MODE, 1, 1},
     {Code::LOG_LEVEL, 2, 4},
-    {Code::DUMP, 2, 3},
+    {Code::DUMP, 2, 8},
     {Code::READ, 6, 8},
     {Code::RESET_STATISTICS, 1, 1},
     {Code::SET_NAME, 2, 2},
@@ -163,7 +163,7 @@ private:
         operations.push_back({Code::BECOME, {line, 4}});      // ADDRESS_INCOMPLETE
         operations.push_back({Code::SERVICE, {caller, 0, static_cast<std::uint8_t>(m_random.below(12))}});
     }
-    /// Something is done to somebody inside what is done to the same.
+    /// Something is done to somebody inside what is done to the same, and now and then something inside that again.
     void strikeInside(Operations& operations)
     {
         static constexpr Code OUTSIDE[] = {
@@ -171,25 +171,35 @@ private:
             Code::ACCEPT,       Code::DROP,         Code::ADD_LEG,  Code::SERVICE,  Code::SETUP,   Code::LEG_SERVICE,
             Code::SET_DATAPATH, Code::SET_ON_CALL,  Code::TRANSFER, Code::CLEANUP,  Code::ACQUIRE, Code::RELEASE,
             Code::DROP_CALLS,   Code::ADD_PROVIDER, Code::OFFER,    Code::MOVE_LEG};
+        auto const whom = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back(filled(Code::OBSERVE));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        announceStrike(operations, whom, m_random.isOneIn(3) ? 1 + m_random.below(2) : 0);
+        operations.push_back(doneTo(whom, OUTSIDE[m_random.below(std::size(OUTSIDE))]));
+    }
+    void announceStrike(Operations& operations, std::uint8_t whom, unsigned int depth)
+    {
         static constexpr Code INSIDE[] = {
             Code::GIVE_UP_LEG, Code::MOVE_LEG,        Code::SET_LEG,    Code::DROP,          Code::DESTROY_ADAPTER,
             Code::CLEANUP,     Code::SETUP,           Code::DIAL,       Code::RELEASE,       Code::DESTROY_CONTEXT,
             Code::EMPTY_CALL,  Code::CLEAN_UP_CALL,   Code::TRANSFER,   Code::OBSERVE,       Code::STOP_OBSERVING,
             Code::BECOME,      Code::REMOVE_PROVIDER, Code::DROP_CALLS, Code::DESTROY_MODULE};
-        auto const whom = static_cast<std::uint8_t>(m_random.below(3));
-        operations.push_back(filled(Code::OBSERVE));
-        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        std::size_t const when = operations.size();
         operations.push_back(filled(Code::WHEN));
-        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
-        operations.back().arguments[2] = 0;
-        for (Code const code : {INSIDE[m_random.below(std::size(INSIDE))], OUTSIDE[m_random.below(std::size(OUTSIDE))]})
-        {
-            operations.push_back(filled(code));
-            bool const isOfContext = code == Code::RELEASE || code == Code::DESTROY_CONTEXT ||
-                                     code == Code::DROP_CALLS || code == Code::ACQUIRE;
-            if (!isOfContext && code != Code::SET_ON_CALL && code != Code::EMPTY_CALL && code != Code::CLEAN_UP_CALL)
-                operations.back().arguments[0] = whom;
-        }
+        if (depth > 0)
+            announceStrike(operations, whom, depth - 1);
+        operations.push_back(doneTo(whom, INSIDE[m_random.below(std::size(INSIDE))]));
+        operations[when].arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations[when].arguments[2] = static_cast<std::uint8_t>(operations.size() - when - 2);
+    }
+    Operation doneTo(std::uint8_t whom, Code code)
+    {
+        Operation operation = filled(code);
+        bool const isOfContext =
+            code == Code::RELEASE || code == Code::DESTROY_CONTEXT || code == Code::DROP_CALLS || code == Code::ACQUIRE;
+        if (!isOfContext && code != Code::SET_ON_CALL && code != Code::EMPTY_CALL && code != Code::CLEAN_UP_CALL)
+            operation.arguments[0] = whom;
+        return operation;
     }
     Operation filled(Code code)
     {

@@ -91,7 +91,7 @@ struct Operation
 
 /// Of `when`: the call-outs that are let pass, and the operations that are carried out inside.
 constexpr unsigned int MOST_OTHERS = 64;
-constexpr unsigned int MOST_INSIDE = 4;
+constexpr unsigned int MOST_INSIDE = 8;
 
 using Operations = std::vector<Operation>;
 
