@@ -59,7 +59,7 @@ InfoContainer& CC_Property::getInfo(InfoContainer& info, unsigned int maxLevel, 
                                     unsigned int maxDetail, unsigned int detail, String const& prefix) const
 {
     if (level > maxLevel || detail > maxDetail)
-        return info; // before anything is formatted
+        return info;                            // before anything is formatted
     char const* const name = getPropertyName(); // both first: a value's text may remove the property
     char const* const type = getTypeName();
     try

@@ -73,7 +73,7 @@ private:
     static constexpr std::uint64_t IN_USE = 0x5511ced0a11c0de1;
     static constexpr std::uint64_t KEPT = 0xdeadb10cdeadb10c;
     static constexpr int PATTERN = 0xdd;
-    static constexpr std::size_t NUMBER_OF_KEPT = 4096;
+    static constexpr std::size_t LARGE = 256;
 
     [[noreturn]] static void FAULT(char const* what)
     {
@@ -82,14 +82,46 @@ private:
     }
     static void CHECK(Header const& header);
 
+    /// What was freed last, the oldest making room for the next.
+    template <std::size_t SIZE>
+    class Kept
+    {
+    public:
+        void keep(Header& header)
+        {
+            Header*& place = m_headers[m_next];
+            if (place != nullptr)
+            {
+                CHECK(*place);
+                std::free(place);
+            }
+            place = &header;
+            m_next = (m_next + 1) % SIZE;
+            m_unchecked = m_unchecked < SIZE ? m_unchecked + 1 : SIZE;
+        }
+        /// What came since the last time; what came before is looked at when it makes room.
+        void checkNew()
+        {
+            for (; m_unchecked != 0; --m_unchecked)
+                CHECK(*m_headers[(m_next + SIZE - m_unchecked) % SIZE]);
+        }
+
+    private:
+        Header* m_headers[SIZE]{};
+        std::size_t m_next = 0;
+        std::size_t m_unchecked = 0;
+    };
+
     static std::mutex s_mutex;
-    static Header* s_kept[NUMBER_OF_KEPT];
-    static std::size_t s_next;
+    static Kept<4096> s_small;
+    /// Adapters among them. Their memory is not used again in the same run: an observer list finds an observer by its
+    /// address, and one that has the address of a former one takes its place.
+    static Kept<1024> s_large;
 };
 
 std::mutex Heap::s_mutex;
-Heap::Header* Heap::s_kept[NUMBER_OF_KEPT];
-std::size_t Heap::s_next = 0;
+Heap::Kept<4096> Heap::s_small;
+Heap::Kept<1024> Heap::s_large;
 
 void Heap::CHECK(Header const& header)
 {
@@ -120,14 +152,7 @@ void Heap::GIVE(void* memory) noexcept
         FAULT(header->mark == KEPT ? "a block is freed twice" : "what is freed is no block");
     header->mark = KEPT;
     std::memset(memory, PATTERN, header->size);
-    Header*& place = s_kept[s_next];
-    s_next = (s_next + 1) % NUMBER_OF_KEPT;
-    if (place != nullptr)
-    {
-        CHECK(*place);
-        std::free(place);
-    }
-    place = header;
+    header->size < LARGE ? s_small.keep(*header) : s_large.keep(*header);
 #else
     std::free(memory);
 #endif
@@ -136,9 +161,8 @@ void Heap::GIVE(void* memory) noexcept
 void Heap::CHECK_ALL() noexcept
 {
     std::lock_guard const lock(s_mutex);
-    for (Header const* const header : s_kept)
-        if (header != nullptr)
-            CHECK(*header);
+    s_small.checkNew();
+    s_large.checkNew();
 }
 
 void Memory::CHECK_KEPT_BLOCKS() { Heap::CHECK_ALL(); }
