@@ -104,6 +104,40 @@ public:
         }
     }
 
+    /// The texts of a list that, where it is, has one at least.
+    std::vector<std::string> texts(char const* key, std::vector<std::string> fallback) const
+    {
+        toml::node const* const node = m_table.get(key);
+        if (node == nullptr)
+            return fallback;
+        toml::array const* const list = node->as_array();
+        if (list == nullptr || list->empty())
+            refuse(key, "expected a list of texts");
+        std::vector<std::string> result;
+        for (toml::node const& element : *list)
+        {
+            if (!element.is_string())
+                refuse(key, "expected a list of texts");
+            result.push_back(element.as_string()->get());
+        }
+        return result;
+    }
+
+    std::vector<AddressRange> ranges(char const* key) const
+    {
+        std::vector<AddressRange> result;
+        try
+        {
+            for (std::string const& range : texts(key, {}))
+                result.push_back(AddressRange::PARSE(range));
+        }
+        catch (std::invalid_argument const& error)
+        {
+            refuse(key, error.what());
+        }
+        return result;
+    }
+
     void allow(std::initializer_list<char const*> keys) const
     {
         for (auto const& entry : m_table)
@@ -124,14 +158,42 @@ constexpr unsigned int LEAST_RECORDED = 4096; // octets
 constexpr unsigned int MOST_RECORDED = 1024 * 1024 * 1024;
 constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 
+constexpr unsigned int LEAST_MESSAGE = 1024;   // octets
+constexpr unsigned int MOST_MESSAGE = 1 << 20; // of a stream; a datagram ends at 65535
+
+/// Without `transports` an interface listens on what it speaks to its peer.
+void READ_TRANSPORTS(Section const& section, Configuration::Interface& interface)
+{
+    std::string const towardsPeer = section.oneOf("transport", "udp", {"udp", "tcp"});
+    interface.usesTcp = towardsPeer == "tcp";
+    interface.listensOnUdp = interface.listensOnTcp = false;
+    for (std::string const& transport : section.texts("transports", {towardsPeer}))
+        if (transport == "udp")
+            interface.listensOnUdp = true;
+        else if (transport == "tcp")
+            interface.listensOnTcp = true;
+        else
+            section.refuse("transports", "must be some of udp, tcp");
+    if (!(interface.usesTcp ? interface.listensOnTcp : interface.listensOnUdp))
+        section.refuse("transports", "must have '" + towardsPeer + "', which is the peer's");
+}
+
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout"});
+    section.allow({"name", "listen", "peer", "transport", "transports", "allow", "max-message-size", "max-header-size",
+                   "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     interface.listen = section.address("listen");
     interface.peer = section.address("peer");
-    interface.usesTcp = section.oneOf("transport", "udp", {"udp", "tcp"}) == "tcp";
+    READ_TRANSPORTS(section, interface);
+    interface.allow = section.ranges("allow");
+    interface.maxMessageSize =
+        section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxHeaderSize = section.number("max-header-size", interface.maxHeaderSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxConnectionsPerSource =
+        section.number("max-connections-per-source", interface.maxConnectionsPerSource, 1, UNLIMITED);
+    interface.tcpIdle = section.number("tcp-idle", interface.tcpIdle, 1, 86400);
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
@@ -214,6 +276,18 @@ Configuration READ_TABLE(toml::table const& table, std::string const& file)
 ConfigurationError::ConfigurationError(std::string const& file, std::string const& key, std::string const& reason)
     : std::runtime_error(ONE_LINE(file + ": " + key + ": " + reason))
 {
+}
+
+bool SocketAddress::isUnspecified() const
+{
+    return AddressRange::PARSE("0.0.0.0").contains(AddressRange::PARSE(host).getFirst()) ||
+           AddressRange::PARSE("::").contains(AddressRange::PARSE(host).getFirst());
+}
+
+bool SocketAddress::isMulticast() const
+{
+    return AddressRange::PARSE("224.0.0.0/4").contains(AddressRange::PARSE(host).getFirst()) ||
+           AddressRange::PARSE("ff00::/8").contains(AddressRange::PARSE(host).getFirst());
 }
 
 std::string SocketAddress::text() const

@@ -18,6 +18,12 @@ listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
 t1 = 100
+transports = ["tcp", "udp"]
+allow = ["192.0.2.0/24", "2001:db8::7"]
+max-message-size = 2000
+max-header-size = 1500
+max-connections-per-source = 3
+tcp-idle = 4
 t1x64 = 3200
 answer-timeout = 30
 )";
@@ -51,6 +57,13 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     ASSERT_EQ(configuration.interfaces.size(), 2u);
     Configuration::Interface const& a = configuration.interfaces[0];
     EXPECT_FALSE(a.usesTcp);
+    EXPECT_TRUE(a.listensOnUdp);
+    EXPECT_FALSE(a.listensOnTcp);
+    EXPECT_TRUE(a.allow.empty());
+    EXPECT_EQ(a.maxMessageSize, 65535u);
+    EXPECT_EQ(a.maxHeaderSize, 32768u);
+    EXPECT_EQ(a.maxConnectionsPerSource, 16u);
+    EXPECT_EQ(a.tcpIdle, 120u);
     EXPECT_EQ(a.t1, 500u);
     EXPECT_EQ(a.t1x64, 32000u);
     EXPECT_EQ(a.answerTimeout, 180u);
@@ -76,11 +89,26 @@ TEST(Configuration, EveryKeyIsRead)
     Configuration::Interface const* const b = configuration.findInterface("b");
     ASSERT_NE(b, nullptr);
     EXPECT_TRUE(b->usesTcp);
+    EXPECT_TRUE(b->listensOnUdp);
+    EXPECT_TRUE(b->listensOnTcp);
+    EXPECT_EQ(b->allow.size(), 2u);
+    EXPECT_EQ(b->maxMessageSize, 2000u);
+    EXPECT_EQ(b->maxHeaderSize, 1500u);
+    EXPECT_EQ(b->maxConnectionsPerSource, 3u);
+    EXPECT_EQ(b->tcpIdle, 4u);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].prefix, "49");
+}
+
+TEST(Configuration, WithoutListOfTransportsAnInterfaceListensOnWhatItSpeaksToItsPeer)
+{
+    Configuration const configuration = Configuration::PARSE(
+        "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\ntransport = \"tcp\"\n", "f");
+    EXPECT_TRUE(configuration.interfaces[0].listensOnTcp);
+    EXPECT_FALSE(configuration.interfaces[0].listensOnUdp);
 }
 
 TEST(Configuration, ALongerTimeOfTransactionsFollowsFromALongerFirstRetransmission)
@@ -99,6 +127,7 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
     };
     std::string const good = TWO_INTERFACES;
     std::string const first = "[[interface]]\nname = \"a\"\n";
+    std::string const whole = first + "listen = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\n";
     Row const rows[] = {
         {"", "f: interface: is missing: at least one [[interface]] is needed"},
         {"interface = 3", "f: interface: expected tables, [[interface]]"},
@@ -123,6 +152,15 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {first + "listen = \"127.0.0.1:65536\"", "f: interface[0].listen: '65536' is not a port"},
         {first + "listen = \"127.0.0.1:5x\"", "f: interface[0].listen: '5x' is not a port"},
         {good + "t2 = 1", "f: interface[1].t2: is not a key"},
+        {whole + "transports = []", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = \"tcp\"", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = [3]", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = [\"sctp\"]", "f: interface[0].transports: must be some of udp, tcp"},
+        {whole + "transports = [\"tcp\"]", "f: interface[0].transports: must have 'udp', which is the peer's"},
+        {whole + "allow = [\"host\"]", "f: interface[0].allow: 'host' is not an address"},
+        {whole + "allow = [\"10.0.0.1/8\"]", "f: interface[0].allow: '10.0.0.1/8' has bits beyond its prefix"},
+        {whole + "max-message-size = 100", "f: interface[0].max-message-size: must be from 1024 to 1048576"},
+        {whole + "tcp-idle = 0", "f: interface[0].tcp-idle: must be from 1 to 86400"},
         {good + "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"",
          "f: interface[2].name: 'a' is taken by another interface"},
         {good + "[[route]]\nto = \"b\"", "f: route[0].from: is missing"},

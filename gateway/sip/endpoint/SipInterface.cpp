@@ -34,7 +34,8 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
           SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp)))
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), ALLOW))
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration))
+    , m_guard(configuration)
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard))
     , m_defaultLeg(nta_leg_tcreate(m_agent.get(), HANDLE, this, NTATAG_NO_DIALOG(1), TAG_END()))
 {
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);

@@ -4,6 +4,7 @@
 #include "configuration/Configuration.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
 
 #include <memory>
@@ -15,7 +16,7 @@ class SipEndpoint;
 class TYEvent;
 struct SipCause;
 
-/// One SIP interface: listens on one address, on UDP and TCP, and sends its calls to one peer. A provider of call
+/// One SIP interface: listens on one address, on UDP, TCP or both, and sends its calls to one peer. A provider of call
 /// control under the interface's name.
 ///
 /// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the gateway;
@@ -45,6 +46,7 @@ public:
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
     std::string const& getContact() const { return m_contact; }
+    SipGuard::Counters const& getGuardCounters() const { return m_guard.getCounters(); }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
@@ -71,6 +73,7 @@ private:
     std::string m_contact;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
+    SipGuard m_guard;
     SipAgent m_agent;
     SipLeg m_defaultLeg;
     TYEvent* m_cleanUpEvent = nullptr;
