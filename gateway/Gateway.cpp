@@ -195,5 +195,11 @@ void Gateway::printState() const
     std::printf("counters: %llu placed, %llu answered, %llu cleared, %llu failed, %llu refused, %u up\n",
                 counters.placed, counters.answered, counters.cleared, counters.failed, counters.refused,
                 CallControl::GET_NUMBER_OF_CALLS());
+    for (auto const& port : m_ports)
+    {
+        SipGuard::Counters const& guard = port->interface.getGuardCounters();
+        std::printf("interface %s: %llu messages of strangers, %llu too large, %llu connections refused\n",
+                    port->interface.getName().c_str(), guard.strangers, guard.tooLarge, guard.connections);
+    }
     std::fflush(stdout);
 }

@@ -32,7 +32,8 @@ enum Called : unsigned int
     TAKE = 4,
     SIZE = 8,
     DURATION = 16,
-    ALL = 31
+    REGISTER = 32,
+    ALL = 63
 };
 unsigned int s_called = 0;
 
@@ -345,6 +346,18 @@ IN_PLACE int accept(int listening, sockaddr* from, socklen_t* length)
 {
     s_called |= TAKE;
     return SipGuard::ACCEPT(listening, from, length);
+}
+
+/// The stack starts the time of a connection with its first message; one that never brings any must end as well.
+IN_PLACE int tport_register_secondary(tport_t* connection, su_wakeup_f wakeup, int events)
+{
+    static auto* const s_original = ORIGINAL<int(tport_t*, su_wakeup_f, int)>("tport_register_secondary");
+    static auto* const s_startTime = ORIGINAL<int(tport_t*)>("tport_set_secondary_timer");
+    s_called |= REGISTER;
+    int const result = s_original(connection, wakeup, events);
+    if (result == 0)
+        s_startTime(connection);
+    return result;
 }
 
 /// How many octets the stack is to read: with all that a busy peer has sent its limit would be reached, and the
