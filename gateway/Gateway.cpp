@@ -76,7 +76,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
     , m_environment{m_stack,
                     m_host.getContextName(),
                     Routing(configuration.routes),
-                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond),
+                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond, configuration.maxCallsPerSource),
                     CallTrace(tracedCalls),
                     {},
                     0,

@@ -71,14 +71,15 @@ struct Configuration
     };
 
     std::string file;
-    std::string context;                  ///< the call-control context; empty: its default
-    std::string logLevel = "info";        ///< of spdlog
-    unsigned int callControlLogLevel = 1; ///< of the library's monitor, 0 to 5
-    unsigned int maxCalls = 0;            ///< at the same time; 0: no limit
-    unsigned int maxCallsPerSecond = 0;   ///< 0: no limit
-    std::string recording;                ///< the recorder's file; empty: in memory
-    unsigned int recordingSize = 4194304; ///< octets; 0: nothing is recorded
-    unsigned int clearAfter = 10;         ///< seconds that calls may go on after the request to end
+    std::string context;                   ///< the call-control context; empty: its default
+    std::string logLevel = "info";         ///< of spdlog
+    unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
+    unsigned int maxCalls = 4000;          ///< at the same time; 0: no limit
+    unsigned int maxCallsPerSecond = 200;  ///< 0: no limit
+    unsigned int maxCallsPerSource = 2000; ///< of one address at the same time; 0: no limit
+    std::string recording;                 ///< the recorder's file; empty: in memory
+    unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
+    unsigned int clearAfter = 10;          ///< seconds that calls may go on after the request to end
     std::vector<Interface> interfaces;
     std::vector<Route> routes;
 

@@ -48,8 +48,9 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(configuration.file, "f");
     EXPECT_EQ(configuration.logLevel, "info");
     EXPECT_EQ(configuration.callControlLogLevel, 1u);
-    EXPECT_EQ(configuration.maxCalls, 0u);
-    EXPECT_EQ(configuration.maxCallsPerSecond, 0u);
+    EXPECT_EQ(configuration.maxCalls, 4000u);
+    EXPECT_EQ(configuration.maxCallsPerSecond, 200u);
+    EXPECT_EQ(configuration.maxCallsPerSource, 2000u);
     EXPECT_EQ(configuration.clearAfter, 10u);
     EXPECT_EQ(configuration.recording, "");
     EXPECT_EQ(configuration.recordingSize, 4194304u);
@@ -75,7 +76,8 @@ TEST(Configuration, EveryKeyIsRead)
 {
     Configuration const configuration = Configuration::PARSE(
         std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-calls = 7\n"
-                    "max-calls-per-second = 8\nclear-after = 9\nrecording = \"/r\"\nrecording-size = 4096\n") +
+                    "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
+                    "\"/r\"\nrecording-size = 4096\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -83,6 +85,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.callControlLogLevel, 5u);
     EXPECT_EQ(configuration.maxCalls, 7u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 8u);
+    EXPECT_EQ(configuration.maxCallsPerSource, 6u);
     EXPECT_EQ(configuration.clearAfter, 9u);
     EXPECT_EQ(configuration.recording, "/r");
     EXPECT_EQ(configuration.recordingSize, 4096u);

@@ -66,14 +66,15 @@ std::string MAKE_BINDING(Configuration::Interface const& configuration, char con
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard)
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard,
+                                 nta_message_f* onMessage, SipInterface* interface)
 {
     SipGuard::PROVE(stack, configuration.listen.host);
     unsigned int const idle = configuration.tcpIdle * 1000;
-    SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, nullptr, nullptr, NTATAG_UA(1), NTATAG_PASS_100(1),
-                                    NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)), NTATAG_UDP_MTU(UDP_MTU),
-                                    NTATAG_SIP_T1(configuration.t1), NTATAG_SIP_T1X64(configuration.t1x64),
-                                    NTATAG_SERVER_RPORT(1), TAG_END()));
+    SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1),
+                                    NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
+                                    NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
+                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1), TAG_END()));
     for (char const* const transport : {"udp", "tcp"})
     {
         bool const isUdp = *transport == 'u';

@@ -4,8 +4,10 @@
 /// SIP module includes the stack through here, so that all of them agree.
 class SipDescriptorHandler;
 class SipEndpoint;
+class SipInterface;
 class SipRequestHandler;
 
+#define NTA_AGENT_MAGIC_T SipInterface
 #define NTA_LEG_MAGIC_T SipRequestHandler
 #define NTA_OUTGOING_MAGIC_T SipEndpoint
 #define NTA_INCOMING_MAGIC_T SipEndpoint
@@ -14,6 +16,7 @@ class SipRequestHandler;
 #include <sofia-sip/msg_addr.h>
 #include <sofia-sip/msg_header.h>
 #include <sofia-sip/nta.h>
+#include <sofia-sip/nta_stateless.h>
 #include <sofia-sip/nta_tag.h>
 #include <sofia-sip/nta_tport.h>
 #include <sofia-sip/sip_header.h>
