@@ -223,10 +223,11 @@ void FOR_EACH_TABLE(Section const& root, toml::table const& table, std::string c
 
 void READ_GATEWAY(Section const& section, Configuration& configuration)
 {
-    section.allow({"context", "log-level", "call-control-log-level", "max-calls", "max-calls-per-second",
+    section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-calls", "max-calls-per-second",
                    "max-calls-per-source", "clear-after", "recording", "recording-size"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
+    configuration.logFile = section.text("log-file", {});
     configuration.callControlLogLevel = section.number("call-control-log-level", 1, 0, 5);
     configuration.maxCalls = section.number("max-calls", configuration.maxCalls, 0, UNLIMITED);
     configuration.maxCallsPerSecond =

@@ -73,6 +73,7 @@ struct Configuration
     std::string file;
     std::string context;                   ///< the call-control context; empty: its default
     std::string logLevel = "info";         ///< of spdlog
+    std::string logFile;                   ///< empty: the standard error stream
     unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
     unsigned int maxCalls = 4000;          ///< at the same time; 0: no limit
     unsigned int maxCallsPerSecond = 200;  ///< 0: no limit
