@@ -26,12 +26,14 @@ start_callee callee
 run_caller caller 4989123 &
 background+=($!)
 in_log "$WORK/gateway.log" "Accept call"
-mv "$WORK/gateway.log" "$WORK/old.log"
-for signal in USR2 PIPE CHLD WINCH CONT URG HUP USR1; do
+for signal in PIPE CHLD WINCH CONT URG USR2; do
     kill -$signal $gateway_pid
 done
-in_log "$WORK/gateway.log" "SIGHUP: the log is opened again; the configuration is not"
 in_log "$WORK/gateway.log" "SIGUSR2 means nothing here"
+mv "$WORK/gateway.log" "$WORK/old.log"
+kill -HUP $gateway_pid
+kill -USR1 $gateway_pid
+in_log "$WORK/gateway.log" "SIGHUP: the log is opened again; the configuration is not"
 expect_trace "^state: 1 calls up"
 expect_trace "^counters: "
 wait "${background[0]}" || fail "the call did not go on"
