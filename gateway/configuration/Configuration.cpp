@@ -9,16 +9,17 @@
 #include <fstream>
 #include <initializer_list>
 #include <limits>
-#include <sstream>
+
 #include <system_error>
 
 namespace
 {
+bool IS_CONTROL(char c) { return static_cast<unsigned char>(c) < 0x20 || c == 0x7f; }
+
 /// Everything on one line, whatever a parser's message or a file's name holds.
 std::string ONE_LINE(std::string text)
 {
-    std::replace_if(
-        text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x20; }, ' ');
+    std::replace_if(text.begin(), text.end(), IS_CONTROL, ' ');
     return text;
 }
 
@@ -53,7 +54,10 @@ public:
             return fallback;
         if (!node->is_string())
             refuse(key, "expected a text");
-        return node->as_string()->get();
+        std::string value = node->as_string()->get();
+        if (std::any_of(value.begin(), value.end(), IS_CONTROL))
+            refuse(key, "has a line break or another control character");
+        return value;
     }
 
     std::string neededText(char const* key) const
@@ -178,14 +182,42 @@ void READ_TRANSPORTS(Section const& section, Configuration::Interface& interface
         section.refuse("transports", "must have '" + towardsPeer + "', which is the peer's");
 }
 
+/// Where others find it: no address that is everybody's, or many's.
+SocketAddress READ_REACHABLE(Section const& section, char const* key)
+{
+    SocketAddress address = section.address(key);
+    if (address.isUnspecified())
+        section.refuse(key, "'" + address.host + "' is nobody's address");
+    if (address.isMulticast())
+        section.refuse(key, "'" + address.host + "' is a multicast address");
+    return address;
+}
+
+void READ_ADDRESSES(Section const& section, Configuration::Interface& interface)
+{
+    interface.listen = section.address("listen");
+    if (section.has("advertise"))
+        interface.advertise = READ_REACHABLE(section, "advertise");
+    else if (interface.listen.isUnspecified())
+        section.refuse("listen", "'" + interface.listen.host + "' cannot be told to peers: advertise is needed");
+    if (interface.listen.isMulticast())
+        section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
+    interface.peer = READ_REACHABLE(section, "peer");
+    if (interface.peer.isVersion6() != interface.listen.isVersion6())
+        section.refuse("peer", "is not of the version of the internet protocol that listen is of");
+    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
+        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
+    if (interface.peer == interface.listen || interface.peer == interface.advertise)
+        section.refuse("peer", "is the interface itself");
+}
+
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "peer", "transport", "transports", "allow", "max-message-size", "max-header-size",
-                   "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout"});
+    section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
+                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
-    interface.listen = section.address("listen");
-    interface.peer = section.address("peer");
+    READ_ADDRESSES(section, interface);
     READ_TRANSPORTS(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =
@@ -322,10 +354,13 @@ SocketAddress SocketAddress::PARSE(std::string const& text)
 Configuration Configuration::READ(std::string const& file)
 {
     std::ifstream stream(file);
-    std::ostringstream text;
-    if (!stream || !(text << stream.rdbuf()) || stream.bad())
+    std::string text;
+    char piece[4096];
+    while (stream.read(piece, sizeof piece) || stream.gcount() > 0)
+        text.append(piece, static_cast<std::size_t>(stream.gcount()));
+    if (!stream.is_open() || stream.bad())
         throw ConfigurationError(file, "file", "cannot be read");
-    return PARSE(text.str(), file);
+    return PARSE(text, file);
 }
 
 Configuration Configuration::PARSE(std::string_view text, std::string const& file)

@@ -10,7 +10,7 @@ char const* const TWO_INTERFACES = R"(
 [[interface]]
 name = "a"
 listen = "127.0.0.1:5060"
-peer = "[2001:db8::1]:5070"
+peer = "192.0.2.7:5070"
 
 [[interface]]
 name = "b"
@@ -68,8 +68,8 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.t1, 500u);
     EXPECT_EQ(a.t1x64, 32000u);
     EXPECT_EQ(a.answerTimeout, 180u);
-    EXPECT_EQ(a.peer.host, "2001:db8::1");
-    EXPECT_EQ(a.peer.text(), "[2001:db8::1]:5070");
+    EXPECT_EQ(a.peer.text(), "192.0.2.7:5070");
+    EXPECT_EQ(a.getAddress().text(), "127.0.0.1:5060");
 }
 
 TEST(Configuration, EveryKeyIsRead)
@@ -131,6 +131,8 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
     std::string const good = TWO_INTERFACES;
     std::string const first = "[[interface]]\nname = \"a\"\n";
     std::string const whole = first + "listen = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\n";
+    auto const addresses = [&](std::string const& listen, std::string const& peer)
+    { return first + "listen = \"" + listen + "\"\npeer = \"" + peer + "\"\n"; };
     Row const rows[] = {
         {"", "f: interface: is missing: at least one [[interface]] is needed"},
         {"interface = 3", "f: interface: expected tables, [[interface]]"},
@@ -155,6 +157,23 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {first + "listen = \"127.0.0.1:65536\"", "f: interface[0].listen: '65536' is not a port"},
         {first + "listen = \"127.0.0.1:5x\"", "f: interface[0].listen: '5x' is not a port"},
         {good + "t2 = 1", "f: interface[1].t2: is not a key"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2"),
+         "f: interface[0].listen: '0.0.0.0' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2"), "f: interface[0].listen: '::' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2") + "advertise = \"127.0.0.1:1\"",
+         "f: interface[0].advertise: is not of the version of the internet protocol that listen is of"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2") + "advertise = \"0.0.0.0:1\"",
+         "f: interface[0].advertise: '0.0.0.0' is nobody's address"},
+        {addresses("224.0.0.1:1", "127.0.0.1:2"), "f: interface[0].listen: '224.0.0.1' is a multicast address"},
+        {addresses("127.0.0.1:1", "239.1.2.3:2"), "f: interface[0].peer: '239.1.2.3' is a multicast address"},
+        {addresses("[::1]:1", "[ff02::1]:2"), "f: interface[0].peer: 'ff02::1' is a multicast address"},
+        {addresses("127.0.0.1:1", "0.0.0.0:2"), "f: interface[0].peer: '0.0.0.0' is nobody's address"},
+        {addresses("127.0.0.1:1", "[::1]:2"),
+         "f: interface[0].peer: is not of the version of the internet protocol that listen is of"},
+        {addresses("127.0.0.1:1", "127.0.0.1:1"), "f: interface[0].peer: is the interface itself"},
+        {"[[interface]]\nname = \"a\\nb\"", "f: interface[0].name: has a line break or another control character"},
+        {"[gateway]\ncontext = \"a\\u007f\"\n" + good,
+         "f: gateway.context: has a line break or another control character"},
         {whole + "transports = []", "f: interface[0].transports: expected a list of texts"},
         {whole + "transports = \"tcp\"", "f: interface[0].transports: expected a list of texts"},
         {whole + "transports = [3]", "f: interface[0].transports: expected a list of texts"},
@@ -178,6 +197,29 @@ TEST(Configuration, TextThatIsNoTomlIsNamedByItsLine)
 {
     EXPECT_EQ(COMPLAINT("[gateway]\nmax-calls = = 3\n").rfind("f: line 2: ", 0), 0u);
     EXPECT_EQ(COMPLAINT("a = \"\n\n").find('\n'), std::string::npos);
+}
+
+TEST(Configuration, AnAddressForThePeersLetsItListenOnAll)
+{
+    Configuration const configuration =
+        Configuration::PARSE("[[interface]]\nname = \"a\"\nlisten = \"0.0.0.0:5060\"\nadvertise = \"192.0.2.1:5070\"\n"
+                             "peer = \"192.0.2.7:5060\"\n",
+                             "f");
+    EXPECT_EQ(configuration.interfaces[0].listen.text(), "0.0.0.0:5060");
+    EXPECT_EQ(configuration.interfaces[0].getAddress().text(), "192.0.2.1:5070");
+}
+
+TEST(Configuration, AnEmptyFileIsReadAndLacksAnInterface)
+{
+    try
+    {
+        Configuration::READ("/dev/null");
+        FAIL();
+    }
+    catch (ConfigurationError const& error)
+    {
+        EXPECT_STREQ(error.what(), "/dev/null: interface: is missing: at least one [[interface]] is needed");
+    }
 }
 
 TEST(Configuration, AFileThatCannotBeReadIsNamed)

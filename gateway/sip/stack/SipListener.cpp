@@ -62,7 +62,8 @@ url_string_t const* const NO_PORT = reinterpret_cast<url_string_t const*>(-1); /
 
 std::string MAKE_BINDING(Configuration::Interface const& configuration, char const* transport)
 {
-    return SipAddress::MAKE_URI({}, configuration.listen, false) + ";transport=" + transport;
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.getAddress(), false) + ";transport=" + transport;
+    return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
 }
 } // namespace
 

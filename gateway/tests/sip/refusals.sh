@@ -52,9 +52,9 @@ expect_answer 481 -- with_tag
 start_callee tel_callee
 expect_answer "100 486" -- request INVITE 'tel:+49-89-123;phone-context=x'
 expect_callee
-for transport in un t1; do
+for transport in u1 t1; do
     start_callee callee
-    [[ $transport == un ]] && expect_caller caller 4989123 || expect_caller tcp_caller 4989123 -t t1
+    [[ $transport == u1 ]] && expect_caller caller 4989123 || expect_caller tcp_caller 4989123 -t t1
     expect_callee
 done
 
