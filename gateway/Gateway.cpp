@@ -9,6 +9,7 @@
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "host/MediaContexts.h"
+#include "operation/Log.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
 #include "sip/message/SipCause.h"
@@ -18,7 +19,7 @@
 
 #include <algorithm>
 #include <csignal>
-#include <cstdio>
+
 #include <stdexcept>
 #include <sys/signalfd.h>
 #include <unistd.h>
@@ -31,7 +32,7 @@ sigset_t HANDLED_SIGNALS()
 {
     sigset_t signals;
     sigemptyset(&signals);
-    for (int const signal : {SIGTERM, SIGINT, SIGUSR1})
+    for (int const signal : {SIGTERM, SIGINT, SIGHUP, SIGUSR1, SIGUSR2, SIGCHLD})
         sigaddset(&signals, signal);
     return signals;
 }
@@ -76,7 +77,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
     , m_environment{m_stack,
                     m_host.getContextName(),
                     Routing(configuration.routes),
-                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond),
+                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond, configuration.maxCallsPerSource),
                     CallTrace(tracedCalls),
                     {},
                     0,
@@ -119,10 +120,31 @@ void Gateway::onSignal()
 {
     signalfd_siginfo info = {};
     while (read(m_signals.get(), &info, sizeof info) == static_cast<ssize_t>(sizeof info))
-        if (info.ssi_signo == SIGUSR1)
-            printState();
-        else
+        switch (info.ssi_signo)
+        {
+        case SIGUSR1:
+            m_dump.begin([this] { return getState(); });
+            break;
+        case SIGCHLD:
+            m_dump.onChild();
+            break;
+        case SIGHUP:
+            onHangUp();
+            break;
+        case SIGUSR2:
+            spdlog::info("SIGUSR2 means nothing here");
+            break;
+        default:
             end();
+        }
+}
+
+void Gateway::onHangUp()
+{
+    if (REOPEN_LOG())
+        spdlog::info("SIGHUP: the log is opened again; the configuration is not, since a change of it needs a restart");
+    else
+        spdlog::error("SIGHUP: the log cannot be opened again and goes on where it was");
 }
 
 /// The first request lets the calls go on for a while, another one clears them at once.
@@ -174,7 +196,8 @@ bool Gateway::hasEndpoints() const
                        [](auto const& port) { return port->interface.getNumberOfEndpoints() != 0; });
 }
 
-void Gateway::printState() const
+/// In the process that tells it, which is a copy of this one.
+std::string Gateway::getState() const
 {
     InfoContainer info;
     CallControl::GET_PROVIDER_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
@@ -189,11 +212,18 @@ void Gateway::printState() const
     CC_CallPool::Statistics& pool = CC_CallPool::s_statistics;
     pool.prepareGet();
     Counters const& counters = m_environment.counters;
-    std::printf("state: %u calls up\n%s", CallControl::GET_NUMBER_OF_CALLS(), info.getString_TreeFormat().c_str());
-    std::printf("pool: %llu calls added, %llu removed, at most %llu at once, %llu ms of calls\n", pool.m_callsAdded,
-                pool.m_callsRemoved, pool.m_maxActiveCalls, pool.m_callTime);
-    std::printf("counters: %llu placed, %llu answered, %llu cleared, %llu failed, %llu refused, %u up\n",
-                counters.placed, counters.answered, counters.cleared, counters.failed, counters.refused,
-                CallControl::GET_NUMBER_OF_CALLS());
-    std::fflush(stdout);
+    unsigned int const up = CallControl::GET_NUMBER_OF_CALLS();
+    std::string text = fmt::format("state: {} calls up\n{}", up, info.getString_TreeFormat().view());
+    text += fmt::format("pool: {} calls added, {} removed, at most {} at once, {} ms of calls\n", pool.m_callsAdded,
+                        pool.m_callsRemoved, pool.m_maxActiveCalls, pool.m_callTime);
+    for (auto const& port : m_ports)
+    {
+        SipGuard::Counters const& guard = port->interface.getGuardCounters();
+        text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
+                            port->interface.getName().view(), guard.strangers, guard.tooLarge, guard.connections);
+    }
+    text += fmt::format("log: {} lines dropped\n", GET_DROPPED_LOG_LINES());
+    text += fmt::format("counters: {} placed, {} answered, {} cleared, {} failed, {} refused, {} up\n", counters.placed,
+                        counters.answered, counters.cleared, counters.failed, counters.refused, up);
+    return text;
 }

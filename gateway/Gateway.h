@@ -3,6 +3,7 @@
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
 #include "operation/Recording.h"
+#include "operation/StateDump.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 #include "sip/endpoint/SipEnvironment.h"
@@ -66,7 +67,8 @@ private:
     void onClearTimer();
     void stopIfIdle();
     bool hasEndpoints() const;
-    void printState() const;
+    void onHangUp();
+    std::string getState() const;
 
     Configuration m_configuration;
     TYEventLoop m_callControlLoop;
@@ -74,6 +76,7 @@ private:
     SipStack m_stack;
     Signals m_signals;
     Recording m_recording;
+    StateDump m_dump;
     CallControlHost m_host;
     SipEnvironment m_environment;
     TYTimer m_clearTimer;

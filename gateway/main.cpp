@@ -1,12 +1,14 @@
 // callcontrol-gateway: SIP clients call each other through the call-control library. README.md tells how it is used.
 #include "Gateway.h"
 #include "operation/Log.h"
+#include "operation/Output.h"
 
 #include <CLI/CLI.hpp>
 
 #include <cstdio>
 #include <exception>
 #include <string>
+#include <unistd.h>
 
 namespace
 {
@@ -51,6 +53,7 @@ int SERVE(Configuration const& configuration, unsigned int tracedCalls)
     unsigned int const leftOver = Gateway::GET_NUMBER_OF_LEFT_OVERS();
     std::printf("gateway: %llu calls placed, %llu answered, %llu cleared, %llu failed, %u left over\n", counters.placed,
                 counters.answered, counters.cleared, counters.failed, leftOver);
+    std::fflush(stdout);
     return leftOver == 0 ? ALL_RIGHT : LEFT_OVERS;
 }
 
@@ -62,11 +65,14 @@ int RUN(Arguments const& arguments)
         std::printf("%s: all right\n", arguments.file.c_str());
         return ALL_RIGHT;
     }
-    SET_UP_LOG(arguments.logLevel.empty() ? configuration.logLevel : arguments.logLevel);
+    Gateway::BLOCK_SIGNALS();
+    if (!SET_UP_LOG(arguments.logLevel.empty() ? configuration.logLevel : arguments.logLevel, configuration.logFile))
+        throw ConfigurationError(arguments.file, "gateway.log-file", "the file cannot be opened");
+    static Output output(STDOUT_FILENO);
+    stdout = output.makeStream(); // whoever prints, for now and ever
     static MonitorWriter writer;
     RTD::REPOSITORY::SET_WRITER(&writer);
     RTD::REPOSITORY::ENABLE(CALL_CONTROL_MONITOR, configuration.callControlLogLevel);
-    Gateway::BLOCK_SIGNALS();
     return SERVE(configuration, arguments.tracedCalls);
 }
 

@@ -9,16 +9,17 @@
 #include <fstream>
 #include <initializer_list>
 #include <limits>
-#include <sstream>
+
 #include <system_error>
 
 namespace
 {
+bool IS_CONTROL(char c) { return static_cast<unsigned char>(c) < 0x20 || c == 0x7f; }
+
 /// Everything on one line, whatever a parser's message or a file's name holds.
 std::string ONE_LINE(std::string text)
 {
-    std::replace_if(
-        text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x20; }, ' ');
+    std::replace_if(text.begin(), text.end(), IS_CONTROL, ' ');
     return text;
 }
 
@@ -53,7 +54,10 @@ public:
             return fallback;
         if (!node->is_string())
             refuse(key, "expected a text");
-        return node->as_string()->get();
+        std::string value = node->as_string()->get();
+        if (std::any_of(value.begin(), value.end(), IS_CONTROL))
+            refuse(key, "has a line break or another control character");
+        return value;
     }
 
     std::string neededText(char const* key) const
@@ -104,6 +108,40 @@ public:
         }
     }
 
+    /// The texts of a list that, where it is, has one at least.
+    std::vector<std::string> texts(char const* key, std::vector<std::string> fallback) const
+    {
+        toml::node const* const node = m_table.get(key);
+        if (node == nullptr)
+            return fallback;
+        toml::array const* const list = node->as_array();
+        if (list == nullptr || list->empty())
+            refuse(key, "expected a list of texts");
+        std::vector<std::string> result;
+        for (toml::node const& element : *list)
+        {
+            if (!element.is_string())
+                refuse(key, "expected a list of texts");
+            result.push_back(element.as_string()->get());
+        }
+        return result;
+    }
+
+    std::vector<AddressRange> ranges(char const* key) const
+    {
+        std::vector<AddressRange> result;
+        try
+        {
+            for (std::string const& range : texts(key, {}))
+                result.push_back(AddressRange::PARSE(range));
+        }
+        catch (std::invalid_argument const& error)
+        {
+            refuse(key, error.what());
+        }
+        return result;
+    }
+
     void allow(std::initializer_list<char const*> keys) const
     {
         for (auto const& entry : m_table)
@@ -124,14 +162,70 @@ constexpr unsigned int LEAST_RECORDED = 4096; // octets
 constexpr unsigned int MOST_RECORDED = 1024 * 1024 * 1024;
 constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 
+constexpr unsigned int LEAST_MESSAGE = 1024;   // octets
+constexpr unsigned int MOST_MESSAGE = 1 << 20; // of a stream; a datagram ends at 65535
+
+/// Without `transports` an interface listens on what it speaks to its peer.
+void READ_TRANSPORTS(Section const& section, Configuration::Interface& interface)
+{
+    std::string const towardsPeer = section.oneOf("transport", "udp", {"udp", "tcp"});
+    interface.usesTcp = towardsPeer == "tcp";
+    interface.listensOnUdp = interface.listensOnTcp = false;
+    for (std::string const& transport : section.texts("transports", {towardsPeer}))
+        if (transport == "udp")
+            interface.listensOnUdp = true;
+        else if (transport == "tcp")
+            interface.listensOnTcp = true;
+        else
+            section.refuse("transports", "must be some of udp, tcp");
+    if (!(interface.usesTcp ? interface.listensOnTcp : interface.listensOnUdp))
+        section.refuse("transports", "must have '" + towardsPeer + "', which is the peer's");
+}
+
+/// Where others find it: no address that is everybody's, or many's.
+SocketAddress READ_REACHABLE(Section const& section, char const* key)
+{
+    SocketAddress address = section.address(key);
+    if (address.isUnspecified())
+        section.refuse(key, "'" + address.host + "' is nobody's address");
+    if (address.isMulticast())
+        section.refuse(key, "'" + address.host + "' is a multicast address");
+    return address;
+}
+
+void READ_ADDRESSES(Section const& section, Configuration::Interface& interface)
+{
+    interface.listen = section.address("listen");
+    if (section.has("advertise"))
+        interface.advertise = READ_REACHABLE(section, "advertise");
+    else if (interface.listen.isUnspecified())
+        section.refuse("listen", "'" + interface.listen.host + "' cannot be told to peers: advertise is needed");
+    if (interface.listen.isMulticast())
+        section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
+    interface.peer = READ_REACHABLE(section, "peer");
+    if (interface.peer.isVersion6() != interface.listen.isVersion6())
+        section.refuse("peer", "is not of the version of the internet protocol that listen is of");
+    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
+        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
+    if (interface.peer == interface.listen || interface.peer == interface.advertise)
+        section.refuse("peer", "is the interface itself");
+}
+
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout"});
+    section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
+                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
-    interface.listen = section.address("listen");
-    interface.peer = section.address("peer");
-    interface.usesTcp = section.oneOf("transport", "udp", {"udp", "tcp"}) == "tcp";
+    READ_ADDRESSES(section, interface);
+    READ_TRANSPORTS(section, interface);
+    interface.allow = section.ranges("allow");
+    interface.maxMessageSize =
+        section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxHeaderSize = section.number("max-header-size", interface.maxHeaderSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxConnectionsPerSource =
+        section.number("max-connections-per-source", interface.maxConnectionsPerSource, 1, UNLIMITED);
+    interface.tcpIdle = section.number("tcp-idle", interface.tcpIdle, 1, 86400);
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
@@ -161,13 +255,17 @@ void FOR_EACH_TABLE(Section const& root, toml::table const& table, std::string c
 
 void READ_GATEWAY(Section const& section, Configuration& configuration)
 {
-    section.allow({"context", "log-level", "call-control-log-level", "max-calls", "max-calls-per-second", "clear-after",
-                   "recording", "recording-size"});
+    section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-calls", "max-calls-per-second",
+                   "max-calls-per-source", "clear-after", "recording", "recording-size"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
+    configuration.logFile = section.text("log-file", {});
     configuration.callControlLogLevel = section.number("call-control-log-level", 1, 0, 5);
-    configuration.maxCalls = section.number("max-calls", 0, 0, UNLIMITED);
-    configuration.maxCallsPerSecond = section.number("max-calls-per-second", 0, 0, UNLIMITED);
+    configuration.maxCalls = section.number("max-calls", configuration.maxCalls, 0, UNLIMITED);
+    configuration.maxCallsPerSecond =
+        section.number("max-calls-per-second", configuration.maxCallsPerSecond, 0, UNLIMITED);
+    configuration.maxCallsPerSource =
+        section.number("max-calls-per-source", configuration.maxCallsPerSource, 0, UNLIMITED);
     configuration.clearAfter = section.number("clear-after", configuration.clearAfter, 0, 86400);
     configuration.recording = section.text("recording", {});
     configuration.recordingSize = section.number("recording-size", configuration.recordingSize, 0, MOST_RECORDED);
@@ -216,6 +314,18 @@ ConfigurationError::ConfigurationError(std::string const& file, std::string cons
 {
 }
 
+bool SocketAddress::isUnspecified() const
+{
+    return AddressRange::PARSE("0.0.0.0").contains(AddressRange::PARSE(host).getFirst()) ||
+           AddressRange::PARSE("::").contains(AddressRange::PARSE(host).getFirst());
+}
+
+bool SocketAddress::isMulticast() const
+{
+    return AddressRange::PARSE("224.0.0.0/4").contains(AddressRange::PARSE(host).getFirst()) ||
+           AddressRange::PARSE("ff00::/8").contains(AddressRange::PARSE(host).getFirst());
+}
+
 std::string SocketAddress::text() const
 {
     return (isVersion6() ? "[" + host + "]" : host) + ":" + std::to_string(port);
@@ -244,10 +354,13 @@ SocketAddress SocketAddress::PARSE(std::string const& text)
 Configuration Configuration::READ(std::string const& file)
 {
     std::ifstream stream(file);
-    std::ostringstream text;
-    if (!stream || !(text << stream.rdbuf()) || stream.bad())
+    std::string text;
+    char piece[4096];
+    while (stream.read(piece, sizeof piece) || stream.gcount() > 0)
+        text.append(piece, static_cast<std::size_t>(stream.gcount()));
+    if (!stream.is_open() || stream.bad())
         throw ConfigurationError(file, "file", "cannot be read");
-    return PARSE(text.str(), file);
+    return PARSE(text, file);
 }
 
 Configuration Configuration::PARSE(std::string_view text, std::string const& file)

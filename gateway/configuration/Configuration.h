@@ -1,5 +1,7 @@
 #pragma once
 
+#include "configuration/AddressRange.h"
+
 #include <cstdint>
 #include <stdexcept>
 #include <string>
@@ -13,6 +15,9 @@ struct SocketAddress
     std::uint16_t port = 0;
 
     bool isVersion6() const { return host.find(':') != std::string::npos; }
+    bool isUnspecified() const; ///< "0.0.0.0" or "[::]": every address of the host
+    bool isMulticast() const;
+    friend bool operator==(SocketAddress const&, SocketAddress const&) = default;
     /// The form above.
     std::string text() const;
     /// Throws std::invalid_argument with the reason for anything else, port 0 included.
@@ -40,11 +45,22 @@ struct Configuration
     {
         std::string name;
         SocketAddress listen;
+        SocketAddress advertise; ///< what the peers are told instead of `listen`; port 0: nothing
         SocketAddress peer;
-        bool usesTcp = false;             ///< towards the peer; it always listens on UDP and TCP
+        bool usesTcp = false;     ///< towards the peer
+        bool listensOnUdp = true; ///< one of the two at least
+        bool listensOnTcp = false;
+        std::vector<AddressRange> allow;     ///< who is served; empty: the peer's address alone
+        unsigned int maxMessageSize = 65535; ///< octets
+        unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
+        unsigned int maxConnectionsPerSource = 16;
+        unsigned int tcpIdle = 120;       ///< seconds that a connection may stay without a message
         unsigned int t1 = 500;            ///< milliseconds: the first retransmission
         unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
         unsigned int answerTimeout = 180; ///< seconds that the peer may ring
+
+        /// Where the peers reach it.
+        SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
     };
     /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
     struct Route
@@ -55,14 +71,16 @@ struct Configuration
     };
 
     std::string file;
-    std::string context;                  ///< the call-control context; empty: its default
-    std::string logLevel = "info";        ///< of spdlog
-    unsigned int callControlLogLevel = 1; ///< of the library's monitor, 0 to 5
-    unsigned int maxCalls = 0;            ///< at the same time; 0: no limit
-    unsigned int maxCallsPerSecond = 0;   ///< 0: no limit
-    std::string recording;                ///< the recorder's file; empty: in memory
-    unsigned int recordingSize = 4194304; ///< octets; 0: nothing is recorded
-    unsigned int clearAfter = 10;         ///< seconds that calls may go on after the request to end
+    std::string context;                   ///< the call-control context; empty: its default
+    std::string logLevel = "info";         ///< of spdlog
+    std::string logFile;                   ///< empty: the standard error stream
+    unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
+    unsigned int maxCalls = 4000;          ///< at the same time; 0: no limit
+    unsigned int maxCallsPerSecond = 200;  ///< 0: no limit
+    unsigned int maxCallsPerSource = 2000; ///< of one address at the same time; 0: no limit
+    std::string recording;                 ///< the recorder's file; empty: in memory
+    unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
+    unsigned int clearAfter = 10;          ///< seconds that calls may go on after the request to end
     std::vector<Interface> interfaces;
     std::vector<Route> routes;
 

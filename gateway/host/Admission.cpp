@@ -3,9 +3,12 @@
 #include <algorithm>
 #include <utility>
 
-bool Admission::admit(unsigned int callsUp)
+bool Admission::admit(unsigned int callsUp, InternetAddress const& source)
 {
-    if (m_maxCalls != 0 && callsUp >= m_maxCalls)
+    if (!hasRoom(callsUp))
+        return false;
+    auto const ofSource = m_perSource != 0 ? m_calls.find(source) : m_calls.end();
+    if (ofSource != m_calls.end() && ofSource->second >= m_perSource)
         return false;
     if (m_perSecond == 0)
         return true;
@@ -14,6 +17,13 @@ bool Admission::admit(unsigned int callsUp)
         return false;
     m_tokens -= 1;
     return true;
+}
+
+void Admission::end(InternetAddress const& source)
+{
+    auto const found = m_calls.find(source);
+    if (found != m_calls.end() && --found->second == 0)
+        m_calls.erase(found);
 }
 
 void Admission::refill()

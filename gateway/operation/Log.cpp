@@ -1,9 +1,40 @@
 #include "operation/Log.h"
 
-#include <spdlog/sinks/stdout_sinks.h>
+#include "operation/Output.h"
+
+#include <spdlog/sinks/base_sink.h>
 #include <spdlog/spdlog.h>
 
 #include <memory>
+#include <mutex>
+#include <unistd.h>
+
+namespace
+{
+std::string s_file; // empty: the standard error stream
+
+Output& LOG_OUTPUT()
+{
+    static Output s_output(STDERR_FILENO);
+    return s_output;
+}
+
+/// Sends what the logger writes to the output.
+class OutputSink : public spdlog::sinks::base_sink<std::mutex>
+{
+public:
+    OutputSink() { set_pattern("%H:%M:%S.%e %l %v"); }
+
+private:
+    void sink_it_(spdlog::details::log_msg const& message) override
+    {
+        spdlog::memory_buf_t text;
+        formatter_->format(message, text);
+        LOG_OUTPUT().write({text.data(), text.size()});
+    }
+    void flush_() override {}
+};
+} // namespace
 
 void MonitorWriter::write(unsigned int monitorId, unsigned int level, char const* text)
 {
@@ -11,11 +42,15 @@ void MonitorWriter::write(unsigned int monitorId, unsigned int level, char const
                 text);
 }
 
-void SET_UP_LOG(std::string const& level)
+bool SET_UP_LOG(std::string const& level, std::string const& file)
 {
-    auto const logger = std::make_shared<spdlog::logger>("gateway", std::make_shared<spdlog::sinks::stderr_sink_st>());
-    logger->set_pattern("%H:%M:%S.%e %l %v");
+    s_file = file;
+    auto const logger = std::make_shared<spdlog::logger>("gateway", std::make_shared<OutputSink>());
     logger->set_level(spdlog::level::from_str(level));
-    logger->flush_on(spdlog::level::trace); // a line that is not out when the process dies is the one that was needed
     spdlog::set_default_logger(logger);
+    return s_file.empty() || REOPEN_LOG();
 }
+
+bool REOPEN_LOG() { return s_file.empty() || LOG_OUTPUT().open(s_file.c_str()); }
+
+unsigned long long GET_DROPPED_LOG_LINES() { return LOG_OUTPUT().getDropped(); }

@@ -11,5 +11,11 @@ public:
     void write(unsigned int monitorId, unsigned int level, char const* text) override;
 };
 
-/// Sets up spdlog on the standard error stream. `level`: a name of spdlog's ("info").
-void SET_UP_LOG(std::string const& level);
+/// Sets up spdlog on a file, or on the standard error stream for an empty name. A line never holds up its writer.
+/// `level`: a name of spdlog's ("info"). False when the file cannot be opened.
+bool SET_UP_LOG(std::string const& level, std::string const& file = {});
+/// Goes on in a file of that name, after the one before was moved away. False when it cannot be opened: the old one is
+/// gone on with.
+bool REOPEN_LOG();
+/// Lines that nobody took in time.
+unsigned long long GET_DROPPED_LOG_LINES();

@@ -10,7 +10,7 @@ char const* const TWO_INTERFACES = R"(
 [[interface]]
 name = "a"
 listen = "127.0.0.1:5060"
-peer = "[2001:db8::1]:5070"
+peer = "192.0.2.7:5070"
 
 [[interface]]
 name = "b"
@@ -18,6 +18,12 @@ listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
 t1 = 100
+transports = ["tcp", "udp"]
+allow = ["192.0.2.0/24", "2001:db8::7"]
+max-message-size = 2000
+max-header-size = 1500
+max-connections-per-source = 3
+tcp-idle = 4
 t1x64 = 3200
 answer-timeout = 30
 )";
@@ -42,8 +48,9 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(configuration.file, "f");
     EXPECT_EQ(configuration.logLevel, "info");
     EXPECT_EQ(configuration.callControlLogLevel, 1u);
-    EXPECT_EQ(configuration.maxCalls, 0u);
-    EXPECT_EQ(configuration.maxCallsPerSecond, 0u);
+    EXPECT_EQ(configuration.maxCalls, 4000u);
+    EXPECT_EQ(configuration.maxCallsPerSecond, 200u);
+    EXPECT_EQ(configuration.maxCallsPerSource, 2000u);
     EXPECT_EQ(configuration.clearAfter, 10u);
     EXPECT_EQ(configuration.recording, "");
     EXPECT_EQ(configuration.recordingSize, 4194304u);
@@ -51,18 +58,26 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     ASSERT_EQ(configuration.interfaces.size(), 2u);
     Configuration::Interface const& a = configuration.interfaces[0];
     EXPECT_FALSE(a.usesTcp);
+    EXPECT_TRUE(a.listensOnUdp);
+    EXPECT_FALSE(a.listensOnTcp);
+    EXPECT_TRUE(a.allow.empty());
+    EXPECT_EQ(a.maxMessageSize, 65535u);
+    EXPECT_EQ(a.maxHeaderSize, 32768u);
+    EXPECT_EQ(a.maxConnectionsPerSource, 16u);
+    EXPECT_EQ(a.tcpIdle, 120u);
     EXPECT_EQ(a.t1, 500u);
     EXPECT_EQ(a.t1x64, 32000u);
     EXPECT_EQ(a.answerTimeout, 180u);
-    EXPECT_EQ(a.peer.host, "2001:db8::1");
-    EXPECT_EQ(a.peer.text(), "[2001:db8::1]:5070");
+    EXPECT_EQ(a.peer.text(), "192.0.2.7:5070");
+    EXPECT_EQ(a.getAddress().text(), "127.0.0.1:5060");
 }
 
 TEST(Configuration, EveryKeyIsRead)
 {
     Configuration const configuration = Configuration::PARSE(
         std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-calls = 7\n"
-                    "max-calls-per-second = 8\nclear-after = 9\nrecording = \"/r\"\nrecording-size = 4096\n") +
+                    "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
+                    "\"/r\"\nrecording-size = 4096\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -70,17 +85,33 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.callControlLogLevel, 5u);
     EXPECT_EQ(configuration.maxCalls, 7u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 8u);
+    EXPECT_EQ(configuration.maxCallsPerSource, 6u);
     EXPECT_EQ(configuration.clearAfter, 9u);
     EXPECT_EQ(configuration.recording, "/r");
     EXPECT_EQ(configuration.recordingSize, 4096u);
     Configuration::Interface const* const b = configuration.findInterface("b");
     ASSERT_NE(b, nullptr);
     EXPECT_TRUE(b->usesTcp);
+    EXPECT_TRUE(b->listensOnUdp);
+    EXPECT_TRUE(b->listensOnTcp);
+    EXPECT_EQ(b->allow.size(), 2u);
+    EXPECT_EQ(b->maxMessageSize, 2000u);
+    EXPECT_EQ(b->maxHeaderSize, 1500u);
+    EXPECT_EQ(b->maxConnectionsPerSource, 3u);
+    EXPECT_EQ(b->tcpIdle, 4u);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].prefix, "49");
+}
+
+TEST(Configuration, WithoutListOfTransportsAnInterfaceListensOnWhatItSpeaksToItsPeer)
+{
+    Configuration const configuration = Configuration::PARSE(
+        "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\ntransport = \"tcp\"\n", "f");
+    EXPECT_TRUE(configuration.interfaces[0].listensOnTcp);
+    EXPECT_FALSE(configuration.interfaces[0].listensOnUdp);
 }
 
 TEST(Configuration, ALongerTimeOfTransactionsFollowsFromALongerFirstRetransmission)
@@ -99,6 +130,9 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
     };
     std::string const good = TWO_INTERFACES;
     std::string const first = "[[interface]]\nname = \"a\"\n";
+    std::string const whole = first + "listen = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\n";
+    auto const addresses = [&](std::string const& listen, std::string const& peer)
+    { return first + "listen = \"" + listen + "\"\npeer = \"" + peer + "\"\n"; };
     Row const rows[] = {
         {"", "f: interface: is missing: at least one [[interface]] is needed"},
         {"interface = 3", "f: interface: expected tables, [[interface]]"},
@@ -123,6 +157,32 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {first + "listen = \"127.0.0.1:65536\"", "f: interface[0].listen: '65536' is not a port"},
         {first + "listen = \"127.0.0.1:5x\"", "f: interface[0].listen: '5x' is not a port"},
         {good + "t2 = 1", "f: interface[1].t2: is not a key"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2"),
+         "f: interface[0].listen: '0.0.0.0' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2"), "f: interface[0].listen: '::' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2") + "advertise = \"127.0.0.1:1\"",
+         "f: interface[0].advertise: is not of the version of the internet protocol that listen is of"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2") + "advertise = \"0.0.0.0:1\"",
+         "f: interface[0].advertise: '0.0.0.0' is nobody's address"},
+        {addresses("224.0.0.1:1", "127.0.0.1:2"), "f: interface[0].listen: '224.0.0.1' is a multicast address"},
+        {addresses("127.0.0.1:1", "239.1.2.3:2"), "f: interface[0].peer: '239.1.2.3' is a multicast address"},
+        {addresses("[::1]:1", "[ff02::1]:2"), "f: interface[0].peer: 'ff02::1' is a multicast address"},
+        {addresses("127.0.0.1:1", "0.0.0.0:2"), "f: interface[0].peer: '0.0.0.0' is nobody's address"},
+        {addresses("127.0.0.1:1", "[::1]:2"),
+         "f: interface[0].peer: is not of the version of the internet protocol that listen is of"},
+        {addresses("127.0.0.1:1", "127.0.0.1:1"), "f: interface[0].peer: is the interface itself"},
+        {"[[interface]]\nname = \"a\\nb\"", "f: interface[0].name: has a line break or another control character"},
+        {"[gateway]\ncontext = \"a\\u007f\"\n" + good,
+         "f: gateway.context: has a line break or another control character"},
+        {whole + "transports = []", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = \"tcp\"", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = [3]", "f: interface[0].transports: expected a list of texts"},
+        {whole + "transports = [\"sctp\"]", "f: interface[0].transports: must be some of udp, tcp"},
+        {whole + "transports = [\"tcp\"]", "f: interface[0].transports: must have 'udp', which is the peer's"},
+        {whole + "allow = [\"host\"]", "f: interface[0].allow: 'host' is not an address"},
+        {whole + "allow = [\"10.0.0.1/8\"]", "f: interface[0].allow: '10.0.0.1/8' has bits beyond its prefix"},
+        {whole + "max-message-size = 100", "f: interface[0].max-message-size: must be from 1024 to 1048576"},
+        {whole + "tcp-idle = 0", "f: interface[0].tcp-idle: must be from 1 to 86400"},
         {good + "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"",
          "f: interface[2].name: 'a' is taken by another interface"},
         {good + "[[route]]\nto = \"b\"", "f: route[0].from: is missing"},
@@ -137,6 +197,29 @@ TEST(Configuration, TextThatIsNoTomlIsNamedByItsLine)
 {
     EXPECT_EQ(COMPLAINT("[gateway]\nmax-calls = = 3\n").rfind("f: line 2: ", 0), 0u);
     EXPECT_EQ(COMPLAINT("a = \"\n\n").find('\n'), std::string::npos);
+}
+
+TEST(Configuration, AnAddressForThePeersLetsItListenOnAll)
+{
+    Configuration const configuration =
+        Configuration::PARSE("[[interface]]\nname = \"a\"\nlisten = \"0.0.0.0:5060\"\nadvertise = \"192.0.2.1:5070\"\n"
+                             "peer = \"192.0.2.7:5060\"\n",
+                             "f");
+    EXPECT_EQ(configuration.interfaces[0].listen.text(), "0.0.0.0:5060");
+    EXPECT_EQ(configuration.interfaces[0].getAddress().text(), "192.0.2.1:5070");
+}
+
+TEST(Configuration, AnEmptyFileIsReadAndLacksAnInterface)
+{
+    try
+    {
+        Configuration::READ("/dev/null");
+        FAIL();
+    }
+    catch (ConfigurationError const& error)
+    {
+        EXPECT_STREQ(error.what(), "/dev/null: interface: is missing: at least one [[interface]] is needed");
+    }
 }
 
 TEST(Configuration, AFileThatCannotBeReadIsNamed)

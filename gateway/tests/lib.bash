@@ -76,10 +76,19 @@ start_gateway() {
     [[ -f $WORK/gateway.toml ]] || write_configuration
     "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls "${TRACED:-1}" "$@" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
     gateway_pid=$!
-    local port
+    local port transport
     for port in $PORT_A $PORT_B; do
-        wait_for_port $gateway_pid "$port" udp && wait_for_port $gateway_pid "$port" tcp || fail "the gateway does not listen"
+        for transport in $(transports); do
+            wait_for_port $gateway_pid "$port" "$transport" || fail "the gateway does not listen"
+        done
     done
+}
+
+# transports: on which every interface of the configuration listens
+transports() {
+    local found
+    found=$(grep -E '^transports? =' "$WORK/gateway.toml" | tail -n 1 | grep -oE '"(udp|tcp)"' | tr -d '"')
+    echo "${found:-udp}"
 }
 
 # start_callee SCENARIO [ARGUMENT]...: SIPp as the peer of interface b, for one call unless the arguments say more.

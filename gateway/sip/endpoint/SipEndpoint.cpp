@@ -48,7 +48,7 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
 void SipEndpoint::ON_TIMER(void* endpoint)
 {
     auto& self = *static_cast<SipEndpoint*>(endpoint);
-    self.handle([&] { self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout(); });
+    self.handle([&] { self.m_isCalling ? self.onCallingTimer() : self.onAnswerTimeout(); });
 }
 
 SipEndpoint::~SipEndpoint()

@@ -75,7 +75,9 @@ private:
                    SipParty const& called);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
-    void onDialFailed();
+    void startExpiry(sip_t const* request);
+    void failDialLater();
+    void onCallingTimer();
     static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
     void onAck(sip_t const* request);
     void onAckMissing();
@@ -160,10 +162,12 @@ private:
     nta_outgoing_t* m_ack = nullptr;
     nta_outgoing_t* m_bye = nullptr;
     unsigned int m_inviteSequence = 0;
-    TYTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
+    TYTimer m_timer; // calling side: a dial failed, the INVITE expires; called side: its answer or its end is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isAckLate = false;              // the ACK is still to be sent: it must carry an answer that is not here yet
+    bool m_isOverTcp = false;              // the INVITE received
+    bool m_hasDialFailed = false;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_wasAnswered = false;

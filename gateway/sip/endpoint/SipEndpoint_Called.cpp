@@ -83,7 +83,9 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
     m_hadPeer = true;
     if (isTraced())
         trace("did  accept as " + called.getText() + ", State=TRYING");
-    if (!sendInvite(called, properties))
+    if (m_interface.isPeerBusy())
+        clear({QCause::TEMPORARY_FAILURE, 503, {}});
+    else if (!sendInvite(called, properties))
         clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
     return XCode::OK;
 }
@@ -97,12 +99,12 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
     m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
-                            SIPTAG_FROM_STR(caller.getFrom(configuration.listen).c_str()), SIPTAG_TO_STR(to.c_str()),
-                            TAG_END());
+                            SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
+                            SIPTAG_TO_STR(to.c_str()), TAG_END());
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
-    std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.listen) +
-                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.listen, uri);
+    std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
+                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri);
     return startInvite(uri, identityHeaders,
                        maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
                                               : DEFAULT_MAX_FORWARDS);
@@ -114,12 +116,13 @@ bool SipEndpoint::startInvite(std::string const& uri, std::string const& identit
     std::string const hops = std::to_string(maxForwards);
     m_hasOffer = !session.empty();
     trace("-> INVITE " + uri + (m_hasOffer ? " with a session description" : ""));
-    m_invite = nta_outgoing_tcreate(m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE,
-                                    URL_STRING_MAKE(uri.c_str()), SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
-                                    SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
-                                    TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
-                                    TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                                    TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+    m_invite = nta_outgoing_tcreate(
+        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(uri.c_str()),
+        SIPTAG_CONTACT_STR(m_interface.getContact(m_interface.getConfiguration().usesTcp).c_str()),
+        SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED_STR(""), SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
+        TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
+        TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
     if (m_invite == nullptr)
         return false;
     m_inviteSequence = nta_leg_get_seq(m_leg);
@@ -204,6 +207,8 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
     m_dialog = Dialog::OVER;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     forgetInvite();
+    if (!isOurs && status == 503 && response->sip_retry_after != nullptr)
+        m_interface.leavePeerAlone(response->sip_retry_after->af_delta);
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else

@@ -6,6 +6,7 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/endpoint/SipRules.h"
 #include "sip/message/SipDiversion.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipProperty.h"
@@ -17,7 +18,7 @@ using namespace SipProperty;
 
 namespace
 {
-constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
+constexpr unsigned long LONGEST_EXPIRY = 86400; // seconds; a longer one is as good as none
 
 /// What the INVITE tells of its side beyond the party that calls.
 void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, std::string const& session)
@@ -44,7 +45,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     {
         if (m_transaction != nullptr)
         {
-            m_timer.start(0); // as below
+            failDialLater();
             return 0;
         }
         m_dialog = Dialog::OVER;
@@ -66,13 +67,41 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     }
     nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
     trace("-> 100");
-    // the stack still holds the transaction, which must not end under it: a failure waits until it has let go
+    startExpiry(request);
     if (!dial(request, provider, called).isOk())
-        m_timer.start(0);
+        failDialLater();
     return 0;
 }
 
-void SipEndpoint::onDialFailed() { clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}}); }
+/// RFC 3261, 13.3.1: who calls wants no answer after that time.
+void SipEndpoint::startExpiry(sip_t const* request)
+{
+    sip_expires_t const* const expires = request->sip_expires;
+    if (expires != nullptr && expires->ex_date == 0 && expires->ex_delta <= LONGEST_EXPIRY)
+        m_timer.start(static_cast<unsigned int>(expires->ex_delta) * 1000);
+}
+
+/// Who has handed us the transaction still holds it, and it must not end under him.
+void SipEndpoint::failDialLater()
+{
+    m_hasDialFailed = true;
+    m_timer.start(0);
+}
+
+void SipEndpoint::onCallingTimer()
+{
+    if (m_hasDialFailed)
+    {
+        clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
+        return;
+    }
+    if (m_dialog != Dialog::INVITE_RECEIVED)
+        return;
+    trace("the INVITE has expired");
+    SipCause const cause{QCause::NO_ANSWER_FROM_USER, 487, {}};
+    answerFinally(487, cause.getReasonHeader(false));
+    leaveCall(cause);
+}
 
 bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* request)
 {
@@ -85,6 +114,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     m_dialog = Dialog::INVITE_RECEIVED;
+    m_isOverTcp = SipRules::CAME_OVER_TCP(request);
     return true;
 }
 
@@ -96,9 +126,8 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, session);
     CC_PropertyContainer offer;
-    unsigned long const maxForwards =
-        request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;
-    ADD(offer, CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, maxForwards - 1)); // else the default
+    ADD(offer,
+        CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, SipRules::MAX_FORWARDS_AFTER(request))); // else the default
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
     if (isTraced())
@@ -198,6 +227,7 @@ void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasDa
 void SipEndpoint::answer()
 {
     answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
+    m_timer.stop();
     m_dialog = Dialog::ANSWERED;
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
@@ -207,11 +237,12 @@ void SipEndpoint::answer()
 void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string const& session)
 {
     std::string const identity =
-        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress());
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
-    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact(m_isOverTcp).c_str()),
+                        SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED_STR(""),
                         TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
                         TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                         TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());

@@ -1,6 +1,8 @@
 // What either side does inside its dialog, and how a dialog ends.
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/endpoint/SipRules.h"
+#include "sip/message/SipBody.h"
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
 {
@@ -11,7 +13,10 @@ int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t co
 
 int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
-    switch (request->sip_request->rq_method)
+    sip_method_t const method = request->sip_request->rq_method;
+    if (int const refused = method != sip_method_ack ? SipRules::CHECK_REQUIRED(transaction, request) : 0; refused != 0)
+        return refused;
+    switch (method)
     {
     case sip_method_bye:
         return onBye(request);
@@ -124,9 +129,4 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
     return text;
 }
 
-std::string SipEndpoint::SESSION_OF(sip_t const* message)
-{
-    if (message->sip_payload == nullptr || message->sip_payload->pl_data == nullptr)
-        return {};
-    return std::string(message->sip_payload->pl_data, message->sip_payload->pl_len);
-}
+std::string SipEndpoint::SESSION_OF(sip_t const* message) { return SipBody::READ(message).session; }

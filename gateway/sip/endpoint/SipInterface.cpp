@@ -5,7 +5,9 @@
 #include "platform/eventloop/TYEvent.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipEndpoint.h"
+#include "sip/endpoint/SipRules.h"
 #include "sip/message/SipAddress.h"
+#include "sip/message/SipBody.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipPropertyId.h"
@@ -14,15 +16,26 @@
 
 #include <spdlog/spdlog.h>
 
+#include <algorithm>
 #include <new>
 #include <stdexcept>
-#include <strings.h>
+
 #include <tuple>
 
 namespace
 {
 constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
+constexpr unsigned long LONGEST_PAUSE = 60; // seconds
+
+/// Where the transaction's request came from.
+InternetAddress SOURCE_OF(nta_incoming_t* transaction)
+{
+    msg_t* const message = nta_incoming_getrequest(transaction);
+    InternetAddress const source = AddressRange::ADDRESS_OF(msg_addr(message)->su_sa);
+    msg_destroy(message);
+    return source;
+}
 } // namespace
 
 SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration)
@@ -30,12 +43,12 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
     , m_environment(environment)
     , m_configuration(configuration)
     , m_name(configuration.name.c_str())
-    , m_contact(
-          SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp)))
+    , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
+    , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), ALLOW))
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration))
-    , m_defaultLeg(nta_leg_tcreate(m_agent.get(), HANDLE, this, NTATAG_NO_DIALOG(1), TAG_END()))
+    , m_guard(configuration)
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
 {
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
 }
@@ -87,17 +100,50 @@ int SipInterface::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t c
     }
 }
 
+int SipInterface::HANDLE_MESSAGE(SipInterface* interface, nta_agent_t*, msg_t* message, sip_t* sip)
+{
+    interface->onMessage(message, sip);
+    return 0;
+}
+
+/// A message that the stack knows nothing of becomes a transaction here, and not before it is known that there is room:
+/// a refusal without one is sent once and forgotten, where the stack would repeat that of a transaction until the ACK.
+void SipInterface::onMessage(msg_t* message, sip_t* sip)
+{
+    bool const isRequest = sip->sip_request != nullptr && sip->sip_request->rq_method != sip_method_ack;
+    if (!isRequest)
+    {
+        nta_msg_discard(m_agent.get(), message);
+        return;
+    }
+    bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && sip->sip_to->a_tag == nullptr;
+    if (isNewCall && !admits(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
+    {
+        nta_msg_treply(m_agent.get(), message, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
+                       TAG_END());
+        return;
+    }
+    nta_incoming_t* const transaction = nta_incoming_create(m_agent.get(), nullptr, message, sip, TAG_END());
+    if (transaction == nullptr)
+        return;
+    int const status = handleRequest(nullptr, transaction, sip);
+    if (status == 0)
+        return;
+    nta_incoming_treply(transaction, status, nullptr, TAG_END()); // nothing if it was answered finally
+    nta_incoming_destroy(transaction);
+}
+
 int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
     sip_method_t const method = request->sip_request->rq_method;
-    if (method == sip_method_ack)
-        return 0;
     if (method == sip_method_cancel || (request->sip_to != nullptr && request->sip_to->a_tag != nullptr))
         return 481;
-    if (method == sip_method_options)
-        return answerOptions(transaction);
     if (int const refused = refuseMethod(transaction, request); refused != 0)
         return refused;
+    if (int const refused = SipRules::CHECK(transaction, request); refused != 0)
+        return refused;
+    if (method == sip_method_options)
+        return answerOptions(transaction);
     return method == sip_method_invite ? receiveInvite(transaction, request) : 481;
 }
 
@@ -106,19 +152,25 @@ int SipInterface::refuseMethod(nta_incoming_t* transaction, sip_t const* request
     return nta_check_method(transaction, request, m_allow, SIPTAG_ALLOW(m_allow), TAG_END());
 }
 
+/// As an INVITE would be answered: who asks wants to know whether to send calls.
 int SipInterface::answerOptions(nta_incoming_t* transaction) const
 {
-    nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_ALLOW(m_allow), SIPTAG_ACCEPT_STR("application/sdp"),
-                        TAG_END());
-    return 200;
+    bool const hasRoom = !m_environment.isEnding && m_environment.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS());
+    if (!hasRoom)
+        nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
+                            TAG_END());
+    else
+        nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_ALLOW(m_allow), SIPTAG_SUPPORTED_STR(""),
+                            SIPTAG_ACCEPT_STR(SipBody::ACCEPT), SIPTAG_ACCEPT_ENCODING_STR(SipBody::ACCEPT_ENCODING),
+                            TAG_END());
+    return hasRoom ? 200 : 503;
 }
 
 int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
         return refused;
-    if (int const refused = admit(transaction); refused != 0)
-        return refused;
+
     SipParty const called = SipIdentity::READ_CALLED(request);
     std::string const number = called.getUser();
     unsigned int const callNumber = ++m_environment.lastCallNumber;
@@ -129,7 +181,8 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     SipEndpoint* endpoint = nullptr;
     try
     {
-        endpoint = &makeEndpoint(callNumber);
+        InternetAddress const source = SOURCE_OF(transaction);
+        endpoint = &makeEndpoint(callNumber, &source);
     }
     catch (std::bad_alloc const&)
     {
@@ -153,50 +206,61 @@ int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callN
 /// What keeps an INVITE from being a call, whatever it asks for.
 int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request) const
 {
-    if (request->sip_max_forwards != nullptr && request->sip_max_forwards->mf_count == 0)
-        return 483;
+
     if (request->sip_contact == nullptr || request->sip_contact->m_url->url_type == url_any)
     {
         nta_incoming_treply(transaction, 400, "Missing Contact Header", TAG_END());
         return 400;
     }
-    if (int const refused = nta_check_required(transaction, request, nullptr, TAG_END()); refused != 0)
-        return refused;
-    bool const isSession =
-        request->sip_content_type != nullptr && strcasecmp(request->sip_content_type->c_type, "application/sdp") == 0;
-    if (request->sip_payload != nullptr && !isSession)
-    {
-        nta_incoming_treply(transaction, SIP_415_UNSUPPORTED_MEDIA, SIPTAG_ACCEPT_STR("application/sdp"), TAG_END());
-        return 415;
-    }
-    return 0;
+    return SipRules::CHECK_BODY(transaction, request);
 }
 
-int SipInterface::admit(nta_incoming_t* transaction)
+bool SipInterface::admits(InternetAddress const& source)
 {
-    if (!m_environment.isEnding && m_environment.admission.admit(CallControl::GET_NUMBER_OF_CALLS()))
-        return 0;
+    if (!m_environment.isEnding && m_environment.admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
+        return true;
     ++m_environment.counters.refused;
     spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
                   m_environment.isEnding ? "the gateway is ending" : "too many calls");
-    nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
-                        TAG_END());
-    return 503;
+    return false;
+}
+
+void SipInterface::leavePeerAlone(unsigned long seconds)
+{
+    unsigned long const served = std::min(seconds, LONGEST_PAUSE);
+    m_peerBusyUntil = TY::Time::NOW(TY::Time::MONOTONIC);
+    m_peerBusyUntil.seconds += static_cast<decltype(m_peerBusyUntil.seconds)>(served);
+    spdlog::info("interface {}: the peer takes no calls, none is sent for {} s", m_configuration.name, served);
+}
+
+bool SipInterface::isPeerBusy() const
+{
+    if (m_peerBusyUntil.seconds == 0)
+        return false;
+    TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
+    return now.seconds < m_peerBusyUntil.seconds ||
+           (now.seconds == m_peerBusyUntil.seconds && now.nanoseconds < m_peerBusyUntil.nanoseconds);
 }
 
 void SipInterface::clearCalls(SipCause const& cause)
 {
-    for (auto const& [endpoint, owner] : m_endpoints)
+    for (auto const& [endpoint, owned] : m_endpoints)
         endpoint->clear(cause);
 }
 
-SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber)
+SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber, InternetAddress const* source)
 {
     if (m_finished.capacity() <= m_endpoints.size()) // so that an end needs no memory
         m_finished.reserve(2 * (m_endpoints.size() + 1));
     auto owner = std::make_unique<SipEndpoint>(*this, callNumber);
     SipEndpoint& endpoint = *owner;
-    m_endpoints.emplace(&endpoint, std::move(owner));
+    Owned& owned = m_endpoints[&endpoint];
+    owned.endpoint = std::move(owner);
+    if (source != nullptr)
+    {
+        m_environment.admission.begin(*source);
+        owned.source = *source;
+    }
     return endpoint;
 }
 
@@ -211,7 +275,14 @@ void SipInterface::CLEAN_UP(void* interface) { static_cast<SipInterface*>(interf
 void SipInterface::cleanUp()
 {
     for (std::size_t i = 0; i < m_finished.size(); ++i) // ending one may finish another
-        m_endpoints.erase(m_finished[i]);
+    {
+        auto const found = m_endpoints.find(m_finished[i]);
+        if (found == m_endpoints.end())
+            continue;
+        if (found->second.source)
+            m_environment.admission.end(*found->second.source);
+        m_endpoints.erase(found);
+    }
     m_finished.clear();
     if (m_environment.onEndpointGone)
         m_environment.onEndpointGone();

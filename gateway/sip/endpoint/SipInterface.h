@@ -2,11 +2,14 @@
 
 #include "callcontrol/provider/CC_Provider.h"
 #include "configuration/Configuration.h"
+#include "platform/base/TYTime.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -15,7 +18,7 @@ class SipEndpoint;
 class TYEvent;
 struct SipCause;
 
-/// One SIP interface: listens on one address, on UDP and TCP, and sends its calls to one peer. A provider of call
+/// One SIP interface: listens on one address, on UDP, TCP or both, and sends its calls to one peer. A provider of call
 /// control under the interface's name.
 ///
 /// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the gateway;
@@ -44,24 +47,34 @@ public:
     Configuration::Interface const& getConfiguration() const { return m_configuration; }
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
-    std::string const& getContact() const { return m_contact; }
+    /// Where the peer reaches us, for what goes over TCP or UDP.
+    std::string const& getContact(bool isOverTcp) const { return isOverTcp ? m_tcpContact : m_contact; }
+    sip_allow_t const* getAllow() const { return m_allow; }
+    SipGuard::Counters const& getGuardCounters() const { return m_guard.getCounters(); }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
     int answerOptions(nta_incoming_t* transaction) const;
+    /// The peer answered with 503 and Retry-After: until these seconds are over, 60 at most, no call goes to it, and
+    /// those that would get 503. The caller is not told the time: it would send us no call at all, also none for other
+    /// peers.
+    void leavePeerAlone(unsigned long seconds);
+    bool isPeerBusy() const;
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
     /// The endpoint is done; it is destroyed in the loop's next turn.
     void finish(SipEndpoint& endpoint);
 
 private:
+    static int HANDLE_MESSAGE(SipInterface* interface, nta_agent_t* agent, msg_t* message, sip_t* sip);
+    void onMessage(msg_t* message, sip_t* sip);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
     int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
-    int admit(nta_incoming_t* transaction);
-    SipEndpoint& makeEndpoint(unsigned int callNumber);
+    bool admits(InternetAddress const& source);
+    SipEndpoint& makeEndpoint(unsigned int callNumber, InternetAddress const* source = nullptr);
     static void CLEAN_UP(void* interface);
     void cleanUp();
 
@@ -69,11 +82,19 @@ private:
     Configuration::Interface m_configuration;
     String m_name;
     std::string m_contact;
+    std::string m_tcpContact;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
+    SipGuard m_guard;
     SipAgent m_agent;
-    SipLeg m_defaultLeg;
+
     TYEvent* m_cleanUpEvent = nullptr;
-    std::unordered_map<SipEndpoint*, std::unique_ptr<SipEndpoint>> m_endpoints;
+    struct Owned
+    {
+        std::unique_ptr<SipEndpoint> endpoint;
+        std::optional<InternetAddress> source; // of a call that came in
+    };
+    std::unordered_map<SipEndpoint*, Owned> m_endpoints;
     std::vector<SipEndpoint*> m_finished;
+    TY::Time m_peerBusyUntil;
 };

@@ -55,7 +55,8 @@ SipNameAddr SipNameAddr::OF(char const* display, url_t const& url, msg_param_t c
 {
     SipNameAddr address;
     address.name = SipReason::UNQUOTE(SipText::TRIM(display != nullptr ? display : ""));
-    address.user = SipAddress::UNESCAPE_USER(TEXT_OF(url.url_user));
+    if (NAMES_A_PARTY(url))
+        address.user = SipAddress::UNESCAPE_USER(TEXT_OF(url.url_user));
     address.host = TEXT_OF(url.url_host);
     address.uriParameters = TEXT_OF(url.url_params);
     address.uriHeaders = TEXT_OF(url.url_headers);

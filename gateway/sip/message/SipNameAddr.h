@@ -13,7 +13,7 @@
 struct SipNameAddr
 {
     std::string name;          ///< without quotes; may be empty
-    std::string user;          ///< unescaped; of a tel URI its number
+    std::string user;          ///< unescaped; of a tel URI its number; none of any but sip, sips and tel
     std::string host;          ///< empty for a tel URI
     std::string uriParameters; ///< "cause=302;x=y", as they stand
     std::string uriHeaders;    ///< "Privacy=history&x=y", as they stand

@@ -1,6 +1,7 @@
 #include "sip/stack/SipListener.h"
 
 #include "sip/message/SipAddress.h"
+#include "sip/stack/SipGuard.h"
 #include "sip/stack/SipStack.h"
 
 #include <arpa/inet.h>
@@ -15,7 +16,6 @@
 namespace
 {
 constexpr unsigned int SOCKET_BUFFER = 4u << 20; // bytes; a burst of calls comes faster than one thread reads
-constexpr unsigned int LARGEST_MESSAGE = 65536;  // bytes
 constexpr unsigned int UDP_MTU = 65535;          // bytes; above it the stack would change to TCP on its own
 
 socklen_t FILL(sockaddr_storage& storage, SocketAddress const& address)
@@ -56,19 +56,38 @@ void CHECK_PORT(SocketAddress const& address, int type, char const* transport)
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration)
+namespace
 {
-    CHECK_PORT(configuration.listen, SOCK_DGRAM, "udp");
-    CHECK_PORT(configuration.listen, SOCK_STREAM, "tcp");
-    std::string const uri = SipAddress::MAKE_URI({}, configuration.listen, false);
-    SipAgent agent(nta_agent_create(stack.getRoot(), URL_STRING_MAKE((uri + ";transport=udp").c_str()), nullptr,
-                                    nullptr, NTATAG_UA(1), NTATAG_PASS_100(1), NTATAG_MAXSIZE(LARGEST_MESSAGE),
+url_string_t const* const NO_PORT = reinterpret_cast<url_string_t const*>(-1); // null would be one on every address
+
+std::string MAKE_BINDING(Configuration::Interface const& configuration, char const* transport)
+{
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.getAddress(), false) + ";transport=" + transport;
+    return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
+}
+} // namespace
+
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard,
+                                 nta_message_f* onMessage, SipInterface* interface)
+{
+    SipGuard::PROVE(stack, configuration.listen.host);
+    unsigned int const idle = configuration.tcpIdle * 1000;
+    SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1),
+                                    NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
                                     NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
-                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1),
-                                    TPTAG_UDP_RMEM(SOCKET_BUFFER), TPTAG_UDP_WMEM(SOCKET_BUFFER), TAG_END()));
-    if (agent == nullptr)
-        throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (udp)");
-    if (nta_agent_add_tport(agent.get(), URL_STRING_MAKE((uri + ";transport=tcp").c_str()), TAG_END()) < 0)
-        throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (tcp)");
+                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1), TAG_END()));
+    for (char const* const transport : {"udp", "tcp"})
+    {
+        bool const isUdp = *transport == 'u';
+        if (!(isUdp ? configuration.listensOnUdp : configuration.listensOnTcp))
+            continue;
+        CHECK_PORT(configuration.listen, isUdp ? SOCK_DGRAM : SOCK_STREAM, transport);
+        if (agent == nullptr ||
+            nta_agent_add_tport(agent.get(), URL_STRING_MAKE(MAKE_BINDING(configuration, transport).c_str()),
+                                TPTAG_UDP_RMEM(SOCKET_BUFFER), TPTAG_UDP_WMEM(SOCKET_BUFFER), TPTAG_IDLE(idle),
+                                TPTAG_TIMEOUT(idle), TAG_END()) < 0)
+            throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (" + transport + ")");
+    }
+    guard.watch(agent.get());
     return agent;
 }

@@ -3,12 +3,15 @@
 #include "configuration/Configuration.h"
 #include "sip/stack/SipHandles.h"
 
+class SipGuard;
 class SipStack;
 
 /// How an interface takes its address.
 namespace SipListener
 {
-/// A transaction engine that listens on the interface's address, on UDP and TCP, with the interface's timers. Throws
-/// std::runtime_error with the reason when one of the two ports is taken or the system refuses.
-SipAgent MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration);
+/// A transaction engine that listens on the interface's address, on the transports that it has, with the interface's
+/// timers and limits, and lets in what the guard does. `onMessage` is told of every message that belongs to no
+/// transaction and no dialog. Throws std::runtime_error with the reason when a port is taken or the system refuses.
+SipAgent MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard,
+                    nta_message_f* onMessage, SipInterface* interface);
 } // namespace SipListener

@@ -32,7 +32,7 @@ bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
 bad "line 2: " '2s/.*/call = = 3/'
 bad "interface: is missing" '/^\[\[interface/,$d'
 
-# a port in use, of each transport; the first interface is given back, too
+# a port in use; the first interface is given back, too
 write_configuration
 start_gateway
 sed "s/:$PORT_A\"/:$((PORT + 30))\"/" "$WORK/gateway.toml" >"$WORK/second.toml"

@@ -28,6 +28,7 @@ poor_callee() {
     respond_in_dialog "200 OK"
 }
 
+write_configuration '' 'transports = ["udp", "tcp"]'
 start_gateway
 start_callee poor_callee
 expect_caller poor_caller 4989123

@@ -51,7 +51,7 @@ stop_gateway "3 calls placed, 1 answered, 1 cleared, 2 failed"
 
 # no way leads from the interface's address to the peer's
 write_configuration '' $'t1 = 50\nt1x64 = 1000'
-sed -i "s/peer = \"$HOST:$PORT_CALLEE\"/peer = \"[::1]:$PORT_CALLEE\"/" "$WORK/gateway.toml"
+sed -i "s/peer = \"$HOST:$PORT_CALLEE\"/peer = \"192.0.2.1:$PORT_CALLEE\"/" "$WORK/gateway.toml"
 start_gateway
 expect_caller unsendable_caller 4989123
 stop_gateway "1 calls placed, 0 answered, 0 cleared, 1 failed"

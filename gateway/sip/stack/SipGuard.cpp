@@ -1,0 +1,388 @@
+#include "sip/stack/SipGuard.h"
+
+#include "sip/stack/SipStack.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <netdb.h>
+#include <netinet/in.h>
+#include <stdexcept>
+#include <string>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <utility>
+
+namespace
+{
+constexpr usize_t LARGEST_READ = 65536; // octets that the stack takes from a stream at once; a datagram has fewer
+constexpr usize_t ROUNDING = 1024;      // by which the stack's buffers are larger than asked for
+
+std::vector<SipGuard*> s_guards;
+
+/// Which of the functions below the stack has called.
+enum Called : unsigned int
+{
+    NEXT = 1,
+    DELIVER = 2,
+    TAKE = 4,
+    SIZE = 8,
+    DURATION = 16,
+    REGISTER = 32,
+    ALL = 63
+};
+unsigned int s_called = 0;
+
+/// The function of that name that the stack would have called without us.
+template <class Function>
+Function* ORIGINAL(char const* name)
+{
+    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
+}
+
+// --- connections -----------------------------------------------------------------------------------------------------
+
+/// A connection as it was when it came. Nobody tells of its end; but a socket's inode is never that of another.
+struct Connection
+{
+    InternetAddress source;
+    ino_t inode = 0; ///< 0: none
+};
+std::vector<Connection> s_connections; // by descriptor
+
+ino_t INODE_OF(int descriptor)
+{
+    struct stat status = {};
+    return fstat(descriptor, &status) == 0 ? status.st_ino : 0;
+}
+
+std::size_t NUMBER_OF_CONNECTIONS(InternetAddress const& source)
+{
+    std::size_t number = 0;
+    for (std::size_t i = 0; i < s_connections.size(); ++i)
+    {
+        Connection& connection = s_connections[i];
+        if (connection.inode == 0 || connection.source != source)
+            continue;
+        if (INODE_OF(static_cast<int>(i)) == connection.inode)
+            ++number;
+        else
+            connection.inode = 0;
+    }
+    return number;
+}
+
+void CLOSE_AT_ONCE(int descriptor)
+{
+    linger const none = {1, 0}; // with a reset: nothing of it stays in the system
+    setsockopt(descriptor, SOL_SOCKET, SO_LINGER, &none, sizeof none);
+    close(descriptor);
+}
+
+/// A descriptor kept for the moment at which there is no other. A connection that cannot be taken would stay in its
+/// queue and wake the loop again at once, for ever; so it is taken with this one, and closed.
+class Spare
+{
+public:
+    Spare() { open(); }
+    void refuse(int listening)
+    {
+        if (m_descriptor >= 0)
+            close(m_descriptor);
+        m_descriptor = -1;
+        if (int const refused = accept4(listening, nullptr, nullptr, SOCK_CLOEXEC | SOCK_NONBLOCK); refused >= 0)
+            CLOSE_AT_ONCE(refused);
+        open();
+    }
+
+private:
+    void open() { m_descriptor = ::open("/dev/null", O_RDONLY | O_CLOEXEC); }
+    int m_descriptor = -1;
+};
+
+bool IS_AT(SocketAddress const& address, sockaddr_storage const& storage)
+{
+    std::uint16_t const port = storage.ss_family == AF_INET6 ? reinterpret_cast<sockaddr_in6 const&>(storage).sin6_port
+                                                             : reinterpret_cast<sockaddr_in const&>(storage).sin_port;
+    return ntohs(port) == address.port && (storage.ss_family == AF_INET6) == address.isVersion6() &&
+           AddressRange::ADDRESS_OF(reinterpret_cast<sockaddr const&>(storage)) ==
+               AddressRange::PARSE(address.host).getFirst();
+}
+} // namespace
+
+SipGuard::SipGuard(Configuration::Interface const& configuration)
+    : m_listen(configuration.listen)
+    , m_allow(configuration.allow)
+    , m_maxMessageSize(configuration.maxMessageSize)
+    , m_maxHeaderSize(configuration.maxHeaderSize)
+    , m_maxConnectionsPerSource(configuration.maxConnectionsPerSource)
+{
+    if (m_allow.empty())
+        m_allow.push_back(AddressRange::PARSE(configuration.peer.host));
+    s_guards.push_back(this);
+}
+
+SipGuard::~SipGuard() { std::erase(s_guards, this); }
+
+void SipGuard::watch(nta_agent_t* agent)
+{
+    m_ports.clear();
+    for (tport_t* port = tport_primaries(nta_agent_tports(agent)); port != nullptr; port = tport_next(port))
+        m_ports.push_back(port);
+}
+
+usize_t SipGuard::LIMIT_OF(Configuration::Interface const& configuration)
+{
+    return configuration.maxMessageSize + LARGEST_READ + ROUNDING;
+}
+
+bool SipGuard::isServed(InternetAddress const& source) const
+{
+    return std::any_of(m_allow.begin(), m_allow.end(),
+                       [&](AddressRange const& range) { return range.contains(source); });
+}
+
+SipGuard* SipGuard::FIND(int listening)
+{
+    sockaddr_storage local = {};
+    socklen_t length = sizeof local;
+    if (getsockname(listening, reinterpret_cast<sockaddr*>(&local), &length) != 0)
+        return nullptr;
+    auto const found =
+        std::find_if(s_guards.begin(), s_guards.end(), [&](SipGuard* guard) { return IS_AT(guard->m_listen, local); });
+    return found != s_guards.end() ? *found : nullptr;
+}
+
+int SipGuard::ACCEPT(int listening, sockaddr* from, socklen_t* length)
+{
+    static Spare s_spare;
+    int const descriptor = accept4(listening, from, length, SOCK_CLOEXEC);
+    SipGuard* const guard = FIND(listening);
+    if (descriptor < 0)
+    {
+        if (guard != nullptr && (errno == EMFILE || errno == ENFILE))
+        {
+            s_spare.refuse(listening);
+            ++guard->m_counters.connections;
+            errno = 0; // nothing that the stack should do something about
+        }
+        return -1;
+    }
+    if (guard == nullptr || guard->takesConnection(descriptor, *from))
+        return descriptor;
+    CLOSE_AT_ONCE(descriptor);
+    ++guard->m_counters.connections;
+    errno = 0;
+    return -1;
+}
+
+bool SipGuard::takesConnection(int descriptor, sockaddr const& from)
+{
+    InternetAddress const source = AddressRange::ADDRESS_OF(from);
+    auto const index = static_cast<std::size_t>(descriptor);
+    if (!isServed(source) || NUMBER_OF_CONNECTIONS(source) >= m_maxConnectionsPerSource)
+        return false;
+    try
+    {
+        if (s_connections.size() <= index)
+            s_connections.resize(index + 1);
+        s_connections[index] = {source, INODE_OF(descriptor)};
+        return true;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return false;
+    }
+}
+
+bool SipGuard::ADMIT(tport_t const* port, msg_t* message)
+{
+    tport_t const* const primary = tport_parent(port);
+    for (SipGuard* const guard : s_guards)
+        if (std::find(guard->m_ports.begin(), guard->m_ports.end(), primary) != guard->m_ports.end())
+            return guard->admit(message);
+    return true;
+}
+
+bool SipGuard::admit(msg_t* message)
+{
+    if (!isServed(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
+    {
+        ++m_counters.strangers;
+        return false;
+    }
+    sip_t const* const sip = sip_object(message);
+    if (sip == nullptr)
+        return true;
+    usize_t const size = msg_size(message);
+    usize_t const body = sip->sip_payload != nullptr ? sip->sip_payload->pl_len : 0;
+    bool const isTooLarge = size > m_maxMessageSize || size - std::min(body, size) > m_maxHeaderSize ||
+                            (sip->sip_flags & MSG_FLG_TOOLARGE) != 0;
+    if (!isTooLarge)
+        return true;
+    ++m_counters.tooLarge;
+    if (sip->sip_request == nullptr || sip->sip_request->rq_method == sip_method_ack)
+        return false;
+    msg_set_flags(message, MSG_FLG_TOOLARGE); // the stack answers with 413 and ends the connection
+    return true;
+}
+
+// --- the proof -------------------------------------------------------------------------------------------------------
+
+namespace
+{
+constexpr char const* MESSAGE = "OPTIONS sip:x SIP/2.0\r\nContent-Length: 0\r\n\r\n";
+constexpr int TURNS = 200;
+constexpr su_duration_t TURN = 10;          // milliseconds
+constexpr su_duration_t FAR_AWAY = 3600000; // for a timer that is waited for
+
+/// A listener of the stack that takes whatever comes, and a connection to it.
+class Proof
+{
+public:
+    Proof(su_root_t* root, std::string const& host)
+    {
+        static tport_stack_class_t const s_class = {sizeof s_class, RECEIVE, COMPLAIN, ALLOCATE, nullptr};
+        static char const* const s_transports[] = {"tcp", nullptr};
+        bool const isVersion6 = host.find(':') != std::string::npos;
+        std::string const name = isVersion6 ? "[" + host + "]" : host;
+        tp_name_t address = {"tcp", name.c_str(), name.c_str(), "*", nullptr, nullptr};
+        m_port = tport_tcreate(reinterpret_cast<tp_stack_t*>(this), &s_class, root, TAG_END());
+        if (m_port == nullptr || tport_tbind(m_port, &address, s_transports, TAG_END()) < 0)
+            return;
+        connectTo(host, tport_name(tport_primaries(m_port))->tpn_port);
+    }
+    ~Proof()
+    {
+        if (m_descriptor >= 0)
+            close(m_descriptor);
+        if (m_port != nullptr)
+            tport_destroy(m_port);
+    }
+    Proof(Proof const&) = delete;
+    Proof& operator=(Proof const&) = delete;
+
+    void send() const
+    {
+        std::string const two = std::string(MESSAGE) + MESSAGE;
+        if (m_descriptor >= 0 && write(m_descriptor, two.data(), two.size()) < 0)
+            return; // which shows
+    }
+
+private:
+    static void RECEIVE(tp_stack_t*, tport_t*, msg_t* message, tp_magic_t*, su_time_t) { msg_destroy(message); }
+    static void COMPLAIN(tp_stack_t*, tport_t*, int, char const*) {}
+    static msg_t* ALLOCATE(tp_stack_t*, int flags, char const*, usize_t, tport_t const*, tp_client_t*)
+    {
+        return msg_create(sip_default_mclass(), flags);
+    }
+
+    void connectTo(std::string const& host, char const* port)
+    {
+        addrinfo hints = {};
+        hints.ai_flags = AI_NUMERICHOST | AI_NUMERICSERV;
+        hints.ai_socktype = SOCK_STREAM;
+        addrinfo* found = nullptr;
+        if (getaddrinfo(host.c_str(), port, &hints, &found) != 0)
+            return;
+        m_descriptor = socket(found->ai_family, SOCK_STREAM | SOCK_CLOEXEC, 0);
+        if (connect(m_descriptor, found->ai_addr, found->ai_addrlen) != 0)
+            close(std::exchange(m_descriptor, -1));
+        freeaddrinfo(found);
+    }
+
+    tport_t* m_port = nullptr;
+    int m_descriptor = -1;
+};
+
+void NOTHING(su_root_magic_t*, su_timer_t*, su_timer_arg_t*) {}
+} // namespace
+
+void SipGuard::PROVE(SipStack& stack, std::string const& host)
+{
+    if (s_called == ALL)
+        return;
+    su_timer_t* const timer = su_timer_create(su_root_task(stack.getRoot()), FAR_AWAY);
+    su_timer_set(timer, NOTHING, nullptr);
+    Proof const proof(stack.getRoot(), host);
+    proof.send();
+    for (int i = 0; i < TURNS && s_called != ALL; ++i)
+        su_root_step(stack.getRoot(), TURN);
+    su_timer_destroy(timer);
+    if (s_called != ALL)
+        throw std::runtime_error("the SIP stack does not ask what it may take (" + std::to_string(s_called) + ")");
+}
+
+// --- in place of the stack's and the system's own --------------------------------------------------------------------
+
+#define IN_PLACE extern "C" __attribute__((visibility("default")))
+
+/// The stack's own forgets the limit from the second message of a connection on.
+IN_PLACE msg_t* msg_next(msg_t* message)
+{
+    static auto* const s_original = ORIGINAL<msg_t*(msg_t*)>("msg_next");
+    s_called |= NEXT;
+    msg_t* const next = s_original(message);
+    if (next != nullptr)
+        msg_maxsize(next, msg_maxsize(message, 0));
+    return next;
+}
+
+/// Every message passes here, those that are no SIP among them.
+IN_PLACE void tport_deliver(tport_t* port, msg_t* message, msg_t* next, void* compressor, su_time_t now)
+{
+    static auto* const s_original = ORIGINAL<void(tport_t*, msg_t*, msg_t*, void*, su_time_t)>("tport_deliver");
+    s_called |= DELIVER;
+    if (SipGuard::ADMIT(port, message))
+        s_original(port, message, next, compressor, now);
+    else
+        msg_destroy(message);
+}
+
+IN_PLACE int accept(int listening, sockaddr* from, socklen_t* length)
+{
+    s_called |= TAKE;
+    return SipGuard::ACCEPT(listening, from, length);
+}
+
+/// The stack starts the time of a connection with its first message; one that never brings any must end as well.
+IN_PLACE int tport_register_secondary(tport_t* connection, su_wakeup_f wakeup, int events)
+{
+    static auto* const s_original = ORIGINAL<int(tport_t*, su_wakeup_f, int)>("tport_register_secondary");
+    static auto* const s_startTime = ORIGINAL<int(tport_t*)>("tport_set_secondary_timer");
+    s_called |= REGISTER;
+    int const result = s_original(connection, wakeup, events);
+    if (result == 0)
+        s_startTime(connection);
+    return result;
+}
+
+/// How many octets the stack is to read: with all that a busy peer has sent its limit would be reached, and the
+/// connection given up. What is left wakes it again.
+IN_PLACE issize_t su_getmsgsize(su_socket_t descriptor)
+{
+    s_called |= SIZE;
+    int size = 0;
+    if (ioctl(descriptor, FIONREAD, &size) != 0)
+        return -1;
+    return std::min<issize_t>(size, LARGEST_READ);
+}
+
+/// Milliseconds, rounded up: the stack waits for its next timer for so long, and with the part of a millisecond left
+/// out it would then ask the clock, without any wait, until that is over.
+IN_PLACE su_duration_t su_duration(su_time_t const later, su_time_t const earlier)
+{
+    s_called |= DURATION;
+    constexpr long long MOST = SU_DURATION_MAX;
+    long long const seconds = static_cast<long long>(later.tv_sec) - static_cast<long long>(earlier.tv_sec);
+    long long const micros = static_cast<long long>(later.tv_usec) - static_cast<long long>(earlier.tv_usec);
+    if (seconds > MOST / 1000 || seconds < -MOST / 1000)
+        return seconds > 0 ? SU_DURATION_MAX : -SU_DURATION_MAX;
+    long long const total = seconds * 1000000 + micros;
+    long long const millis = total / 1000 + (total % 1000 > 0 ? 1 : 0);
+    return static_cast<su_duration_t>(std::clamp(millis, -MOST, MOST));
+}
