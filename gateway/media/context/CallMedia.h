@@ -3,6 +3,7 @@
 #include "media/context/LegMedia.h"
 #include "platform/media/MG_IContext.h"
 
+#include <atomic>
 #include <memory>
 
 /// The media of one call: what its legs say and hear meets here. Two legs hear each other, of more each hears all the
@@ -20,7 +21,7 @@
 ///     media->moveTo(*CallMedia::OF(other));          // transferred
 ///     media.reset();                                 // released
 ///
-/// On the signalling thread; only the last reference may be given up elsewhere.
+/// On the signalling thread.
 class CallMedia : public MG_IContext
 {
 public:
