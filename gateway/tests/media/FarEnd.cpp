@@ -2,6 +2,7 @@
 
 #include "media/rtp/DatagramAddress.h"
 
+#include <poll.h>
 #include <stdexcept>
 #include <sys/socket.h>
 
@@ -66,6 +67,12 @@ std::vector<unsigned char> FarEnd::take(int descriptor, MediaAddress* from)
     if (from != nullptr && length >= 0)
         *from = source.get();
     return octets;
+}
+
+bool FarEnd::isReadable(int milliseconds) const
+{
+    pollfd descriptor{m_ports.rtp.get(), POLLIN, 0};
+    return poll(&descriptor, 1, milliseconds) > 0;
 }
 
 std::optional<FarEnd::Received> FarEnd::hear()

@@ -35,6 +35,8 @@ public:
     void sendRtcp(RtcpPacket const& packet);
     void sendRtcpRaw(std::vector<unsigned char> const& octets);
     /// @}
+    /// Whether something has come, waiting for at most so many milliseconds.
+    bool isReadable(int milliseconds) const;
     /// What has come; nothing when nothing is there. @{
     std::optional<Received> hear();
     std::vector<Received> hearAll();

@@ -1,4 +1,5 @@
 #include "MediaFixture.h"
+#include "testing/FailingAllocator.h"
 
 #include <random>
 
@@ -283,6 +284,27 @@ TEST_F(Relay, TheFarSideBeginsAnewAndOursGoesOn)
     EXPECT_EQ(after.timestamp, before.timestamp + 160);
     EXPECT_TRUE(after.marker);
     EXPECT_EQ(askQuality(a).lostPackets, 0u);
+}
+
+TEST_F(Relay, PacketsTakeNoMemory)
+{
+    connect();
+    for (unsigned int i = 0; i < 30; ++i)
+    {
+        a.far.say(SPEECH);
+        b.far.say(SPEECH);
+    }
+    b.far.send({false, 99, 1, 1, 1}, SPEECH);
+    RtcpPacket packet;
+    packet.sender = 1;
+    a.far.sendRtcp(packet);
+    FailingAllocator::failNth(0);
+    while (layer->getLoop(0).turn(0))
+    {
+    }
+    FailingAllocator::stop();
+    EXPECT_EQ(FailingAllocator::count(), 0u);
+    EXPECT_EQ(b.far.hearAll().size(), 30u);
 }
 
 TEST_F(Relay, ALegAloneIsDeafAndDumb)
