@@ -57,3 +57,5 @@ void LegMedia::sendDigit(char digit, unsigned int milliseconds)
 }
 
 void LegMedia::askQuality() { m_call->m_core->post(*m_call, MediaOrder::Ask{m_number}); }
+
+void LegMedia::detectDigits(bool isWanted) { m_call->m_core->post(*m_call, MediaOrder::Detect{m_number, isWanted}); }

@@ -52,6 +52,10 @@ public:
     /// that we can speak.
     void sendDigit(char digit, unsigned int milliseconds = 100);
 
+    /// Whether digits are also heard in what the far side says: for those that send no telephone events. What is said
+    /// is decoded for it, so it costs.
+    void detectDigits(bool isWanted);
+
     /// What the datapath told last; all 0 and absent before. At most five seconds old.
     MediaQuality const& getQuality() const { return m_quality; }
     /// Has the observer told of the quality at once, a turn of each loop later.

@@ -1,6 +1,7 @@
 #include "media/context/MediaCore.h"
 
 #include <algorithm>
+#include <stdexcept>
 
 namespace
 {
@@ -23,8 +24,11 @@ MediaCore::MediaCore(MediaOptions const& options, TYEventLoop& signalling)
     , m_ports(options.firstPort, options.lastPort, options.differentiation)
     , m_random(std::random_device()())
 {
+    std::string error;
+    if (!m_tones.read(m_options.tones.empty() ? ToneTable::BUILT_IN() : m_options.tones, m_options.country, error))
+        throw std::runtime_error("tones: " + error);
     for (unsigned int i = 0; i < m_options.threads; ++i)
-        m_loops.push_back(std::make_unique<MediaLoop>(*m_news));
+        m_loops.push_back(std::make_unique<MediaLoop>(*m_news, m_tones));
 }
 
 void MediaCore::start()

@@ -36,6 +36,7 @@ private:
 
     MediaOptions m_options;
     std::unique_ptr<Mailbox<MediaNews>> m_news; // before the loops, who post to it; null after the end
+    ToneTable m_tones;
     std::vector<std::unique_ptr<MediaLoop>> m_loops;
     unsigned int m_nextLoop = 0;
     RtpPortRange m_ports;

@@ -22,8 +22,8 @@ class TYEventLoop;
 class MediaLayer
 {
 public:
-    /// `signalling`: the loop from which observers are told; it must outlive this. Throws std::runtime_error when the
-    /// system refuses.
+    /// `signalling`: the loop from which observers are told; it must outlive this. Throws std::runtime_error with
+    /// the reason when the system refuses, or the tones cannot be read.
     MediaLayer(MediaOptions const& options, TYEventLoop& signalling);
     ~MediaLayer();
     MediaLayer(MediaLayer const&) = delete;

@@ -13,8 +13,9 @@ constexpr unsigned long long TICKS_OF_A_SECOND = 1000 / MediaLoop::TICK;
 constexpr int MOST_EVENTS = 512; // taken with one wake
 } // namespace
 
-MediaLoop::MediaLoop(Mailbox<MediaNews>& news)
+MediaLoop::MediaLoop(Mailbox<MediaNews>& news, ToneTable const& tones)
     : m_news(news)
+    , m_tones(tones)
     , m_orders(
           m_events, [](void* self) { static_cast<MediaLoop*>(self)->takeOrders(); }, this)
     , m_clock(
@@ -41,7 +42,8 @@ void MediaLoop::stop()
         post(MediaOrder::Stop());
         m_thread.join();
     }
-    m_events.runTurn(); // what was posted last; and the loop is this thread's again
+    m_isClosed = true;  // what was posted last would go on to loops that have ended
+    m_events.runTurn(); // and the loop is this thread's again
     m_clock.stop();
     readTime();
     for (auto& [number, leg] : m_legs)

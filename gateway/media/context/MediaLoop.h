@@ -5,6 +5,7 @@
 #include "media/context/MediaValues.h"
 #include "media/rtp/DatagramBatch.h"
 #include "media/rtp/RtpTermination.h"
+#include "media/tone/ToneTable.h"
 #include "platform/eventloop/TYTimer.h"
 
 #include <thread>
@@ -25,9 +26,9 @@ struct MediaLoopCounters
 class MediaLoop : private RtpTerminationObserver
 {
 public:
-    /// `news`: where what the legs have to tell is posted. It must outlive the loop. Throws std::runtime_error when the
-    /// system refuses.
-    explicit MediaLoop(Mailbox<MediaNews>& news);
+    /// `news`: where what the legs have to tell is posted. It and the tones must outlive the loop. Throws
+    /// std::runtime_error when the system refuses.
+    MediaLoop(Mailbox<MediaNews>& news, ToneTable const& tones);
     ~MediaLoop();
     MediaLoop(MediaLoop const&) = delete;
     MediaLoop& operator=(MediaLoop const&) = delete;
@@ -36,7 +37,7 @@ public:
     void stop();
 
     /// From any thread. Whether there was memory for it.
-    bool post(MediaOrder::Any&& order) { return m_orders.post(std::move(order)); }
+    bool post(MediaOrder::Any&& order);
     /// For call control; it turns with this one.
     TYEventLoop& getEvents() { return m_events; }
 
@@ -75,6 +76,7 @@ private:
     void obey(MediaOrder::Expect& order);
     void obey(MediaOrder::HandOver& order);
     void obey(MediaOrder::Tone& order);
+    void obey(MediaOrder::Detect& order);
     void obey(MediaOrder::Digit& order);
     void obey(MediaOrder::Ask& order);
     void obey(MediaOrder::End& order);
@@ -96,6 +98,7 @@ private:
     void tell(MediaNews&& news);
 
     Mailbox<MediaNews>& m_news;
+    ToneTable const& m_tones;
     TYEventLoop m_events;
     Mailbox<MediaOrder::Any> m_orders;
     TYTimer m_clock;
@@ -105,6 +108,7 @@ private:
     long long m_nextTick = 0;
     unsigned long long m_ticks = 0;
     bool m_isStopping = false;
+    bool m_isClosed = false; // orders are passed over
     std::unordered_map<unsigned long long, Leg> m_legs;
     std::unordered_map<unsigned long long, std::vector<MediaOrder::Any>> m_expected; // with what waits for each
     std::unordered_map<unsigned long long, Bridge> m_bridges;                        // by their calls

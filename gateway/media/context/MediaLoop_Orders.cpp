@@ -19,6 +19,8 @@ unsigned long long MediaOrder::LEG_OF(Any const& order)
         order);
 }
 
+bool MediaLoop::post(MediaOrder::Any&& order) { return m_orders.post(std::move(order)); }
+
 void MediaLoop::takeOrders()
 {
     m_orders.take([this](MediaOrder::Any& order) { take(order); });
@@ -26,6 +28,8 @@ void MediaLoop::takeOrders()
 
 void MediaLoop::take(MediaOrder::Any& order)
 {
+    if (m_isClosed)
+        return;
     bool const brings = std::holds_alternative<MediaOrder::Make>(order);
     auto const expected = brings ? m_expected.end() : m_expected.find(MediaOrder::LEG_OF(order));
     if (expected != m_expected.end())
@@ -91,7 +95,10 @@ std::unique_ptr<RtpTermination> MediaLoop::remove(unsigned long long number)
 void MediaLoop::obey(MediaOrder::Describe& order)
 {
     if (Leg* const leg = find(order.leg))
+    {
         leg->termination->describe(order.description, m_now);
+        leg->bridge->connect();
+    }
 }
 
 void MediaLoop::obey(MediaOrder::Connect& order)
@@ -111,7 +118,17 @@ void MediaLoop::obey(MediaOrder::HandOver& order)
         order.loop->post(MediaOrder::Make{order.call, std::move(leg)});
 }
 
-void MediaLoop::obey(MediaOrder::Tone&) {}
+void MediaLoop::obey(MediaOrder::Tone& order)
+{
+    if (Leg* const leg = find(order.leg))
+        leg->termination->playTone(m_tones.find(order.tone));
+}
+
+void MediaLoop::obey(MediaOrder::Detect& order)
+{
+    if (Leg* const leg = find(order.leg))
+        leg->termination->detectDigits(order.isWanted);
+}
 
 void MediaLoop::obey(MediaOrder::Digit& order)
 {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <string>
+
 /// How the media layer does its work. What is out of range is brought into it.
 struct MediaOptions
 {
@@ -10,4 +12,6 @@ struct MediaOptions
     unsigned int learningTime = 2000;   ///< milliseconds after the first packet in which the far address may settle
     unsigned int silence = 20;          ///< seconds without a packet until signalling is told; 0: it never is
     unsigned int reportInterval = 5000; ///< milliseconds between two RTCP reports
+    std::string country = "de";         ///< whose tones are played
+    std::string tones;                  ///< where they are written (ToneTable); empty: the built-in ten countries
 };

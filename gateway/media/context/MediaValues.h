@@ -45,6 +45,11 @@ struct Tone
     unsigned long long leg;
     MG_Tones::ECallProgressTone::Type tone;
 };
+struct Detect ///< digits in speech
+{
+    unsigned long long leg;
+    bool isWanted;
+};
 struct Digit
 {
     unsigned long long leg;
@@ -62,7 +67,7 @@ struct End
 struct Stop ///< the loop's running
 {
 };
-using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Digit, Ask, End, Stop>;
+using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Detect, Digit, Ask, End, Stop>;
 
 /// Which leg it is about; 0: none.
 unsigned long long LEG_OF(Any const& order);

@@ -1,5 +1,7 @@
 #include "media/rtp/RtpRoutes.h"
 
+#include <algorithm>
+
 unsigned int RtpRoutes::CLOCK_RATE(MG_Rtp::ECodec::Type codec)
 {
     switch (codec)
@@ -37,4 +39,11 @@ void RtpRoutes::add(MediaPayloadTypes const& types, Route const& route)
 {
     if (types.isAgreed() && (route.kind != VOICE || m_routes[types.receive].kind != VOICE)) // the first of two wins
         m_routes[types.receive] = route;
+}
+
+bool RtpRoutes::areAllRelayed(MediaDescription const& from) const
+{
+    return std::all_of(from.formats.begin(), from.formats.end(),
+                       [this](MediaFormat const& format)
+                       { return get(format.types.receive).relayType != MediaPayloadTypes::NONE; });
 }

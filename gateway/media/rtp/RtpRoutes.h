@@ -30,6 +30,8 @@ public:
 
     /// REQUIRES: type < 128.
     Route const& get(unsigned char type) const { return m_routes[type]; }
+    /// Whether all that the leg so described may say is taken as it is.
+    bool areAllRelayed(MediaDescription const& from) const;
     /// Of the codec that is spoken towards the leg's own far side, in Hz.
     unsigned int getClockRate() const { return m_clockRate; }
 

@@ -1,5 +1,11 @@
 #include "media/rtp/RtpTermination.h"
 
+#include "media/codec/VoiceReceiver.h"
+#include "media/codec/VoiceSender.h"
+#include "media/quality/EModel.h"
+#include "media/tone/DtmfDetector.h"
+
+#include <algorithm>
 #include <utility>
 
 namespace
@@ -20,6 +26,8 @@ RtpTermination::RtpTermination(unsigned long long number, RtpPorts&& ports, Medi
     , m_reports(options.reportInterval * MILLISECOND, seed.name)
 {
 }
+
+RtpTermination::~RtpTermination() = default;
 
 bool RtpTermination::receives() const
 {
@@ -42,16 +50,16 @@ void RtpTermination::describe(MediaDescription const& description, long long now
     if (!description.rtcp.isSomewhere() && rtcp.port != 0)
         ++rtcp.port;
     m_rtcpLatch.expect(DatagramAddress(rtcp));
+    setKeys(description.keys);
     m_description = description;
     setPartner(m_partner);
-    if (m_partner != nullptr)
-        m_partner->setPartner(this);
 }
 
 void RtpTermination::setPartner(RtpTermination* partner)
 {
     m_partner = partner;
     m_routes = RtpRoutes(m_description, partner == nullptr ? nullptr : &partner->m_description);
+    m_isRelayable = partner == nullptr || m_routes.areAllRelayed(m_description);
 }
 
 void RtpTermination::receiveRtp(DatagramBatch& batch, long long now)
@@ -62,7 +70,7 @@ void RtpTermination::receiveRtp(DatagramBatch& batch, long long now)
         DatagramAddress const& from = batch.getSource(i);
         if (batch.isCut(i))
             ++m_quality.malformedPackets;
-        else if (RtpPacket::IS_RTCP(batch.getOctets(i)))
+        else if (RtpPacket::IS_RTCP(batch.getOctets(i))) // also under SRTP: that byte is in the clear
             takeRtcp(batch.getOctets(i), from, now);
         else
             takeRtp(batch.getOctets(i), from, batch, now);
@@ -82,11 +90,18 @@ void RtpTermination::takeRtp(std::span<unsigned char> octets, DatagramAddress co
                              long long now)
 {
     RtpPacket packet;
-    if (!packet.read(octets))
+    if (m_isUnusable)
+    {
+        ++m_quality.unkeyedPackets;
+        return;
+    }
+    if (!packet.read(octets)) // first, so that nothing malformed comes to the keys
     {
         ++m_quality.malformedPackets;
         return;
     }
+    if (m_srtp != nullptr && (!open(octets, &SrtpSession::openRtp) || !packet.read(octets)))
+        return;
     RtpRoutes::Route const& route = m_routes.get(packet.header.type);
     if (route.kind == RtpRoutes::UNKNOWN)
     {
@@ -103,7 +118,9 @@ void RtpTermination::takeRtp(std::span<unsigned char> octets, DatagramAddress co
         return;
     if (route.kind == RtpRoutes::EVENT)
         takeEvent(packet, now);
-    if (m_partner != nullptr)
+    else if (route.kind == RtpRoutes::VOICE)
+        hearVoice(packet, route);
+    if (m_partner != nullptr && !m_isAllDecoded)
         relay(packet, route, batch, now);
 }
 
@@ -135,7 +152,9 @@ void RtpTermination::tell(std::optional<HeardDigit> const& heard)
 void RtpTermination::relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now)
 {
     RtpTermination& to = *m_partner;
-    if (route.relayType == MediaPayloadTypes::NONE || !to.isOpenForRelay())
+    if (route.relayType == MediaPayloadTypes::NONE)
+        return;
+    if (!to.isOpenForRelay())
     {
         to.m_numbering.interrupt();
         return;
@@ -145,13 +164,19 @@ void RtpTermination::relay(RtpPacket const& packet, RtpRoutes::Route const& rout
     header.write(start);
     ++to.m_quality.sentPackets;
     to.m_quality.sentOctets += packet.payload.size();
-    batch.queue({start, RtpHeader::LENGTH + packet.payload.size()}, to.m_latch.getTarget());
+    std::size_t length = RtpHeader::LENGTH + packet.payload.size();
+    if (to.m_srtp != nullptr)
+        length = to.m_srtp->protectRtp(start, length); // a received datagram has room behind it
+    if (length != 0)
+        batch.queue({start, length}, to.m_latch.getTarget());
 }
 
 void RtpTermination::takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now)
 {
     RtpLatch& latch = m_isMultiplexed ? m_latch : m_rtcpLatch;
     RtcpPacket packet;
+    if (m_srtp != nullptr && !open(octets, &SrtpSession::openRtcp))
+        return;
     if (!packet.read(octets, m_numbering.getSource()))
         ++m_quality.malformedPackets;
     else if (!latch.accept(from, now))
@@ -162,23 +187,64 @@ void RtpTermination::takeRtcp(std::span<unsigned char> octets, DatagramAddress c
 
 void RtpTermination::tick(long long now)
 {
-    if (std::optional<TelephoneEventSender::Packet> const packet = m_digits.tick(getClockRate()))
-        sendEvent(*packet, now);
+    if (m_digits.isBusy())
+    {
+        if (std::optional<TelephoneEventSender::Packet> const packet = m_digits.tick(getClockRate()))
+            sendEvent(*packet, now);
+        return;
+    }
+    sendTone(now);
 }
 
 void RtpTermination::sendEvent(TelephoneEventSender::Packet const& packet, long long now)
 {
-    if (!m_description.telephoneEvent.isAgreed() || !sends() || !m_latch.getTarget().isSomewhere())
+    if (!m_description.telephoneEvent.isAgreed())
+    {
+        sendAudibleEvent(packet, now);
         return;
+    }
     if (packet.isFirst)
         m_eventTimestamp = m_numbering.beginEvent(getClockRate(), now);
-    unsigned char octets[RtpHeader::LENGTH + TelephoneEvent::LENGTH];
-    m_numbering.event(m_description.telephoneEvent.send, m_eventTimestamp, packet.isFirst).write(octets);
-    packet.event.write(octets + RtpHeader::LENGTH);
+    unsigned char payload[TelephoneEvent::LENGTH];
+    packet.event.write(payload);
+    transmit(m_numbering.event(m_description.telephoneEvent.send, m_eventTimestamp, packet.isFirst), payload);
+}
+
+/// For packets of our own; what is relayed goes out in batches.
+void RtpTermination::transmit(RtpHeader const& header, std::span<unsigned char const> payload)
+{
+    std::array<unsigned char, DatagramBatch::ROOM> octets;
+    if (!isOpen() || payload.size() > DatagramBatch::LONGEST - RtpHeader::LENGTH)
+        return;
+    header.write(octets.data());
+    std::copy(payload.begin(), payload.end(), octets.begin() + RtpHeader::LENGTH);
+    std::size_t length = RtpHeader::LENGTH + payload.size();
+    if (m_srtp != nullptr)
+        length = m_srtp->protectRtp(octets.data(), length);
+    if (length == 0)
+        return;
     ++m_quality.sentPackets;
-    m_quality.sentOctets += TelephoneEvent::LENGTH;
+    m_quality.sentOctets += payload.size();
     DatagramAddress const& to = m_latch.getTarget();
-    sendto(getRtp(), octets, sizeof octets, 0, &to.any, to.length); // what is lost now is repeated
+    sendto(getRtp(), octets.data(), length, 0, &to.any, to.length);
+}
+
+void RtpTermination::setKeys(MediaKeys const& keys)
+{
+    if (keys == m_description.keys)
+        return; // the counters of the stream go on
+    m_srtp = SrtpSession::MAKE(keys);
+    m_isUnusable = keys.suite != MediaKeys::NONE && m_srtp == nullptr;
+}
+
+/// Opens what came under SRTP, in place.
+bool RtpTermination::open(std::span<unsigned char>& octets,
+                          std::size_t (SrtpSession::*work)(unsigned char*, std::size_t))
+{
+    std::size_t const length = ((*m_srtp).*work)(octets.data(), octets.size());
+    octets = octets.first(length);
+    m_quality.unkeyedPackets += length == 0;
+    return length != 0;
 }
 
 void RtpTermination::attend(long long now)
@@ -211,10 +277,15 @@ void RtpTermination::end(long long now)
 void RtpTermination::sendReport(bool isBye, long long now)
 {
     DatagramAddress const& to = m_isMultiplexed ? m_latch.getTarget() : m_rtcpLatch.getTarget();
-    if (!to.isSomewhere())
+    if (!to.isSomewhere() || m_isUnusable)
         return;
-    std::array<unsigned char, RtcpPacket::LONGEST> octets;
-    std::size_t const length = m_reports.write(octets, m_numbering, m_reception, m_quality, isBye, now);
+    std::array<unsigned char, RtcpPacket::LONGEST + SrtpSession::MOST_GROWTH> octets;
+    std::size_t length = m_reports.write(std::span(octets).first<RtcpPacket::LONGEST>(), m_numbering, m_reception,
+                                         m_quality, isBye, now);
+    if (m_srtp != nullptr)
+        length = m_srtp->protectRtcp(octets.data(), length);
+    if (length == 0)
+        return;
     sendto(m_isMultiplexed ? getRtp() : getRtcp(), octets.data(), length, 0, &to.any, to.length);
 }
 
@@ -222,5 +293,13 @@ MediaQuality const& RtpTermination::getQuality()
 {
     m_quality.lostPackets = m_reception.getTotalLost();
     m_quality.jitter = m_reception.getJitterMilliseconds();
+    if (m_quality.lostPackets && m_description.formats.getSize() != 0)
+    {
+        double const lost = *m_quality.lostPackets;
+        double const expected = lost + static_cast<double>(m_quality.receivedPackets);
+        m_quality.meanOpinionScore =
+            EModel::SCORE(m_description.formats.begin()->codec.getCodec(), expected == 0 ? 0 : 100 * lost / expected,
+                          m_quality.roundTripTime.value_or(0) / 2.0);
+    }
     return m_quality;
 }

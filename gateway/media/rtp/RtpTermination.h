@@ -9,8 +9,13 @@
 #include "media/rtp/RtpRoutes.h"
 #include "media/rtp/TelephoneEventReceiver.h"
 #include "media/rtp/TelephoneEventSender.h"
+#include "media/srtp/SrtpSession.h"
+#include "media/tone/Tone.h"
 
+class DtmfDetector;
 class RtpTermination;
+class VoiceReceiver;
+class VoiceSender;
 
 /// Whoever passes on what a termination has to tell. On the datapath's thread.
 class RtpTerminationObserver
@@ -43,6 +48,7 @@ public:
     };
     /// @}
     RtpTermination(unsigned long long number, RtpPorts&& ports, MediaOptions const& options, Seed const& seed);
+    ~RtpTermination();
     RtpTermination(RtpTermination const&) = delete;
     RtpTermination& operator=(RtpTermination const&) = delete;
 
@@ -58,16 +64,30 @@ public:
     MediaDescription const& getDescription() const { return m_description; }
     /// The other leg of a call of two, to which is relayed; null: none, or more.
     void setPartner(RtpTermination* partner);
+    /// Whether a partner so described understands everything that may come from here as it is.
+    bool isRelayable() const { return m_isRelayable; }
 
     /// Takes what has come to a socket, and sends on what is relayed.
     void receiveRtp(DatagramBatch& batch, long long now);
     void receiveRtcp(DatagramBatch& batch, long long now);
 
     bool sendDigit(char digit, unsigned int milliseconds) { return m_digits.add(digit, milliseconds); }
+    /// Plays it instead of what the others say; null: ends it. It must outlive this.
+    void playTone(Tone const* tone);
+    /// Whether digits are heard in what is spoken, too.
+    void detectDigits(bool isWanted);
     /// Whether it wants its ticks.
-    bool isClocked() const { return m_digits.isBusy(); }
+    bool isClocked() const { return m_digits.isBusy() || m_tone.has_value(); }
     /// Every 20 ms of its clocked time.
     void tick(long long now);
+
+    /// Decodes from now on what cannot be relayed, or all, at that rate in Hz. Throws std::bad_alloc.
+    void openVoice(unsigned int rate, bool isAll);
+    void closeVoice();
+    /// The next 20 ms of what the far side says, at the rate it was opened with; false: nothing.
+    bool listen(std::span<short> frame);
+    /// 20 ms for the far side, at that rate in Hz; passed over while a tone or a digit goes out.
+    void speak(std::span<short const> frame, unsigned int rate, long long now);
     /// About once a second: reports, silence, quality.
     void attend(long long now);
     /// Tells the far side that the stream ends.
@@ -78,7 +98,14 @@ public:
 private:
     bool receives() const;
     bool sends() const;
-    bool isOpenForRelay() const { return sends() && !isClocked() && m_latch.getTarget().isSomewhere(); }
+    bool isOpen() const { return sends() && !m_isUnusable && m_latch.getTarget().isSomewhere(); }
+    bool isOpenForRelay() const { return isOpen() && !isClocked(); }
+    void setKeys(MediaKeys const& keys);
+    bool open(std::span<unsigned char>& octets, std::size_t (SrtpSession::*work)(unsigned char*, std::size_t));
+    void transmit(RtpHeader const& header, std::span<unsigned char const> payload);
+    void hearVoice(RtpPacket const& packet, RtpRoutes::Route const& route);
+    void sendFrame(std::span<short const> frame, unsigned int rate, long long now);
+    void prepareSender(unsigned int rate);
     unsigned int getClockRate() const { return m_routes.getClockRate(); }
     void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
     void takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now);
@@ -87,6 +114,8 @@ private:
     void relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now);
     void tell(std::optional<HeardDigit> const& heard);
     void sendEvent(TelephoneEventSender::Packet const& packet, long long now);
+    void sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now);
+    void sendTone(long long now);
     void sendReport(bool isBye, long long now);
     void checkSilence(long long now);
 
@@ -110,6 +139,15 @@ private:
     RtcpReports m_reports;
     TelephoneEventReceiver m_heard;
     TelephoneEventSender m_digits;
+    bool m_isRelayable = true;
+    bool m_isAllDecoded = false;
+    bool m_isUnusable = false; // its keys cannot be used: nothing goes in or out in the clear
+    std::unique_ptr<SrtpSession> m_srtp;
+    std::unique_ptr<VoiceReceiver> m_receiver;
+    std::unique_ptr<VoiceSender> m_sender;
+    std::unique_ptr<DtmfDetector> m_detector;
+    std::optional<ToneGenerator> m_tone;
+    std::optional<ToneGenerator> m_digitSound;
     std::uint32_t m_eventTimestamp = 0;
     MediaDescription m_description;
 };
