@@ -1,0 +1,33 @@
+#pragma once
+
+#include "media/mixer/Conference.h"
+
+#include <memory>
+#include <vector>
+
+class RtpTermination;
+
+/// A call in the datapath: the terminations of its legs, and who hears whom. Two that understand each other are
+/// relayed; two that do not are transcoded, more are mixed. On the thread of its datapath loop.
+class Bridge
+{
+public:
+    Bridge();
+    ~Bridge();
+
+    void add(RtpTermination& leg);
+    void remove(RtpTermination& leg);
+    /// To be called when one of the legs was described anew.
+    void connect();
+    bool isEmpty() const { return m_legs.empty(); }
+
+    /// Every 20 ms.
+    void tick(long long now);
+
+private:
+    bool needsConference() const;
+    void openConference();
+
+    std::vector<RtpTermination*> m_legs;
+    std::unique_ptr<Conference> m_conference; // null: all are relayed
+};

@@ -1,0 +1,52 @@
+#pragma once
+
+#include "media/context/LegMedia.h"
+#include "platform/media/MG_IContext.h"
+
+#include <atomic>
+#include <memory>
+
+/// The media of one call: what its legs say and hear meets here. Two legs hear each other, of more each hears all the
+/// others. It is the context to which the property Context (0x400400) binds a call, and lives as long as that or one of
+/// its legs.
+///
+///     CallMedia* const call = CallMedia::OF(adapter.getDatapathContext());
+///     std::unique_ptr<LegMedia> media = call->addLeg(interfaceAddress, observer);
+///     if (media == nullptr)
+///         ... // no port is free: release with cause 47
+///     ... // our session description: media->getLocalRtp()
+///
+///     media->describe(description);                  // offer and answer are through
+///     media->setMode(VoipCodecAndMode::SEND_ONLY);   // the far side put us on hold: it hears the others' music
+///     media->moveTo(*CallMedia::OF(other));          // transferred
+///     media.reset();                                 // released
+///
+/// On the signalling thread.
+class CallMedia : public MG_IContext
+{
+public:
+    /// The context as one of this media layer; null for null, and for one of another making.
+    static CallMedia* OF(MG_IContext* context) { return dynamic_cast<CallMedia*>(context); }
+
+    ~CallMedia() override;
+    /// The lower 32 bits of its number, which is never used again.
+    unsigned int getId() const override { return static_cast<unsigned int>(m_number); }
+    unsigned long long getNumber() const { return m_number; }
+
+    /// A termination for one more leg, on ports of the address `local`, which must be one of this machine: silent in
+    /// both directions until it is described. The observer must outlive it. Null when no pair of ports is free, the
+    /// address is not ours, memory is out or the media layer has ended.
+    std::unique_ptr<LegMedia> addLeg(IpAddress const& local, MediaObserver& observer);
+
+    /// The number of contexts alive.
+    static std::atomic<unsigned int> s_numberOfInstances;
+
+private:
+    friend class LegMedia;
+    friend class MediaCore;
+    CallMedia(MediaCore& core, unsigned long long number, unsigned int loop);
+
+    TYPtr<MediaCore> m_core;
+    unsigned long long m_number;
+    unsigned int m_loop;
+};

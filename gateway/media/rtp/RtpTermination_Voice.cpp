@@ -1,0 +1,97 @@
+#include "media/codec/VoiceReceiver.h"
+#include "media/codec/VoiceSender.h"
+#include "media/rtp/RtpTermination.h"
+#include "media/tone/DtmfDetector.h"
+
+#include <array>
+
+namespace
+{
+constexpr unsigned int TONE_RATE = 8000; // Hz
+constexpr std::size_t TONE_FRAME = TONE_RATE / 50;
+} // namespace
+
+void RtpTermination::openVoice(unsigned int rate, bool isAll)
+{
+    m_isAllDecoded = isAll;
+    if (m_receiver == nullptr || m_receiver->getRate() != rate)
+        m_receiver = std::make_unique<VoiceReceiver>(rate);
+    prepareSender(rate);
+}
+
+void RtpTermination::closeVoice()
+{
+    m_isAllDecoded = false;
+    m_receiver.reset();
+    if (!m_tone)
+        m_sender.reset();
+}
+
+/// Makes the sender anew when what is spoken, or the rate, has changed.
+void RtpTermination::prepareSender(unsigned int rate)
+{
+    if (m_description.formats.getSize() == 0)
+        return m_sender.reset();
+    MG_Rtp::MediaType const& media = m_description.formats.begin()->codec.getMediaType();
+    if (m_sender == nullptr || m_sender->getRate() != rate || m_sender->getMedia() != media)
+        m_sender = std::make_unique<VoiceSender>(rate, media);
+}
+
+void RtpTermination::hearVoice(RtpPacket const& packet, RtpRoutes::Route const& route)
+{
+    MG_Rtp::ECodec::Type const codec = m_description.formats.begin()[route.format].codec.getCodec();
+    if (m_receiver != nullptr && (m_isAllDecoded || route.relayType == MediaPayloadTypes::NONE))
+        m_receiver->put(packet.header, codec, packet.payload);
+    if (m_detector == nullptr)
+        return;
+    m_detector->hear(codec, packet.payload);
+    while (std::optional<char> const digit = m_detector->take())
+        tell(HeardDigit{*digit, 0});
+}
+
+bool RtpTermination::listen(std::span<short> frame) { return m_receiver != nullptr && m_receiver->take(frame); }
+
+void RtpTermination::speak(std::span<short const> frame, unsigned int rate, long long now)
+{
+    if (!isClocked())
+        sendFrame(frame, rate, now);
+}
+
+void RtpTermination::sendFrame(std::span<short const> frame, unsigned int rate, long long now)
+{
+    prepareSender(rate); // as it was, unless something changed
+    if (m_sender == nullptr || !isOpen())
+        return;
+    m_sender->add(frame);
+    std::uint32_t const ticks = m_sender->getPeriod() * getClockRate() / 1000;
+    for (std::span<unsigned char const> payload = m_sender->take(); !payload.empty(); payload = m_sender->take())
+        transmit(m_numbering.next(m_description.formats.begin()->types.send, ticks, getClockRate(), now), payload);
+}
+
+void RtpTermination::playTone(Tone const* tone)
+{
+    m_tone.reset();
+    if (tone != nullptr)
+        m_tone.emplace(*tone);
+}
+
+void RtpTermination::sendTone(long long now)
+{
+    std::array<short, TONE_FRAME> frame;
+    if (m_tone->make(frame, TONE_RATE))
+        sendFrame(frame, TONE_RATE, now);
+    else
+        m_tone.reset();
+}
+
+/// Without telephone events a digit is a sound (ITU-T Q.23), if the codec is one that we speak.
+void RtpTermination::sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now)
+{
+    if (packet.isFirst)
+        m_digitSound.emplace(DtmfDetector::SOUND_OF(packet.event.event));
+    std::array<short, TONE_FRAME> frame;
+    if (m_digitSound && m_digitSound->make(frame, TONE_RATE))
+        sendFrame(frame, TONE_RATE, now);
+}
+
+void RtpTermination::detectDigits(bool isWanted) { m_detector = isWanted ? std::make_unique<DtmfDetector>() : nullptr; }
