@@ -42,6 +42,7 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+    , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
 }
 
@@ -55,7 +56,9 @@ SipEndpoint::~SipEndpoint()
 {
     m_adapter.cleanup();
     forgetTransaction();
-    forgetInvite();
+    forgetOffer();
+    m_invite.forget();
+    m_reinvite.forget();
     if (m_bye != nullptr)
     {
         nta_outgoing_bind(m_bye, nullptr, nullptr);
@@ -74,7 +77,7 @@ InfoContainer& SipEndpoint::getInfo(InfoContainer& info, unsigned int maxLevel, 
 {
     String text;
     text.format("%s/%u, %s side, dialog %s", getName().c_str(), m_callNumber, m_isCalling ? "calling" : "called",
-                DIALOG_NAME(m_dialog));
+                SipDialogState::NAME(m_dialog));
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Endpoint", text);
     return info;
 }
@@ -89,10 +92,11 @@ void SipEndpoint::followCall(CC_Flags const& flags)
     traceFlags(flags);
     if (isPeerReleased())
         onPeerReleased();
-    else if (m_isCalling)
+    else if (m_dialog == SipDialogState::INVITE_RECEIVED)
         followPeer();
-    else if (m_isAckLate && flags.get(SipPropertyId::SESSION_DESCRIPTION))
-        acknowledgeLate();
+    else if (m_dialog == SipDialogState::ANSWERED || m_dialog == SipDialogState::UP)
+        m_session.follow(m_dialog == SipDialogState::UP && m_lateAck == nullptr && !m_isOffering &&
+                         m_offerReceived == nullptr);
 }
 
 /// Nothing is asked of a SIP side yet: whoever asks sees that nobody took the service.
@@ -135,7 +139,8 @@ void SipEndpoint::endWithoutWords()
 {
     if (std::exchange(m_isInCall, false))
         m_adapter.drop(QCause::RESOURCE_UNAVAILABLE, 0);
-    setDialog(Dialog::OVER);
+    m_dialog = SipDialogState::OVER;
+    finishIfDone();
 }
 
 /// Takes the leg out of the call, with the cause in the peer's words.
@@ -187,17 +192,19 @@ void SipEndpoint::recordQuality()
     std::ignore = m_adapter.setOwnQoS(*record); // without memory the call ends without a record
 }
 
-void SipEndpoint::setDialog(Dialog dialog)
+SipDialogState::Action SipEndpoint::advance(SipDialogState::Event event)
 {
-    m_dialog = dialog;
-    finishIfDone();
+    SipDialogState::Step const step = SipDialogState::STEP(m_dialog, event);
+    m_dialog = step.next;
+    return step.action;
 }
 
 void SipEndpoint::finishIfDone()
 {
-    if (m_dialog != Dialog::OVER || m_isInCall || std::exchange(m_isFinished, true))
+    if (m_dialog != SipDialogState::OVER || m_isInCall || std::exchange(m_isFinished, true))
         return;
     m_timer.stop();
+    m_offerTimer.stop();
     m_interface.finish(*this);
 }
 
@@ -206,36 +213,6 @@ XCode SipEndpoint::writeOwn(CC_PropertyContainer const& properties)
     if (isTraced())
         trace("did  " + TEXT_OF(properties));
     return m_adapter.setOwnProperties(properties);
-}
-
-std::string SipEndpoint::getPeerText(unsigned int id) const
-{
-    auto const* const property = getPeer<CC_PropertyString>(id);
-    return property != nullptr ? std::string(property->getValue().view()) : std::string();
-}
-
-char const* SipEndpoint::DIALOG_NAME(Dialog dialog)
-{
-    switch (dialog)
-    {
-    case Dialog::NONE:
-        return "none";
-    case Dialog::INVITE_RECEIVED:
-        return "INVITE received";
-    case Dialog::ANSWERED:
-        return "answered";
-    case Dialog::INVITE_SENT:
-        return "INVITE sent";
-    case Dialog::CANCELLED:
-        return "cancelled";
-    case Dialog::UP:
-        return "up";
-    case Dialog::BYE_SENT:
-        return "BYE sent";
-    case Dialog::OVER:
-        return "over";
-    }
-    return "(unknown)";
 }
 
 // --- trace -----------------------------------------------------------------------------------------------------------
@@ -268,8 +245,6 @@ std::string SipEndpoint::TEXT_OF(CC_Property const& property)
     String value;
     property.getValueString(value);
     std::string const name = SipPropertyId::NAME(property.getId());
-    if (property.getId() == SipPropertyId::SESSION_DESCRIPTION)
-        return name + fmt::format(" ({} bytes)", value.length());
     return name + "=" + ON_ONE_LINE(value.view());
 }
 

@@ -5,12 +5,13 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/CallTrace.h"
 #include "platform/eventloop/TYTimer.h"
+#include "sip/dialog/SipDialogState.h"
+#include "sip/dialog/SipDirectSession.h"
+#include "sip/dialog/SipOfferAnswer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
-
-#include <spdlog/fmt/fmt.h>
 
 #include <memory>
 #include <new>
@@ -26,9 +27,14 @@ class SipInterface;
 ///
 ///     100 PROCEEDING     180 ALERTING     183 PROCEEDING with data     200 CONNECTED     the end RELEASED and a cause
 ///
+/// How the dialog itself goes on is the table of SipDialogState; while it is up,
+///
+///     State HELD: our peer holds     Session-Offer, Session-Answer: what SipDirectSession makes of re-INVITE and
+///     UPDATE
+///
 /// Owned by its interface, which destroys it once both the dialog is over and the leg dropped. Belongs to the thread of
 /// the stack's loop, which is also that of the call-control loop.
-class SipEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, public SipRequestHandler
+class SipEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, public SipRequestHandler, private SipSessionWire
 {
 public:
     SipEndpoint(SipInterface& interface, unsigned int callNumber);
@@ -57,18 +63,15 @@ public:
     int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
 
 private:
-    enum class Dialog
+    /// An INVITE that we sent, as long as its answer may be repeated and be in need of another ACK.
+    struct Invitation
     {
-        NONE,
-        INVITE_RECEIVED, ///< not answered finally
-        ANSWERED,        ///< 200 sent, the ACK is outstanding
-        INVITE_SENT,
-        CANCELLED, ///< CANCEL sent, the INVITE's final answer is outstanding
-        UP,
-        BYE_SENT,
-        OVER
+        nta_outgoing_t* transaction = nullptr;
+        nta_outgoing_t* ack = nullptr;
+        unsigned int sequence = 0;
+
+        void forget();
     };
-    static char const* DIALOG_NAME(Dialog dialog);
 
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
@@ -78,6 +81,7 @@ private:
     void onDialFailed();
     static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
     void onAck(sip_t const* request);
+    void takeAnswerOfAck(sip_t const* request);
     void onAckMissing();
     void onCancel(sip_t const* request);
     void followPeer();
@@ -94,13 +98,40 @@ private:
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
+    void takeAnswer(sip_t const* response);
+    void addSession(CC_PropertyContainer& own, std::string const& session);
     void onRejected(unsigned int status, sip_t const* response);
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
-    void acknowledge(std::string const& sessionDescription);
-    void acknowledgeLate();
+    void acknowledge(Invitation& invitation, std::string const& sessionDescription);
     void cancel(SipCause const& cause);
-    void forgetInvite();
+
+    // while the dialog is up: SipEndpoint_Session.cpp
+    void sendOffer(std::string const& description, bool isQuick) override;
+    void sendAnswer(std::string const& description) override;
+    void sendRefusal(unsigned int status) override;
+    int onOffer(nta_incoming_t* transaction, sip_t const* request);
+    int checkOffer(nta_incoming_t* transaction, sip_t const* request);
+    unsigned int getOfferRefusal() const;
+    int takeOffer(nta_incoming_t* transaction, std::string const& description, bool isUpdate);
+    static int HANDLE_ACK_OR_CANCEL_OF_OFFER(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
+    void onOfferAcknowledged(sip_t const* request);
+    void onOfferCancelled();
+    void refuseOffer(unsigned int status);
+    bool isAwaitingAck() const;
+    void sendWaitingOffer();
+    void startOffer(std::string const& description, bool isQuick);
+    static int HANDLE_OFFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    void onOfferResponse(unsigned int status, sip_t const* response);
+    void onOfferAccepted(sip_t const* response);
+    void onOfferRefused(unsigned int status);
+    void tryAgainLater();
+    static void ON_OFFER_TIMER(void* endpoint);
+    void followHold();
+    void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
+    void forgetOffer();
+    void endOffers();
+    void noteAllow(sip_t const* message);
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
@@ -127,7 +158,7 @@ private:
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void endDialog(SipCause const& cause);
-    void setDialog(Dialog dialog);
+    SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
     void onPeerReleased();
@@ -140,7 +171,6 @@ private:
     {
         return dynamic_cast<Property const*>(m_adapter.getPeerProperty(id));
     }
-    std::string getPeerText(unsigned int id) const;
     bool isPeerReleased() const;
 
     bool isTraced() const { return m_ladder != nullptr; }
@@ -153,17 +183,14 @@ private:
     unsigned int m_callNumber;
     std::shared_ptr<CallTrace::Ladder> m_ladder;
     bool m_isCalling = false;
-    Dialog m_dialog = Dialog::NONE;
+    SipDialogState::State m_dialog = SipDialogState::NONE;
     nta_leg_t* m_leg = nullptr;
     nta_incoming_t* m_transaction = nullptr; // the INVITE received
-    nta_outgoing_t* m_invite = nullptr;      // the INVITE sent; kept for answers that are repeated
-    nta_outgoing_t* m_ack = nullptr;
+    Invitation m_invite;
     nta_outgoing_t* m_bye = nullptr;
-    unsigned int m_inviteSequence = 0;
     TYTimer m_timer; // calling side: a dial failed; called side: the answer or the end of the INVITE is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
-    bool m_isAckLate = false;              // the ACK is still to be sent: it must carry an answer that is not here yet
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_wasAnswered = false;
@@ -171,5 +198,21 @@ private:
     bool m_isInCall = false;
     bool m_isFinished = false;
     SipQuality m_quality;
+    SipOfferAnswer m_negotiation;
+    SipDirectSession m_session{m_adapter, *this};
+    nta_incoming_t* m_offerReceived = nullptr; // a re-INVITE or UPDATE that is not done
+    bool m_isOfferAnswered = false;            // that re-INVITE: its ACK is outstanding
+    Invitation m_reinvite;                     // or UPDATE
+    bool m_isOffering = false;                 // ours is not answered, or is to be sent again
+    bool m_isOfferQuick = false;
+    bool m_isOfferWaiting = false; // until an ACK has come
+    std::string m_offer;           // ours
+    std::string m_offerOfPeer;
+    unsigned int m_refusals = 0;     // 491 to ours
+    Invitation* m_lateAck = nullptr; // whose ACK must carry an answer that is not here yet
+    bool m_allowsUpdate = false;     // our peer
+    bool m_isHeldByOffer = false;
+    bool m_isHeld = false;
+    TYTimer m_offerTimer;         // an offer is to be repeated; or an answer does not come
     CC_CallAdapterE164 m_adapter; // last: silenced first
 };

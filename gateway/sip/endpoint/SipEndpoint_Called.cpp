@@ -28,15 +28,6 @@ void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State 
     ADD(properties, CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
 }
 
-/// What an answer with a session description brings: the description, and that media may come.
-void ADD_SESSION(CC_PropertyContainer& properties, std::string const& session)
-{
-    if (session.empty())
-        return;
-    ADD_TEXT(properties, SipPropertyId::SESSION_DESCRIPTION, session);
-    ADD(properties, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
-}
-
 /// Who answers, if the answer says so.
 void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
 {
@@ -110,20 +101,21 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
 
 bool SipEndpoint::startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards)
 {
-    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
+    std::string const session = m_session.readFirstOffer();
     std::string const hops = std::to_string(maxForwards);
     m_hasOffer = !session.empty();
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, session);
     trace("-> INVITE " + uri + (m_hasOffer ? " with a session description" : ""));
-    m_invite = nta_outgoing_tcreate(m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE,
-                                    URL_STRING_MAKE(uri.c_str()), SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
-                                    SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
-                                    TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
-                                    TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                                    TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
-    if (m_invite == nullptr)
+    m_invite.transaction = nta_outgoing_tcreate(
+        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(uri.c_str()),
+        SIPTAG_CONTACT_STR(m_interface.getContact().c_str()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
+        TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
+        TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+    if (m_invite.transaction == nullptr)
         return false;
-    m_inviteSequence = nta_leg_get_seq(m_leg);
-    m_dialog = Dialog::INVITE_SENT;
+    m_invite.sequence = nta_leg_get_seq(m_leg);
+    advance(SipDialogState::INVITE_OUT);
     m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
     return true;
 }
@@ -146,51 +138,76 @@ int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* t
 
 void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
 {
-    if (m_dialog != Dialog::INVITE_SENT || response == nullptr)
+    if (m_dialog != SipDialogState::INVITE_SENT || response == nullptr)
         return;
     m_hasRung = m_hasRung || status == 180;
     trace("<- " + std::to_string(status));
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
-    if (m_hasOffer)
-        m_quality.noteAnswer(session);
     ADD_CONNECTED(own, response);
-    ADD_SESSION(own, session);
+    if (m_hasOffer)
+        addSession(own, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
         ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
     ADD_STATE(own, m_hasRung ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
     std::ignore = writeOwn(own); // what memory refuses the other side does not hear; the next answer may fit
 }
 
+/// What an answer with a session description brings: the description, and that media may come.
+void SipEndpoint::addSession(CC_PropertyContainer& own, std::string const& session)
+{
+    if (session.empty())
+        return;
+    if (m_hasOffer)
+    {
+        m_quality.noteAnswer(session);
+        m_session.addAnswer(own, session);
+    }
+    else
+        m_session.addOffer(own, session);
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
+}
+
 void SipEndpoint::onAnswer(sip_t const* response)
 {
     trace("<- 200");
-    switch (m_dialog)
+    switch (advance(SipDialogState::ANSWER_IN))
     {
-    case Dialog::INVITE_SENT:
-        break;
-    case Dialog::CANCELLED: // the answer crossed our CANCEL
-        m_timer.stop();
+    case SipDialogState::PROCEED:
         confirmDialog(response);
-        acknowledge({});
+        takeAnswer(response);
+        break;
+    case SipDialogState::ACK_AND_BYE:
+        confirmDialog(response);
+        acknowledge(m_invite, {});
         sendBye(m_byeAfterAck.value_or(SipCause{}));
-        return;
-    default: // repeated: our ACK was lost
-        if (!m_isAckLate)
-            acknowledge({});
-        return;
+        break;
+    case SipDialogState::ACKNOWLEDGE:
+        if (m_lateAck != &m_invite)
+            acknowledge(m_invite, {});
+        break;
+    default:
+        break;
     }
-    m_timer.stop();
-    confirmDialog(response);
+}
+
+/// Whoever offered first has the other's answer now, or our peer has offered and its answer comes with the ACK.
+void SipEndpoint::takeAnswer(sip_t const* response)
+{
     m_wasAnswered = true;
+    noteAllow(response);
     std::string const session = SESSION_OF(response);
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::FINAL, session);
     if (m_hasOffer || session.empty())
-        acknowledge({});
-    if (m_hasOffer)
-        m_quality.noteAnswer(session);
+        acknowledge(m_invite, {});
+    else
+    {
+        m_lateAck = &m_invite;
+        m_offerOfPeer = session;
+    }
     CC_PropertyContainer own;
     ADD_CONNECTED(own, response);
-    ADD_SESSION(own, session);
+    addSession(own, session);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
     if (!writeOwn(own).isOk())
         clear({QCause::RESOURCE_UNAVAILABLE, 0, {}}); // nobody would ever hear of the answer
@@ -199,11 +216,10 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 {
     bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
-    if (m_dialog != Dialog::INVITE_SENT && m_dialog != Dialog::CANCELLED)
+    if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::OVER;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
-    forgetInvite();
+    m_invite.forget();
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else
@@ -213,14 +229,14 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
-    if (m_dialog == Dialog::CANCELLED)
+    if (advance(SipDialogState::TIMEOUT) == SipDialogState::IGNORE)
+        return;
+    if (m_dialog == SipDialogState::OVER)
     {
-        forgetInvite();
-        setDialog(Dialog::OVER);
+        m_invite.forget();
+        finishIfDone();
         return;
     }
-    if (m_dialog != Dialog::INVITE_SENT)
-        return;
     trace("the callee has not answered in time");
     bool const hasRung = m_hasRung;
     clear({hasRung ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING, hasRung ? 480u : 408u, {}});
@@ -230,33 +246,23 @@ void SipEndpoint::confirmDialog(sip_t const* response)
 {
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
-    m_dialog = Dialog::UP;
-    m_isAckLate = true; // whatever comes in between
+    m_timer.stop();
 }
 
-void SipEndpoint::acknowledge(std::string const& sessionDescription)
+void SipEndpoint::acknowledge(Invitation& invitation, std::string const& sessionDescription)
 {
-    // a BYE may have gone out since, but the ACK bears the INVITE's number
-    std::string const sequence = std::to_string(m_inviteSequence) + " ACK";
+    // another request may have gone out since, but the ACK bears the INVITE's number
+    std::string const sequence = std::to_string(invitation.sequence) + " ACK";
     bool const hasSession = !sessionDescription.empty();
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
-    m_isAckLate = false;
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(m_ack);
-    m_ack = nta_outgoing_tcreate(m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr,
-                                 SIPTAG_CSEQ_STR(sequence.c_str()),
-                                 TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                                 TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
-}
-
-/// The other side's answer to the offer that came with our 200 is here.
-void SipEndpoint::acknowledgeLate()
-{
-    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
-    if (session.empty())
-        return;
-    m_quality.noteAnswer(session);
-    acknowledge(session);
+    if (m_lateAck == &invitation)
+        m_lateAck = nullptr;
+    if (invitation.ack != nullptr)
+        nta_outgoing_destroy(invitation.ack);
+    invitation.ack = nta_outgoing_tcreate(
+        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
+        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
 }
 
 void SipEndpoint::cancel(SipCause const& cause)
@@ -264,17 +270,16 @@ void SipEndpoint::cancel(SipCause const& cause)
     std::string const reason = cause.getReasonHeader(true);
     trace("-> CANCEL, Reason: " + reason);
     m_byeAfterAck = cause; // should it be answered all the same
-    m_dialog = Dialog::CANCELLED;
-    nta_outgoing_tcancel(m_invite, nullptr, nullptr, SIPTAG_REASON_STR(reason.c_str()), TAG_END());
+    nta_outgoing_tcancel(m_invite.transaction, nullptr, nullptr, SIPTAG_REASON_STR(reason.c_str()), TAG_END());
     m_timer.start(m_interface.getConfiguration().t1x64);
 }
 
-void SipEndpoint::forgetInvite()
+void SipEndpoint::Invitation::forget()
 {
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(std::exchange(m_ack, nullptr));
-    if (m_invite == nullptr)
+    if (ack != nullptr)
+        nta_outgoing_destroy(std::exchange(ack, nullptr));
+    if (transaction == nullptr)
         return;
-    nta_outgoing_bind(m_invite, nullptr, nullptr);
-    nta_outgoing_destroy(std::exchange(m_invite, nullptr));
+    nta_outgoing_bind(transaction, nullptr, nullptr);
+    nta_outgoing_destroy(std::exchange(transaction, nullptr));
 }

@@ -20,14 +20,12 @@ namespace
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
 
 /// What the INVITE tells of its side beyond the party that calls.
-void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, std::string const& session)
+void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession)
 {
     if (!second.number.empty())
         second.addAsSecondTo(own);
     SipDiversion::READ(request).addTo(own);
-    if (!session.empty())
-        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, !session.empty())); // else a new leg's: none
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, hasSession)); // else a new leg's: none
 }
 } // namespace
 
@@ -47,7 +45,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
             m_timer.start(0); // as below
             return 0;
         }
-        m_dialog = Dialog::OVER;
+        m_dialog = SipDialogState::OVER;
         leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
         return 503;
     }
@@ -58,9 +56,10 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
 {
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
+    noteAllow(request);
     if (!makeServerDialog(transaction, request))
     {
-        m_dialog = Dialog::OVER;
+        m_dialog = SipDialogState::OVER;
         leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
         return 503;
     }
@@ -84,7 +83,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
-    m_dialog = Dialog::INVITE_RECEIVED;
+    advance(SipDialogState::INVITE_IN);
     return true;
 }
 
@@ -92,9 +91,12 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
 {
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     SipIdentity const caller = SipIdentity::READ_CALLER(request);
     CC_PropertyContainer own;
-    ADD_CALLING(own, caller.second, request, session);
+    ADD_CALLING(own, caller.second, request, m_hasOffer);
+    if (m_hasOffer)
+        m_session.addOffer(own, session);
     CC_PropertyContainer offer;
     unsigned long const maxForwards =
         request->sip_max_forwards != nullptr ? request->sip_max_forwards->mf_count : DEFAULT_MAX_FORWARDS;
@@ -132,27 +134,22 @@ int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, si
 
 void SipEndpoint::onAck(sip_t const* request)
 {
-    if (m_dialog != Dialog::ANSWERED)
+    if (advance(SipDialogState::ACK_IN) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::UP;
     forgetTransaction(); // it would live on for half a minute
     trace("<- ACK");
-    if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
-    {
-        m_quality.noteAnswer(session);
-        CC_PropertyContainer own;
-        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-        std::ignore = writeOwn(own); // without memory the called side gives up in its time
-    }
+    if (!m_hasOffer && m_isInCall)
+        takeAnswerOfAck(request);
     if (m_byeAfterAck)
-        sendBye(*m_byeAfterAck);
+        endDialog(*m_byeAfterAck);
+    else
+        sendWaitingOffer();
 }
 
 void SipEndpoint::onAckMissing()
 {
-    if (m_dialog != Dialog::ANSWERED)
+    if (advance(SipDialogState::ACK_MISSING) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::UP;
     forgetTransaction();
     trace("the 200 was not acknowledged");
     SipCause const cause = m_byeAfterAck.value_or(SipCause{QCause::RECOVERY_ON_TIMER_EXPIRY, 0, {}});
@@ -162,7 +159,7 @@ void SipEndpoint::onAckMissing()
 
 void SipEndpoint::onCancel(sip_t const* request)
 {
-    if (m_dialog != Dialog::INVITE_RECEIVED)
+    if (advance(SipDialogState::CANCEL_IN) == SipDialogState::IGNORE)
         return; // answered already: the BYE will follow
     trace("<- CANCEL");
     SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
@@ -177,8 +174,6 @@ void SipEndpoint::followPeer()
     if (state == nullptr)
         return;
     m_hadPeer = true;
-    if (m_dialog != Dialog::INVITE_RECEIVED)
-        return;
     auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
     bool const hasData = data != nullptr && data->getValue();
     if (state->getState() >= CC_PropertyCallLegState::HELD)
@@ -192,13 +187,16 @@ void SipEndpoint::followPeer()
 void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
 {
     m_hasEarlyMedia = m_hasEarlyMedia || hasData;
-    answerFromPeer(status, phrase, hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string());
+    answerFromPeer(status, phrase, hasData && m_hasOffer ? m_session.readForInvite(true) : std::string());
 }
 
 void SipEndpoint::answer()
 {
-    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
-    m_dialog = Dialog::ANSWERED;
+    std::string const session = m_session.readForInvite(m_hasOffer);
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
+    m_session.noteSettled();
+    answerFromPeer(SIP_200_OK, session);
+    advance(SipDialogState::ANSWER_OUT);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
 }
@@ -223,7 +221,6 @@ void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHe
     nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
                         TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
     forgetTransaction(); // the stack goes on repeating the answer until its ACK
-    setDialog(Dialog::OVER);
 }
 
 void SipEndpoint::forgetTransaction()

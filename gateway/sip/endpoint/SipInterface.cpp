@@ -21,7 +21,7 @@
 
 namespace
 {
-constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS";
+constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 } // namespace
 
@@ -160,6 +160,11 @@ int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request)
         nta_incoming_treply(transaction, 400, "Missing Contact Header", TAG_END());
         return 400;
     }
+    return checkContent(transaction, request);
+}
+
+int SipInterface::checkContent(nta_incoming_t* transaction, sip_t const* request) const
+{
     if (int const refused = nta_check_required(transaction, request, nullptr, TAG_END()); refused != 0)
         return refused;
     bool const isSession =

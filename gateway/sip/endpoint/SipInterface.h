@@ -50,6 +50,9 @@ public:
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
     int answerOptions(nta_incoming_t* transaction) const;
+    /// Answers a request that asks for an extension which we do not have, or has a body that is no session description:
+    /// 420, 415; 0 for any other.
+    int checkContent(nta_incoming_t* transaction, sip_t const* request) const;
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
     /// The endpoint is done; it is destroyed in the loop's next turn.

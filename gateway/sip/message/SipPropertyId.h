@@ -7,14 +7,16 @@
 /// modules.
 namespace SipPropertyId
 {
-/// CC_PropertyString, of a leg: its side's own offer or answer
-inline constexpr unsigned int SESSION_DESCRIPTION = CC_PropertyId::FIRST_OF_MODULES;
+/// SipSessionWord, of a leg: its side's own last offer
+inline constexpr unsigned int SESSION_OFFER = CC_PropertyId::FIRST_OF_MODULES;
 /// CC_PropertyUnsigned, of a call: the gateway's number for it
 inline constexpr unsigned int CALL_NUMBER = CC_PropertyId::FIRST_OF_MODULES + 1;
 /// CC_PropertyUnsigned, of an offer: how many hops are left
 inline constexpr unsigned int MAX_FORWARDS = CC_PropertyId::FIRST_OF_MODULES + 2;
+/// SipSessionWord, of a leg: what became of the other side's offer
+inline constexpr unsigned int SESSION_ANSWER = CC_PropertyId::FIRST_OF_MODULES + 3;
 
-/// Declares the names of these three, with which logs and dumps show them from then on: OK, also when they have these
+/// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.
 XCode DECLARE();
 /// The name of any property id, these included once they are declared; "(unknown)" otherwise.
