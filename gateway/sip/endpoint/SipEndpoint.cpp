@@ -66,6 +66,9 @@ SipEndpoint::~SipEndpoint()
     }
     if (m_leg != nullptr)
         nta_leg_destroy(m_leg);
+    for (nta_leg_t* const leg : m_otherLegs)
+        if (leg != nullptr)
+            nta_leg_destroy(leg);
 }
 
 String const& SipEndpoint::getName() const { return m_interface.getName(); }

@@ -17,6 +17,7 @@
 #include <new>
 #include <optional>
 #include <string>
+#include <vector>
 
 class SipInterface;
 
@@ -72,6 +73,12 @@ private:
 
         void forget();
     };
+    /// One of those whom a proxy of the called side has asked, by the tag of its dialog.
+    struct Fork
+    {
+        std::string tag;
+        bool hasRung = false;
+    };
 
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
@@ -86,7 +93,10 @@ private:
     void onCancel(sip_t const* request);
     void followPeer();
     void answer();
-    void answerProvisionally(int status, char const* phrase, bool hasData);
+    void answerProvisionally(int status, char const* phrase);
+    void repeatProvisional();
+    void useFork(unsigned int fork);
+    nta_leg_t* makeFork();
     void answerFromPeer(int status, char const* phrase, std::string const& session);
     void answerFinally(unsigned int status, std::string const& reasonHeader);
     void forgetTransaction();
@@ -103,6 +113,8 @@ private:
     void onRejected(unsigned int status, sip_t const* response);
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
+    Fork* findFork(sip_t const* response);
+    void addFork(CC_PropertyContainer& own, Fork const* fork);
     void acknowledge(Invitation& invitation, std::string const& sessionDescription);
     void cancel(SipCause const& cause);
 
@@ -193,6 +205,11 @@ private:
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
+    int m_provisional = 0;      // the status that we sent last
+    std::string m_earlySession; // with it, or with one before
+    unsigned int m_fork = 0;
+    std::vector<nta_leg_t*> m_otherLegs; // calling side: of forks; the number of our leg is m_fork
+    std::vector<Fork> m_forks;           // called side: who was heard of, first come first
     bool m_wasAnswered = false;
     bool m_hadPeer = false;
     bool m_isInCall = false;

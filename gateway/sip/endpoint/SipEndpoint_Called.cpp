@@ -140,16 +140,21 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
 {
     if (m_dialog != SipDialogState::INVITE_SENT || response == nullptr)
         return;
-    m_hasRung = m_hasRung || status == 180;
     trace("<- " + std::to_string(status));
+    Fork* const fork = findFork(response);
+    m_hasRung = m_hasRung || status == 180;
+    if (fork != nullptr && status == 180)
+        fork->hasRung = true;
+    bool const isRinging = fork != nullptr ? fork->hasRung : m_hasRung;
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
+    addFork(own, fork);
     ADD_CONNECTED(own, response);
     if (m_hasOffer)
         addSession(own, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
         ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
-    ADD_STATE(own, m_hasRung ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
+    ADD_STATE(own, isRinging ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
     std::ignore = writeOwn(own); // what memory refuses the other side does not hear; the next answer may fit
 }
 
@@ -206,6 +211,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
         m_offerOfPeer = session;
     }
     CC_PropertyContainer own;
+    addFork(own, findFork(response));
     ADD_CONNECTED(own, response);
     addSession(own, session);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
@@ -247,6 +253,29 @@ void SipEndpoint::confirmDialog(sip_t const* response)
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
     m_timer.stop();
+}
+
+// Several parties may answer what a proxy has forked: the first 200 wins (RFC 3261, 13.2.2.4). Any other gets its ACK
+// and a BYE from the stack, which hands us nothing more of it.
+
+/// Null for a response that is of no dialog.
+SipEndpoint::Fork* SipEndpoint::findFork(sip_t const* response)
+{
+    if (response->sip_to == nullptr || response->sip_to->a_tag == nullptr)
+        return nullptr;
+    std::string_view const tag = response->sip_to->a_tag;
+    auto const found = std::find_if(m_forks.begin(), m_forks.end(), [&](Fork const& fork) { return fork.tag == tag; });
+    return found != m_forks.end() ? &*found : &m_forks.emplace_back(Fork{std::string(tag)});
+}
+
+/// Tells the other side whose news comes with it, when that is not whose the last one was.
+void SipEndpoint::addFork(CC_PropertyContainer& own, Fork const* fork)
+{
+    if (fork == nullptr)
+        return;
+    auto const number = static_cast<unsigned int>(fork - m_forks.data());
+    if (number != std::exchange(m_fork, number))
+        ADD(own, CC_PropertyUnsigned(SipPropertyId::FORK, number));
 }
 
 void SipEndpoint::acknowledge(Invitation& invitation, std::string const& sessionDescription)

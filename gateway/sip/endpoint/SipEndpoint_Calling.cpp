@@ -11,13 +11,18 @@
 #include "sip/message/SipProperty.h"
 #include "sip/message/SipPropertyId.h"
 
+#include <algorithm>
+#include <cstring>
 #include <tuple>
+#include <utility>
 
 using namespace SipProperty;
 
 namespace
 {
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 70;
+constexpr unsigned int LONGEST_SILENCE = 60000; // milliseconds
+constexpr unsigned int MOST_FORKS = 32;
 
 /// What the INVITE tells of its side beyond the party that calls.
 void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession)
@@ -175,19 +180,77 @@ void SipEndpoint::followPeer()
         return;
     m_hadPeer = true;
     auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
+    auto const* const fork = getPeer<CC_PropertyUnsigned>(SipPropertyId::FORK);
     bool const hasData = data != nullptr && data->getValue();
+    unsigned int const number = fork != nullptr ? static_cast<unsigned int>(fork->getValue()) : 0;
+    bool const isNews = number != m_fork; // of another party
+    if (isNews)
+    {
+        useFork(number);
+        m_hasRung = m_hasEarlyMedia = false;
+    }
     if (state->getState() >= CC_PropertyCallLegState::HELD)
+    {
         answer();
-    else if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
-        answerProvisionally(SIP_180_RINGING, hasData);
-    else if (hasData && !m_hasEarlyMedia)
-        answerProvisionally(SIP_183_SESSION_PROGRESS, hasData);
+        return;
+    }
+    std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
+    bool const isNewSession = session != m_earlySession;
+    m_earlySession = std::move(session);
+    bool const hadEarlyMedia = std::exchange(m_hasEarlyMedia, m_hasEarlyMedia || hasData);
+    if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
+        answerProvisionally(SIP_180_RINGING);
+    else if (hasData && (!hadEarlyMedia || isNewSession))
+        answerProvisionally(SIP_183_SESSION_PROGRESS);
 }
 
-void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
+void SipEndpoint::answerProvisionally(int status, char const* phrase)
 {
-    m_hasEarlyMedia = m_hasEarlyMedia || hasData;
-    answerFromPeer(status, phrase, hasData && m_hasOffer ? m_session.readForInvite(true) : std::string());
+    m_provisional = status;
+    answerFromPeer(status, phrase, m_earlySession);
+    unsigned int const interval = 120 * m_interface.getConfiguration().t1; // a minute, unless the network is a fast one
+    m_offerTimer.start(std::min(interval, LONGEST_SILENCE));
+}
+
+/// So that no proxy on the way gives the call up (RFC 3261, 13.3.1.1).
+void SipEndpoint::repeatProvisional() { answerProvisionally(m_provisional, nullptr); }
+
+// A proxy of the called side may ask several parties at once. Each of them is a dialog of its own for the caller, with
+// a tag of its own, until one has answered (RFC 3261, 12.1).
+
+/// What is said from now on that one says, with the tag of its dialog.
+void SipEndpoint::useFork(unsigned int fork)
+{
+    if (fork >= MOST_FORKS)
+        return; // speaks as the one before
+    if (m_otherLegs.size() <= std::max(fork, m_fork))
+        m_otherLegs.resize(std::max(fork, m_fork) + 1);
+    nta_leg_t* const leg = m_otherLegs[fork] != nullptr ? m_otherLegs[fork] : makeFork();
+    if (leg == nullptr)
+        return;
+    m_otherLegs[fork] = nullptr;
+    m_otherLegs[m_fork] = std::exchange(m_leg, leg);
+    m_fork = fork;
+    // The stack has one tag per INVITE, with which it answers and knows the ACK. All its tags are of one length.
+    char const* const old = nta_incoming_gettag(m_transaction);
+    char const* const tag = nta_leg_get_tag(m_leg);
+    if (old != nullptr && std::strlen(old) == std::strlen(tag))
+        std::memcpy(const_cast<char*>(old), tag, std::strlen(tag));
+}
+
+nta_leg_t* SipEndpoint::makeFork()
+{
+    msg_t* const message = nta_incoming_getrequest(m_transaction);
+    sip_t const* const request = sip_object(message);
+    nta_leg_t* const leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(request->sip_call_id),
+                                           SIPTAG_FROM(request->sip_to), SIPTAG_TO(request->sip_from), TAG_END());
+    if (leg != nullptr)
+    {
+        nta_leg_tag(leg, nullptr);
+        nta_leg_server_route(leg, request->sip_record_route, request->sip_contact);
+    }
+    msg_destroy(message);
+    return leg;
 }
 
 void SipEndpoint::answer()
@@ -195,6 +258,7 @@ void SipEndpoint::answer()
     std::string const session = m_session.readForInvite(m_hasOffer);
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
     m_session.noteSettled();
+    m_offerTimer.stop();
     answerFromPeer(SIP_200_OK, session);
     advance(SipDialogState::ANSWER_OUT);
     m_wasAnswered = true;

@@ -360,13 +360,17 @@ void SipEndpoint::ON_OFFER_TIMER(void* endpoint)
     self.handle(
         [&]
         {
-            if (self.m_isOffering)
+            if (self.m_dialog == SipDialogState::INVITE_RECEIVED)
+                self.repeatProvisional();
+            else if (self.m_isOffering)
             {
                 self.startOffer(self.m_offer, self.m_isOfferQuick);
-                return;
             }
-            self.m_session.withdraw(); // the other side does not know what to say
-            self.refuseOffer(504);
+            else
+            {
+                self.m_session.withdraw(); // the other side does not know what to say
+                self.refuseOffer(504);
+            }
         });
 }
 

@@ -15,6 +15,9 @@ inline constexpr unsigned int CALL_NUMBER = CC_PropertyId::FIRST_OF_MODULES + 1;
 inline constexpr unsigned int MAX_FORWARDS = CC_PropertyId::FIRST_OF_MODULES + 2;
 /// SipSessionWord, of a leg: what became of the other side's offer
 inline constexpr unsigned int SESSION_ANSWER = CC_PropertyId::FIRST_OF_MODULES + 3;
+/// CC_PropertyUnsigned, of a leg: which of the parties that a proxy has called says what the leg says now, counted from
+/// 0 as they were first heard of
+inline constexpr unsigned int FORK = CC_PropertyId::FIRST_OF_MODULES + 4;
 
 /// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.
