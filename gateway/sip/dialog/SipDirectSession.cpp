@@ -56,9 +56,15 @@ void SipDirectSession::addOffer(CC_PropertyContainer& own, std::string const& de
     ADD(own, SipSessionWord(SipPropertyId::SESSION_OFFER, makeOffer(description, false)));
 }
 
-void SipDirectSession::addAnswer(CC_PropertyContainer& own, std::string const& description)
+void SipDirectSession::addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding)
 {
-    ADD(own, SipSessionWord(SipPropertyId::SESSION_ANSWER, {m_peer, m_taken, 0, false, STRING(description)}));
+    ADD(own, SipSessionWord(SipPropertyId::SESSION_ANSWER, {m_peer, m_taken, 0, isBinding, STRING(description)}));
+}
+
+bool SipDirectSession::isAnswerBinding() const
+{
+    SipSessionWord::Content const* const word = getPeerWord(SipPropertyId::SESSION_ANSWER);
+    return word != nullptr && word->isQuick;
 }
 
 std::string SipDirectSession::readFirstOffer()

@@ -30,10 +30,12 @@ public:
 
     /// Our peer's offer in its INVITE, or in the answer to ours.
     void addOffer(CC_PropertyContainer& own, std::string const& description);
-    /// Our peer's answer to the other side's first offer.
-    void addAnswer(CC_PropertyContainer& own, std::string const& description);
+    /// Our peer's answer to the other side's first offer; it may say another thing later unless it is binding.
+    void addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding);
     /// The other side's offer for our INVITE; it counts as taken. Empty without one.
     std::string readFirstOffer();
+    /// Whether what `readForInvite` reads for an offer of ours is binding.
+    bool isAnswerBinding() const;
     /// What the other side says to our INVITE's offer, or offers because it had none; as it is now.
     std::string readForInvite(bool hadOffer);
 

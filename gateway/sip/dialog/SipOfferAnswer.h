@@ -65,6 +65,8 @@ public:
     };
 
     State getState() const { return m_state; }
+    /// Whether anything was ever agreed on.
+    bool hasAgreed() const { return m_wasAgreed; }
     bool isOpen() const { return m_state == OURS || m_state == THEIRS; }
     /// An INVITE without a description: the next 1xx or 2xx brings the offer.
     void noteOfferlessInvite() { m_isOfferWanted = true; }

@@ -19,8 +19,8 @@ public:
         unsigned long long to = 0; ///< the Call-Leg-ID of whom it is for; 0: of whoever is offered the call
         unsigned int number = 0;   ///< of the offer
         unsigned int refusal = 0;  ///< of an answer: the SIP status with which the offer is refused; 0: it is not
-        bool isQuick = false;      ///< an offer of which nobody is to be asked
-        String description{};      ///< of an offer, empty: the other side is asked to offer
+        bool isQuick = false; ///< an offer of which nobody is to be asked; an answer that binds before the call is up
+        String description{}; ///< of an offer, empty: the other side is asked to offer
 
         friend bool operator==(Content const&, Content const&) = default;
     };

@@ -66,6 +66,7 @@ SipEndpoint::~SipEndpoint()
     }
     if (m_leg != nullptr)
         nta_leg_destroy(m_leg);
+    forgetForks();
     for (nta_leg_t* const leg : m_otherLegs)
         if (leg != nullptr)
             nta_leg_destroy(leg);
@@ -94,9 +95,14 @@ void SipEndpoint::followCall(CC_Flags const& flags)
 {
     traceFlags(flags);
     if (isPeerReleased())
+    {
         onPeerReleased();
-    else if (m_dialog == SipDialogState::INVITE_RECEIVED)
+        return;
+    }
+    if (m_dialog == SipDialogState::INVITE_RECEIVED)
         followPeer();
+    if (isAgreedEarly())
+        m_session.follow(false);
     else if (m_dialog == SipDialogState::ANSWERED || m_dialog == SipDialogState::UP)
         m_session.follow(m_dialog == SipDialogState::UP && m_lateAck == nullptr && !m_isOffering &&
                          m_offerReceived == nullptr);

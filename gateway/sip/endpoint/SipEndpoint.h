@@ -78,6 +78,9 @@ private:
     {
         std::string tag;
         bool hasRung = false;
+        unsigned int sequence = 0; ///< of its last reliable provisional response, 0: none
+        nta_leg_t* leg = nullptr;  ///< with such responses
+        bool isAgreed = false;     ///< one of them had the answer
     };
 
     // calling side: SipEndpoint_Calling.cpp
@@ -95,6 +98,10 @@ private:
     void answer();
     void answerProvisionally(int status, char const* phrase);
     void repeatProvisional();
+    bool answerReliably(int status, char const* phrase, std::string const& session);
+    static int HANDLE_PRACK(SipEndpoint* endpoint, nta_reliable_t* reliable, nta_incoming_t* transaction,
+                            sip_t const* request);
+    int onPrack(nta_incoming_t* transaction, sip_t const* request);
     void useFork(unsigned int fork);
     nta_leg_t* makeFork();
     void answerFromPeer(int status, char const* phrase, std::string const& session);
@@ -109,11 +116,13 @@ private:
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
     void takeAnswer(sip_t const* response);
-    void addSession(CC_PropertyContainer& own, std::string const& session);
+    void addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding);
     void onRejected(unsigned int status, sip_t const* response);
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
     Fork* findFork(sip_t const* response);
+    bool acceptReliably(Fork& fork, sip_t const* response);
+    void forgetForks();
     void addFork(CC_PropertyContainer& own, Fork const* fork);
     void acknowledge(Invitation& invitation, std::string const& sessionDescription);
     void cancel(SipCause const& cause);
@@ -144,6 +153,7 @@ private:
     void forgetOffer();
     void endOffers();
     void noteAllow(sip_t const* message);
+    bool isAgreedEarly() const;
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
@@ -205,8 +215,11 @@ private:
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
-    int m_provisional = 0;      // the status that we sent last
-    std::string m_earlySession; // with it, or with one before
+    bool m_allowsReliable = false; // calling side: our peer
+    bool m_wantsReliable = false;
+    unsigned int m_unacknowledged = 0; // reliable responses without their PRACK
+    int m_provisional = 0;             // the status that we sent last
+    std::string m_earlySession;        // with it, or with one before
     unsigned int m_fork = 0;
     std::vector<nta_leg_t*> m_otherLegs; // calling side: of forks; the number of our leg is m_fork
     std::vector<Fork> m_forks;           // called side: who was heard of, first come first

@@ -109,6 +109,7 @@ bool SipEndpoint::startInvite(std::string const& uri, std::string const& identit
     m_invite.transaction = nta_outgoing_tcreate(
         m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(uri.c_str()),
         SIPTAG_CONTACT_STR(m_interface.getContact().c_str()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
+        SIPTAG_ALLOW_STR(m_interface.getAllow()), TAG_IF(m_hasOffer, SIPTAG_SUPPORTED_STR("100rel")),
         TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
@@ -145,13 +146,19 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     m_hasRung = m_hasRung || status == 180;
     if (fork != nullptr && status == 180)
         fork->hasRung = true;
+    bool const isReliable = fork != nullptr && response->sip_rseq != nullptr && m_hasOffer &&
+                            sip_has_feature(response->sip_require, "100rel") != 0;
+    if (isReliable && !acceptReliably(*fork, response))
+        return;
     bool const isRinging = fork != nullptr ? fork->hasRung : m_hasRung;
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
     addFork(own, fork);
     ADD_CONNECTED(own, response);
-    if (m_hasOffer)
-        addSession(own, session);
+    if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
+        addSession(own, session, isReliable);
+    if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::RELIABLE, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
         ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
     ADD_STATE(own, isRinging ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
@@ -159,14 +166,14 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
 }
 
 /// What an answer with a session description brings: the description, and that media may come.
-void SipEndpoint::addSession(CC_PropertyContainer& own, std::string const& session)
+void SipEndpoint::addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding)
 {
     if (session.empty())
         return;
     if (m_hasOffer)
     {
         m_quality.noteAnswer(session);
-        m_session.addAnswer(own, session);
+        m_session.addAnswer(own, session, isBinding);
     }
     else
         m_session.addOffer(own, session);
@@ -201,8 +208,15 @@ void SipEndpoint::takeAnswer(sip_t const* response)
 {
     m_wasAnswered = true;
     noteAllow(response);
-    std::string const session = SESSION_OF(response);
-    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::FINAL, session);
+    Fork const* const fork = findFork(response);
+    bool const isAgreed = fork != nullptr && fork->isAgreed; // then a description says nothing new
+    std::string const session = isAgreed ? std::string() : SESSION_OF(response);
+    if (!isAgreed && m_negotiation.getState() == SipOfferAnswer::AGREED) // with another party
+        m_negotiation = SipOfferAnswer();
+    if (!isAgreed && m_negotiation.getState() == SipOfferAnswer::NEW && m_hasOffer)
+        m_negotiation.note(SipOfferAnswer::SENT, SipOfferAnswer::INVITE);
+    if (!isAgreed)
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::FINAL, session);
     if (m_hasOffer || session.empty())
         acknowledge(m_invite, {});
     else
@@ -211,9 +225,9 @@ void SipEndpoint::takeAnswer(sip_t const* response)
         m_offerOfPeer = session;
     }
     CC_PropertyContainer own;
-    addFork(own, findFork(response));
+    addFork(own, fork);
     ADD_CONNECTED(own, response);
-    addSession(own, session);
+    addSession(own, session, true);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
     if (!writeOwn(own).isOk())
         clear({QCause::RESOURCE_UNAVAILABLE, 0, {}}); // nobody would ever hear of the answer
@@ -250,6 +264,11 @@ void SipEndpoint::onAnswerTimeout()
 
 void SipEndpoint::confirmDialog(sip_t const* response)
 {
+    if (Fork* const fork = findFork(response); fork != nullptr && fork->leg != nullptr)
+    {
+        nta_leg_destroy(m_leg);
+        m_leg = std::exchange(fork->leg, nullptr);
+    }
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
     m_timer.stop();
@@ -266,6 +285,39 @@ SipEndpoint::Fork* SipEndpoint::findFork(sip_t const* response)
     std::string_view const tag = response->sip_to->a_tag;
     auto const found = std::find_if(m_forks.begin(), m_forks.end(), [&](Fork const& fork) { return fork.tag == tag; });
     return found != m_forks.end() ? &*found : &m_forks.emplace_back(Fork{std::string(tag)});
+}
+
+/// Sends the PRACK (RFC 3262), in the party's own dialog. False for a response that is repeated or comes before its
+/// turn: it is to be passed over.
+bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
+{
+    auto const sequence = static_cast<unsigned int>(response->sip_rseq->rs_response);
+    if (fork.sequence != 0 && sequence != fork.sequence + 1)
+        return false;
+    if (fork.leg == nullptr)
+        fork.leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(response->sip_call_id),
+                                   SIPTAG_FROM(response->sip_from), SIPTAG_TO(response->sip_to),
+                                   SIPTAG_CSEQ(response->sip_cseq), TAG_END());
+    if (fork.leg == nullptr)
+        return false;
+    nta_leg_client_route(fork.leg, response->sip_record_route, response->sip_contact);
+    noteAllow(response);
+    std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
+    trace("-> PRACK");
+    nta_outgoing_t* const prack = nta_outgoing_tcreate(fork.leg, nullptr, nullptr, nullptr, SIP_METHOD_PRACK, nullptr,
+                                                       SIPTAG_RACK_STR(acknowledged.c_str()), TAG_END());
+    if (prack == nullptr)
+        return false;
+    nta_outgoing_destroy(prack); // the stack goes on by itself
+    fork.sequence = sequence;
+    return true;
+}
+
+void SipEndpoint::forgetForks()
+{
+    for (Fork& fork : m_forks)
+        if (fork.leg != nullptr)
+            nta_leg_destroy(std::exchange(fork.leg, nullptr));
 }
 
 /// Tells the other side whose news comes with it, when that is not whose the last one was.

@@ -62,6 +62,8 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
     noteAllow(request);
+    m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
+    m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
     {
         m_dialog = SipDialogState::OVER;
@@ -153,6 +155,8 @@ void SipEndpoint::onAck(sip_t const* request)
 
 void SipEndpoint::onAckMissing()
 {
+    if (m_dialog == SipDialogState::INVITE_RECEIVED) // nor did a PRACK
+        clear({QCause::RECOVERY_ON_TIMER_EXPIRY, 504, {}});
     if (advance(SipDialogState::ACK_MISSING) == SipDialogState::IGNORE)
         return;
     forgetTransaction();
@@ -188,15 +192,21 @@ void SipEndpoint::followPeer()
     {
         useFork(number);
         m_hasRung = m_hasEarlyMedia = false;
+        m_negotiation = SipOfferAnswer(); // with this party nothing is agreed on
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, m_hasOffer ? "an offer" : "");
     }
     if (state->getState() >= CC_PropertyCallLegState::HELD)
     {
         answer();
         return;
     }
-    std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
-    bool const isNewSession = session != m_earlySession;
-    m_earlySession = std::move(session);
+    bool isNewSession = false;
+    if (!isAgreedEarly()) // else what is new comes with UPDATE
+    {
+        std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
+        isNewSession = session != m_earlySession;
+        m_earlySession = std::move(session);
+    }
     bool const hadEarlyMedia = std::exchange(m_hasEarlyMedia, m_hasEarlyMedia || hasData);
     if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
         answerProvisionally(SIP_180_RINGING);
@@ -207,9 +217,60 @@ void SipEndpoint::followPeer()
 void SipEndpoint::answerProvisionally(int status, char const* phrase)
 {
     m_provisional = status;
-    answerFromPeer(status, phrase, m_earlySession);
+    if (!answerReliably(status, phrase, m_earlySession))
+        answerFromPeer(status, phrase, isAgreedEarly() ? std::string() : m_earlySession);
     unsigned int const interval = 120 * m_interface.getConfiguration().t1; // a minute, unless the network is a fast one
     m_offerTimer.start(std::min(interval, LONGEST_SILENCE));
+}
+
+// Reliable provisional responses (RFC 3262): when the caller insists, or understands them and the answer is binding.
+
+/// Whether it is sent so, or must not be sent at all.
+bool SipEndpoint::answerReliably(int status, char const* phrase, std::string const& session)
+{
+    bool const isAnswer = !session.empty() && !isAgreedEarly() && m_session.isAnswerBinding();
+    if (m_wantsReliable && !m_hasOffer)
+        return true; // it would have to bear an offer, which nobody has made
+    if (!m_wantsReliable && !(m_allowsReliable && isAnswer))
+        return false;
+    std::string const identity =
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+    nta_reliable_t const* const reliable = nta_reliable_treply(
+        m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
+        SIPTAG_ALLOW_STR(m_interface.getAllow()), TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+        TAG_IF(isAnswer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(isAnswer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+    if (reliable == nullptr)
+        return false;
+    trace("-> " + std::to_string(status) + (isAnswer ? " with a session description" : "") + ", reliably");
+    ++m_unacknowledged;
+    if (!isAnswer)
+        return true;
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::RELIABLE, session);
+    m_quality.noteAnswer(session);
+    m_session.noteSettled();
+    return true;
+}
+
+int SipEndpoint::HANDLE_PRACK(SipEndpoint* endpoint, nta_reliable_t* reliable, nta_incoming_t* transaction,
+                              sip_t const* request)
+{
+    nta_reliable_destroy(reliable);
+    int status = 200;
+    if (request != nullptr) // else it never came; the INVITE's end is told apart
+        endpoint->handle([&] { status = endpoint->onPrack(transaction, request); });
+    return status;
+}
+
+int SipEndpoint::onPrack(nta_incoming_t* transaction, sip_t const* request)
+{
+    m_unacknowledged -= m_unacknowledged > 0;
+    bool const hasOffer = !SESSION_OF(request).empty();
+    trace(std::string("<- PRACK, -> ") + (hasOffer ? "488" : "200"));
+    if (hasOffer) // it is acknowledged all the same; an UPDATE may offer
+        nta_incoming_treply(transaction, SIP_488_NOT_ACCEPTABLE, TAG_END());
+    sendWaitingOffer();
+    return hasOffer ? 488 : 200;
 }
 
 /// So that no proxy on the way gives the call up (RFC 3261, 13.3.1.1).
@@ -255,8 +316,9 @@ nta_leg_t* SipEndpoint::makeFork()
 
 void SipEndpoint::answer()
 {
-    std::string const session = m_session.readForInvite(m_hasOffer);
-    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
+    std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
+    if (!isAgreedEarly())
+        noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
     m_session.noteSettled();
     m_offerTimer.stop();
     answerFromPeer(SIP_200_OK, session);

@@ -73,8 +73,11 @@ int SipEndpoint::onOffer(nta_incoming_t* transaction, sip_t const* request)
 
 int SipEndpoint::checkOffer(nta_incoming_t* transaction, sip_t const* request)
 {
-    if (m_dialog != SipDialogState::UP && m_dialog != SipDialogState::ANSWERED)
-        return 481;
+    bool const isEarly = m_dialog == SipDialogState::INVITE_RECEIVED || m_dialog == SipDialogState::INVITE_SENT;
+    if (isEarly && request->sip_request->rq_method == sip_method_invite)
+        return 491;
+    if (isEarly ? !isAgreedEarly() : m_dialog != SipDialogState::UP && m_dialog != SipDialogState::ANSWERED)
+        return isEarly ? 491 : 481;
     if (int const refused = m_interface.checkContent(transaction, request); refused != 0)
         return refused;
     unsigned int const refusal = getOfferRefusal();
@@ -85,6 +88,13 @@ int SipEndpoint::checkOffer(nta_incoming_t* transaction, sip_t const* request)
                             TAG_END());
     }
     return static_cast<int>(refusal);
+}
+
+/// Whether a reliable provisional response has settled the session before the call is up: then an UPDATE may change it.
+bool SipEndpoint::isAgreedEarly() const
+{
+    bool const isEarly = m_dialog == SipDialogState::INVITE_RECEIVED || m_dialog == SipDialogState::INVITE_SENT;
+    return isEarly && m_negotiation.hasAgreed();
 }
 
 /// An offer of theirs beside one of ours is glare, beside another of theirs too early.
@@ -242,13 +252,22 @@ void SipEndpoint::followHold()
 
 // --- ours ------------------------------------------------------------------------------------------------------------
 
-bool SipEndpoint::isAwaitingAck() const { return m_dialog == SipDialogState::ANSWERED || m_isOfferAnswered; }
+/// Or a PRACK: what was said before must have arrived.
+bool SipEndpoint::isAwaitingAck() const
+{
+    return m_dialog == SipDialogState::ANSWERED || m_isOfferAnswered || m_unacknowledged > 0;
+}
 
 void SipEndpoint::sendOffer(std::string const& description, bool isQuick)
 {
     if (m_isOffering || (m_offerReceived != nullptr && !m_isOfferAnswered) || m_lateAck != nullptr)
     {
         m_session.takeRefusal(491);
+        return;
+    }
+    if (m_dialog != SipDialogState::UP && m_dialog != SipDialogState::ANSWERED && !(isAgreedEarly() && m_allowsUpdate))
+    {
+        m_session.takeRefusal(504);
         return;
     }
     m_offer = description;
@@ -266,7 +285,10 @@ void SipEndpoint::sendWaitingOffer()
 
 void SipEndpoint::startOffer(std::string const& description, bool isQuick)
 {
-    bool const isUpdate = isQuick && m_allowsUpdate && !description.empty();
+    bool const isEarly = isAgreedEarly();
+    bool const isUpdate = (isQuick || isEarly) && m_allowsUpdate && !description.empty();
+    bool const hasOtherLeg = isEarly && !m_isCalling && m_fork < m_forks.size() && m_forks[m_fork].leg != nullptr;
+    nta_leg_t* const leg = hasOtherLeg ? m_forks[m_fork].leg : m_leg;
     bool const hasSession = !description.empty();
     trace(std::string(isUpdate ? "-> UPDATE" : "-> INVITE") + " in the dialog" +
           (hasSession ? " with a session description" : ""));
@@ -274,11 +296,11 @@ void SipEndpoint::startOffer(std::string const& description, bool isQuick)
     m_isOffering = true;
     noteSession(SipOfferAnswer::SENT, isUpdate ? SipOfferAnswer::UPDATE : SipOfferAnswer::INVITE, description);
     m_reinvite.transaction = nta_outgoing_tcreate(
-        m_leg, HANDLE_OFFER_RESPONSE, this, nullptr, isUpdate ? sip_method_update : sip_method_invite,
+        leg, HANDLE_OFFER_RESPONSE, this, nullptr, isUpdate ? sip_method_update : sip_method_invite,
         isUpdate ? "UPDATE" : "INVITE", nullptr, SIPTAG_CONTACT_STR(m_interface.getContact().c_str()),
         TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(description.c_str())), TAG_END());
-    m_reinvite.sequence = nta_leg_get_seq(m_leg);
+    m_reinvite.sequence = nta_leg_get_seq(leg);
     if (m_reinvite.transaction == nullptr)
         onOfferRefused(500);
 }
@@ -295,12 +317,13 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
 {
     trace("<- " + std::to_string(status) + " to the offer");
     bool const isInvite = nta_outgoing_method(m_reinvite.transaction) == sip_method_invite;
-    if (status < 300 && response != nullptr && (!m_isOffering || m_dialog != SipDialogState::UP))
+    bool const isUp = m_dialog == SipDialogState::UP || isAgreedEarly() || m_dialog == SipDialogState::ANSWERED;
+    if (status < 300 && response != nullptr && (!m_isOffering || !isUp))
     {
         if (isInvite && m_lateAck != &m_reinvite) // repeated, or late: the call has ended meanwhile
             acknowledge(m_reinvite, {});
     }
-    else if (m_dialog != SipDialogState::UP || !m_isOffering)
+    else if (!isUp || !m_isOffering)
         return;
     else if (status < 300 && response != nullptr)
         onOfferAccepted(response);
@@ -360,12 +383,12 @@ void SipEndpoint::ON_OFFER_TIMER(void* endpoint)
     self.handle(
         [&]
         {
-            if (self.m_dialog == SipDialogState::INVITE_RECEIVED)
-                self.repeatProvisional();
-            else if (self.m_isOffering)
+            if (self.m_isOffering)
             {
                 self.startOffer(self.m_offer, self.m_isOfferQuick);
             }
+            else if (self.m_offerReceived == nullptr && self.m_dialog == SipDialogState::INVITE_RECEIVED)
+                self.repeatProvisional();
             else
             {
                 self.m_session.withdraw(); // the other side does not know what to say

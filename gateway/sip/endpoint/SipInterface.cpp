@@ -21,7 +21,8 @@
 
 namespace
 {
-constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE";
+constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK";
+constexpr char const* SUPPORTED = "100rel";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 } // namespace
 
@@ -34,6 +35,7 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
           SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp)))
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), ALLOW))
+    , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration))
     , m_defaultLeg(nta_leg_tcreate(m_agent.get(), HANDLE, this, NTATAG_NO_DIALOG(1), TAG_END()))
 {
@@ -101,6 +103,8 @@ int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
     return method == sip_method_invite ? receiveInvite(transaction, request) : 481;
 }
 
+char const* SipInterface::getAllow() const { return ALLOW; }
+
 int SipInterface::refuseMethod(nta_incoming_t* transaction, sip_t const* request) const
 {
     return nta_check_method(transaction, request, m_allow, SIPTAG_ALLOW(m_allow), TAG_END());
@@ -165,7 +169,7 @@ int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request)
 
 int SipInterface::checkContent(nta_incoming_t* transaction, sip_t const* request) const
 {
-    if (int const refused = nta_check_required(transaction, request, nullptr, TAG_END()); refused != 0)
+    if (int const refused = nta_check_required(transaction, request, m_supported, TAG_END()); refused != 0)
         return refused;
     bool const isSession =
         request->sip_content_type != nullptr && strcasecmp(request->sip_content_type->c_type, "application/sdp") == 0;

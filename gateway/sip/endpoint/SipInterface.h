@@ -45,6 +45,7 @@ public:
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
     std::string const& getContact() const { return m_contact; }
+    char const* getAllow() const; ///< the methods that we take
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
@@ -74,6 +75,7 @@ private:
     std::string m_contact;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
+    sip_supported_t* m_supported;
     SipAgent m_agent;
     SipLeg m_defaultLeg;
     TYEvent* m_cleanUpEvent = nullptr;
