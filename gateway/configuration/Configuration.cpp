@@ -126,7 +126,7 @@ constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout"});
+    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout", "transfer"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     interface.listen = section.address("listen");
@@ -134,6 +134,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.usesTcp = section.oneOf("transport", "udp", {"udp", "tcp"}) == "tcp";
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
+    interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     return interface;
 }

@@ -45,6 +45,7 @@ struct Configuration
         unsigned int t1 = 500;            ///< milliseconds: the first retransmission
         unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
         unsigned int answerTimeout = 180; ///< seconds that the peer may ring
+        bool transfersOnWire = false;     ///< a peer that is to be transferred is sent REFER; else we dial for it
     };
     /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
     struct Route

@@ -17,6 +17,7 @@ name = "b"
 listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
+transfer = "refer"
 t1 = 100
 t1x64 = 3200
 answer-timeout = 30
@@ -54,6 +55,7 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.t1, 500u);
     EXPECT_EQ(a.t1x64, 32000u);
     EXPECT_EQ(a.answerTimeout, 180u);
+    EXPECT_FALSE(a.transfersOnWire);
     EXPECT_EQ(a.peer.host, "2001:db8::1");
     EXPECT_EQ(a.peer.text(), "[2001:db8::1]:5070");
 }
@@ -76,6 +78,7 @@ TEST(Configuration, EveryKeyIsRead)
     Configuration::Interface const* const b = configuration.findInterface("b");
     ASSERT_NE(b, nullptr);
     EXPECT_TRUE(b->usesTcp);
+    EXPECT_TRUE(b->transfersOnWire);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);

@@ -8,6 +8,8 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyString.h"
+#include "services/CC_ServiceBlindTransfer.h"
+#include "services/CC_ServiceBlindTransferStatus.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipPropertyId.h"
 
@@ -49,12 +51,25 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
 void SipEndpoint::ON_TIMER(void* endpoint)
 {
     auto& self = *static_cast<SipEndpoint*>(endpoint);
-    self.handle([&] { self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout(); });
+    self.handle(
+        [&]
+        {
+            if (self.m_dialog == SipDialogState::UP)
+                self.onReferralTimeout();
+            else
+                self.m_isCalling ? self.onDialFailed() : self.onAnswerTimeout();
+        });
 }
 
 SipEndpoint::~SipEndpoint()
 {
     m_adapter.cleanup();
+    m_target.reset();
+    if (m_refer != nullptr)
+    {
+        nta_outgoing_bind(m_refer, nullptr, nullptr);
+        nta_outgoing_destroy(m_refer);
+    }
     forgetTransaction();
     forgetOffer();
     m_invite.forget();
@@ -86,9 +101,12 @@ InfoContainer& SipEndpoint::getInfo(InfoContainer& info, unsigned int maxLevel, 
     return info;
 }
 
-void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& flags)
+void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const& flags)
 {
-    handle([&] { followCall(flags); });
+    if (&adapter == &m_adapter)
+        handle([&] { followCall(flags); });
+    else
+        handle([&] { followTarget(); });
 }
 
 void SipEndpoint::followCall(CC_Flags const& flags)
@@ -96,10 +114,13 @@ void SipEndpoint::followCall(CC_Flags const& flags)
     traceFlags(flags);
     if (isPeerReleased())
     {
-        onPeerReleased();
+        if (!m_isTransferring) // else our peer is to have the target
+            onPeerReleased();
         return;
     }
-    if (m_dialog == SipDialogState::INVITE_RECEIVED)
+    if (m_dialog == SipDialogState::INVITE_RECEIVED && m_isReplacing)
+        m_session.follow(false);
+    else if (m_dialog == SipDialogState::INVITE_RECEIVED)
         followPeer();
     if (isAgreedEarly())
         m_session.follow(false);
@@ -108,11 +129,20 @@ void SipEndpoint::followCall(CC_Flags const& flags)
                          m_offerReceived == nullptr);
 }
 
-/// Nothing is asked of a SIP side yet: whoever asks sees that nobody took the service.
-void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter&, CC_Service&)
+void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter& adapter, CC_Service& service)
 {
-    if (isTraced())
-        handle([&] { trace("told a service, not taken"); });
+    if (&adapter == &m_adapter)
+        handle([&] { takeService(service); });
+}
+
+void SipEndpoint::takeService(CC_Service& service)
+{
+    if (service.isOfType(CC_ServiceBlindTransfer::TYPE()))
+        onBlindTransfer(static_cast<CC_ServiceBlindTransfer&>(service));
+    else if (service.isOfType(CC_ServiceBlindTransferStatus::TYPE()))
+        endReferral(static_cast<CC_ServiceBlindTransferStatus&>(service).getCause());
+    else
+        trace("told a service, not taken: " + std::string(service.getInfo().view()));
 }
 
 /// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
@@ -160,6 +190,8 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         finishIfDone();
         return;
     }
+    if (std::exchange(m_isTransferring, false) && m_target != nullptr)
+        m_target->drop(cause.cause, 0); // our peer has gone: nobody is there to be transferred
     m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);
     if (m_isCalling)
     {

@@ -19,6 +19,7 @@
 #include <string>
 #include <vector>
 
+class CC_ServiceBlindTransfer;
 class SipInterface;
 
 /// One side of one call: a SIP dialog on the one hand, a call leg on the other.
@@ -45,6 +46,9 @@ public:
     /// which the transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                       SipParty const& called);
+    /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
+    int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
+    bool isReplaceable() const;
     /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
 
@@ -96,6 +100,7 @@ private:
     void onCancel(sip_t const* request);
     void followPeer();
     void answer();
+    void answerWith(std::string const& session);
     void answerProvisionally(int status, char const* phrase);
     void repeatProvisional();
     bool answerReliably(int status, char const* phrase, std::string const& session);
@@ -155,6 +160,24 @@ private:
     void noteAllow(sip_t const* message);
     bool isAgreedEarly() const;
 
+    // SipEndpoint_Transfer.cpp
+    int onRefer(nta_incoming_t* transaction, sip_t const* request);
+    void joinCallOf(SipEndpoint& other);
+    void askPeerToTransfer(std::string const& number, std::string const& headers);
+    void notifyReferrer(unsigned int status, char const* phrase);
+    void endReferral(QCause cause);
+    void onReferralTimeout();
+    void tellTransferStatus(QCause cause);
+    void onBlindTransfer(CC_ServiceBlindTransfer const& transfer);
+    void dialTarget(std::string const& number);
+    void followTarget();
+    void joinTarget();
+    void endTransfer(QCause cause);
+    void refer(std::string const& number);
+    static int HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    int onNotify(sip_t const* request);
+    XCode takePlaceOf(SipEndpoint& replaced, sip_t const* request);
+
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
     /// Runs what something that happened asks for. When memory is out in the middle of it the call is cleared, since
@@ -174,6 +197,7 @@ private:
     void endWithoutWords();
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     void followCall(CC_Flags const& flags);
+    void takeService(CC_Service& service);
     bool sayWhy(SipCause const& cause);
     static void ON_TIMER(void* endpoint);
     int onBye(sip_t const* request);
@@ -241,8 +265,14 @@ private:
     unsigned int m_refusals = 0;     // 491 to ours
     Invitation* m_lateAck = nullptr; // whose ACK must carry an answer that is not here yet
     bool m_allowsUpdate = false;     // our peer
+    bool m_isReferring = false;      // our peer has asked for a transfer that is not done
+    bool m_isTransferring = false;   // the other side's has
+    bool m_hasTarget = false;        // its leg was seen
+    bool m_isReplacing = false;      // our INVITE takes a dialog's place
+    nta_outgoing_t* m_refer = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;
-    TYTimer m_offerTimer;         // an offer is to be repeated; or an answer does not come
-    CC_CallAdapterE164 m_adapter; // last: silenced first
+    TYTimer m_offerTimer;                         // an offer is to be repeated; or an answer does not come
+    std::unique_ptr<CC_CallAdapterE164> m_target; // of a transfer
+    CC_CallAdapterE164 m_adapter;                 // last: silenced first
 };

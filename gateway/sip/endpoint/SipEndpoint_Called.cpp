@@ -5,6 +5,7 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipAddress.h"
@@ -84,6 +85,7 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     Configuration::Interface const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
+    auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
     std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
@@ -93,7 +95,8 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
     std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.listen) +
-                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.listen, uri);
+                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.listen, uri) +
+                                        (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
     return startInvite(uri, identityHeaders,
                        maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
                                               : DEFAULT_MAX_FORWARDS);

@@ -317,9 +317,14 @@ nta_leg_t* SipEndpoint::makeFork()
 void SipEndpoint::answer()
 {
     std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
+    m_session.noteSettled();
+    answerWith(session);
+}
+
+void SipEndpoint::answerWith(std::string const& session)
+{
     if (!isAgreedEarly())
         noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
-    m_session.noteSettled();
     m_offerTimer.stop();
     answerFromPeer(SIP_200_OK, session);
     advance(SipDialogState::ANSWER_OUT);

@@ -139,6 +139,11 @@ void SipEndpoint::sendAnswer(std::string const& description)
         followHold();
         return;
     }
+    if (m_dialog == SipDialogState::INVITE_RECEIVED && m_isReplacing)
+    {
+        answerWith(description);
+        return;
+    }
     if (m_offerReceived == nullptr || m_isOfferAnswered)
         return;
     bool const isUpdate = nta_incoming_method(m_offerReceived) == sip_method_update;
@@ -158,6 +163,8 @@ void SipEndpoint::sendAnswer(std::string const& description)
 
 void SipEndpoint::sendRefusal(unsigned int status)
 {
+    if (m_dialog == SipDialogState::INVITE_RECEIVED && m_isReplacing)
+        clear({SipCause::CAUSE_OF_STATUS(status), status, {}});
     if (m_lateAck == nullptr)
     {
         refuseOffer(status);

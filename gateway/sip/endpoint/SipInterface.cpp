@@ -21,8 +21,8 @@
 
 namespace
 {
-constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK";
-constexpr char const* SUPPORTED = "100rel";
+constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY";
+constexpr char const* SUPPORTED = "100rel, replaces";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 } // namespace
 
@@ -39,11 +39,13 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration))
     , m_defaultLeg(nta_leg_tcreate(m_agent.get(), HANDLE, this, NTATAG_NO_DIALOG(1), TAG_END()))
 {
+    environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
 }
 
 SipInterface::~SipInterface()
 {
+    std::erase(m_environment.interfaces, this);
     m_endpoints.clear();
     m_cleanUpEvent->destroy();
 }
@@ -123,6 +125,8 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         return refused;
     if (int const refused = admit(transaction); refused != 0)
         return refused;
+    if (request->sip_replaces != nullptr)
+        return receiveReplacing(transaction, request);
     SipParty const called = SipIdentity::READ_CALLED(request);
     std::string const number = called.getUser();
     unsigned int const callNumber = ++m_environment.lastCallNumber;
@@ -141,6 +145,30 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         return 503;
     }
     return endpoint->receiveInvite(transaction, request, *to, called);
+}
+
+SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const
+{
+    for (SipInterface const* const interface : m_environment.interfaces)
+        if (nta_leg_t* const leg = nta_leg_by_replaces(interface->getAgent(), replaces))
+            if (auto* const endpoint = dynamic_cast<SipEndpoint*>(nta_leg_magic(leg, HANDLE));
+                endpoint != nullptr && endpoint->isReplaceable())
+                return endpoint;
+    return nullptr;
+}
+
+/// RFC 3891, 3: 481 for a dialog that we do not have, and one that is not up yet is none; 486 for one that must be
+/// early.
+int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* request)
+{
+    SipEndpoint* const replaced = findReplaced(request->sip_replaces);
+    if (replaced == nullptr)
+        return 481;
+    if (request->sip_replaces->rp_early_only)
+        return 486;
+    unsigned int const callNumber = ++m_environment.lastCallNumber;
+    ++m_environment.counters.placed;
+    return makeEndpoint(callNumber).receiveReplacing(transaction, request, *replaced);
 }
 
 int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)

@@ -54,6 +54,8 @@ public:
     /// Answers a request that asks for an extension which we do not have, or has a body that is no session description:
     /// 420, 415; 0 for any other.
     int checkContent(nta_incoming_t* transaction, sip_t const* request) const;
+    /// The endpoint with that dialog, on whatever interface; null when there is none that can be replaced.
+    SipEndpoint* findReplaced(sip_replaces_t const* replaces) const;
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
     /// The endpoint is done; it is destroyed in the loop's next turn.
@@ -62,6 +64,7 @@ public:
 private:
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
+    int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
     int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
     int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
     int admit(nta_incoming_t* transaction);

@@ -18,6 +18,9 @@ inline constexpr unsigned int SESSION_ANSWER = CC_PropertyId::FIRST_OF_MODULES +
 /// CC_PropertyUnsigned, of a leg: which of the parties that a proxy has called says what the leg says now, counted from
 /// 0 as they were first heard of
 inline constexpr unsigned int FORK = CC_PropertyId::FIRST_OF_MODULES + 4;
+/// CC_PropertyString, of a leg that asks for a transfer, and then of the offer: header lines for the INVITE to the
+/// target
+inline constexpr unsigned int HEADERS_FOR_TARGET = CC_PropertyId::FIRST_OF_MODULES + 5;
 
 /// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.
