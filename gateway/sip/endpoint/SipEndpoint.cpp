@@ -10,6 +10,7 @@
 #include "properties/CC_PropertyString.h"
 #include "services/CC_ServiceBlindTransfer.h"
 #include "services/CC_ServiceBlindTransferStatus.h"
+#include "services/CC_ServiceUserInput.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipPropertyId.h"
 
@@ -65,20 +66,16 @@ SipEndpoint::~SipEndpoint()
 {
     m_adapter.cleanup();
     m_target.reset();
-    if (m_refer != nullptr)
-    {
-        nta_outgoing_bind(m_refer, nullptr, nullptr);
-        nta_outgoing_destroy(m_refer);
-    }
+    for (nta_outgoing_t* const request : {m_refer, m_info, m_bye})
+        if (request != nullptr)
+        {
+            nta_outgoing_bind(request, nullptr, nullptr);
+            nta_outgoing_destroy(request);
+        }
     forgetTransaction();
     forgetOffer();
     m_invite.forget();
     m_reinvite.forget();
-    if (m_bye != nullptr)
-    {
-        nta_outgoing_bind(m_bye, nullptr, nullptr);
-        nta_outgoing_destroy(m_bye);
-    }
     if (m_leg != nullptr)
         nta_leg_destroy(m_leg);
     forgetForks();
@@ -141,6 +138,8 @@ void SipEndpoint::takeService(CC_Service& service)
         onBlindTransfer(static_cast<CC_ServiceBlindTransfer&>(service));
     else if (service.isOfType(CC_ServiceBlindTransferStatus::TYPE()))
         endReferral(static_cast<CC_ServiceBlindTransferStatus&>(service).getCause());
+    else if (service.isOfType(CC_ServiceUserInput::TYPE()))
+        onUserInput(static_cast<CC_ServiceUserInput&>(service));
     else
         trace("told a service, not taken: " + std::string(service.getInfo().view()));
 }

@@ -13,13 +13,16 @@
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
 
+#include <deque>
 #include <memory>
 #include <new>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 class CC_ServiceBlindTransfer;
+class CC_ServiceUserInput;
 class SipInterface;
 
 /// One side of one call: a SIP dialog on the one hand, a call leg on the other.
@@ -178,6 +181,12 @@ private:
     int onNotify(sip_t const* request);
     XCode takePlaceOf(SipEndpoint& replaced, sip_t const* request);
 
+    // SipEndpoint_Input.cpp
+    int onInfo(nta_incoming_t* transaction, sip_t const* request);
+    void onUserInput(CC_ServiceUserInput const& input);
+    void sendDigit();
+    static int HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
     /// Runs what something that happened asks for. When memory is out in the middle of it the call is cleared, since
@@ -270,6 +279,8 @@ private:
     bool m_hasTarget = false;        // its leg was seen
     bool m_isReplacing = false;      // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
+    std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
+    nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;
     TYTimer m_offerTimer;                         // an offer is to be repeated; or an answer does not come

@@ -22,6 +22,8 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     case sip_method_invite:
     case sip_method_update:
         return onOffer(transaction, request);
+    case sip_method_info:
+        return onInfo(transaction, request);
     case sip_method_refer:
         return onRefer(transaction, request);
     case sip_method_notify:
