@@ -214,7 +214,8 @@ void READ_ADDRESSES(Section const& section, Configuration::Interface& interface)
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
     section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
-                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout"});
+                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout",
+                   "transfer"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
@@ -228,6 +229,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.tcpIdle = section.number("tcp-idle", interface.tcpIdle, 1, 86400);
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
+    interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     return interface;
 }

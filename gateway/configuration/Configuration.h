@@ -58,6 +58,7 @@ struct Configuration
         unsigned int t1 = 500;            ///< milliseconds: the first retransmission
         unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
         unsigned int answerTimeout = 180; ///< seconds that the peer may ring
+        bool transfersOnWire = false;     ///< a peer that is to be transferred is sent REFER; else we dial for it
 
         /// Where the peers reach it.
         SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }

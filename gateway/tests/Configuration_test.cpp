@@ -17,6 +17,7 @@ name = "b"
 listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
+transfer = "refer"
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -70,6 +71,7 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.answerTimeout, 180u);
     EXPECT_EQ(a.peer.text(), "192.0.2.7:5070");
     EXPECT_EQ(a.getAddress().text(), "127.0.0.1:5060");
+    EXPECT_FALSE(a.transfersOnWire);
 }
 
 TEST(Configuration, EveryKeyIsRead)
@@ -99,6 +101,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(b->maxHeaderSize, 1500u);
     EXPECT_EQ(b->maxConnectionsPerSource, 3u);
     EXPECT_EQ(b->tcpIdle, 4u);
+    EXPECT_TRUE(b->transfersOnWire);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);

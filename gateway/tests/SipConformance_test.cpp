@@ -74,9 +74,6 @@ public:
     {
         switch (ability)
         {
-        case DIGITS_FROM_WIRE:
-        case DIGITS_TO_WIRE:
-            return "the gateway's SIP side knows no digits during a call";
         case LATE_DIGITS:
             return "an INVITE bears a whole number";
         default:
@@ -99,6 +96,10 @@ public:
     void clear(QCause cause) override
     {
         ASIDE([&] { m_agent.clear(static_cast<unsigned int>(cause)); });
+    }
+    void sendDigit(char digit) override
+    {
+        ASIDE([&] { m_agent.sendDigit(digit); });
     }
     void goSilent() override { m_agent.goSilent(); }
 
@@ -151,7 +152,8 @@ private:
     unsigned long getWork() const { return m_agent.getNumberOfMessages() + m_turns; }
     void onEvent(SipUserAgent::Event const& event)
     {
-        static constexpr Seen::What KINDS[] = {Seen::OFFERED, Seen::RINGING, Seen::ANSWERED, Seen::CLEARED};
+        static constexpr Seen::What KINDS[] = {Seen::OFFERED, Seen::RINGING, Seen::ANSWERED, Seen::DIGITS,
+                                               Seen::CLEARED};
         saw({.what = KINDS[event.kind],
              .text = event.number,
              .cause = static_cast<QCause>(event.cause),

@@ -1,13 +1,14 @@
 #include "sip/message/SipPropertyId.h"
 
-#include "properties/CC_PropertyString.h"
+#include "sip/dialog/SipSessionWord.h"
 
 #include <gtest/gtest.h>
 
 TEST(SipPropertyId, OwnAndKnownIdsHaveNames)
 {
     EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK);
-    EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::SESSION_DESCRIPTION), "Session-Description");
+    EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::SESSION_OFFER), "Session-Offer");
+    EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::SESSION_ANSWER), "Session-Answer");
     EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::CALL_NUMBER), "Call-Number");
     EXPECT_STREQ(SipPropertyId::NAME(SipPropertyId::MAX_FORWARDS), "Max-Forwards");
     EXPECT_STREQ(SipPropertyId::NAME(CC_PropertyId::STATE), "State");
@@ -19,7 +20,8 @@ TEST(SipPropertyId, LogsShowTheNamesOfThoseOfTheGateway)
 {
     EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK);
     EXPECT_EQ(SipPropertyId::DECLARE(), XCode::OK) << "a second gateway in the process declares the same";
-    CC_PropertyString const session(SipPropertyId::SESSION_DESCRIPTION, "v=0");
+    SipSessionWord const session(SipPropertyId::SESSION_OFFER, {17, 2, 0, false, "v=0"});
     InfoContainer info;
-    EXPECT_EQ(session.getInfo(info, 9, 0, 9, 0, "").getString_TreeFormat(), "Session-Description: v=0 (String)\n");
+    EXPECT_EQ(session.getInfo(info, 9, 0, 9, 0, "").getString_TreeFormat(),
+              "Session-Offer: 2 (3 bytes) (Session-Word)\n");
 }

@@ -93,9 +93,9 @@ SipUserAgent::SipUserAgent() : m_socket(socket(AF_INET, SOCK_DGRAM | SOCK_NONBLO
 
 SipUserAgent::~SipUserAgent() { close(m_socket); }
 
-void SipUserAgent::send(std::string const& text)
+void SipUserAgent::send(std::string const& text, std::string const& body)
 {
-    std::string const whole = text + "Content-Length: 0\r\n\r\n";
+    std::string const whole = text + "Content-Length: " + std::to_string(body.size()) + "\r\n\r\n" + body;
     sockaddr_in const raw = ADDRESS_OF(m_peer);
     if (sendto(m_socket, whole.data(), whole.size(), 0, reinterpret_cast<sockaddr const*>(&raw), sizeof raw) < 0)
         throw std::runtime_error("the user agent cannot send");
@@ -141,6 +141,11 @@ void SipUserAgent::takeRequest(std::string_view message)
         takeCancel(message, *call);
     else if (message.starts_with("BYE "))
         takeBye(message, *call);
+    else if (message.starts_with("INFO "))
+    {
+        send(ANSWER_TO(message, "200 OK", call->local));
+        tell({.kind = Event::DIGITS, .call = call->number, .number = BETWEEN(std::string(message), "Signal=", "\r")});
+    }
 }
 
 void SipUserAgent::takeInvite(std::string_view message)
@@ -266,6 +271,13 @@ void SipUserAgent::clear(unsigned int cause)
         answerInvite(*call, "480 Temporarily Unavailable", REASON_OF(cause));
 }
 
+void SipUserAgent::sendDigit(char digit)
+{
+    if (Call* const call = findFirst())
+        request(*call, "INFO", makeVia(), ++call->sequence, "Content-Type: application/dtmf-relay\r\n",
+                std::string("Signal=") + digit + "\r\nDuration=100\r\n");
+}
+
 void SipUserAgent::ping()
 {
     std::string const peer = "sip:" + m_peer.text();
@@ -280,11 +292,12 @@ void SipUserAgent::ping()
 }
 
 void SipUserAgent::request(Call const& call, char const* method, std::string const& via, unsigned int sequence,
-                           std::string const& more)
+                           std::string const& more, std::string const& body)
 {
     send(std::string(method) + " " + call.target + " SIP/2.0\r\n" + via + "Max-Forwards: 70\r\nFrom: " + call.local +
-         "\r\nTo: " + call.remote + "\r\nCall-ID: " + call.id + "\r\nCSeq: " + std::to_string(sequence) + " " + method +
-         "\r\n" + more);
+             "\r\nTo: " + call.remote + "\r\nCall-ID: " + call.id + "\r\nCSeq: " + std::to_string(sequence) + " " +
+             method + "\r\n" + more,
+         body);
 }
 
 std::string SipUserAgent::makeVia()

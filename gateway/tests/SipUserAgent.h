@@ -9,7 +9,7 @@
 
 /// A small SIP user agent for tests, plain text over a UDP socket of the loopback: calls, is called, rings, answers,
 /// clears, in one thread with what it talks to. It knows as much of SIP as a gateway on the same machine needs: no
-/// retransmissions of its own, no routes, no authentication, no session descriptions.
+/// retransmissions of its own, no routes, no authentication, no session descriptions, digits by INFO alone.
 ///
 ///     SipUserAgent agent;
 ///     agent.setPeer({"127.0.0.1", 5060});
@@ -26,6 +26,7 @@ public:
             CALLED,  ///< an INVITE to `number`
             RINGING, ///< 180 to ours
             ANSWERED,
+            DIGITS, ///< an INFO with the digit that is the `number`
             CLEARED ///< BYE, CANCEL or a final answer of 300 and above, with the cause of its Reason header; 0: none
         };
         Kind kind;
@@ -52,6 +53,7 @@ public:
     void ring();
     void answer();
     void clear(unsigned int cause);
+    void sendDigit(char digit);
 
     /// From now on nothing is answered, and nothing but pongs heard.
     void goSilent() { m_isSilent = true; }
@@ -80,7 +82,7 @@ private:
         bool isOver = false;
     };
 
-    void send(std::string const& text);
+    void send(std::string const& text, std::string const& body = {});
     void take(std::string_view message);
     void takeRequest(std::string_view message);
     void takeInvite(std::string_view message);
@@ -91,7 +93,7 @@ private:
     void answerInvite(Call& call, char const* status, std::string const& more = {});
     void end(Call& call, unsigned int cause);
     void request(Call const& call, char const* method, std::string const& via, unsigned int sequence,
-                 std::string const& more);
+                 std::string const& more, std::string const& body = {});
     std::string makeVia();
     Call* find(std::string_view id);
     Call* findFirst();

@@ -95,7 +95,7 @@ transports() {
 start_callee() {
     write_scenario "$WORK/$1.xml" "$1"
     sipp "$HOST:$PORT_B" -sf "$WORK/$1.xml" -i "$HOST" -bind_local -p "$PORT_CALLEE" -cp $((PORT + 4)) -mp $((PORT + 10)) \
-        -nostdin -m 1 -timeout 20s -timeout_error -trace_err -error_file "$WORK/callee.log" "${@:2}" >"$WORK/callee.out" 2>&1 &
+        -nostdin -m 1 -timeout ${SIPP_TIMEOUT:-20s} -timeout_error -trace_err -error_file "$WORK/callee.log" "${@:2}" >"$WORK/callee.out" 2>&1 &
     callee_pid=$!
     wait_for_port $callee_pid "$PORT_CALLEE" udp || fail "the callee does not start"
 }
@@ -104,7 +104,7 @@ start_callee() {
 run_caller() {
     write_scenario "$WORK/$1.xml" "$1"
     sipp "$HOST:$PORT_A" -sf "$WORK/$1.xml" -s "$2" -i "$HOST" -bind_local -p "$PORT_CALLER" -cp $((PORT + 5)) \
-        -mp $((PORT + 20)) -nostdin -m 1 -timeout 20s -timeout_error -trace_err -error_file "$WORK/caller.log" "${@:3}" \
+        -mp $((PORT + 20)) -nostdin -m 1 -timeout ${SIPP_TIMEOUT:-20s} -timeout_error -trace_err -error_file "$WORK/caller.log" "${@:3}" \
         >"$WORK/caller.out" 2>&1
 }
 

@@ -104,10 +104,6 @@ send_invite_with() {
     send_text retrans "$(request_text INVITE 1 '[branch]' '' "${@:2}")" "$1"
 }
 send_invite() { send_invite_with "$SDP_OF_CALLER" "$@"; }
-send_reinvite() {
-    invite_step=$step
-    send_text retrans "$(request_text INVITE 2 '[branch]' '[peer_tag_param]')" "$SDP_OF_CALLER"
-}
 send_ack() { send_text '' "$(request_text ACK "${2:-1}" '[branch]' '[peer_tag_param]')" "${1:-}"; }
 # of an answer from 300 on: part of the INVITE's transaction
 send_ack_of_failure() {
@@ -184,7 +180,7 @@ Via:[\$path]
 CSeq: [\$sequence] INVITE
 Contact: <sip:callee@[local_ip]:[local_port];transport=[transport]>" "$SDP_OF_CALLEE"
 }
-# expect_and_keep METHOD, and after other messages answer_kept METHOD: with 200
+# expect_and_keep METHOD, and after other messages answer_kept METHOD [BODY]: with 200
 expect_and_keep() {
     echo "<recv request=\"$1\"><action><ereg regexp=\"[0-9]+\" search_in=\"hdr\" header=\"CSeq:\" assign_to=\"sequence\"/>"
     echo '<ereg regexp=".*" search_in="hdr" header="Via:" assign_to="path"/></action></recv>'
@@ -196,7 +192,8 @@ Via:[\$path]
 From:[\$caller]
 To: <sip:callee@[local_ip]:[local_port]>;tag=[pid]callee[call_number]
 [last_Call-ID:]
-CSeq: [\$sequence] $1" ''
+CSeq: [\$sequence] $1
+Contact: <sip:callee@[local_ip]:[local_port]>" "${2:-}"
 }
 # bye_from_here [HEADER]...: the called side hangs up
 bye_from_here() {
@@ -207,4 +204,46 @@ To:[\$caller]
 [last_Call-ID:]
 CSeq: 1 BYE
 Max-Forwards: 70$(printf '\n%s' "$@")" ''
+}
+
+# --- inside the dialog ------------------------------------------------------------------------------------------------
+# session OWNER VERSION [DIRECTION [PAYLOAD-TYPE [ADDRESS]]]: another session description of a side
+session() {
+    local port=40000
+    [[ $1 == callee ]] && port=50000
+    echo "v=0
+o=$1 1 $2 IN IP4 [local_ip]
+s=-
+c=IN IP4 ${5:-[local_ip]}
+t=0 0
+m=audio $port RTP/AVP ${4:-8}
+a=${3:-sendrecv}"
+}
+# send_offer METHOD SEQUENCE BODY [HEADER]...: a re-INVITE or UPDATE of the calling side
+send_offer() {
+    [[ $1 == INVITE ]] && invite_step=$step
+    send_text retrans "$(request_text "$1" "$2" '[branch]' '[peer_tag_param]' "${@:4}")" "$3"
+}
+# request_from_callee METHOD SEQUENCE BODY [HEADER]...: any request of the called side in its dialog; ACK as well
+request_from_callee() {
+    [[ $1 == INVITE ]] && invite_step=$step
+    local retransmits=retrans branch='[branch]'
+    [[ $1 == ACK ]] && retransmits=''
+    [[ $1 == ACK-OF-FAILURE ]] && retransmits='' branch="[branch-$((step - invite_step))]" && set -- ACK "${@:2}"
+    send_text "$retransmits" "$1 sip:gateway@[remote_ip]:[remote_port] SIP/2.0
+Via: SIP/2.0/[transport] [local_ip]:[local_port];branch=$branch
+From: <sip:callee@[local_ip]:[local_port]>;tag=[pid]callee[call_number]
+To:[\$caller]
+[last_Call-ID:]
+CSeq: $2 $1
+Contact: <sip:callee@[local_ip]:[local_port];transport=[transport]>
+Max-Forwards: 70$(printf '\n%s' "${@:4}")" "$3"
+}
+# respond_again STATUS-AND-PHRASE [BODY [HEADER]...]: to a re-INVITE, repeated until its ACK; respond_once: to any other
+# request inside the dialog
+respond_again() { send_text retrans "$(response_text "$1" "${@:3}")" "${2:-}"; }
+respond_once() { send_text '' "$(response_text "$1" "${@:3}")" "${2:-}"; }
+response_text() { # STATUS-AND-PHRASE [HEADER]...
+    printf '%s\n' "SIP/2.0 $1" '[last_Via:]' '[last_From:]' '[last_To:]' '[last_Call-ID:]' '[last_CSeq:]' \
+        'Contact: <sip:callee@[local_ip]:[local_port];transport=[transport]>' "${@:2}"
 }

@@ -8,6 +8,9 @@
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyString.h"
+#include "services/CC_ServiceBlindTransfer.h"
+#include "services/CC_ServiceBlindTransferStatus.h"
+#include "services/CC_ServiceUserInput.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipPropertyId.h"
 
@@ -42,27 +45,43 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+    , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
 }
 
 void SipEndpoint::ON_TIMER(void* endpoint)
 {
     auto& self = *static_cast<SipEndpoint*>(endpoint);
-    self.handle([&] { self.m_isCalling ? self.onCallingTimer() : self.onAnswerTimeout(); });
+    self.handle(
+        [&]
+        {
+            if (self.m_dialog == SipDialogState::UP)
+                self.onReferralTimeout();
+            else
+                self.m_isCalling ? self.onCallingTimer() : self.onAnswerTimeout();
+        });
 }
 
 SipEndpoint::~SipEndpoint()
 {
     m_adapter.cleanup();
+    m_target.reset();
+    for (nta_outgoing_t* const request : {m_refer, m_info, m_bye})
+        if (request != nullptr)
+        {
+            nta_outgoing_bind(request, nullptr, nullptr);
+            nta_outgoing_destroy(request);
+        }
     forgetTransaction();
-    forgetInvite();
-    if (m_bye != nullptr)
-    {
-        nta_outgoing_bind(m_bye, nullptr, nullptr);
-        nta_outgoing_destroy(m_bye);
-    }
+    forgetOffer();
+    m_invite.forget();
+    m_reinvite.forget();
     if (m_leg != nullptr)
         nta_leg_destroy(m_leg);
+    forgetForks();
+    for (nta_leg_t* const leg : m_otherLegs)
+        if (leg != nullptr)
+            nta_leg_destroy(leg);
 }
 
 String const& SipEndpoint::getName() const { return m_interface.getName(); }
@@ -74,32 +93,55 @@ InfoContainer& SipEndpoint::getInfo(InfoContainer& info, unsigned int maxLevel, 
 {
     String text;
     text.format("%s/%u, %s side, dialog %s", getName().c_str(), m_callNumber, m_isCalling ? "calling" : "called",
-                DIALOG_NAME(m_dialog));
+                SipDialogState::NAME(m_dialog));
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Endpoint", text);
     return info;
 }
 
-void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& flags)
+void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags const& flags)
 {
-    handle([&] { followCall(flags); });
+    if (&adapter == &m_adapter)
+        handle([&] { followCall(flags); });
+    else
+        handle([&] { followTarget(); });
 }
 
 void SipEndpoint::followCall(CC_Flags const& flags)
 {
     traceFlags(flags);
     if (isPeerReleased())
-        onPeerReleased();
-    else if (m_isCalling)
+    {
+        if (!m_isTransferring) // else our peer is to have the target
+            onPeerReleased();
+        return;
+    }
+    if (m_dialog == SipDialogState::INVITE_RECEIVED && m_isReplacing)
+        m_session.follow(false);
+    else if (m_dialog == SipDialogState::INVITE_RECEIVED)
         followPeer();
-    else if (m_isAckLate && flags.get(SipPropertyId::SESSION_DESCRIPTION))
-        acknowledgeLate();
+    if (isAgreedEarly())
+        m_session.follow(false);
+    else if (m_dialog == SipDialogState::ANSWERED || m_dialog == SipDialogState::UP)
+        m_session.follow(m_dialog == SipDialogState::UP && m_lateAck == nullptr && !m_isOffering &&
+                         m_offerReceived == nullptr);
 }
 
-/// Nothing is asked of a SIP side yet: whoever asks sees that nobody took the service.
-void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter&, CC_Service&)
+void SipEndpoint::notifyPeerSynchronousService(CC_CallAdapter& adapter, CC_Service& service)
 {
-    if (isTraced())
-        handle([&] { trace("told a service, not taken"); });
+    if (&adapter == &m_adapter)
+        handle([&] { takeService(service); });
+}
+
+void SipEndpoint::takeService(CC_Service& service)
+{
+    if (service.isOfType(CC_ServiceBlindTransfer::TYPE()))
+        onBlindTransfer(static_cast<CC_ServiceBlindTransfer&>(service));
+    else if (service.isOfType(CC_ServiceBlindTransferStatus::TYPE()))
+        endReferral(static_cast<CC_ServiceBlindTransferStatus&>(service).getCause());
+    else if (service.isOfType(CC_ServiceUserInput::TYPE()))
+        onUserInput(static_cast<CC_ServiceUserInput&>(service));
+    else
+        trace("told a service, not taken: " + std::string(service.getInfo().view()));
 }
 
 /// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
@@ -135,7 +177,8 @@ void SipEndpoint::endWithoutWords()
 {
     if (std::exchange(m_isInCall, false))
         m_adapter.drop(QCause::RESOURCE_UNAVAILABLE, 0);
-    setDialog(Dialog::OVER);
+    m_dialog = SipDialogState::OVER;
+    finishIfDone();
 }
 
 /// Takes the leg out of the call, with the cause in the peer's words.
@@ -146,6 +189,8 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         finishIfDone();
         return;
     }
+    if (std::exchange(m_isTransferring, false) && m_target != nullptr)
+        m_target->drop(cause.cause, 0); // our peer has gone: nobody is there to be transferred
     m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);
     if (m_isCalling)
     {
@@ -187,17 +232,19 @@ void SipEndpoint::recordQuality()
     std::ignore = m_adapter.setOwnQoS(*record); // without memory the call ends without a record
 }
 
-void SipEndpoint::setDialog(Dialog dialog)
+SipDialogState::Action SipEndpoint::advance(SipDialogState::Event event)
 {
-    m_dialog = dialog;
-    finishIfDone();
+    SipDialogState::Step const step = SipDialogState::STEP(m_dialog, event);
+    m_dialog = step.next;
+    return step.action;
 }
 
 void SipEndpoint::finishIfDone()
 {
-    if (m_dialog != Dialog::OVER || m_isInCall || std::exchange(m_isFinished, true))
+    if (m_dialog != SipDialogState::OVER || m_isInCall || std::exchange(m_isFinished, true))
         return;
     m_timer.stop();
+    m_offerTimer.stop();
     m_interface.finish(*this);
 }
 
@@ -206,36 +253,6 @@ XCode SipEndpoint::writeOwn(CC_PropertyContainer const& properties)
     if (isTraced())
         trace("did  " + TEXT_OF(properties));
     return m_adapter.setOwnProperties(properties);
-}
-
-std::string SipEndpoint::getPeerText(unsigned int id) const
-{
-    auto const* const property = getPeer<CC_PropertyString>(id);
-    return property != nullptr ? std::string(property->getValue().view()) : std::string();
-}
-
-char const* SipEndpoint::DIALOG_NAME(Dialog dialog)
-{
-    switch (dialog)
-    {
-    case Dialog::NONE:
-        return "none";
-    case Dialog::INVITE_RECEIVED:
-        return "INVITE received";
-    case Dialog::ANSWERED:
-        return "answered";
-    case Dialog::INVITE_SENT:
-        return "INVITE sent";
-    case Dialog::CANCELLED:
-        return "cancelled";
-    case Dialog::UP:
-        return "up";
-    case Dialog::BYE_SENT:
-        return "BYE sent";
-    case Dialog::OVER:
-        return "over";
-    }
-    return "(unknown)";
 }
 
 // --- trace -----------------------------------------------------------------------------------------------------------
@@ -268,8 +285,6 @@ std::string SipEndpoint::TEXT_OF(CC_Property const& property)
     String value;
     property.getValueString(value);
     std::string const name = SipPropertyId::NAME(property.getId());
-    if (property.getId() == SipPropertyId::SESSION_DESCRIPTION)
-        return name + fmt::format(" ({} bytes)", value.length());
     return name + "=" + ON_ONE_LINE(value.view());
 }
 

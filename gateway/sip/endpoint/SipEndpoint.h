@@ -5,18 +5,24 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/CallTrace.h"
 #include "platform/eventloop/TYTimer.h"
+#include "sip/dialog/SipDialogState.h"
+#include "sip/dialog/SipDirectSession.h"
+#include "sip/dialog/SipOfferAnswer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
 
-#include <spdlog/fmt/fmt.h>
-
+#include <deque>
 #include <memory>
 #include <new>
 #include <optional>
 #include <string>
+#include <utility>
+#include <vector>
 
+class CC_ServiceBlindTransfer;
+class CC_ServiceUserInput;
 class SipInterface;
 
 /// One side of one call: a SIP dialog on the one hand, a call leg on the other.
@@ -26,9 +32,14 @@ class SipInterface;
 ///
 ///     100 PROCEEDING     180 ALERTING     183 PROCEEDING with data     200 CONNECTED     the end RELEASED and a cause
 ///
+/// How the dialog itself goes on is the table of SipDialogState; while it is up,
+///
+///     State HELD: our peer holds     Session-Offer, Session-Answer: what SipDirectSession makes of re-INVITE and
+///     UPDATE
+///
 /// Owned by its interface, which destroys it once both the dialog is over and the leg dropped. Belongs to the thread of
 /// the stack's loop, which is also that of the call-control loop.
-class SipEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, public SipRequestHandler
+class SipEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, public SipRequestHandler, private SipSessionWire
 {
 public:
     SipEndpoint(SipInterface& interface, unsigned int callNumber);
@@ -38,6 +49,9 @@ public:
     /// which the transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                       SipParty const& called);
+    /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
+    int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
+    bool isReplaceable() const;
     /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
 
@@ -57,18 +71,24 @@ public:
     int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
 
 private:
-    enum class Dialog
+    /// An INVITE that we sent, as long as its answer may be repeated and be in need of another ACK.
+    struct Invitation
     {
-        NONE,
-        INVITE_RECEIVED, ///< not answered finally
-        ANSWERED,        ///< 200 sent, the ACK is outstanding
-        INVITE_SENT,
-        CANCELLED, ///< CANCEL sent, the INVITE's final answer is outstanding
-        UP,
-        BYE_SENT,
-        OVER
+        nta_outgoing_t* transaction = nullptr;
+        nta_outgoing_t* ack = nullptr;
+        unsigned int sequence = 0;
+
+        void forget();
     };
-    static char const* DIALOG_NAME(Dialog dialog);
+    /// One of those whom a proxy of the called side has asked, by the tag of its dialog.
+    struct Fork
+    {
+        std::string tag;
+        bool hasRung = false;
+        unsigned int sequence = 0; ///< of its last reliable provisional response, 0: none
+        nta_leg_t* leg = nullptr;  ///< with such responses
+        bool isAgreed = false;     ///< one of them had the answer
+    };
 
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
@@ -80,11 +100,20 @@ private:
     void onCallingTimer();
     static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
     void onAck(sip_t const* request);
+    void takeAnswerOfAck(sip_t const* request);
     void onAckMissing();
     void onCancel(sip_t const* request);
     void followPeer();
     void answer();
-    void answerProvisionally(int status, char const* phrase, bool hasData);
+    void answerWith(std::string const& session);
+    void answerProvisionally(int status, char const* phrase);
+    void repeatProvisional();
+    bool answerReliably(int status, char const* phrase, std::string const& session);
+    static int HANDLE_PRACK(SipEndpoint* endpoint, nta_reliable_t* reliable, nta_incoming_t* transaction,
+                            sip_t const* request);
+    int onPrack(nta_incoming_t* transaction, sip_t const* request);
+    void useFork(unsigned int fork);
+    nta_leg_t* makeFork();
     void answerFromPeer(int status, char const* phrase, std::string const& session);
     void answerFinally(unsigned int status, std::string const& reasonHeader);
     void forgetTransaction();
@@ -96,13 +125,69 @@ private:
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
+    void takeAnswer(sip_t const* response);
+    void addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding);
     void onRejected(unsigned int status, sip_t const* response);
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
-    void acknowledge(std::string const& sessionDescription);
-    void acknowledgeLate();
+    Fork* findFork(sip_t const* response);
+    bool acceptReliably(Fork& fork, sip_t const* response);
+    void forgetForks();
+    void addFork(CC_PropertyContainer& own, Fork const* fork);
+    void acknowledge(Invitation& invitation, std::string const& sessionDescription);
     void cancel(SipCause const& cause);
-    void forgetInvite();
+
+    // while the dialog is up: SipEndpoint_Session.cpp
+    void sendOffer(std::string const& description, bool isQuick) override;
+    void sendAnswer(std::string const& description) override;
+    void sendRefusal(unsigned int status) override;
+    int onOffer(nta_incoming_t* transaction, sip_t const* request);
+    int checkOffer(nta_incoming_t* transaction, sip_t const* request);
+    unsigned int getOfferRefusal() const;
+    int takeOffer(nta_incoming_t* transaction, std::string const& description, bool isUpdate);
+    static int HANDLE_ACK_OR_CANCEL_OF_OFFER(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
+    void onOfferAcknowledged(sip_t const* request);
+    void onOfferCancelled();
+    void refuseOffer(unsigned int status);
+    bool isAwaitingAck() const;
+    void sendWaitingOffer();
+    void startOffer(std::string const& description, bool isQuick);
+    static int HANDLE_OFFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    void onOfferResponse(unsigned int status, sip_t const* response);
+    void onOfferAccepted(sip_t const* response);
+    void onOfferRefused(unsigned int status);
+    void tryAgainLater();
+    static void ON_OFFER_TIMER(void* endpoint);
+    void followHold();
+    void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
+    void forgetOffer();
+    void endOffers();
+    void noteAllow(sip_t const* message);
+    bool isAgreedEarly() const;
+
+    // SipEndpoint_Transfer.cpp
+    int onRefer(nta_incoming_t* transaction, sip_t const* request);
+    void joinCallOf(SipEndpoint& other);
+    void askPeerToTransfer(std::string const& number, std::string const& headers);
+    void notifyReferrer(unsigned int status, char const* phrase);
+    void endReferral(QCause cause);
+    void onReferralTimeout();
+    void tellTransferStatus(QCause cause);
+    void onBlindTransfer(CC_ServiceBlindTransfer const& transfer);
+    void dialTarget(std::string const& number);
+    void followTarget();
+    void joinTarget();
+    void endTransfer(QCause cause);
+    void refer(std::string const& number);
+    static int HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+    int onNotify(sip_t const* request);
+    XCode takePlaceOf(SipEndpoint& replaced, sip_t const* request);
+
+    // SipEndpoint_Input.cpp
+    int onInfo(nta_incoming_t* transaction, sip_t const* request);
+    void onUserInput(CC_ServiceUserInput const& input);
+    void sendDigit();
+    static int HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
@@ -123,26 +208,27 @@ private:
     void endWithoutWords();
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     void followCall(CC_Flags const& flags);
+    void takeService(CC_Service& service);
     bool sayWhy(SipCause const& cause);
     static void ON_TIMER(void* endpoint);
     int onBye(sip_t const* request);
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void endDialog(SipCause const& cause);
-    void setDialog(Dialog dialog);
+    SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
     void onPeerReleased();
     void finishIfDone();
     XCode writeOwn(CC_PropertyContainer const& properties);
     static std::string REASON_OF(sip_t const* message);
+    char const* getContact() const; // of the dialog
     static std::string SESSION_OF(sip_t const* message);
     template <class Property>
     Property const* getPeer(unsigned int id) const
     {
         return dynamic_cast<Property const*>(m_adapter.getPeerProperty(id));
     }
-    std::string getPeerText(unsigned int id) const;
     bool isPeerReleased() const;
 
     bool isTraced() const { return m_ladder != nullptr; }
@@ -155,25 +241,54 @@ private:
     unsigned int m_callNumber;
     std::shared_ptr<CallTrace::Ladder> m_ladder;
     bool m_isCalling = false;
-    Dialog m_dialog = Dialog::NONE;
+    SipDialogState::State m_dialog = SipDialogState::NONE;
     nta_leg_t* m_leg = nullptr;
     nta_incoming_t* m_transaction = nullptr; // the INVITE received
-    nta_outgoing_t* m_invite = nullptr;      // the INVITE sent; kept for answers that are repeated
-    nta_outgoing_t* m_ack = nullptr;
+    Invitation m_invite;
     nta_outgoing_t* m_bye = nullptr;
-    unsigned int m_inviteSequence = 0;
     TYTimer m_timer; // calling side: a dial failed, the INVITE expires; called side: its answer or its end is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
-    bool m_isAckLate = false;              // the ACK is still to be sent: it must carry an answer that is not here yet
-    bool m_isOverTcp = false;              // the INVITE received
+    bool m_isOverTcp = false;              // the dialog: where its Contact points
     bool m_hasDialFailed = false;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
+    bool m_allowsReliable = false; // calling side: our peer
+    bool m_wantsReliable = false;
+    unsigned int m_unacknowledged = 0; // reliable responses without their PRACK
+    int m_provisional = 0;             // the status that we sent last
+    std::string m_earlySession;        // with it, or with one before
+    unsigned int m_fork = 0;
+    std::vector<nta_leg_t*> m_otherLegs; // calling side: of forks; the number of our leg is m_fork
+    std::vector<Fork> m_forks;           // called side: who was heard of, first come first
     bool m_wasAnswered = false;
     bool m_hadPeer = false;
     bool m_isInCall = false;
     bool m_isFinished = false;
     SipQuality m_quality;
-    CC_CallAdapterE164 m_adapter; // last: silenced first
+    SipOfferAnswer m_negotiation;
+    SipDirectSession m_session{m_adapter, *this};
+    nta_incoming_t* m_offerReceived = nullptr; // a re-INVITE or UPDATE that is not done
+    bool m_isOfferAnswered = false;            // that re-INVITE: its ACK is outstanding
+    Invitation m_reinvite;                     // or UPDATE
+    bool m_isOffering = false;                 // ours is not answered, or is to be sent again
+    bool m_isOfferQuick = false;
+    bool m_isOfferWaiting = false; // until an ACK has come
+    std::string m_offer;           // ours
+    std::string m_offerOfPeer;
+    unsigned int m_refusals = 0;     // 491 to ours
+    Invitation* m_lateAck = nullptr; // whose ACK must carry an answer that is not here yet
+    bool m_allowsUpdate = false;     // our peer
+    bool m_isReferring = false;      // our peer has asked for a transfer that is not done
+    bool m_isTransferring = false;   // the other side's has
+    bool m_hasTarget = false;        // its leg was seen
+    bool m_isReplacing = false;      // our INVITE takes a dialog's place
+    nta_outgoing_t* m_refer = nullptr;
+    std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
+    nta_outgoing_t* m_info = nullptr;
+    bool m_isHeldByOffer = false;
+    bool m_isHeld = false;
+    TYTimer m_offerTimer;                         // an offer is to be repeated; or an answer does not come
+    std::unique_ptr<CC_CallAdapterE164> m_target; // of a transfer
+    CC_CallAdapterE164 m_adapter;                 // last: silenced first
 };

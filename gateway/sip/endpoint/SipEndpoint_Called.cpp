@@ -5,6 +5,7 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipAddress.h"
@@ -26,15 +27,6 @@ constexpr unsigned int DEFAULT_MAX_FORWARDS = 69;
 void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State state)
 {
     ADD(properties, CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
-}
-
-/// What an answer with a session description brings: the description, and that media may come.
-void ADD_SESSION(CC_PropertyContainer& properties, std::string const& session)
-{
-    if (session.empty())
-        return;
-    ADD_TEXT(properties, SipPropertyId::SESSION_DESCRIPTION, session);
-    ADD(properties, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
 }
 
 /// Who answers, if the answer says so.
@@ -95,6 +87,7 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     Configuration::Interface const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
+    auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
     std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
@@ -104,7 +97,8 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
     std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
-                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri);
+                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
+                                        (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
     return startInvite(uri, identityHeaders,
                        maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
                                               : DEFAULT_MAX_FORWARDS);
@@ -112,21 +106,23 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
 
 bool SipEndpoint::startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards)
 {
-    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
+    std::string const session = m_session.readFirstOffer();
     std::string const hops = std::to_string(maxForwards);
     m_hasOffer = !session.empty();
+    m_isOverTcp = m_interface.getConfiguration().usesTcp;
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, session);
     trace("-> INVITE " + uri + (m_hasOffer ? " with a session description" : ""));
-    m_invite = nta_outgoing_tcreate(
+    m_invite.transaction = nta_outgoing_tcreate(
         m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(uri.c_str()),
-        SIPTAG_CONTACT_STR(m_interface.getContact(m_interface.getConfiguration().usesTcp).c_str()),
-        SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED_STR(""), SIPTAG_MAX_FORWARDS_STR(hops.c_str()),
+        SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
+        SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces" : "replaces"),
         TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
-    if (m_invite == nullptr)
+    if (m_invite.transaction == nullptr)
         return false;
-    m_inviteSequence = nta_leg_get_seq(m_leg);
-    m_dialog = Dialog::INVITE_SENT;
+    m_invite.sequence = nta_leg_get_seq(m_leg);
+    advance(SipDialogState::INVITE_OUT);
     m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
     return true;
 }
@@ -149,51 +145,95 @@ int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* t
 
 void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
 {
-    if (m_dialog != Dialog::INVITE_SENT || response == nullptr)
+    if (m_dialog != SipDialogState::INVITE_SENT || response == nullptr)
         return;
-    m_hasRung = m_hasRung || status == 180;
     trace("<- " + std::to_string(status));
+    Fork* const fork = findFork(response);
+    m_hasRung = m_hasRung || status == 180;
+    if (fork != nullptr && status == 180)
+        fork->hasRung = true;
+    bool const isReliable = fork != nullptr && response->sip_rseq != nullptr && m_hasOffer &&
+                            sip_has_feature(response->sip_require, "100rel") != 0;
+    if (isReliable && !acceptReliably(*fork, response))
+        return;
+    bool const isRinging = fork != nullptr ? fork->hasRung : m_hasRung;
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
-    if (m_hasOffer)
-        m_quality.noteAnswer(session);
+    addFork(own, fork);
     ADD_CONNECTED(own, response);
-    ADD_SESSION(own, session);
+    if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
+        addSession(own, session, isReliable);
+    if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::RELIABLE, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
         ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
-    ADD_STATE(own, m_hasRung ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
+    ADD_STATE(own, isRinging ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
     std::ignore = writeOwn(own); // what memory refuses the other side does not hear; the next answer may fit
+}
+
+/// What an answer with a session description brings: the description, and that media may come.
+void SipEndpoint::addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding)
+{
+    if (session.empty())
+        return;
+    if (m_hasOffer)
+    {
+        m_quality.noteAnswer(session);
+        m_session.addAnswer(own, session, isBinding);
+    }
+    else
+        m_session.addOffer(own, session);
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
 }
 
 void SipEndpoint::onAnswer(sip_t const* response)
 {
     trace("<- 200");
-    switch (m_dialog)
+    switch (advance(SipDialogState::ANSWER_IN))
     {
-    case Dialog::INVITE_SENT:
-        break;
-    case Dialog::CANCELLED: // the answer crossed our CANCEL
-        m_timer.stop();
+    case SipDialogState::PROCEED:
         confirmDialog(response);
-        acknowledge({});
+        takeAnswer(response);
+        break;
+    case SipDialogState::ACK_AND_BYE:
+        confirmDialog(response);
+        acknowledge(m_invite, {});
         sendBye(m_byeAfterAck.value_or(SipCause{}));
-        return;
-    default: // repeated: our ACK was lost
-        if (!m_isAckLate)
-            acknowledge({});
-        return;
+        break;
+    case SipDialogState::ACKNOWLEDGE:
+        if (m_lateAck != &m_invite)
+            acknowledge(m_invite, {});
+        break;
+    default:
+        break;
     }
-    m_timer.stop();
-    confirmDialog(response);
+}
+
+/// Whoever offered first has the other's answer now, or our peer has offered and its answer comes with the ACK.
+void SipEndpoint::takeAnswer(sip_t const* response)
+{
     m_wasAnswered = true;
-    std::string const session = SESSION_OF(response);
+    noteAllow(response);
+    Fork const* const fork = findFork(response);
+    bool const isAgreed = fork != nullptr && fork->isAgreed; // then a description says nothing new
+    std::string const session = isAgreed ? std::string() : SESSION_OF(response);
+    if (!isAgreed && m_negotiation.getState() == SipOfferAnswer::AGREED) // with another party
+        m_negotiation = SipOfferAnswer();
+    if (!isAgreed && m_negotiation.getState() == SipOfferAnswer::NEW && m_hasOffer)
+        m_negotiation.note(SipOfferAnswer::SENT, SipOfferAnswer::INVITE);
+    if (!isAgreed)
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::FINAL, session);
     if (m_hasOffer || session.empty())
-        acknowledge({});
-    if (m_hasOffer)
-        m_quality.noteAnswer(session);
+        acknowledge(m_invite, {});
+    else
+    {
+        m_lateAck = &m_invite;
+        m_offerOfPeer = session;
+    }
     CC_PropertyContainer own;
+    addFork(own, fork);
     ADD_CONNECTED(own, response);
-    ADD_SESSION(own, session);
+    addSession(own, session, true);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
     if (!writeOwn(own).isOk())
         clear({QCause::RESOURCE_UNAVAILABLE, 0, {}}); // nobody would ever hear of the answer
@@ -202,11 +242,10 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 {
     bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
-    if (m_dialog != Dialog::INVITE_SENT && m_dialog != Dialog::CANCELLED)
+    if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::OVER;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
-    forgetInvite();
+    m_invite.forget();
     if (!isOurs && status == 503 && response->sip_retry_after != nullptr)
         m_interface.leavePeerAlone(response->sip_retry_after->af_delta);
     if (isOurs)
@@ -218,14 +257,14 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
-    if (m_dialog == Dialog::CANCELLED)
+    if (advance(SipDialogState::TIMEOUT) == SipDialogState::IGNORE)
+        return;
+    if (m_dialog == SipDialogState::OVER)
     {
-        forgetInvite();
-        setDialog(Dialog::OVER);
+        m_invite.forget();
+        finishIfDone();
         return;
     }
-    if (m_dialog != Dialog::INVITE_SENT)
-        return;
     trace("the callee has not answered in time");
     bool const hasRung = m_hasRung;
     clear({hasRung ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING, hasRung ? 480u : 408u, {}});
@@ -233,35 +272,86 @@ void SipEndpoint::onAnswerTimeout()
 
 void SipEndpoint::confirmDialog(sip_t const* response)
 {
+    if (Fork* const fork = findFork(response); fork != nullptr && fork->leg != nullptr)
+    {
+        nta_leg_destroy(m_leg);
+        m_leg = std::exchange(fork->leg, nullptr);
+    }
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
-    m_dialog = Dialog::UP;
-    m_isAckLate = true; // whatever comes in between
+    m_timer.stop();
 }
 
-void SipEndpoint::acknowledge(std::string const& sessionDescription)
+// Several parties may answer what a proxy has forked: the first 200 wins (RFC 3261, 13.2.2.4). Any other gets its ACK
+// and a BYE from the stack, which hands us nothing more of it.
+
+/// Null for a response that is of no dialog.
+SipEndpoint::Fork* SipEndpoint::findFork(sip_t const* response)
 {
-    // a BYE may have gone out since, but the ACK bears the INVITE's number
-    std::string const sequence = std::to_string(m_inviteSequence) + " ACK";
+    if (response->sip_to == nullptr || response->sip_to->a_tag == nullptr)
+        return nullptr;
+    std::string_view const tag = response->sip_to->a_tag;
+    auto const found = std::find_if(m_forks.begin(), m_forks.end(), [&](Fork const& fork) { return fork.tag == tag; });
+    return found != m_forks.end() ? &*found : &m_forks.emplace_back(Fork{std::string(tag)});
+}
+
+/// Sends the PRACK (RFC 3262), in the party's own dialog. False for a response that is repeated or comes before its
+/// turn: it is to be passed over.
+bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
+{
+    auto const sequence = static_cast<unsigned int>(response->sip_rseq->rs_response);
+    if (fork.sequence != 0 && sequence != fork.sequence + 1)
+        return false;
+    if (fork.leg == nullptr)
+        fork.leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(response->sip_call_id),
+                                   SIPTAG_FROM(response->sip_from), SIPTAG_TO(response->sip_to),
+                                   SIPTAG_CSEQ(response->sip_cseq), TAG_END());
+    if (fork.leg == nullptr)
+        return false;
+    nta_leg_client_route(fork.leg, response->sip_record_route, response->sip_contact);
+    noteAllow(response);
+    std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
+    trace("-> PRACK");
+    nta_outgoing_t* const prack = nta_outgoing_tcreate(fork.leg, nullptr, nullptr, nullptr, SIP_METHOD_PRACK, nullptr,
+                                                       SIPTAG_RACK_STR(acknowledged.c_str()), TAG_END());
+    if (prack == nullptr)
+        return false;
+    nta_outgoing_destroy(prack); // the stack goes on by itself
+    fork.sequence = sequence;
+    return true;
+}
+
+void SipEndpoint::forgetForks()
+{
+    for (Fork& fork : m_forks)
+        if (fork.leg != nullptr)
+            nta_leg_destroy(std::exchange(fork.leg, nullptr));
+}
+
+/// Tells the other side whose news comes with it, when that is not whose the last one was.
+void SipEndpoint::addFork(CC_PropertyContainer& own, Fork const* fork)
+{
+    if (fork == nullptr)
+        return;
+    auto const number = static_cast<unsigned int>(fork - m_forks.data());
+    if (number != std::exchange(m_fork, number))
+        ADD(own, CC_PropertyUnsigned(SipPropertyId::FORK, number));
+}
+
+void SipEndpoint::acknowledge(Invitation& invitation, std::string const& sessionDescription)
+{
+    // another request may have gone out since, but the ACK bears the INVITE's number
+    std::string const sequence = std::to_string(invitation.sequence) + " ACK";
     bool const hasSession = !sessionDescription.empty();
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
-    m_isAckLate = false;
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(m_ack);
-    m_ack = nta_outgoing_tcreate(m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr,
-                                 SIPTAG_CSEQ_STR(sequence.c_str()),
-                                 TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                                 TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
-}
-
-/// The other side's answer to the offer that came with our 200 is here.
-void SipEndpoint::acknowledgeLate()
-{
-    std::string const session = getPeerText(SipPropertyId::SESSION_DESCRIPTION);
-    if (session.empty())
-        return;
-    m_quality.noteAnswer(session);
-    acknowledge(session);
+    if (m_lateAck == &invitation)
+        m_lateAck = nullptr;
+    if (invitation.ack != nullptr)
+        nta_outgoing_destroy(invitation.ack);
+    invitation.ack = nta_outgoing_tcreate(
+        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
+        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
 }
 
 void SipEndpoint::cancel(SipCause const& cause)
@@ -269,17 +359,16 @@ void SipEndpoint::cancel(SipCause const& cause)
     std::string const reason = cause.getReasonHeader(true);
     trace("-> CANCEL, Reason: " + reason);
     m_byeAfterAck = cause; // should it be answered all the same
-    m_dialog = Dialog::CANCELLED;
-    nta_outgoing_tcancel(m_invite, nullptr, nullptr, SIPTAG_REASON_STR(reason.c_str()), TAG_END());
+    nta_outgoing_tcancel(m_invite.transaction, nullptr, nullptr, SIPTAG_REASON_STR(reason.c_str()), TAG_END());
     m_timer.start(m_interface.getConfiguration().t1x64);
 }
 
-void SipEndpoint::forgetInvite()
+void SipEndpoint::Invitation::forget()
 {
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(std::exchange(m_ack, nullptr));
-    if (m_invite == nullptr)
+    if (ack != nullptr)
+        nta_outgoing_destroy(std::exchange(ack, nullptr));
+    if (transaction == nullptr)
         return;
-    nta_outgoing_bind(m_invite, nullptr, nullptr);
-    nta_outgoing_destroy(std::exchange(m_invite, nullptr));
+    nta_outgoing_bind(transaction, nullptr, nullptr);
+    nta_outgoing_destroy(std::exchange(transaction, nullptr));
 }

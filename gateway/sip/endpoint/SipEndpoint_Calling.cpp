@@ -12,23 +12,26 @@
 #include "sip/message/SipProperty.h"
 #include "sip/message/SipPropertyId.h"
 
+#include <algorithm>
+#include <cstring>
 #include <tuple>
+#include <utility>
 
 using namespace SipProperty;
 
 namespace
 {
 constexpr unsigned long LONGEST_EXPIRY = 86400; // seconds; a longer one is as good as none
+constexpr unsigned int LONGEST_SILENCE = 60000; // milliseconds
+constexpr unsigned int MOST_FORKS = 32;
 
 /// What the INVITE tells of its side beyond the party that calls.
-void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, std::string const& session)
+void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession)
 {
     if (!second.number.empty())
         second.addAsSecondTo(own);
     SipDiversion::READ(request).addTo(own);
-    if (!session.empty())
-        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, !session.empty())); // else a new leg's: none
+    ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, hasSession)); // else a new leg's: none
 }
 } // namespace
 
@@ -48,7 +51,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
             failDialLater();
             return 0;
         }
-        m_dialog = Dialog::OVER;
+        m_dialog = SipDialogState::OVER;
         leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
         return 503;
     }
@@ -59,9 +62,12 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
 {
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
+    noteAllow(request);
+    m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
+    m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
     {
-        m_dialog = Dialog::OVER;
+        m_dialog = SipDialogState::OVER;
         leaveCall({QCause::RESOURCE_UNAVAILABLE, 503, {}});
         return 503;
     }
@@ -95,7 +101,7 @@ void SipEndpoint::onCallingTimer()
         clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
         return;
     }
-    if (m_dialog != Dialog::INVITE_RECEIVED)
+    if (m_dialog != SipDialogState::INVITE_RECEIVED)
         return;
     trace("the INVITE has expired");
     SipCause const cause{QCause::NO_ANSWER_FROM_USER, 487, {}};
@@ -113,7 +119,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
-    m_dialog = Dialog::INVITE_RECEIVED;
+    advance(SipDialogState::INVITE_IN);
     m_isOverTcp = SipRules::CAME_OVER_TCP(request);
     return true;
 }
@@ -122,9 +128,12 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
 {
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     SipIdentity const caller = SipIdentity::READ_CALLER(request);
     CC_PropertyContainer own;
-    ADD_CALLING(own, caller.second, request, session);
+    ADD_CALLING(own, caller.second, request, m_hasOffer);
+    if (m_hasOffer)
+        m_session.addOffer(own, session);
     CC_PropertyContainer offer;
     ADD(offer,
         CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, SipRules::MAX_FORWARDS_AFTER(request))); // else the default
@@ -161,27 +170,24 @@ int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, si
 
 void SipEndpoint::onAck(sip_t const* request)
 {
-    if (m_dialog != Dialog::ANSWERED)
+    if (advance(SipDialogState::ACK_IN) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::UP;
     forgetTransaction(); // it would live on for half a minute
     trace("<- ACK");
-    if (std::string const session = SESSION_OF(request); !m_hasOffer && !session.empty() && m_isInCall)
-    {
-        m_quality.noteAnswer(session);
-        CC_PropertyContainer own;
-        ADD_TEXT(own, SipPropertyId::SESSION_DESCRIPTION, session);
-        std::ignore = writeOwn(own); // without memory the called side gives up in its time
-    }
+    if (!m_hasOffer && m_isInCall)
+        takeAnswerOfAck(request);
     if (m_byeAfterAck)
-        sendBye(*m_byeAfterAck);
+        endDialog(*m_byeAfterAck);
+    else
+        sendWaitingOffer();
 }
 
 void SipEndpoint::onAckMissing()
 {
-    if (m_dialog != Dialog::ANSWERED)
+    if (m_dialog == SipDialogState::INVITE_RECEIVED) // nor did a PRACK
+        clear({QCause::RECOVERY_ON_TIMER_EXPIRY, 504, {}});
+    if (advance(SipDialogState::ACK_MISSING) == SipDialogState::IGNORE)
         return;
-    m_dialog = Dialog::UP;
     forgetTransaction();
     trace("the 200 was not acknowledged");
     SipCause const cause = m_byeAfterAck.value_or(SipCause{QCause::RECOVERY_ON_TIMER_EXPIRY, 0, {}});
@@ -191,7 +197,7 @@ void SipEndpoint::onAckMissing()
 
 void SipEndpoint::onCancel(sip_t const* request)
 {
-    if (m_dialog != Dialog::INVITE_RECEIVED)
+    if (advance(SipDialogState::CANCEL_IN) == SipDialogState::IGNORE)
         return; // answered already: the BYE will follow
     trace("<- CANCEL");
     SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
@@ -206,29 +212,152 @@ void SipEndpoint::followPeer()
     if (state == nullptr)
         return;
     m_hadPeer = true;
-    if (m_dialog != Dialog::INVITE_RECEIVED)
-        return;
     auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
+    auto const* const fork = getPeer<CC_PropertyUnsigned>(SipPropertyId::FORK);
     bool const hasData = data != nullptr && data->getValue();
+    unsigned int const number = fork != nullptr ? static_cast<unsigned int>(fork->getValue()) : 0;
+    bool const isNews = number != m_fork; // of another party
+    if (isNews)
+    {
+        useFork(number);
+        m_hasRung = m_hasEarlyMedia = false;
+        m_negotiation = SipOfferAnswer(); // with this party nothing is agreed on
+        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, m_hasOffer ? "an offer" : "");
+    }
     if (state->getState() >= CC_PropertyCallLegState::HELD)
+    {
         answer();
-    else if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
-        answerProvisionally(SIP_180_RINGING, hasData);
-    else if (hasData && !m_hasEarlyMedia)
-        answerProvisionally(SIP_183_SESSION_PROGRESS, hasData);
+        return;
+    }
+    bool isNewSession = false;
+    if (!isAgreedEarly()) // else what is new comes with UPDATE
+    {
+        std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
+        isNewSession = session != m_earlySession;
+        m_earlySession = std::move(session);
+    }
+    bool const hadEarlyMedia = std::exchange(m_hasEarlyMedia, m_hasEarlyMedia || hasData);
+    if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
+        answerProvisionally(SIP_180_RINGING);
+    else if (hasData && (!hadEarlyMedia || isNewSession))
+        answerProvisionally(SIP_183_SESSION_PROGRESS);
 }
 
-void SipEndpoint::answerProvisionally(int status, char const* phrase, bool hasData)
+void SipEndpoint::answerProvisionally(int status, char const* phrase)
 {
-    m_hasEarlyMedia = m_hasEarlyMedia || hasData;
-    answerFromPeer(status, phrase, hasData ? getPeerText(SipPropertyId::SESSION_DESCRIPTION) : std::string());
+    m_provisional = status;
+    if (!answerReliably(status, phrase, m_earlySession))
+        answerFromPeer(status, phrase, isAgreedEarly() ? std::string() : m_earlySession);
+    unsigned int const interval = 120 * m_interface.getConfiguration().t1; // a minute, unless the network is a fast one
+    m_offerTimer.start(std::min(interval, LONGEST_SILENCE));
+}
+
+// Reliable provisional responses (RFC 3262): when the caller insists, or understands them and the answer is binding.
+
+/// Whether it is sent so, or must not be sent at all.
+bool SipEndpoint::answerReliably(int status, char const* phrase, std::string const& session)
+{
+    bool const isAnswer = !session.empty() && !isAgreedEarly() && m_session.isAnswerBinding();
+    if (m_wantsReliable && !m_hasOffer)
+        return true; // it would have to bear an offer, which nobody has made
+    if (!m_wantsReliable && !(m_allowsReliable && isAnswer))
+        return false;
+    std::string const identity =
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+    nta_reliable_t const* const reliable = nta_reliable_treply(
+        m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
+        SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+        TAG_IF(isAnswer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(isAnswer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+    if (reliable == nullptr)
+        return false;
+    trace("-> " + std::to_string(status) + (isAnswer ? " with a session description" : "") + ", reliably");
+    ++m_unacknowledged;
+    if (!isAnswer)
+        return true;
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::RELIABLE, session);
+    m_quality.noteAnswer(session);
+    m_session.noteSettled();
+    return true;
+}
+
+int SipEndpoint::HANDLE_PRACK(SipEndpoint* endpoint, nta_reliable_t* reliable, nta_incoming_t* transaction,
+                              sip_t const* request)
+{
+    nta_reliable_destroy(reliable);
+    int status = 200;
+    if (request != nullptr) // else it never came; the INVITE's end is told apart
+        endpoint->handle([&] { status = endpoint->onPrack(transaction, request); });
+    return status;
+}
+
+int SipEndpoint::onPrack(nta_incoming_t* transaction, sip_t const* request)
+{
+    m_unacknowledged -= m_unacknowledged > 0;
+    bool const hasOffer = !SESSION_OF(request).empty();
+    trace(std::string("<- PRACK, -> ") + (hasOffer ? "488" : "200"));
+    if (hasOffer) // it is acknowledged all the same; an UPDATE may offer
+        nta_incoming_treply(transaction, SIP_488_NOT_ACCEPTABLE, TAG_END());
+    sendWaitingOffer();
+    return hasOffer ? 488 : 200;
+}
+
+/// So that no proxy on the way gives the call up (RFC 3261, 13.3.1.1).
+void SipEndpoint::repeatProvisional() { answerProvisionally(m_provisional, nullptr); }
+
+// A proxy of the called side may ask several parties at once. Each of them is a dialog of its own for the caller, with
+// a tag of its own, until one has answered (RFC 3261, 12.1).
+
+/// What is said from now on that one says, with the tag of its dialog.
+void SipEndpoint::useFork(unsigned int fork)
+{
+    if (fork >= MOST_FORKS)
+        return; // speaks as the one before
+    if (m_otherLegs.size() <= std::max(fork, m_fork))
+        m_otherLegs.resize(std::max(fork, m_fork) + 1);
+    nta_leg_t* const leg = m_otherLegs[fork] != nullptr ? m_otherLegs[fork] : makeFork();
+    if (leg == nullptr)
+        return;
+    m_otherLegs[fork] = nullptr;
+    m_otherLegs[m_fork] = std::exchange(m_leg, leg);
+    m_fork = fork;
+    // The stack has one tag per INVITE, with which it answers and knows the ACK. All its tags are of one length.
+    char const* const old = nta_incoming_gettag(m_transaction);
+    char const* const tag = nta_leg_get_tag(m_leg);
+    if (old != nullptr && std::strlen(old) == std::strlen(tag))
+        std::memcpy(const_cast<char*>(old), tag, std::strlen(tag));
+}
+
+nta_leg_t* SipEndpoint::makeFork()
+{
+    msg_t* const message = nta_incoming_getrequest(m_transaction);
+    sip_t const* const request = sip_object(message);
+    nta_leg_t* const leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(request->sip_call_id),
+                                           SIPTAG_FROM(request->sip_to), SIPTAG_TO(request->sip_from), TAG_END());
+    if (leg != nullptr)
+    {
+        nta_leg_tag(leg, nullptr);
+        nta_leg_server_route(leg, request->sip_record_route, request->sip_contact);
+    }
+    msg_destroy(message);
+    return leg;
 }
 
 void SipEndpoint::answer()
 {
-    answerFromPeer(SIP_200_OK, getPeerText(SipPropertyId::SESSION_DESCRIPTION));
+    std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
+    m_session.noteSettled();
+    answerWith(session);
+}
+
+void SipEndpoint::answerWith(std::string const& session)
+{
+    if (!isAgreedEarly())
+        noteSession(SipOfferAnswer::SENT, SipOfferAnswer::FINAL, session);
+    m_offerTimer.stop();
     m_timer.stop();
-    m_dialog = Dialog::ANSWERED;
+    answerFromPeer(SIP_200_OK, session);
+    advance(SipDialogState::ANSWER_OUT);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
 }
@@ -241,8 +370,8 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
-    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(m_interface.getContact(m_isOverTcp).c_str()),
-                        SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED_STR(""),
+    nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
+                        SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED(m_interface.getSupported()),
                         TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
                         TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                         TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
@@ -254,7 +383,6 @@ void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHe
     nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
                         TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
     forgetTransaction(); // the stack goes on repeating the answer until its ACK
-    setDialog(Dialog::OVER);
 }
 
 void SipEndpoint::forgetTransaction()

@@ -14,7 +14,9 @@ int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t co
 int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
     sip_method_t const method = request->sip_request->rq_method;
-    if (int const refused = method != sip_method_ack ? SipRules::CHECK_REQUIRED(transaction, request) : 0; refused != 0)
+    if (int const refused =
+            method != sip_method_ack ? SipRules::CHECK_REQUIRED(transaction, request, m_interface.getSupported()) : 0;
+        refused != 0)
         return refused;
     switch (method)
     {
@@ -25,8 +27,14 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     case sip_method_options:
         return m_interface.answerOptions(transaction);
     case sip_method_invite:
-        trace("<- INVITE in the dialog, -> 488");
-        return 488; // sessions are not renegotiated
+    case sip_method_update:
+        return onOffer(transaction, request);
+    case sip_method_info:
+        return onInfo(transaction, request);
+    case sip_method_refer:
+        return onRefer(transaction, request);
+    case sip_method_notify:
+        return onNotify(request);
     default:
         break;
     }
@@ -37,25 +45,17 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
 int SipEndpoint::onBye(sip_t const* request)
 {
     SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
-    trace("<- BYE, -> 200");
-    switch (m_dialog)
-    {
-    case Dialog::INVITE_RECEIVED: // a caller may end its early dialog this way
-        answerFinally(487, {});
-        break;
-    case Dialog::ANSWERED:
-    case Dialog::UP:
-        if (m_isAckLate)
-            acknowledge({});
-        forgetTransaction();
-        setDialog(Dialog::OVER);
-        break;
-    case Dialog::INVITE_SENT:
-    case Dialog::CANCELLED:
+    bool const wasUp = m_dialog == SipDialogState::UP || m_dialog == SipDialogState::ANSWERED;
+    SipDialogState::Action const action = advance(SipDialogState::BYE_IN);
+    if (action == SipDialogState::REFUSE)
         return 481; // there is no dialog yet
-    default:        // both sides hang up at once: ours is answered as well
-        return 200;
-    }
+    trace("<- BYE, -> 200");
+    if (action == SipDialogState::TERMINATE)
+        answerFinally(487, {});
+    else if (!wasUp)
+        return 200; // both sides hang up at once: ours is answered as well
+    endOffers();
+    forgetTransaction();
     leaveCall(cause);
     return 200;
 }
@@ -63,40 +63,38 @@ int SipEndpoint::onBye(sip_t const* request)
 /// Ends the SIP side as its state demands; nothing happens when it is ending already.
 void SipEndpoint::endDialog(SipCause const& cause)
 {
-    switch (m_dialog)
+    switch (advance(SipDialogState::END))
     {
-    case Dialog::INVITE_RECEIVED:
+    case SipDialogState::REJECT:
         answerFinally(cause.getFinalStatus(), cause.getReasonHeader(false));
         break;
-    case Dialog::ANSWERED: // a BYE must not overtake the 200
+    case SipDialogState::BYE_AFTER_ACK:
         if (!m_byeAfterAck)
             m_byeAfterAck = cause;
         break;
-    case Dialog::INVITE_SENT:
+    case SipDialogState::SEND_CANCEL:
         cancel(cause);
         break;
-    case Dialog::UP:
-        if (m_isAckLate)
-            acknowledge({});
+    case SipDialogState::SEND_BYE:
+        endOffers();
         sendBye(cause);
-        break;
-    case Dialog::NONE:
-        setDialog(Dialog::OVER);
         break;
     default:
         break;
     }
+    finishIfDone();
 }
 
 void SipEndpoint::sendBye(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
     trace("-> BYE, Reason: " + reason);
-    m_dialog = Dialog::BYE_SENT;
     m_bye = nta_outgoing_tcreate(m_leg, HANDLE_BYE_RESPONSE, this, nullptr, SIP_METHOD_BYE, nullptr,
                                  SIPTAG_REASON_STR(reason.c_str()), TAG_END());
-    if (m_bye == nullptr)
-        setDialog(Dialog::OVER);
+    if (m_bye != nullptr)
+        return;
+    advance(SipDialogState::BYE_DONE);
+    finishIfDone();
 }
 
 int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)
@@ -107,7 +105,7 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
     bool const isOurs = response == nullptr || nta_sip_is_internal(response);
     nta_outgoing_destroy(transaction);
     endpoint->m_bye = nullptr;
-    endpoint->m_dialog = Dialog::OVER;
+    endpoint->advance(SipDialogState::BYE_DONE);
     endpoint->handle(
         [&] { endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE"); });
     endpoint->finishIfDone();
@@ -128,5 +126,7 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
     }
     return text;
 }
+
+char const* SipEndpoint::getContact() const { return m_interface.getContact(m_isOverTcp).c_str(); }
 
 std::string SipEndpoint::SESSION_OF(sip_t const* message) { return SipBody::READ(message).session; }

@@ -7,7 +7,9 @@
 #include "platform/base/String.h"
 
 #include <functional>
+#include <vector>
 
+class SipInterface;
 class SipStack;
 
 /// What all SIP interfaces of the gateway share. Owned by the gateway, which outlives them.
@@ -20,6 +22,7 @@ struct SipEnvironment
     CallTrace trace;
     Counters counters;
     unsigned int lastCallNumber = 0;
-    bool isEnding = false;                ///< no new calls
-    std::function<void()> onEndpointGone; ///< told when an endpoint was destroyed; may be empty
+    bool isEnding = false;                   ///< no new calls
+    std::function<void()> onEndpointGone;    ///< told when an endpoint was destroyed; may be empty
+    std::vector<SipInterface*> interfaces{}; ///< they enter and leave by themselves
 };

@@ -24,7 +24,8 @@
 
 namespace
 {
-constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS";
+constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO";
+constexpr char const* SUPPORTED = "100rel, replaces";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 constexpr unsigned long LONGEST_PAUSE = 60; // seconds
 
@@ -47,14 +48,17 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
     , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), ALLOW))
+    , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
 {
+    environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
 }
 
 SipInterface::~SipInterface()
 {
+    std::erase(m_environment.interfaces, this);
     m_endpoints.clear();
     m_cleanUpEvent->destroy();
 }
@@ -140,7 +144,7 @@ int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
         return 481;
     if (int const refused = refuseMethod(transaction, request); refused != 0)
         return refused;
-    if (int const refused = SipRules::CHECK(transaction, request); refused != 0)
+    if (int const refused = SipRules::CHECK(transaction, request, m_supported); refused != 0)
         return refused;
     if (method == sip_method_options)
         return answerOptions(transaction);
@@ -160,7 +164,7 @@ int SipInterface::answerOptions(nta_incoming_t* transaction) const
         nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
                             TAG_END());
     else
-        nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_ALLOW(m_allow), SIPTAG_SUPPORTED_STR(""),
+        nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_ALLOW(m_allow), SIPTAG_SUPPORTED(m_supported),
                             SIPTAG_ACCEPT_STR(SipBody::ACCEPT), SIPTAG_ACCEPT_ENCODING_STR(SipBody::ACCEPT_ENCODING),
                             TAG_END());
     return hasRoom ? 200 : 503;
@@ -170,7 +174,8 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
         return refused;
-
+    if (request->sip_replaces != nullptr)
+        return receiveReplacing(transaction, request);
     SipParty const called = SipIdentity::READ_CALLED(request);
     std::string const number = called.getUser();
     unsigned int const callNumber = ++m_environment.lastCallNumber;
@@ -192,6 +197,31 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     return endpoint->receiveInvite(transaction, request, *to, called);
 }
 
+SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const
+{
+    for (SipInterface const* const interface : m_environment.interfaces)
+        if (nta_leg_t* const leg = nta_leg_by_replaces(interface->getAgent(), replaces))
+            if (auto* const endpoint = dynamic_cast<SipEndpoint*>(nta_leg_magic(leg, HANDLE));
+                endpoint != nullptr && endpoint->isReplaceable())
+                return endpoint;
+    return nullptr;
+}
+
+/// RFC 3891, 3: 481 for a dialog that we do not have, and one that is not up yet is none; 486 for one that must be
+/// early.
+int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* request)
+{
+    SipEndpoint* const replaced = findReplaced(request->sip_replaces);
+    if (replaced == nullptr)
+        return 481;
+    if (request->sip_replaces->rp_early_only)
+        return 486;
+    unsigned int const callNumber = ++m_environment.lastCallNumber;
+    ++m_environment.counters.placed;
+    InternetAddress const source = SOURCE_OF(transaction);
+    return makeEndpoint(callNumber, &source).receiveReplacing(transaction, request, *replaced);
+}
+
 int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
 {
     SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
@@ -206,7 +236,6 @@ int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callN
 /// What keeps an INVITE from being a call, whatever it asks for.
 int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request) const
 {
-
     if (request->sip_contact == nullptr || request->sip_contact->m_url->url_type == url_any)
     {
         nta_incoming_treply(transaction, 400, "Missing Contact Header", TAG_END());

@@ -49,13 +49,18 @@ public:
     nta_agent_t* getAgent() const { return m_agent.get(); }
     /// Where the peer reaches us, for what goes over TCP or UDP.
     std::string const& getContact(bool isOverTcp) const { return isOverTcp ? m_tcpContact : m_contact; }
+    /// The methods that we take. @{
     sip_allow_t const* getAllow() const { return m_allow; }
+    sip_supported_t const* getSupported() const { return m_supported; }
+    /// @}
     SipGuard::Counters const& getGuardCounters() const { return m_guard.getCounters(); }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
     int answerOptions(nta_incoming_t* transaction) const;
+    /// The endpoint with that dialog, on whatever interface; null when there is none that can be replaced.
+    SipEndpoint* findReplaced(sip_replaces_t const* replaces) const;
     /// The peer answered with 503 and Retry-After: until these seconds are over, 60 at most, no call goes to it, and
     /// those that would get 503. The caller is not told the time: it would send us no call at all, also none for other
     /// peers.
@@ -71,6 +76,7 @@ private:
     void onMessage(msg_t* message, sip_t* sip);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
+    int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
     int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
     int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
     bool admits(InternetAddress const& source);
@@ -85,6 +91,7 @@ private:
     std::string m_tcpContact;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
+    sip_supported_t* m_supported;
     SipGuard m_guard;
     SipAgent m_agent;
 

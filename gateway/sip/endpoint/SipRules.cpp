@@ -13,11 +13,11 @@ constexpr unsigned long LARGEST_MAX_FORWARDS = 255; // RFC 3261, 20.22
 bool IS_SCHEME_SERVED(url_t const& uri) { return uri.url_type == url_sip || uri.url_type == url_tel; }
 } // namespace
 
-int SipRules::CHECK(nta_incoming_t* transaction, sip_t const* request)
+int SipRules::CHECK(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported)
 {
     if (!IS_SCHEME_SERVED(*request->sip_request->rq_url))
         return 416;
-    if (int const refused = CHECK_REQUIRED(transaction, request); refused != 0)
+    if (int const refused = CHECK_REQUIRED(transaction, request, supported); refused != 0)
         return refused;
     sip_max_forwards_t const* const maxForwards = request->sip_max_forwards;
     if (maxForwards == nullptr)
@@ -31,9 +31,9 @@ int SipRules::CHECK(nta_incoming_t* transaction, sip_t const* request)
     return maxForwards->mf_count == 0 && goesOn ? 483 : 0;
 }
 
-int SipRules::CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request)
+int SipRules::CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported)
 {
-    return nta_check_required(transaction, request, nullptr, TAG_END());
+    return nta_check_required(transaction, request, supported, TAG_END());
 }
 
 int SipRules::CHECK_BODY(nta_incoming_t* transaction, sip_t const* request)

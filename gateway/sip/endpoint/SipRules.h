@@ -13,9 +13,9 @@ namespace SipRules
 constexpr unsigned int MOST_FORWARDS = 70; ///< with which a request leaves, at most
 
 /// Of a request outside of dialogs: the URI's scheme (416), extensions (420), Max-Forwards (400, 483).
-int CHECK(nta_incoming_t* transaction, sip_t const* request);
-/// An extension that is required and not there: 420 with Unsupported.
-int CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request);
+int CHECK(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported);
+/// An extension that is required and not among the supported: 420 with Unsupported.
+int CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported);
 /// A body, or an encoding, that is not understood and not optional either: 415 with Accept and Accept-Encoding.
 int CHECK_BODY(nta_incoming_t* transaction, sip_t const* request);
 

@@ -212,3 +212,10 @@ SipBody SipBody::READ(sip_t const* message)
     return READ(body, type != nullptr ? WITH_PARAMETERS(type->c_type, type->c_params) : "", encoding,
                 disposition != nullptr ? WITH_PARAMETERS(disposition->cd_type, disposition->cd_params) : "");
 }
+
+std::string SipBody::PAYLOAD_OF(sip_t const* message)
+{
+    if (message->sip_payload == nullptr || message->sip_payload->pl_data == nullptr)
+        return {};
+    return std::string(message->sip_payload->pl_data, message->sip_payload->pl_len);
+}

@@ -28,6 +28,8 @@ struct SipBody
     Obstacle obstacle = NONE;
 
     static SipBody READ(sip_t const* message);
+    /// The whole body, of whatever type; empty: none.
+    static std::string PAYLOAD_OF(sip_t const* message);
     /// The same of the headers' values as they stand, empty ones absent. `depth`: of multiparts around it.
     static SipBody READ(std::string_view body, std::string_view type, std::string_view encoding,
                         std::string_view disposition, unsigned int depth = 0);

@@ -14,8 +14,10 @@ XCode SipPropertyId::DECLARE()
         char const* shortName;
     };
     for (Names const& names :
-         {Names{SESSION_DESCRIPTION, "Session-Description", "session-description"},
-          Names{CALL_NUMBER, "Call-Number", "call-number"}, Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}})
+         {Names{FORK, "Fork", "fork"}, Names{HEADERS_FOR_TARGET, "Headers-For-Target", "headers-for-target"},
+          Names{SESSION_OFFER, "Session-Offer", "session-offer"},
+          Names{SESSION_ANSWER, "Session-Answer", "session-answer"}, Names{CALL_NUMBER, "Call-Number", "call-number"},
+          Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}})
         if (std::strcmp(NAME(names.id), names.longName) != 0)
             if (XCode const result = CC_PropertyTable::DECLARE(names.id, names.longName, names.shortName);
                 !result.isOk())

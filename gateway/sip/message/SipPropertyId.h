@@ -7,14 +7,22 @@
 /// modules.
 namespace SipPropertyId
 {
-/// CC_PropertyString, of a leg: its side's own offer or answer
-inline constexpr unsigned int SESSION_DESCRIPTION = CC_PropertyId::FIRST_OF_MODULES;
+/// SipSessionWord, of a leg: its side's own last offer
+inline constexpr unsigned int SESSION_OFFER = CC_PropertyId::FIRST_OF_MODULES;
 /// CC_PropertyUnsigned, of a call: the gateway's number for it
 inline constexpr unsigned int CALL_NUMBER = CC_PropertyId::FIRST_OF_MODULES + 1;
 /// CC_PropertyUnsigned, of an offer: how many hops are left
 inline constexpr unsigned int MAX_FORWARDS = CC_PropertyId::FIRST_OF_MODULES + 2;
+/// SipSessionWord, of a leg: what became of the other side's offer
+inline constexpr unsigned int SESSION_ANSWER = CC_PropertyId::FIRST_OF_MODULES + 3;
+/// CC_PropertyUnsigned, of a leg: which of the parties that a proxy has called says what the leg says now, counted from
+/// 0 as they were first heard of
+inline constexpr unsigned int FORK = CC_PropertyId::FIRST_OF_MODULES + 4;
+/// CC_PropertyString, of a leg that asks for a transfer, and then of the offer: header lines for the INVITE to the
+/// target
+inline constexpr unsigned int HEADERS_FOR_TARGET = CC_PropertyId::FIRST_OF_MODULES + 5;
 
-/// Declares the names of these three, with which logs and dumps show them from then on: OK, also when they have these
+/// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.
 XCode DECLARE();
 /// The name of any property id, these included once they are declared; "(unknown)" otherwise.

@@ -11,6 +11,7 @@ class SipRequestHandler;
 #define NTA_LEG_MAGIC_T SipRequestHandler
 #define NTA_OUTGOING_MAGIC_T SipEndpoint
 #define NTA_INCOMING_MAGIC_T SipEndpoint
+#define NTA_RELIABLE_MAGIC_T SipEndpoint
 #define SU_WAKEUP_ARG_T SipDescriptorHandler
 
 #include <sofia-sip/msg_addr.h>

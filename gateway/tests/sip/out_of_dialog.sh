@@ -21,7 +21,7 @@ without_contact() {
     expect 400
     send_ack_of_failure
 }
-extension() { send_invite "Require: 100rel"; expect 420 Unsupported: "100rel"; send_ack_of_failure; }
+extension() { send_invite "Require: precondition"; expect 420 Unsupported: "precondition"; send_ack_of_failure; }
 other_body() { send_invite_with "hello" "Content-Type: text/plain"; expect 415 Accept: "application/sdp"; send_ack_of_failure; }
 good_caller() { call_up; send_bye; expect 200; }
 good_callee() {
