@@ -164,9 +164,10 @@ void CC_CallPool::unlist(CC_Call& call)
     m_calls.remove(std::exchange(call.m_poolElement, nullptr));
 }
 
-CC_Call* CC_CallPool::getAcquiredCall(unsigned int index)
+CC_Call* CC_CallPool::getAcquiredCall(unsigned int index) { return AT(getElement(index)); }
+
+CC_Call* CC_CallPool::AT(TYList<CC_Call*>::Element const* element)
 {
-    TYList<CC_Call*>::Element const* const element = getElement(index);
     return element != nullptr ? element->getValue() : nullptr;
 }
 
@@ -180,7 +181,6 @@ TYList<CC_Call*>::Element* CC_CallPool::getElement(unsigned int index) const
 
 void CC_CallPool::dropCalls(String const&, String const& callName)
 {
-    TYLifeline::Watch const self(m_lifeline);
     String name; // the given one may be a call's own, which can end in here
     try
     {
@@ -190,18 +190,35 @@ void CC_CallPool::dropCalls(String const&, String const& callName)
     {
         return; // longer than any call's name
     }
-    for (TYList<CC_Call*>::Element* element = m_calls.getFirst(); element != nullptr;)
+    auto const drop = [&name](CC_Call& call)
     {
-        CC_Call& call = *element->getValue();
-        CC_Call::Hold const keepCall(&call);
-        CC_Call::Hold const keepNext(element->getNext() != nullptr ? element->getNext()->getValue() : nullptr);
         if (name.isEmpty() || name == call.getName())
             dropCall(call);
+    };
+    forEachCall(drop, Lost::FROM_START); // the calls before have no legs any more
+}
+
+/// Whatever the visits release, and whatever ends in here, us among them.
+template <class Visit>
+void CC_CallPool::forEachCall(Visit const& visit, Lost whenNextIsLost) const
+{
+    TYLifeline::Watch const self(m_lifeline);
+    CC_Call::Hold current(AT(m_calls.getFirst()));
+    for (unsigned int visited = 1; current.get() != nullptr; ++visited)
+    {
+        {
+            CC_Call& call = *current.get();
+            CC_Call::Hold next(AT(call.m_poolElement->getNext()));
+            visit(call);
+            current.swap(next); // with the scope the visited call may end, and who hears of it may release others
+        }
+        while (self.isAlive() && current.get() != nullptr && current.get()->m_listedIn != this)
+        {
+            CC_Call::Hold other(AT(getElement(whenNextIsLost == Lost::FROM_START ? 0 : visited)));
+            current.swap(other);
+        }
         if (!self.isAlive())
             return;
-        // an observer may have released the next call: begin again, the calls before have no legs any more
-        CC_Call const* const next = keepNext.get();
-        element = next == nullptr ? nullptr : next->m_listedIn == this ? next->m_poolElement : m_calls.getFirst();
     }
 }
 
@@ -240,17 +257,8 @@ InfoContainer& CC_CallPool::getInfo(InfoContainer& info, unsigned int maxLevel, 
     info.addWithin(maxLevel, level, maxDetail, detail, prefix, "Call Pool", String::addressOf(this));
     if (maxLevel < level + 1 || maxDetail < detail || !nesting.isOutermost())
         return info;
-    TYLifeline::Watch const self(m_lifeline);
-    unsigned int index = 0;
-    for (auto const* element = m_calls.getFirst(); element != nullptr && self.isAlive();)
-    {
-        CC_Call::Hold const keep(element->getValue());
-        keep.get()->getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty);
-        if (!self.isAlive())
-            return info;
-        bool const isThere = keep.get()->m_listedIn == this;
-        element = isThere ? keep.get()->m_poolElement->getNext() : getElement(index);
-        index += isThere ? 1 : 0;
-    }
+    forEachCall([&](CC_Call const& call)
+                { call.getInfo(info, maxLevel, level + 1, maxDetail, detail, String::s_empty); },
+                Lost::GO_ON);
     return info;
 }

@@ -104,6 +104,15 @@ private:
     static void giveContext(CC_Call& call, MG_IContext* mgContext);
     static void dropCall(CC_Call& call);
 
+    /// What a walk does when the call that is next was released.
+    enum class Lost
+    {
+        FROM_START,
+        GO_ON, ///< behind as many as it has visited
+    };
+    template <class Visit>
+    void forEachCall(Visit const& visit, Lost whenNextIsLost) const;
+    static CC_Call* AT(TYList<CC_Call*>::Element const* element);
     TYList<CC_Call*>::Element* getElement(unsigned int index) const;
 
     TYList<CC_Call*> m_calls;
