@@ -9,6 +9,7 @@
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "host/MediaContexts.h"
+#include "media/context/CallMedia.h"
 #include "operation/Log.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
@@ -65,15 +66,17 @@ unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
     unsigned int const ofCalls =
         CC_Call::s_numberOfInstances + CC_CallLeg::s_numberOfInstances + CC_CallAdapter::s_numberOfInstances;
     unsigned int const ofModules = CC_Endpoint::s_numberOfInstances + CC_Provider::s_numberOfInstances;
-    unsigned int const inside =
-        CC_Property::s_numberOfInstances + TYEvent::s_numberOfInstances.load() + MediaContext::s_numberOfInstances;
+    unsigned int const inside = CC_Property::s_numberOfInstances + TYEvent::s_numberOfInstances.load() +
+                                MediaContext::s_numberOfInstances + CallMedia::s_numberOfInstances;
     return ofCalls + ofModules + inside;
 }
 
 Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
     : m_configuration(configuration)
+    , m_media(configuration.relaysMedia ? std::make_unique<MediaLayer>(configuration.media, m_callControlLoop)
+                                        : nullptr)
     , m_recording(configuration)
-    , m_host(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration))
+    , m_host(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
     , m_environment{m_stack,
                     m_host.getContextName(),
                     Routing(configuration.routes),
@@ -81,6 +84,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
                     CallTrace(tracedCalls),
                     {},
                     0,
+                    configuration.relaysMedia,
                     false,
                     [this] { stopIfIdle(); }}
     , m_clearTimer(
@@ -93,6 +97,8 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
     m_stack.attach(m_datapathLoop);
     m_stack.watch(m_signals.get(), [this] { onSignal(); });
     openPorts();
+    if (m_media != nullptr)
+        m_media->start();
 }
 
 void Gateway::openPorts()

@@ -2,6 +2,7 @@
 
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
+#include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
 #include "operation/StateDump.h"
 #include "platform/eventloop/TYEventLoop.h"
@@ -72,7 +73,8 @@ private:
 
     Configuration m_configuration;
     TYEventLoop m_callControlLoop;
-    TYEventLoop m_datapathLoop;
+    TYEventLoop m_datapathLoop; // idle when the media layer has loops of its own
+    std::unique_ptr<MediaLayer> m_media;
     SipStack m_stack;
     Signals m_signals;
     Recording m_recording;

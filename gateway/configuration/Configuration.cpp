@@ -215,7 +215,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
 {
     section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
                    "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout",
-                   "transfer"});
+                   "transfer", "media-address"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
@@ -230,6 +230,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
+    interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     return interface;
 }
@@ -275,17 +276,50 @@ void READ_GATEWAY(Section const& section, Configuration& configuration)
         section.refuse("recording-size", "expected 0, or at least " + std::to_string(LEAST_RECORDED));
 }
 
+void READ_MEDIA(Section const& section, Configuration& configuration)
+{
+    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp"});
+    MediaOptions& media = configuration.media;
+    configuration.relaysMedia = section.oneOf("mode", "direct", {"direct", "relay"}) == "relay";
+    media.firstPort = static_cast<unsigned short>(section.number("first-port", media.firstPort, 1024, 65534));
+    media.lastPort = static_cast<unsigned short>(section.number("last-port", media.lastPort, 1025, 65535));
+    if (media.lastPort <= media.firstPort)
+        section.refuse("last-port", "must be above first-port");
+    media.threads = section.number("threads", media.threads, 1, 64);
+    media.silence = section.number("silence", 0, 0, 86400);
+    media.differentiation = section.number("dscp", media.differentiation, 0, 63);
+}
+
+void CHECK_MEDIA_ADDRESS(Section const& section, Configuration::Interface const& interface)
+{
+    try
+    {
+        if (SocketAddress::PARSE(SocketAddress{interface.mediaAddress, 1}.text()).isUnspecified())
+            section.refuse("media-address", "'" + interface.mediaAddress + "' cannot be told to peers");
+    }
+    catch (std::invalid_argument const& error)
+    {
+        section.refuse("media-address", error.what());
+    }
+}
+
 Configuration READ_TABLE(toml::table const& table, std::string const& file)
 {
     Configuration configuration;
     configuration.file = file;
     Section const root(file, {}, table);
-    root.allow({"gateway", "interface", "route"});
+    root.allow({"gateway", "media", "interface", "route"});
     if (toml::node const* const node = table.get("gateway"))
     {
         if (!node->is_table())
             root.refuse("gateway", "expected a table, [gateway]");
         READ_GATEWAY(Section(file, "gateway.", *node->as_table()), configuration);
+    }
+    if (toml::node const* const node = table.get("media"))
+    {
+        if (!node->is_table())
+            root.refuse("media", "expected a table, [media]");
+        READ_MEDIA(Section(file, "media.", *node->as_table()), configuration);
     }
     FOR_EACH_TABLE(root, table, file, "interface",
                    [&](Section const& section)
@@ -293,6 +327,8 @@ Configuration READ_TABLE(toml::table const& table, std::string const& file)
                        Configuration::Interface const interface = READ_INTERFACE(section);
                        if (configuration.findInterface(interface.name) != nullptr)
                            section.refuse("name", "'" + interface.name + "' is taken by another interface");
+                       if (configuration.relaysMedia)
+                           CHECK_MEDIA_ADDRESS(section, interface);
                        configuration.interfaces.push_back(interface);
                    });
     if (configuration.interfaces.empty())

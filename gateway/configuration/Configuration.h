@@ -1,6 +1,7 @@
 #pragma once
 
 #include "configuration/AddressRange.h"
+#include "media/context/MediaOptions.h"
 
 #include <cstdint>
 #include <stdexcept>
@@ -58,6 +59,7 @@ struct Configuration
         unsigned int t1 = 500;            ///< milliseconds: the first retransmission
         unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
         unsigned int answerTimeout = 180; ///< seconds that the peer may ring
+        std::string mediaAddress;         ///< of this machine, where media come in; no name
         bool transfersOnWire = false;     ///< a peer that is to be transferred is sent REFER; else we dial for it
 
         /// Where the peers reach it.
@@ -81,7 +83,9 @@ struct Configuration
     unsigned int maxCallsPerSource = 2000; ///< of one address at the same time; 0: no limit
     std::string recording;                 ///< the recorder's file; empty: in memory
     unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
-    unsigned int clearAfter = 10;          ///< seconds that calls may go on after the request to end
+    bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
+    MediaOptions media;
+    unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Interface> interfaces;
     std::vector<Route> routes;
 

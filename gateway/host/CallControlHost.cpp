@@ -2,17 +2,20 @@
 
 #include "callcontrol/CallControl.h"
 #include "host/MediaContexts.h"
+#include "media/context/MediaLayer.h"
 #include "platform/driver/DRIVER.h"
 
 #include <stdexcept>
 
-CallControlHost::CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName)
+CallControlHost::CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName,
+                                 MediaLayer* media)
     : m_callControl(callControl), m_contextName(contextName), m_rebootLock(new RebootLock)
 {
     CallControl::SET_CC_EVENT_LOOP(&callControl);
-    CallControl::SET_DP_EVENT_LOOP(&datapath);
-    CallControl::SET_MG_CONTEXT_REPOSITORY(new MediaContextRepository);
-    CallControl::SET_MG_TERMINATION_REPOSITORY(new MediaTerminationRepository);
+    CallControl::SET_DP_EVENT_LOOP(media != nullptr ? &media->getDatapathLoop() : &datapath);
+    CallControl::SET_MG_CONTEXT_REPOSITORY(media != nullptr ? media->getContexts() : new MediaContextRepository);
+    CallControl::SET_MG_TERMINATION_REPOSITORY(media != nullptr ? media->getTerminations()
+                                                                : new MediaTerminationRepository);
     if (!DRIVER::INSTANCE().addDriverInterface(m_rebootLock.get(), TY::UUID::INVALID(), "reboot").isOk() ||
         !CallControl::ADD_PROPERTY_FACTORY(&m_factory).isOk() || !CallControl::CREATE_CONTEXT(contextName).isOk())
         throw std::runtime_error("call control cannot be set up");

@@ -5,6 +5,7 @@
 #include "properties/CC_Factory.h"
 
 class CC_Provider;
+class MediaLayer;
 class TYEventLoop;
 
 /// Sets up call control for this process as long as it lives: event loops, media repositories, the property factory,
@@ -15,8 +16,10 @@ class TYEventLoop;
 class CallControlHost
 {
 public:
-    /// The loops must outlive the host. Throws std::runtime_error when memory is out or the context exists.
-    CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName);
+    /// The loops must outlive the host, and so must the media layer, if there is one: else media do not go through
+    /// this process. Throws std::runtime_error when memory is out or the context exists.
+    CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName,
+                    MediaLayer* media = nullptr);
     ~CallControlHost();
     CallControlHost(CallControlHost const&) = delete;
     CallControlHost& operator=(CallControlHost const&) = delete;

@@ -85,16 +85,16 @@ TEST(SipQuality, ACodecBehindMoreCompanionsThanAnybodyHasIsNotSearchedFor)
 TEST(SipQuality, ACallWithoutAnAnswerHasNoRecord)
 {
     SipQuality quality;
-    EXPECT_FALSE(quality.getRecord());
+    EXPECT_FALSE(quality.getRecord(nullptr));
     quality.noteAnswer("");
-    EXPECT_FALSE(quality.getRecord());
+    EXPECT_FALSE(quality.getRecord(nullptr));
 }
 
 TEST(SipQuality, ARecordTellsTheCodecAndNoFigureThatNobodyMeasured)
 {
     SipQuality quality;
     quality.noteAnswer(PCMA);
-    auto const record = quality.getRecord();
+    auto const record = quality.getRecord(nullptr);
     ASSERT_TRUE(record);
     CC_QoS::MediaInfo const& media = record->m_mediaInfo;
     ASSERT_TRUE(media.isSelected(media.m_rtp));
@@ -112,7 +112,7 @@ TEST(SipQuality, AnotherCodecInALaterAnswerIsAChangeAndAnotherPeriodNone)
     std::string const shorter = SESSION("m=audio 4000 RTP/AVP 8\r\na=ptime:20\r\n");
     for (std::string const& answer : {PCMA, PCMA, shorter, G729, SESSION("m=audio 0 RTP/AVP 8\r\n"), G729, PCMA})
         quality.noteAnswer(answer);
-    CC_QoS::MediaInfo::RTP const rtp = quality.getRecord().value().m_mediaInfo.m_rtp;
+    CC_QoS::MediaInfo::RTP const rtp = quality.getRecord(nullptr).value().m_mediaInfo.m_rtp;
     EXPECT_EQ(rtp.m_codecChanges, 2);
     EXPECT_EQ(rtp.m_config.m_mediaType.get().packetPeriod, 30u);
 }
@@ -121,7 +121,7 @@ TEST(SipQuality, ACodecThatTheRecordCannotNameIsLeftOut)
 {
     SipQuality quality;
     quality.noteAnswer(SESSION("m=audio 4000 RTP/AVP 99\r\na=rtpmap:99 AMR/8000\r\n"));
-    auto const record = quality.getRecord();
+    auto const record = quality.getRecord(nullptr);
     ASSERT_TRUE(record);
     CC_QoS::MediaInfo::RTP const& rtp = record->m_mediaInfo.m_rtp;
     EXPECT_FALSE(rtp.isPresent(rtp.m_config));

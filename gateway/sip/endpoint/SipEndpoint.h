@@ -7,6 +7,7 @@
 #include "platform/eventloop/TYTimer.h"
 #include "sip/dialog/SipDialogState.h"
 #include "sip/dialog/SipDirectSession.h"
+#include "sip/dialog/SipMedia.h"
 #include "sip/dialog/SipOfferAnswer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCause.h"
@@ -159,6 +160,9 @@ private:
     void tryAgainLater();
     static void ON_OFFER_TIMER(void* endpoint);
     void followHold();
+    std::string toPeer(std::string const& description);
+    void notePreview(SipOfferAnswer::Direction direction, std::string const& session);
+    void onSilence(unsigned int seconds);
     void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
     void forgetOffer();
     void endOffers();
@@ -266,6 +270,7 @@ private:
     bool m_isInCall = false;
     bool m_isFinished = false;
     SipQuality m_quality;
+    SipMedia m_media{[this](unsigned int seconds) { onSilence(seconds); }};
     SipOfferAnswer m_negotiation;
     SipDirectSession m_session{m_adapter, *this};
     nta_incoming_t* m_offerReceived = nullptr; // a re-INVITE or UPDATE that is not done

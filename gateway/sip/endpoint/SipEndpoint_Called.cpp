@@ -106,7 +106,7 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
 
 bool SipEndpoint::startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards)
 {
-    std::string const session = m_session.readFirstOffer();
+    std::string const session = toPeer(m_session.readFirstOffer());
     std::string const hops = std::to_string(maxForwards);
     m_hasOffer = !session.empty();
     m_isOverTcp = m_interface.getConfiguration().usesTcp;
@@ -163,6 +163,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     ADD_CONNECTED(own, response);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
+    notePreview(SipOfferAnswer::RECEIVED, session);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
         noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::RELIABLE, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier

@@ -222,7 +222,10 @@ void SipEndpoint::followPeer()
         useFork(number);
         m_hasRung = m_hasEarlyMedia = false;
         m_negotiation = SipOfferAnswer(); // with this party nothing is agreed on
-        noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, m_hasOffer ? "an offer" : "");
+        if (m_hasOffer)
+            m_negotiation.note(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE);
+        else
+            m_negotiation.noteOfferlessInvite();
     }
     if (state->getState() >= CC_PropertyCallLegState::HELD)
     {
@@ -232,7 +235,7 @@ void SipEndpoint::followPeer()
     bool isNewSession = false;
     if (!isAgreedEarly()) // else what is new comes with UPDATE
     {
-        std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
+        std::string session = hasData && m_hasOffer ? toPeer(m_session.readForInvite(true)) : std::string();
         isNewSession = session != m_earlySession;
         m_earlySession = std::move(session);
     }
@@ -345,7 +348,7 @@ nta_leg_t* SipEndpoint::makeFork()
 
 void SipEndpoint::answer()
 {
-    std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
+    std::string const session = isAgreedEarly() ? std::string() : toPeer(m_session.readForInvite(m_hasOffer));
     m_session.noteSettled();
     answerWith(session);
 }
@@ -369,6 +372,8 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress());
     if (m_hasOffer)
         m_quality.noteAnswer(session);
+    if (status < 200)
+        notePreview(SipOfferAnswer::SENT, session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
                         SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED(m_interface.getSupported()),

@@ -3,6 +3,9 @@
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
+
+#include <spdlog/spdlog.h>
+
 #include "sip/message/SipProperty.h"
 
 #include "properties/CC_PropertyCallLegState.h"
@@ -45,12 +48,41 @@ unsigned int REFUSAL_FOR_OTHER_SIDE(unsigned int status)
 void SipEndpoint::noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier,
                               std::string const& session)
 {
+    m_media.note(direction == SipOfferAnswer::SENT, session);
     if (!session.empty())
         m_negotiation.note(direction, carrier);
     else if (carrier == SipOfferAnswer::INVITE)
         m_negotiation.noteOfferlessInvite();
     else if (carrier == SipOfferAnswer::FINAL || carrier == SipOfferAnswer::ACK)
         m_negotiation.fail(); // a peer that agrees on nothing
+    if (m_negotiation.getState() == SipOfferAnswer::AGREED)
+        m_media.settle();
+}
+
+/// An answer that binds nobody yet: media may come by it.
+void SipEndpoint::notePreview(SipOfferAnswer::Direction direction, std::string const& session)
+{
+    if (session.empty())
+        return;
+    m_media.note(direction == SipOfferAnswer::SENT, session);
+    m_media.settle();
+}
+
+/// What the other side says, as our peer is to read it.
+std::string SipEndpoint::toPeer(std::string const& description)
+{
+    return m_media.toPeer(description, m_adapter.getDatapathContext());
+}
+
+void SipEndpoint::onSilence(unsigned int seconds)
+{
+    handle(
+        [&]
+        {
+            spdlog::info("call {} {} ({} side): nothing was heard for {} s", m_callNumber, getName().view(),
+                         m_isCalling ? "calling" : "called", seconds);
+            clear({QCause::TEMPORARY_FAILURE, 0, {}});
+        });
 }
 
 // --- theirs ----------------------------------------------------------------------------------------------------------
@@ -130,8 +162,9 @@ int SipEndpoint::takeOffer(nta_incoming_t* transaction, std::string const& descr
     return 0;
 }
 
-void SipEndpoint::sendAnswer(std::string const& description)
+void SipEndpoint::sendAnswer(std::string const& answer)
 {
+    std::string const description = toPeer(answer);
     if (m_lateAck != nullptr)
     {
         noteSession(SipOfferAnswer::SENT, SipOfferAnswer::ACK, description);
@@ -278,7 +311,7 @@ void SipEndpoint::sendOffer(std::string const& description, bool isQuick)
         m_session.takeRefusal(504);
         return;
     }
-    m_offer = description;
+    m_offer = toPeer(description);
     m_isOfferQuick = isQuick;
     m_refusals = 0;
     m_isOfferWaiting = true;

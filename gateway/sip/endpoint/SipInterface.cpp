@@ -2,6 +2,7 @@
 
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
+#include "media/context/MediaAddress.h"
 #include "platform/eventloop/TYEvent.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipEndpoint.h"
@@ -44,6 +45,7 @@ SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface
     , m_environment(environment)
     , m_configuration(configuration)
     , m_name(configuration.name.c_str())
+    , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
     , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
     , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
     , m_home(su_home_create())

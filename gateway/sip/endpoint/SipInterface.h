@@ -2,6 +2,7 @@
 
 #include "callcontrol/provider/CC_Provider.h"
 #include "configuration/Configuration.h"
+#include "platform/base/IpAddress.h"
 #include "platform/base/TYTime.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -54,6 +55,8 @@ public:
     sip_supported_t const* getSupported() const { return m_supported; }
     /// @}
     SipGuard::Counters const& getGuardCounters() const { return m_guard.getCounters(); }
+    /// Where media come in; of use only if the environment relays them.
+    IpAddress const& getMediaAddress() const { return m_mediaAddress; }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
@@ -87,6 +90,7 @@ private:
     SipEnvironment& m_environment;
     Configuration::Interface m_configuration;
     String m_name;
+    IpAddress m_mediaAddress;
     std::string m_contact;
     std::string m_tcpContact;
     SipHome m_home;

@@ -1,20 +1,14 @@
 #include "sip/message/SipQuality.h"
 
+#include "sip/message/SipCodec.h"
 #include "sip/message/SipText.h"
 
-#include <algorithm>
-#include <iterator>
 #include <string>
 
 // Read here and not by the stack's own parser, which never comes back from some that are malformed.
 namespace
 {
 using Codec = MG_Rtp::ECodec;
-
-constexpr Codec::Type CODECS[] = {Codec::PCMU,    Codec::GSM,     Codec::G723, Codec::DVI4_8000,  Codec::DVI4_16000,
-                                  Codec::LPC,     Codec::PCMA,    Codec::G722, Codec::L16_STEREO, Codec::L16_MONO,
-                                  Codec::QCELP,   Codec::G728,    Codec::G729, Codec::G726_16,    Codec::G726_24,
-                                  Codec::G726_32, Codec::G726_40, Codec::ILBC, Codec::OPUS};
 
 constexpr unsigned int LONGEST_PERIOD = 1000; // milliseconds
 constexpr unsigned int MOST_COMPANIONS = 16;  // before the codec; each is searched for in the whole description
@@ -60,29 +54,6 @@ std::string_view NAME_OF(std::string_view stream, std::string_view payloadType)
 {
     return FIND_VALUE(stream, "\na=rtpmap:" + std::string(payloadType) + " ");
 }
-
-/// Comfort noise and telephone events accompany a codec.
-bool IS_COMPANION(std::string_view payloadType, std::string_view name)
-{
-    return SipText::IS_ONE_OF(name.substr(0, name.find('/')), {"CN", "telephone-event"}) ||
-           (name.empty() && payloadType == "13");
-}
-
-/// By its name, or by the fixed payload type, which is its number.
-Codec::Type CODEC_OF(std::string_view payloadType, std::string_view name)
-{
-    if (name.ends_with("/1"))
-        name.remove_suffix(2);
-    std::string const whole(name);
-    std::string const encoding(name.substr(0, name.find('/')));
-    auto const fits = [&](Codec::Type codec)
-    {
-        return name.empty() ? payloadType == std::to_string(codec)
-                            : SipText::IS_ONE_OF(Codec::NAME(codec), {whole.c_str(), encoding.c_str()});
-    };
-    auto const* const found = std::find_if(std::begin(CODECS), std::end(CODECS), fits);
-    return found != std::end(CODECS) ? *found : Codec::NONE;
-}
 } // namespace
 
 std::optional<MG_Rtp::MediaType> SipQuality::MEDIA_OF(std::string_view sessionDescription)
@@ -93,8 +64,8 @@ std::optional<MG_Rtp::MediaType> SipQuality::MEDIA_OF(std::string_view sessionDe
     {
         std::string_view const payloadType = SipText::CUT(rest, ' ');
         std::string_view const name = NAME_OF(stream, payloadType);
-        if (!IS_COMPANION(payloadType, name))
-            return MG_Rtp::MediaType{CODEC_OF(payloadType, name),
+        if (!SipCodec::IS_COMPANION(payloadType, name))
+            return MG_Rtp::MediaType{SipCodec::OF(payloadType, name),
                                      SipText::NUMBER(FIND_VALUE(stream, "\na=ptime:"), 1, LONGEST_PERIOD)};
     }
     return std::nullopt;
@@ -110,7 +81,36 @@ void SipQuality::noteAnswer(std::string_view sessionDescription)
     m_media = media;
 }
 
-std::optional<CC_QoS> SipQuality::getRecord() const
+namespace
+{
+using Rtp = decltype(CC_QoS::m_mediaInfo.m_rtp);
+
+int NUMBER(unsigned long long counter) { return static_cast<int>(counter); } // its low bits, as the record carries it
+
+void RECORD(CC_QoS& record, Rtp& rtp, MediaQuality const& measured)
+{
+    if (measured.receivedPackets == 0 && measured.sentPackets == 0)
+        return; // nothing was told yet
+    auto& statistics = rtp.setPresent(rtp.m_statistics);
+    auto& local = statistics.setPresent(statistics.m_local);
+    local.m_rxPackets = NUMBER(measured.receivedPackets);
+    local.m_rxOctets = NUMBER(measured.receivedOctets);
+    local.m_rxPacketsLost = NUMBER(measured.lostPackets.value_or(0));
+    local.m_rxJitter = NUMBER(measured.jitter.value_or(0));
+    local.m_txPackets = NUMBER(measured.sentPackets);
+    local.m_txOctets = NUMBER(measured.sentOctets);
+    local.m_roundTripTime = NUMBER(measured.roundTripTime.value_or(0));
+    if (measured.farLostPackets)
+    {
+        auto& remote = statistics.setPresent(statistics.m_remote);
+        remote.m_rxPacketsLost = NUMBER(*measured.farLostPackets);
+        remote.m_rxJitter = NUMBER(measured.farJitter.value_or(0));
+    }
+    record.m_meanOpinionScore = NUMBER(measured.meanOpinionScore.value_or(0));
+}
+} // namespace
+
+std::optional<CC_QoS> SipQuality::getRecord(MediaQuality const* measured) const
 {
     if (!m_media)
         return std::nullopt;
@@ -119,5 +119,7 @@ std::optional<CC_QoS> SipQuality::getRecord() const
     rtp.m_codecChanges = static_cast<int>(m_codecChanges);
     if (m_media->codec != Codec::NONE)
         rtp.setPresent(rtp.m_config).m_mediaType.set(*m_media);
+    if (measured != nullptr)
+        RECORD(record, rtp, *measured);
     return record;
 }
