@@ -126,7 +126,8 @@ constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout", "transfer"});
+    section.allow({"name", "listen", "peer", "transport", "t1", "t1x64", "answer-timeout", "transfer",
+                   "session-expires", "min-se", "max-call-duration"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     interface.listen = section.address("listen");
@@ -135,6 +136,9 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
+    interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
+    interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);
+    interface.longestCall = section.number("max-call-duration", interface.longestCall, 0, 86400);
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     return interface;
 }

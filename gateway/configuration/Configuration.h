@@ -41,11 +41,14 @@ struct Configuration
         std::string name;
         SocketAddress listen;
         SocketAddress peer;
-        bool usesTcp = false;             ///< towards the peer; it always listens on UDP and TCP
-        unsigned int t1 = 500;            ///< milliseconds: the first retransmission
-        unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
-        unsigned int answerTimeout = 180; ///< seconds that the peer may ring
-        bool transfersOnWire = false;     ///< a peer that is to be transferred is sent REFER; else we dial for it
+        bool usesTcp = false;               ///< towards the peer; it always listens on UDP and TCP
+        unsigned int t1 = 500;              ///< milliseconds: the first retransmission
+        unsigned int t1x64 = 32000;         ///< milliseconds: how long a transaction waits for its answer
+        unsigned int answerTimeout = 180;   ///< seconds that the peer may ring
+        unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
+        unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
+        unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
+        bool transfersOnWire = false;       ///< a peer that is to be transferred is sent REFER; else we dial for it
     };
     /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
     struct Route

@@ -18,6 +18,9 @@ listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
 transfer = "refer"
+session-expires = 0
+min-se = 120
+max-call-duration = 3600
 t1 = 100
 t1x64 = 3200
 answer-timeout = 30
@@ -56,6 +59,9 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.t1x64, 32000u);
     EXPECT_EQ(a.answerTimeout, 180u);
     EXPECT_FALSE(a.transfersOnWire);
+    EXPECT_EQ(a.sessionExpires, 1800u);
+    EXPECT_EQ(a.leastExpires, 90u);
+    EXPECT_EQ(a.longestCall, 0u);
     EXPECT_EQ(a.peer.host, "2001:db8::1");
     EXPECT_EQ(a.peer.text(), "[2001:db8::1]:5070");
 }
@@ -79,6 +85,9 @@ TEST(Configuration, EveryKeyIsRead)
     ASSERT_NE(b, nullptr);
     EXPECT_TRUE(b->usesTcp);
     EXPECT_TRUE(b->transfersOnWire);
+    EXPECT_EQ(b->sessionExpires, 0u);
+    EXPECT_EQ(b->leastExpires, 120u);
+    EXPECT_EQ(b->longestCall, 3600u);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);

@@ -45,6 +45,9 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+    , m_sessionTimer(interface.getConfiguration().sessionExpires, interface.getConfiguration().leastExpires)
+    , m_refreshTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_REFRESH_TIMER, this)
+    , m_lengthTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_LENGTH_TIMER, this)
     , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
 }
@@ -245,6 +248,8 @@ void SipEndpoint::finishIfDone()
         return;
     m_timer.stop();
     m_offerTimer.stop();
+    m_refreshTimer.stop();
+    m_lengthTimer.stop();
     m_interface.finish(*this);
 }
 
