@@ -88,6 +88,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
 {
     if (!SipPropertyId::DECLARE().isOk())
         throw std::runtime_error("the names of the SIP properties cannot be declared");
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.getContextName(), configuration.maxHops); // the context is there
     m_stack.attach(m_callControlLoop);
     m_stack.attach(m_datapathLoop);
     m_stack.watch(m_signals.get(), [this] { onSignal(); });

@@ -62,6 +62,7 @@ struct Configuration
     std::string context;                  ///< the call-control context; empty: its default
     std::string logLevel = "info";        ///< of spdlog
     unsigned int callControlLogLevel = 1; ///< of the library's monitor, 0 to 5
+    unsigned int maxHops = 0;             ///< that a call may take from here on; 0: no limit of our own
     unsigned int maxCalls = 0;            ///< at the same time; 0: no limit
     unsigned int maxCallsPerSecond = 0;   ///< 0: no limit
     std::string recording;                ///< the recorder's file; empty: in memory

@@ -46,6 +46,7 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(configuration.file, "f");
     EXPECT_EQ(configuration.logLevel, "info");
     EXPECT_EQ(configuration.callControlLogLevel, 1u);
+    EXPECT_EQ(configuration.maxHops, 0u);
     EXPECT_EQ(configuration.maxCalls, 0u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 0u);
     EXPECT_EQ(configuration.clearAfter, 10u);
@@ -69,13 +70,15 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
 TEST(Configuration, EveryKeyIsRead)
 {
     Configuration const configuration = Configuration::PARSE(
-        std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-calls = 7\n"
+        std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-hops = 9\n"
+                    "max-calls = 7\n"
                     "max-calls-per-second = 8\nclear-after = 9\nrecording = \"/r\"\nrecording-size = 4096\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
     EXPECT_EQ(configuration.logLevel, "debug");
     EXPECT_EQ(configuration.callControlLogLevel, 5u);
+    EXPECT_EQ(configuration.maxHops, 9u);
     EXPECT_EQ(configuration.maxCalls, 7u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 8u);
     EXPECT_EQ(configuration.clearAfter, 9u);

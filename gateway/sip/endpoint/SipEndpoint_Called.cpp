@@ -99,6 +99,9 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
                       (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
     m_inviteUri = uri;
     m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
+    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
+        hops != nullptr && hops->getValue() != 0)
+        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
     m_ownSession = m_session.readFirstOffer();
     return startInvite();
 }
