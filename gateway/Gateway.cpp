@@ -21,6 +21,7 @@
 #include <cstdio>
 #include <stdexcept>
 #include <sys/signalfd.h>
+#include <tuple>
 #include <unistd.h>
 
 namespace

@@ -96,5 +96,6 @@ std::string SipDescription::REFUSING(std::string_view offer)
     std::unique_ptr<sdp_printer_t, PrinterDeleter> const printer(
         sdp_print(parsed.getHome(), parsed.get(), nullptr, 0, sdp_f_realloc));
     char const* const text = sdp_message(printer.get());
-    return text != nullptr ? std::string(text, sdp_message_size(printer.get())) : std::string();
+    return text != nullptr ? std::string(text, static_cast<std::size_t>(sdp_message_size(printer.get())))
+                           : std::string();
 }

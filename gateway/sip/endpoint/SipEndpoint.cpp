@@ -158,6 +158,8 @@ void SipEndpoint::onPeerReleased()
 {
     SipCause const cause =
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
+    if (m_isReferring)
+        endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
     endDialog(cause);
     leaveCall(cause);
 }
