@@ -166,8 +166,8 @@ void FOR_EACH_TABLE(Section const& root, toml::table const& table, std::string c
 
 void READ_GATEWAY(Section const& section, Configuration& configuration)
 {
-    section.allow({"context", "log-level", "call-control-log-level", "max-hops", "max-calls", "max-calls-per-second", "clear-after",
-                   "recording", "recording-size"});
+    section.allow({"context", "log-level", "call-control-log-level", "max-hops", "max-calls", "max-calls-per-second",
+                   "clear-after", "recording", "recording-size"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
     configuration.callControlLogLevel = section.number("call-control-log-level", 1, 0, 5);
