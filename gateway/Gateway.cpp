@@ -23,6 +23,7 @@
 
 #include <stdexcept>
 #include <sys/signalfd.h>
+#include <tuple>
 #include <unistd.h>
 
 namespace
@@ -93,6 +94,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
 {
     if (!SipPropertyId::DECLARE().isOk())
         throw std::runtime_error("the names of the SIP properties cannot be declared");
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.getContextName(), configuration.maxHops); // the context is there
     m_stack.attach(m_callControlLoop);
     m_stack.attach(m_datapathLoop);
     m_stack.watch(m_signals.get(), [this] { onSignal(); });

@@ -215,7 +215,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
 {
     section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
                    "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout",
-                   "transfer", "media-address"});
+                   "transfer", "media-address", "session-expires", "min-se", "max-call-duration"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
@@ -231,6 +231,9 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
     interface.mediaAddress = section.text("media-address", interface.listen.host);
+    interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
+    interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);
+    interface.longestCall = section.number("max-call-duration", interface.longestCall, 0, 86400);
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     return interface;
 }
@@ -258,12 +261,13 @@ void FOR_EACH_TABLE(Section const& root, toml::table const& table, std::string c
 
 void READ_GATEWAY(Section const& section, Configuration& configuration)
 {
-    section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-calls", "max-calls-per-second",
-                   "max-calls-per-source", "clear-after", "recording", "recording-size"});
+    section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-hops", "max-calls",
+                   "max-calls-per-second", "max-calls-per-source", "clear-after", "recording", "recording-size"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
     configuration.logFile = section.text("log-file", {});
     configuration.callControlLogLevel = section.number("call-control-log-level", 1, 0, 5);
+    configuration.maxHops = section.number("max-hops", 0, 0, 255);
     configuration.maxCalls = section.number("max-calls", configuration.maxCalls, 0, UNLIMITED);
     configuration.maxCallsPerSecond =
         section.number("max-calls-per-second", configuration.maxCallsPerSecond, 0, UNLIMITED);

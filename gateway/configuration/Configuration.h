@@ -55,12 +55,15 @@ struct Configuration
         unsigned int maxMessageSize = 65535; ///< octets
         unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
         unsigned int maxConnectionsPerSource = 16;
-        unsigned int tcpIdle = 120;       ///< seconds that a connection may stay without a message
-        unsigned int t1 = 500;            ///< milliseconds: the first retransmission
-        unsigned int t1x64 = 32000;       ///< milliseconds: how long a transaction waits for its answer
-        unsigned int answerTimeout = 180; ///< seconds that the peer may ring
-        std::string mediaAddress;         ///< of this machine, where media come in; no name
-        bool transfersOnWire = false;     ///< a peer that is to be transferred is sent REFER; else we dial for it
+        unsigned int tcpIdle = 120;         ///< seconds that a connection may stay without a message
+        unsigned int t1 = 500;              ///< milliseconds: the first retransmission
+        unsigned int t1x64 = 32000;         ///< milliseconds: how long a transaction waits for its answer
+        unsigned int answerTimeout = 180;   ///< seconds that the peer may ring
+        unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
+        unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
+        unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
+        std::string mediaAddress;           ///< of this machine, where media come in; no name
+        bool transfersOnWire = false;       ///< a peer that is to be transferred is sent REFER; else we dial for it
 
         /// Where the peers reach it.
         SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
@@ -78,6 +81,7 @@ struct Configuration
     std::string logLevel = "info";         ///< of spdlog
     std::string logFile;                   ///< empty: the standard error stream
     unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
+    unsigned int maxHops = 0;              ///< that a call may take from here on; 0: no limit of our own
     unsigned int maxCalls = 4000;          ///< at the same time; 0: no limit
     unsigned int maxCallsPerSecond = 200;  ///< 0: no limit
     unsigned int maxCallsPerSource = 2000; ///< of one address at the same time; 0: no limit

@@ -18,6 +18,9 @@ listen = "127.0.0.1:5061"
 peer = "192.0.2.1:5060"
 transport = "tcp"
 transfer = "refer"
+session-expires = 0
+min-se = 120
+max-call-duration = 3600
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -49,6 +52,7 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(configuration.file, "f");
     EXPECT_EQ(configuration.logLevel, "info");
     EXPECT_EQ(configuration.callControlLogLevel, 1u);
+    EXPECT_EQ(configuration.maxHops, 0u);
     EXPECT_EQ(configuration.maxCalls, 4000u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 200u);
     EXPECT_EQ(configuration.maxCallsPerSource, 2000u);
@@ -72,12 +76,16 @@ TEST(Configuration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.peer.text(), "192.0.2.7:5070");
     EXPECT_EQ(a.getAddress().text(), "127.0.0.1:5060");
     EXPECT_FALSE(a.transfersOnWire);
+    EXPECT_EQ(a.sessionExpires, 1800u);
+    EXPECT_EQ(a.leastExpires, 90u);
+    EXPECT_EQ(a.longestCall, 0u);
 }
 
 TEST(Configuration, EveryKeyIsRead)
 {
     Configuration const configuration = Configuration::PARSE(
-        std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-calls = 7\n"
+        std::string("[gateway]\ncontext = \"X\"\nlog-level = \"debug\"\ncall-control-log-level = 5\nmax-hops = 9\n"
+                    "max-calls = 7\n"
                     "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
                     "\"/r\"\nrecording-size = 4096\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
@@ -85,6 +93,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.context, "X");
     EXPECT_EQ(configuration.logLevel, "debug");
     EXPECT_EQ(configuration.callControlLogLevel, 5u);
+    EXPECT_EQ(configuration.maxHops, 9u);
     EXPECT_EQ(configuration.maxCalls, 7u);
     EXPECT_EQ(configuration.maxCallsPerSecond, 8u);
     EXPECT_EQ(configuration.maxCallsPerSource, 6u);
@@ -102,6 +111,9 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(b->maxConnectionsPerSource, 3u);
     EXPECT_EQ(b->tcpIdle, 4u);
     EXPECT_TRUE(b->transfersOnWire);
+    EXPECT_EQ(b->sessionExpires, 0u);
+    EXPECT_EQ(b->leastExpires, 120u);
+    EXPECT_EQ(b->longestCall, 3600u);
     EXPECT_EQ(b->t1, 100u);
     EXPECT_EQ(b->t1x64, 3200u);
     EXPECT_EQ(b->answerTimeout, 30u);

@@ -55,7 +55,7 @@ class SipDriver : public ModuleDriver
 {
 public:
     SipDriver()
-        : m_environment{m_stack, "SWITCH", Routing({{NAME, "", PEER}}), Admission(0, 0), CallTrace(0), {}, 0, false, {}}
+        : m_environment{m_stack, "SWITCH", Routing({{NAME, "", PEER}}), Admission(0, 0), CallTrace(0)}
         , m_interface(m_environment, CONFIGURATION(m_agent.getAddress()))
     {
         spdlog::set_level(spdlog::level::off);

@@ -45,5 +45,6 @@ std::string SipParsedDescription::print() const
     std::unique_ptr<sdp_printer_t, Deleter> const printer(
         sdp_print(m_home.get(), m_session, nullptr, 0, sdp_f_realloc));
     char const* const text = sdp_message(printer.get());
-    return text != nullptr ? std::string(text, sdp_message_size(printer.get())) : std::string();
+    return text != nullptr ? std::string(text, static_cast<std::size_t>(sdp_message_size(printer.get())))
+                           : std::string();
 }

@@ -45,6 +45,9 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+    , m_sessionTimer(interface.getConfiguration().sessionExpires, interface.getConfiguration().leastExpires)
+    , m_refreshTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_REFRESH_TIMER, this)
+    , m_lengthTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_LENGTH_TIMER, this)
     , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
     if (m_interface.getEnvironment().relaysMedia)
@@ -158,6 +161,8 @@ void SipEndpoint::onPeerReleased()
 {
     SipCause const cause =
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
+    if (m_isReferring)
+        endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
     endDialog(cause);
     leaveCall(cause);
 }
@@ -249,6 +254,8 @@ void SipEndpoint::finishIfDone()
         return;
     m_timer.stop();
     m_offerTimer.stop();
+    m_refreshTimer.stop();
+    m_lengthTimer.stop();
     m_interface.finish(*this);
 }
 

@@ -9,6 +9,7 @@
 #include "sip/dialog/SipDirectSession.h"
 #include "sip/dialog/SipMedia.h"
 #include "sip/dialog/SipOfferAnswer.h"
+#include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipParty.h"
@@ -122,7 +123,7 @@ private:
     // called side: SipEndpoint_Called.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
-    bool startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards);
+    bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
@@ -186,6 +187,17 @@ private:
     static int HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     int onNotify(sip_t const* request);
     XCode takePlaceOf(SipEndpoint& replaced, sip_t const* request);
+
+    // SipEndpoint_Timer.cpp
+    int takeTimer(nta_incoming_t* transaction, sip_t const* request);
+    void takeTimerOfAnswer(sip_t const* response);
+    bool raiseTimer(sip_t const* response);
+    void startSessionTimer();
+    static void ON_REFRESH_TIMER(void* endpoint);
+    void onRefreshTimer();
+    void refresh();
+    void onRefreshed(unsigned int status, sip_t const* response);
+    static void ON_LENGTH_TIMER(void* endpoint);
 
     // SipEndpoint_Input.cpp
     int onInfo(nta_incoming_t* transaction, sip_t const* request);
@@ -284,10 +296,18 @@ private:
     unsigned int m_refusals = 0;     // 491 to ours
     Invitation* m_lateAck = nullptr; // whose ACK must carry an answer that is not here yet
     bool m_allowsUpdate = false;     // our peer
-    bool m_isReferring = false;      // our peer has asked for a transfer that is not done
-    bool m_isTransferring = false;   // the other side's has
-    bool m_hasTarget = false;        // its leg was seen
-    bool m_isReplacing = false;      // our INVITE takes a dialog's place
+    SipSessionTimer m_sessionTimer;
+    TYTimer m_refreshTimer;
+    TYTimer m_lengthTimer;
+    std::string m_ownSession; // what our peer has of us
+    bool m_isRefresh = false; // ours
+    std::string m_inviteUri;  // for an INVITE that is to be sent again
+    std::string m_inviteHeaders;
+    unsigned int m_maxForwards = 0;
+    bool m_isReferring = false;    // our peer has asked for a transfer that is not done
+    bool m_isTransferring = false; // the other side's has
+    bool m_hasTarget = false;      // its leg was seen
+    bool m_isReplacing = false;    // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
     std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
     nta_outgoing_t* m_info = nullptr;

@@ -96,33 +96,37 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
                             SIPTAG_TO_STR(to.c_str()), TAG_END());
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
-    std::string const identityHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
-                                        SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
-                                        (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
-    return startInvite(uri, identityHeaders,
-                       maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue())
-                                              : DEFAULT_MAX_FORWARDS);
+    m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
+                      SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
+                      (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
+    m_inviteUri = uri;
+    m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
+    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
+        hops != nullptr && hops->getValue() != 0)
+        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
+    m_ownSession = toPeer(m_session.readFirstOffer());
+    m_isOverTcp = configuration.usesTcp;
+    return startInvite();
 }
 
-bool SipEndpoint::startInvite(std::string const& uri, std::string const& identityHeaders, unsigned int maxForwards)
+bool SipEndpoint::startInvite()
 {
-    std::string const session = toPeer(m_session.readFirstOffer());
-    std::string const hops = std::to_string(maxForwards);
-    m_hasOffer = !session.empty();
-    m_isOverTcp = m_interface.getConfiguration().usesTcp;
-    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, session);
-    trace("-> INVITE " + uri + (m_hasOffer ? " with a session description" : ""));
+    std::string const hops = std::to_string(m_maxForwards);
+    std::string const headers = m_inviteHeaders + m_sessionTimer.getRequestHeaders();
+    m_hasOffer = !m_ownSession.empty();
+    noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
+    trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
     m_invite.transaction = nta_outgoing_tcreate(
-        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(uri.c_str()),
+        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
-        SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces" : "replaces"),
-        TAG_IF(!identityHeaders.empty(), SIPTAG_HEADER_STR(identityHeaders.c_str())),
+        SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
+        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-        TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+        TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
     if (m_invite.transaction == nullptr)
         return false;
     m_invite.sequence = nta_leg_get_seq(m_leg);
-    advance(SipDialogState::INVITE_OUT);
+    advance(SipDialogState::INVITE_OUT); // nothing happens when it is sent again
     m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
     return true;
 }
@@ -215,6 +219,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
 {
     m_wasAnswered = true;
     noteAllow(response);
+    takeTimerOfAnswer(response);
     Fork const* const fork = findFork(response);
     bool const isAgreed = fork != nullptr && fork->isAgreed; // then a description says nothing new
     std::string const session = isAgreed ? std::string() : SESSION_OF(response);
@@ -243,6 +248,15 @@ void SipEndpoint::takeAnswer(sip_t const* response)
 void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 {
     bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
+    if (status == 422 && m_dialog == SipDialogState::INVITE_SENT && raiseTimer(response))
+    {
+        trace("<- 422");
+        m_invite.forget();
+        m_negotiation.fail();
+        if (!startInvite())
+            clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
+        return;
+    }
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
@@ -347,6 +361,8 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
     if (m_lateAck == &invitation)
         m_lateAck = nullptr;
+    if (hasSession)
+        m_ownSession = sessionDescription;
     if (invitation.ack != nullptr)
         nta_outgoing_destroy(invitation.ack);
     invitation.ack = nta_outgoing_tcreate(

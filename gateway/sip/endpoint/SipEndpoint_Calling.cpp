@@ -63,6 +63,12 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
     noteAllow(request);
+    if (takeTimer(transaction, request) != 0)
+    {
+        m_dialog = SipDialogState::OVER;
+        leaveCall({QCause::INTERWORKING, 422, {}});
+        return 422;
+    }
     m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
     m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
@@ -174,6 +180,7 @@ void SipEndpoint::onAck(sip_t const* request)
         return;
     forgetTransaction(); // it would live on for half a minute
     trace("<- ACK");
+    startSessionTimer();
     if (!m_hasOffer && m_isInCall)
         takeAnswerOfAck(request);
     if (m_byeAfterAck)
@@ -279,6 +286,7 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
     if (!isAnswer)
         return true;
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::RELIABLE, session);
+    m_ownSession = session;
     m_quality.noteAnswer(session);
     m_session.noteSettled();
     return true;
@@ -361,6 +369,8 @@ void SipEndpoint::answerWith(std::string const& session)
     m_timer.stop();
     answerFromPeer(SIP_200_OK, session);
     advance(SipDialogState::ANSWER_OUT);
+    if (unsigned int const longest = m_interface.getConfiguration().longestCall; longest != 0)
+        m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
 }
@@ -375,9 +385,12 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
     if (status < 200)
         notePreview(SipOfferAnswer::SENT, session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
+    std::string const headers = identity + (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
+    if (status >= 200 && !session.empty())
+        m_ownSession = session;
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
                         SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED(m_interface.getSupported()),
-                        TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+                        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
                         TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                         TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
 }

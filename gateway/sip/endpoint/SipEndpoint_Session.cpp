@@ -113,6 +113,8 @@ int SipEndpoint::checkOffer(nta_incoming_t* transaction, sip_t const* request)
         return isEarly ? 491 : 481;
     if (int const refused = SipRules::CHECK_BODY(transaction, request); refused != 0)
         return refused;
+    if (int const refused = takeTimer(transaction, request); refused != 0)
+        return refused;
     unsigned int const refusal = getOfferRefusal();
     if (refusal == 500)
     {
@@ -142,7 +144,10 @@ int SipEndpoint::takeOffer(nta_incoming_t* transaction, std::string const& descr
 {
     if (isUpdate && description.empty())
     {
-        nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_CONTACT_STR(getContact()), TAG_END());
+        std::string const headers = m_sessionTimer.getResponseHeaders();
+        nta_incoming_treply(transaction, SIP_200_OK, SIPTAG_CONTACT_STR(getContact()),
+                            TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())), TAG_END());
+        startSessionTimer();
         return 200;
     }
     if (!m_isInCall)
@@ -188,7 +193,11 @@ void SipEndpoint::sendAnswer(std::string const& answer)
     m_offerTimer.stop();
     trace("-> 200 with a session description");
     m_isOfferAnswered = !isUpdate;
+    m_ownSession = description;
+    std::string const headers = m_sessionTimer.getResponseHeaders();
+    startSessionTimer();
     nta_incoming_treply(m_offerReceived, SIP_200_OK, SIPTAG_CONTACT_STR(getContact()),
+                        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
                         SIPTAG_CONTENT_TYPE_STR("application/sdp"), SIPTAG_PAYLOAD_STR(description.c_str()), TAG_END());
     if (isUpdate)
         forgetOffer();
@@ -293,15 +302,15 @@ void SipEndpoint::followHold()
 
 // --- ours ------------------------------------------------------------------------------------------------------------
 
-/// Or a PRACK: what was said before must have arrived.
+/// Or a PRACK, or what our peer says to a refresh: what was said before must have arrived.
 bool SipEndpoint::isAwaitingAck() const
 {
-    return m_dialog == SipDialogState::ANSWERED || m_isOfferAnswered || m_unacknowledged > 0;
+    return m_dialog == SipDialogState::ANSWERED || m_isOfferAnswered || m_unacknowledged > 0 || m_isRefresh;
 }
 
 void SipEndpoint::sendOffer(std::string const& description, bool isQuick)
 {
-    if (m_isOffering || (m_offerReceived != nullptr && !m_isOfferAnswered) || m_lateAck != nullptr)
+    if ((m_isOffering && !m_isRefresh) || (m_offerReceived != nullptr && !m_isOfferAnswered) || m_lateAck != nullptr)
     {
         m_session.takeRefusal(491);
         return;
@@ -327,7 +336,7 @@ void SipEndpoint::sendWaitingOffer()
 void SipEndpoint::startOffer(std::string const& description, bool isQuick)
 {
     bool const isEarly = isAgreedEarly();
-    bool const isUpdate = (isQuick || isEarly) && m_allowsUpdate && !description.empty();
+    bool const isUpdate = (isQuick || isEarly) && m_allowsUpdate && (m_isRefresh || !description.empty());
     bool const hasOtherLeg = isEarly && !m_isCalling && m_fork < m_forks.size() && m_forks[m_fork].leg != nullptr;
     nta_leg_t* const leg = hasOtherLeg ? m_forks[m_fork].leg : m_leg;
     bool const hasSession = !description.empty();
@@ -335,10 +344,12 @@ void SipEndpoint::startOffer(std::string const& description, bool isQuick)
           (hasSession ? " with a session description" : ""));
     m_reinvite.forget();
     m_isOffering = true;
+    std::string const headers = m_sessionTimer.getRequestHeaders();
     noteSession(SipOfferAnswer::SENT, isUpdate ? SipOfferAnswer::UPDATE : SipOfferAnswer::INVITE, description);
     m_reinvite.transaction = nta_outgoing_tcreate(
         leg, HANDLE_OFFER_RESPONSE, this, nullptr, isUpdate ? sip_method_update : sip_method_invite,
-        isUpdate ? "UPDATE" : "INVITE", nullptr, SIPTAG_CONTACT_STR(getContact()),
+        isUpdate ? "UPDATE" : "INVITE", nullptr, SIPTAG_CONTACT_STR(getContact()), SIPTAG_SUPPORTED_STR("timer"),
+        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(description.c_str())), TAG_END());
     m_reinvite.sequence = nta_leg_get_seq(leg);
@@ -366,8 +377,12 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
     }
     else if (!isUp || !m_isOffering)
         return;
+    else if (m_isRefresh && status != 491)
+        onRefreshed(status, response);
     else if (status < 300 && response != nullptr)
         onOfferAccepted(response);
+    else if (status == 422 && raiseTimer(response))
+        startOffer(m_offer, m_isOfferQuick);
     else if (status == 491 && ++m_refusals < MOST_REFUSALS)
         tryAgainLater();
     else
@@ -380,6 +395,9 @@ void SipEndpoint::onOfferAccepted(sip_t const* response)
     std::string const session = SESSION_OF(response);
     nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
     m_isOffering = false;
+    takeTimerOfAnswer(response);
+    if (!m_offer.empty())
+        m_ownSession = m_offer;
     noteSession(SipOfferAnswer::RECEIVED, isUpdate ? SipOfferAnswer::UPDATE_OK : SipOfferAnswer::FINAL, session);
     bool const isOffer = m_offer.empty() && !session.empty();
     if (isOffer)
@@ -405,6 +423,12 @@ void SipEndpoint::onOfferRefused(unsigned int status)
 {
     m_isOffering = false;
     m_negotiation.fail();
+    if (std::exchange(m_isRefresh, false))
+    {
+        startSessionTimer();
+        sendWaitingOffer();
+        return;
+    }
     m_session.takeRefusal(REFUSAL_FOR_OTHER_SIDE(status));
     if (status == 481 || status == 408)
         clear({status == 481 ? QCause::CALL_REJECTED : QCause::RECOVERY_ON_TIMER_EXPIRY, status, {}});
@@ -441,8 +465,7 @@ void SipEndpoint::ON_OFFER_TIMER(void* endpoint)
 /// Nobody is answered any more but with what ends a transaction.
 void SipEndpoint::endOffers()
 {
-    m_isOffering = false;
-    m_isOfferWaiting = false;
+    m_isOffering = m_isRefresh = m_isOfferWaiting = false;
     m_offerTimer.stop();
     if (m_lateAck != nullptr)
         acknowledge(*m_lateAck, {});

@@ -166,7 +166,9 @@ void SipEndpoint::onBlindTransfer(CC_ServiceBlindTransfer const& transfer)
 {
     std::string const number(transfer.getNumber().view());
     trace("told transfer to " + number);
-    if (m_dialog != SipDialogState::UP || m_isTransferring)
+    bool const isUp =
+        m_dialog == SipDialogState::UP || m_dialog == SipDialogState::ANSWERED; // the ACK may be on its way
+    if (!isUp || m_isTransferring)
         tellTransferStatus(QCause::TEMPORARY_FAILURE);
     else if (m_interface.getConfiguration().transfersOnWire)
         refer(number);

@@ -20,10 +20,10 @@ struct SipEnvironment
     Routing routing;
     Admission admission;
     CallTrace trace;
-    Counters counters;
+    Counters counters{};
     unsigned int lastCallNumber = 0;
     bool relaysMedia = false;                ///< through ports of ours
     bool isEnding = false;                   ///< no new calls
-    std::function<void()> onEndpointGone;    ///< told when an endpoint was destroyed; may be empty
+    std::function<void()> onEndpointGone{};  ///< told when an endpoint was destroyed; may be empty
     std::vector<SipInterface*> interfaces{}; ///< they enter and leave by themselves
 };

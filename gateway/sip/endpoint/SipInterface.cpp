@@ -26,7 +26,7 @@
 namespace
 {
 constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO";
-constexpr char const* SUPPORTED = "100rel, replaces";
+constexpr char const* SUPPORTED = "100rel, replaces, timer";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 constexpr unsigned long LONGEST_PAUSE = 60; // seconds
 

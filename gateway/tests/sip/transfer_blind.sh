@@ -95,6 +95,34 @@ abandoned_callee() { # the target is busy and the caller has gone
     respond_in_dialog "200 OK"
 }
 
+# the callee asks, and the caller is connected with the target
+asked_caller() {
+    call_up
+    expect_request INVITE body "o=target"
+    respond_again "200 OK" "$(session caller 2)"
+    expect_request ACK
+    expect_request BYE
+    respond_in_dialog "200 OK"
+}
+asking_callee() {
+    expect_invite
+    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
+    expect_request ACK
+    request_from_callee REFER 1 '' "Refer-To: <sip:77@[remote_ip]>"
+    expect 202
+    expect_notify 100 "active"
+    expect_notify 200 "terminated"
+    request_from_callee BYE 2 ''
+    expect 200
+}
+target_of_caller() {
+    expect_invite To: "77@" From: "4420@" nowhere "application/sdp"
+    respond_with "$(session target 1)" retrans "200 OK"
+    expect_request ACK body "o=caller 1 2"
+    pause 100
+    bye_from_here
+    expect 200
+}
 slowly_busy_target() {
     expect_invite
     respond "180 Ringing"
@@ -114,7 +142,8 @@ add_target
 start_gateway
 try caller callee target
 try hasty_caller callee target
+try asked_caller asking_callee target_of_caller
 try refused_caller refused_callee busy_target
 try hasty_caller abandoned_callee slowly_busy_target
-stop_gateway "4 calls placed, 4 answered, 4 cleared, 0 failed"
+stop_gateway "5 calls placed, 5 answered, 5 cleared, 0 failed"
 finish
