@@ -109,10 +109,11 @@ private:
     unsigned int getClockRate() const { return m_routes.getClockRate(); }
     void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
     void takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now);
-    void takeEvent(RtpPacket const& packet, long long now);
+    void takeEvent(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void noteArrival(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now);
     void tell(std::optional<HeardDigit> const& heard);
+    void tellEvent(std::optional<HeardDigit> const& heard);
     void sendEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendTone(long long now);
@@ -141,6 +142,7 @@ private:
     TelephoneEventSender m_digits;
     bool m_isRelayable = true;
     bool m_isAllDecoded = false;
+    bool m_passesDigitsOn = false;
     bool m_isUnusable = false; // its keys cannot be used: nothing goes in or out in the clear
     std::unique_ptr<SrtpSession> m_srtp;
     std::unique_ptr<VoiceReceiver> m_receiver;
