@@ -2,6 +2,7 @@
 
 #include "media/codec/VoiceReceiver.h"
 #include "media/codec/VoiceSender.h"
+#include "media/file/SoundPlayer.h"
 #include "media/quality/EModel.h"
 #include "media/tone/DtmfDetector.h"
 
@@ -207,7 +208,10 @@ void RtpTermination::tick(long long now)
             sendEvent(*packet, now);
         return;
     }
-    sendTone(now);
+    if (m_tone)
+        sendTone(now);
+    else
+        sendSound(now);
 }
 
 void RtpTermination::sendEvent(TelephoneEventSender::Packet const& packet, long long now)
