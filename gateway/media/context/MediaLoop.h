@@ -24,7 +24,7 @@ struct MediaLoopCounters
 ///
 /// Made and ended on the signalling thread, between `start()` and `stop()` at work on its own; a loop that was not
 /// started is turned by hand.
-class MediaLoop : private RtpTerminationObserver
+class MediaLoop final : private RtpTerminationObserver
 {
 public:
     /// `news`: where what the legs have to tell is posted. It and the tones must outlive the loop. Throws
