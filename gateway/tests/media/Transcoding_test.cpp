@@ -233,27 +233,6 @@ TEST_F(Transcoding, ADigitIsMadeAnewAmongTranscodedSpeech)
     EXPECT_EQ(timestamps, std::vector<std::uint32_t>(10, timestamps.at(0))); // 160 ms, and the end twice more
 }
 
-TEST_F(Transcoding, ADigitIsNoLossOfSpeech)
-{
-    connect({PCMA}, {PCMU});
-    MediaDescription description = DESCRIBE(a.far, {PCMA});
-    description.telephoneEvent = {101, 101};
-    a.leg->describe(description);
-    talk(a, PCMA, Sound::VOICE(8000, 8000), b, PCMU);
-    std::size_t const before = headers.size();
-    RtpHeader event = a.far.next;
-    event.type = 101;
-    for (unsigned char packet = 0; packet < 20; ++packet, ++event.sequence)
-    {
-        a.far.send(event, {5, 0x0a, 1, 0});
-        pass(20);
-    }
-    a.far.next.sequence = event.sequence;
-    b.far.hearAll();
-    talk(a, PCMA, Sound::VOICE(8000, 8000), b, PCMU);
-    EXPECT_NEAR(static_cast<double>(headers.size() - before), 50, 2); // nothing was made up for the event's packets
-}
-
 TEST_F(Transcoding, TicksThatCameMuchTooLateAreNotAllMadeUpFor)
 {
     connect({PCMA}, {PCMA});
