@@ -133,7 +133,7 @@ def main():
     parser.add_argument("build")
     parser.add_argument("--calls", type=int, default=100)
     parser.add_argument("--seconds", type=float, default=8)
-    parser.add_argument("--rounds", type=int, default=3)
+    parser.add_argument("--rounds", type=int, default=5)
     options = parser.parse_args()
     programs = f"{options.build}/benchmarks/media"
     makers = {"bare forwarder": lambda: LineRelay("bare forwarder", f"{programs}/bare_forwarder", options.calls),

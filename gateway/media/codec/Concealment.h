@@ -1,18 +1,29 @@
 #pragma once
 
-#include <memory>
+#include <cstddef>
 #include <span>
-#include <spandsp.h>
+#include <vector>
 
-/// Fills gaps in decoded sound by repeating its pitch and fading it out, for codecs that have no way of their own.
+/// Fills gaps in decoded sound for codecs that have no way of their own: the last pitch period is repeated and fades
+/// out within 60 ms, and what comes after the gap is blended in (after ITU-T G.711, appendix I, without its delay).
 class Concealment
 {
 public:
-    Concealment() : m_state(plc_init(nullptr), plc_free) {}
-    /// Sound that came; behind a gap it is blended with what filled that.
-    void note(std::span<short> samples) { plc_rx(m_state.get(), samples.data(), static_cast<int>(samples.size())); }
-    void fill(std::span<short> samples) { plc_fillin(m_state.get(), samples.data(), static_cast<int>(samples.size())); }
+    /// `rate`: of the sound, in Hz. Throws std::bad_alloc.
+    explicit Concealment(unsigned int rate) : m_rate(rate), m_history(rate / 25) {}
+
+    /// Sound that came; its beginning is blended with what filled a gap before it.
+    void note(std::span<short> samples);
+    /// Fills a gap, or one more piece of it.
+    void fill(std::span<short> samples);
 
 private:
-    std::unique_ptr<plc_state_t, int (*)(plc_state_t*)> m_state;
+    std::size_t findPitch() const;
+    double repeat();
+    void remember(std::span<short const> samples);
+
+    unsigned int m_rate;
+    std::vector<short> m_history; // 40 ms
+    std::size_t m_pitch = 0;      // samples of a period; 0: there is no gap
+    std::size_t m_filled = 0;     // samples of the gap
 };

@@ -1,6 +1,7 @@
 #include "media/codec/G711Codec.h"
 
 #include <algorithm>
+#include <spandsp.h>
 
 std::size_t G711Decoder::decode(std::span<unsigned char const> payload, std::span<short> samples)
 {

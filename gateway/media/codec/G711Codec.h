@@ -13,7 +13,7 @@ public:
 
 private:
     bool m_isALaw;
-    Concealment m_concealment;
+    Concealment m_concealment{8000};
 };
 
 class G711Encoder : public VoiceEncoder

@@ -3,6 +3,8 @@
 #include "media/codec/Concealment.h"
 #include "media/codec/VoiceCodec.h"
 
+#include <spandsp.h>
+
 /// G.722 with 64 kbit/s: an octet for two samples at 16 kHz. @{
 class G722Decoder : public VoiceDecoder
 {
@@ -13,7 +15,7 @@ public:
 
 private:
     std::unique_ptr<g722_decode_state_t, int (*)(g722_decode_state_t*)> m_state;
-    Concealment m_concealment;
+    Concealment m_concealment{16000};
 };
 
 class G722Encoder : public VoiceEncoder

@@ -11,7 +11,7 @@ public:
     void conceal(std::span<short> samples) override { m_concealment.fill(samples); }
 
 private:
-    Concealment m_concealment;
+    Concealment m_concealment{44100};
 };
 
 class L16Encoder : public VoiceEncoder

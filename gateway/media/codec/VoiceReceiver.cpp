@@ -9,7 +9,7 @@ constexpr unsigned int MOST_CONCEALED = 3; // packets in a row; what lasts longe
 }
 
 VoiceReceiver::VoiceReceiver(unsigned int rate)
-    : m_rate(rate), m_decoded(VoiceDecoder::MOST_SAMPLES), m_ready(4 * VoiceDecoder::MOST_SAMPLES)
+    : m_rate(rate), m_decoded(VoiceDecoder::MOST_SAMPLES), m_ready(2 * VoiceDecoder::MOST_SAMPLES)
 {
 }
 
@@ -55,7 +55,7 @@ bool VoiceReceiver::prepare(MG_Rtp::ECodec::Type codec)
 
 void VoiceReceiver::decode(JitterBuffer::Slot const& slot)
 {
-    if (!prepare(slot.codec))
+    if (slot.codec == MG_Rtp::ECodec::NONE || !prepare(slot.codec))
         return;
     std::size_t const count = m_decoder->decode({slot.payload.data(), slot.length}, m_decoded);
     if (count == 0)

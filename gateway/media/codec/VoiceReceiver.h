@@ -18,6 +18,7 @@ public:
     explicit VoiceReceiver(unsigned int rate);
 
     unsigned int getRate() const { return m_rate; }
+    /// Codec NONE: a packet that is there, but holds no sound.
     void put(RtpHeader const& header, MG_Rtp::ECodec::Type codec, std::span<unsigned char const> payload)
     {
         m_buffer.put(header, codec, payload);

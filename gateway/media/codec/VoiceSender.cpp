@@ -9,7 +9,7 @@ VoiceSender::VoiceSender(unsigned int rate, MG_Rtp::MediaType const& media)
     , m_encoder(VoiceCodec::MAKE_ENCODER(media.codec, VoiceCodec::RATE_OF(media.codec, rate)))
     , m_resampler(rate, VoiceCodec::RATE_OF(media.codec, rate))
     , m_packet(VoiceCodec::RATE_OF(media.codec, rate) * m_period / 1000)
-    , m_samples(2 * VoiceDecoder::MOST_SAMPLES)
+    , m_samples(VoiceDecoder::MOST_SAMPLES)
     , m_payload(VoiceEncoder::MOST_OCTETS)
 {
 }

@@ -15,6 +15,9 @@ public:
     Bridge();
     ~Bridge();
 
+    /// For one more leg. Throws std::bad_alloc.
+    void makeRoom() { m_legs.reserve(m_legs.size() + 1); }
+    /// REQUIRES: there is room.
     void add(RtpTermination& leg);
     void remove(RtpTermination& leg);
     /// To be called when one of the legs was described anew.

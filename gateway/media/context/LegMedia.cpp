@@ -59,3 +59,8 @@ void LegMedia::sendDigit(char digit, unsigned int milliseconds)
 void LegMedia::askQuality() { m_call->m_core->post(*m_call, MediaOrder::Ask{m_number}); }
 
 void LegMedia::detectDigits(bool isWanted) { m_call->m_core->post(*m_call, MediaOrder::Detect{m_number, isWanted}); }
+
+void LegMedia::playSound(SharedSound const& sound, bool isEndless)
+{
+    m_call->m_core->post(*m_call, MediaOrder::Play{m_number, sound, isEndless});
+}

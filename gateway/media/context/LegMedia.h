@@ -2,6 +2,7 @@
 
 #include "media/context/MediaDescription.h"
 #include "media/context/MediaObserver.h"
+#include "media/file/RecordedSound.h"
 #include "platform/base/TYPtr.h"
 #include "platform/media/MG_Tones.h"
 
@@ -47,6 +48,9 @@ public:
     /// Plays a tone to the far side instead of what the others say; NONE ends it. A tone that the country does not have
     /// is silence.
     void playTone(MG_Tones::ECallProgressTone::Type tone);
+    /// Plays a sound to the far side instead of what the others say, once or again and again (music on hold); null ends
+    /// it. It and a tone take each other's place. WaveReader reads one from a file.
+    void playSound(SharedSound const& sound, bool isEndless = false);
     /// Keys a digit in towards the far side: '0' to '9', '*', '#', 'A' to 'D' for 40 to 5000 milliseconds. Further ones
     /// wait their turn, up to 32. As a telephone event where that was agreed, else as a sound, where the codec is one
     /// that we can speak.

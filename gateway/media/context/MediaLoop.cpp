@@ -124,9 +124,19 @@ void MediaLoop::tick()
 {
     m_nextTick += TICK * MILLISECOND;
     for (auto& [number, bridge] : m_bridges)
-        bridge.tick(m_now);
+        tick(bridge);
     ++m_ticks;
     attend();
+}
+
+void MediaLoop::tick(Bridge& bridge)
+try
+{
+    bridge.tick(m_now);
+}
+catch (std::bad_alloc const&)
+{
+    ++m_counters.failures; // a codec could not be made: this frame is lost
 }
 
 /// Each leg once a second, in each tick those whose turn it is: so the work is spread evenly without a timer for each.

@@ -16,6 +16,7 @@ struct MediaLoopCounters
 {
     unsigned long long turns = 0;        ///< that had anything to do
     unsigned long long skippedTicks = 0; ///< of 20 ms that came too late to be made up for
+    unsigned long long failures = 0;     ///< orders and ticks that found no memory
 };
 
 /// One thread of the datapath: the sockets and the 20 ms clock of the calls that belong to it. Nothing on a packet's
@@ -23,7 +24,7 @@ struct MediaLoopCounters
 ///
 /// Made and ended on the signalling thread, between `start()` and `stop()` at work on its own; a loop that was not
 /// started is turned by hand.
-class MediaLoop : private RtpTerminationObserver
+class MediaLoop final : private RtpTerminationObserver
 {
 public:
     /// `news`: where what the legs have to tell is posted. It and the tones must outlive the loop. Throws
@@ -76,6 +77,7 @@ private:
     void obey(MediaOrder::Expect& order);
     void obey(MediaOrder::HandOver& order);
     void obey(MediaOrder::Tone& order);
+    void obey(MediaOrder::Play& order);
     void obey(MediaOrder::Detect& order);
     void obey(MediaOrder::Digit& order);
     void obey(MediaOrder::Ask& order);
@@ -88,6 +90,7 @@ private:
     void startClock();
     void onClock();
     void tick();
+    void tick(Bridge& bridge);
     void attend();
     void readTime();
 

@@ -27,6 +27,7 @@ void MediaLoop::takeOrders()
 }
 
 void MediaLoop::take(MediaOrder::Any& order)
+try
 {
     if (m_isClosed)
         return;
@@ -36,6 +37,10 @@ void MediaLoop::take(MediaOrder::Any& order)
         expected->second.push_back(std::move(order));
     else
         std::visit([this](auto& one) { obey(one); }, order);
+}
+catch (std::bad_alloc const&)
+{
+    ++m_counters.failures; // the order is not obeyed; what is there goes on
 }
 
 MediaLoop::Leg* MediaLoop::find(unsigned long long leg)
@@ -47,28 +52,40 @@ MediaLoop::Leg* MediaLoop::find(unsigned long long leg)
 void MediaLoop::obey(MediaOrder::Make& order)
 {
     unsigned long long const number = order.leg->getNumber();
+    auto const expected = m_expected.extract(number);
     Leg& leg = m_legs[number];
     leg.termination = std::move(order.leg);
+    try
+    {
+        join(leg, order.call);
+    }
+    catch (std::bad_alloc const&)
+    {
+        m_legs.erase(number);
+        throw;
+    }
     leg.termination->setObserver(this);
     leg.sockets[0] = {leg.termination.get(), false};
     leg.sockets[1] = {leg.termination.get(), true};
     watch(leg.termination->getRtp(), leg.sockets[0]);
     watch(leg.termination->getRtcp(), leg.sockets[1]);
-    join(leg, order.call);
     startClock();
-
-    auto const expected = m_expected.extract(number);
     if (expected.empty())
         return;
     for (MediaOrder::Any& waiting : expected.mapped())
         take(waiting);
 }
 
+/// Leaves the call before. Throws std::bad_alloc before anything has changed.
 void MediaLoop::join(Leg& leg, unsigned long long call)
 {
+    Bridge& bridge = m_bridges[call];
+    bridge.makeRoom();
+    if (leg.bridge != nullptr)
+        leave(leg);
     leg.call = call;
-    leg.bridge = &m_bridges[call];
-    leg.bridge->add(*leg.termination);
+    leg.bridge = &bridge;
+    bridge.add(*leg.termination);
 }
 
 void MediaLoop::leave(Leg& leg)
@@ -106,7 +123,6 @@ void MediaLoop::obey(MediaOrder::Connect& order)
     Leg* const leg = find(order.leg);
     if (leg == nullptr || leg->call == order.call)
         return;
-    leave(*leg);
     join(*leg, order.call);
 }
 
@@ -122,6 +138,12 @@ void MediaLoop::obey(MediaOrder::Tone& order)
 {
     if (Leg* const leg = find(order.leg))
         leg->termination->playTone(m_tones.find(order.tone));
+}
+
+void MediaLoop::obey(MediaOrder::Play& order)
+{
+    if (Leg* const leg = find(order.leg))
+        leg->termination->playSound(order.sound, order.isEndless);
 }
 
 void MediaLoop::obey(MediaOrder::Detect& order)

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/context/MediaDescription.h"
+#include "media/file/RecordedSound.h"
 #include "media/quality/MediaQuality.h"
 #include "platform/media/MG_Tones.h"
 
@@ -45,6 +46,12 @@ struct Tone
     unsigned long long leg;
     MG_Tones::ECallProgressTone::Type tone;
 };
+struct Play
+{
+    unsigned long long leg;
+    SharedSound sound; ///< null: ends what is played
+    bool isEndless;
+};
 struct Detect ///< digits in speech
 {
     unsigned long long leg;
@@ -67,7 +74,7 @@ struct End
 struct Stop ///< the loop's running
 {
 };
-using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Detect, Digit, Ask, End, Stop>;
+using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Play, Detect, Digit, Ask, End, Stop>;
 
 /// Which leg it is about; 0: none.
 unsigned long long LEG_OF(Any const& order);

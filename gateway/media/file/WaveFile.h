@@ -1,5 +1,7 @@
 #pragma once
 
+#include "media/file/RecordedSound.h"
+
 #include <cstdio>
 #include <memory>
 #include <span>
@@ -19,6 +21,8 @@ public:
 
     unsigned int getRate() const { return m_rate; } ///< Hz
     std::vector<short> const& getSamples() const { return m_samples; }
+    /// For `LegMedia::playSound`.
+    SharedSound share() const { return std::make_shared<RecordedSound const>(RecordedSound{m_rate, m_samples}); }
 
 private:
     bool readFormat(std::span<unsigned char const> chunk);

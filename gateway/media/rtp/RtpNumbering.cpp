@@ -7,7 +7,7 @@ namespace
 {
 constexpr long long SECOND = 1000000000;           // ns
 constexpr long long LONGEST_PAUSE = 3600 * SECOND; // after which the timestamp may be anywhere
-constexpr long long PAUSE = 60000000;              // ns without a packet, after which a talk spurt begins
+constexpr long long PAUSE = 40000000;              // ns, by which a packet may be late in the same talk spurt
 
 bool IS_AFTER(std::uint16_t left, std::uint16_t right) { return static_cast<std::int16_t>(left - right) > 0; }
 bool IS_LATER(std::uint32_t left, std::uint32_t right) { return static_cast<std::int32_t>(left - right) > 0; }
@@ -55,7 +55,7 @@ RtpHeader RtpNumbering::relay(RtpHeader const& in, unsigned char type, unsigned 
 
 RtpHeader RtpNumbering::next(unsigned char type, std::uint32_t ticks, unsigned int clockRate, long long now)
 {
-    bool const goesOn = m_isOwn && m_clockRate == clockRate && now - m_time < PAUSE;
+    bool const goesOn = m_isOwn && m_clockRate == clockRate && now - m_time <= PAUSE + m_ticks * SECOND / clockRate;
     std::uint32_t const step = goesOn ? m_ticks : m_hasSent ? std::max(elapsed(clockRate, now), 1u) : 0;
     m_from = 0;
     m_isOwn = true;

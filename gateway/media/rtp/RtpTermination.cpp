@@ -2,6 +2,7 @@
 
 #include "media/codec/VoiceReceiver.h"
 #include "media/codec/VoiceSender.h"
+#include "media/file/SoundPlayer.h"
 #include "media/quality/EModel.h"
 #include "media/tone/DtmfDetector.h"
 
@@ -59,7 +60,8 @@ void RtpTermination::setPartner(RtpTermination* partner)
 {
     m_partner = partner;
     m_routes = RtpRoutes(m_description, partner == nullptr ? nullptr : &partner->m_description);
-    m_isRelayable = partner == nullptr || m_routes.areAllRelayed(m_description);
+    bool const isKnown = partner != nullptr && partner->m_description.formats.getSize() != 0;
+    m_isRelayable = !isKnown || m_routes.areAllRelayed(m_description);
 }
 
 void RtpTermination::receiveRtp(DatagramBatch& batch, long long now)
@@ -117,7 +119,7 @@ void RtpTermination::takeRtp(std::span<unsigned char> octets, DatagramAddress co
     if (!receives())
         return;
     if (route.kind == RtpRoutes::EVENT)
-        takeEvent(packet, now);
+        takeEvent(packet, route, now);
     else if (route.kind == RtpRoutes::VOICE)
         hearVoice(packet, route);
     if (m_partner != nullptr && !m_isAllDecoded)
@@ -134,13 +136,25 @@ void RtpTermination::noteArrival(RtpPacket const& packet, RtpRoutes::Route const
         m_observer->onSpeech(*this);
 }
 
-void RtpTermination::takeEvent(RtpPacket const& packet, long long now)
+void RtpTermination::takeEvent(RtpPacket const& packet, RtpRoutes::Route const& route, long long now)
 {
+    if (m_receiver != nullptr) // it has its number among those of speech
+        m_receiver->put(packet.header, MG_Rtp::ECodec::NONE, {});
+    m_passesDigitsOn = route.relayType == MediaPayloadTypes::NONE || m_receiver != nullptr;
     TelephoneEvent event;
     if (event.read(packet.payload))
-        tell(m_heard.receive(packet.header, event, getClockRate(), now));
+        tellEvent(m_heard.receive(packet.header, event, getClockRate(), now));
     else
         ++m_quality.malformedPackets;
+}
+
+/// Where the packets cannot be relayed, because the partner takes none, or they would get among packets of our own, the
+/// digit is made anew.
+void RtpTermination::tellEvent(std::optional<HeardDigit> const& heard)
+{
+    if (heard && m_passesDigitsOn && m_partner != nullptr)
+        m_partner->sendDigit(heard->digit, heard->milliseconds);
+    tell(heard);
 }
 
 void RtpTermination::tell(std::optional<HeardDigit> const& heard)
@@ -152,7 +166,8 @@ void RtpTermination::tell(std::optional<HeardDigit> const& heard)
 void RtpTermination::relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now)
 {
     RtpTermination& to = *m_partner;
-    if (route.relayType == MediaPayloadTypes::NONE)
+    bool const isDecoded = route.kind != RtpRoutes::VOICE && m_receiver != nullptr;
+    if (route.relayType == MediaPayloadTypes::NONE || isDecoded)
         return;
     if (!to.isOpenForRelay())
     {
@@ -193,7 +208,10 @@ void RtpTermination::tick(long long now)
             sendEvent(*packet, now);
         return;
     }
-    sendTone(now);
+    if (m_tone)
+        sendTone(now);
+    else
+        sendSound(now);
 }
 
 void RtpTermination::sendEvent(TelephoneEventSender::Packet const& packet, long long now)
@@ -249,7 +267,7 @@ bool RtpTermination::open(std::span<unsigned char>& octets,
 
 void RtpTermination::attend(long long now)
 {
-    tell(m_heard.expire(now));
+    tellEvent(m_heard.expire(now));
     checkSilence(now);
     if (m_reports.isDue(now))
         sendReport(false, now);

@@ -2,6 +2,7 @@
 
 #include "media/context/MediaDescription.h"
 #include "media/context/MediaOptions.h"
+#include "media/file/RecordedSound.h"
 #include "media/rtp/DatagramBatch.h"
 #include "media/rtp/RtcpReports.h"
 #include "media/rtp/RtpLatch.h"
@@ -14,6 +15,7 @@
 
 class DtmfDetector;
 class RtpTermination;
+class SoundPlayer;
 class VoiceReceiver;
 class VoiceSender;
 
@@ -74,10 +76,12 @@ public:
     bool sendDigit(char digit, unsigned int milliseconds) { return m_digits.add(digit, milliseconds); }
     /// Plays it instead of what the others say; null: ends it. It must outlive this.
     void playTone(Tone const* tone);
+    /// The same with a sound.
+    void playSound(SharedSound const& sound, bool isEndless);
     /// Whether digits are heard in what is spoken, too.
     void detectDigits(bool isWanted);
     /// Whether it wants its ticks.
-    bool isClocked() const { return m_digits.isBusy() || m_tone.has_value(); }
+    bool isClocked() const { return m_digits.isBusy() || m_tone.has_value() || m_player != nullptr; }
     /// Every 20 ms of its clocked time.
     void tick(long long now);
 
@@ -109,13 +113,15 @@ private:
     unsigned int getClockRate() const { return m_routes.getClockRate(); }
     void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
     void takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now);
-    void takeEvent(RtpPacket const& packet, long long now);
+    void takeEvent(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void noteArrival(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now);
     void tell(std::optional<HeardDigit> const& heard);
+    void tellEvent(std::optional<HeardDigit> const& heard);
     void sendEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendTone(long long now);
+    void sendSound(long long now);
     void sendReport(bool isBye, long long now);
     void checkSilence(long long now);
 
@@ -141,12 +147,14 @@ private:
     TelephoneEventSender m_digits;
     bool m_isRelayable = true;
     bool m_isAllDecoded = false;
+    bool m_passesDigitsOn = false;
     bool m_isUnusable = false; // its keys cannot be used: nothing goes in or out in the clear
     std::unique_ptr<SrtpSession> m_srtp;
     std::unique_ptr<VoiceReceiver> m_receiver;
     std::unique_ptr<VoiceSender> m_sender;
     std::unique_ptr<DtmfDetector> m_detector;
     std::optional<ToneGenerator> m_tone;
+    std::unique_ptr<SoundPlayer> m_player;
     std::optional<ToneGenerator> m_digitSound;
     std::uint32_t m_eventTimestamp = 0;
     MediaDescription m_description;

@@ -1,5 +1,6 @@
 #include "media/codec/VoiceReceiver.h"
 #include "media/codec/VoiceSender.h"
+#include "media/file/SoundPlayer.h"
 #include "media/rtp/RtpTermination.h"
 #include "media/tone/DtmfDetector.h"
 
@@ -8,6 +9,7 @@
 namespace
 {
 constexpr unsigned int TONE_RATE = 8000; // Hz
+constexpr unsigned int WIDE_RATE = 16000;
 constexpr std::size_t TONE_FRAME = TONE_RATE / 50;
 } // namespace
 
@@ -23,7 +25,7 @@ void RtpTermination::closeVoice()
 {
     m_isAllDecoded = false;
     m_receiver.reset();
-    if (!m_tone)
+    if (!isClocked())
         m_sender.reset();
 }
 
@@ -71,6 +73,7 @@ void RtpTermination::sendFrame(std::span<short const> frame, unsigned int rate, 
 void RtpTermination::playTone(Tone const* tone)
 {
     m_tone.reset();
+    m_player.reset();
     if (tone != nullptr)
         m_tone.emplace(*tone);
 }
@@ -82,6 +85,27 @@ void RtpTermination::sendTone(long long now)
         sendFrame(frame, TONE_RATE, now);
     else
         m_tone.reset();
+}
+
+void RtpTermination::playSound(SharedSound const& sound, bool isEndless)
+{
+    m_tone.reset();
+    m_player.reset();
+    if (sound == nullptr || m_description.formats.getSize() == 0)
+        return;
+    MG_Rtp::ECodec::Type const codec = m_description.formats.begin()->codec.getCodec();
+    bool const isWide = VoiceCodec::RATE_OF(codec, WIDE_RATE) > TONE_RATE;
+    m_player = std::make_unique<SoundPlayer>(sound, isEndless, isWide ? WIDE_RATE : TONE_RATE);
+}
+
+void RtpTermination::sendSound(long long now)
+{
+    std::array<short, WIDE_RATE / 50> samples;
+    std::span<short> const frame = std::span(samples).first(m_player->getRate() / 50);
+    if (m_player->take(frame))
+        sendFrame(frame, m_player->getRate(), now);
+    else
+        m_player.reset();
 }
 
 /// Without telephone events a digit is a sound (ITU-T Q.23), if the codec is one that we speak.

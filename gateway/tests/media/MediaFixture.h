@@ -89,7 +89,10 @@ protected:
         {
             hadWork = false;
             for (unsigned int i = 0; i < OPTIONS().threads; ++i)
-                hadWork |= layer->getLoop(i).turn(0) | layer->getLoop(i).getEvents().runTurn();
+            {
+                hadWork |= layer->getLoop(i).turn(0);
+                hadWork |= layer->getLoop(i).getEvents().runTurn();
+            }
             hadWork |= signalling.runTurn();
         }
     }

@@ -1,4 +1,7 @@
 #include "MediaFixture.h"
+#include "callcontrol/CallControl.h"
+#include "properties/CC_PropertyContextId.h"
+#include "properties/CC_PropertyId.h"
 #include "testing/FailingAllocator.h"
 
 #include <random>
@@ -315,6 +318,25 @@ TEST_F(Relay, ALegAloneIsDeafAndDumb)
     turn();
     EXPECT_FALSE(a.far.hear().has_value());
     EXPECT_EQ(askQuality(a).receivedPackets, 1u);
+}
+
+TEST_F(Relay, TheContextOfACallsPropertyIsWhereItsLegsMeet)
+{
+    CallControl::SET_MG_CONTEXT_REPOSITORY(layer->getContexts());
+    CallControl::SET_MG_TERMINATION_REPOSITORY(layer->getTerminations());
+    {
+        CC_PropertyContextId const property(CC_PropertyId::CONTEXT); // as each call gets one
+        CallMedia* const context = CallMedia::OF(property.getContext());
+        ASSERT_NE(context, nullptr);
+        join(a, *context, {PCMA});
+        join(b, *context, {PCMA});
+    }
+    EXPECT_TRUE(pass(a, b).has_value()); // a context lives as long as its legs
+    a.leg.reset();
+    b.leg.reset();
+    EXPECT_EQ(CallMedia::s_numberOfInstances, 0u);
+    CallControl::SET_MG_CONTEXT_REPOSITORY(nullptr);
+    CallControl::SET_MG_TERMINATION_REPOSITORY(nullptr);
 }
 
 TEST_F(Relay, LegsAndContextsMayOutliveTheLayer)

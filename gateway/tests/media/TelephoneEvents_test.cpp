@@ -173,6 +173,21 @@ TEST_F(TelephoneEvents, DigitsWaitForEachOther)
     EXPECT_EQ(digits, "12D");
 }
 
+TEST_F(TelephoneEvents, WhoTakesNoEventsHearsTheDigitAsSound)
+{
+    b.leg->describe(DESCRIBE(b.far, {PCMA}));
+    turn();
+    key(a.far, 5);
+    pass(200);
+    std::vector<FarEnd::Received> const heard = b.far.hearAll();
+    ASSERT_GE(heard.size(), 5u); // 100 ms
+    for (FarEnd::Received const& received : heard)
+    {
+        EXPECT_EQ(received.header.type, PCMA);
+        EXPECT_EQ(received.payload.size(), 160u);
+    }
+}
+
 TEST_F(TelephoneEvents, ShortPayloadsAreMalformed)
 {
     a.far.send({true, 101, 1, 1, 1}, {5, 0, 0});

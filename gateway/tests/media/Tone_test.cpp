@@ -178,6 +178,30 @@ TEST_F(Tones, WithACodecThatWeDoNotSpeakThereIsNone)
     EXPECT_TRUE(b.far.hearAll().empty());
 }
 
+TEST_F(Tones, ASoundIsPlayedOnceOrAgainAndAgain)
+{
+    connect({PCMA});
+    auto const sound =
+        std::make_shared<RecordedSound const>(RecordedSound{16000, Sound::SINE(500, 16000, 8000)}); // 0.5 s
+    b.leg->playSound(sound);
+    pass(2000);
+    std::vector<short> heard = DECODE(b.far.hearAll());
+    EXPECT_NEAR(static_cast<double>(heard.size()), 4000, 200);
+    EXPECT_NEAR(Sound::AMPLITUDE(std::span(heard).subspan(800, 1600), 500, 8000), 8000, 300);
+    a.far.say({1});
+    turn();
+    EXPECT_TRUE(b.far.hear().has_value()); // speech again
+    b.leg->playSound(sound, true);
+    pass(3000);
+    heard = DECODE(b.far.hearAll());
+    EXPECT_NEAR(static_cast<double>(heard.size()), 24000, 400);
+    EXPECT_NEAR(Sound::AMPLITUDE(std::span(heard).last(1600), 500, 8000), 8000, 300);
+    b.leg->playSound(nullptr);
+    turn();
+    pass(100);
+    EXPECT_TRUE(b.far.hearAll().empty());
+}
+
 TEST_F(Tones, AToneThatTheCountryDoesNotHaveIsNone)
 {
     connect();

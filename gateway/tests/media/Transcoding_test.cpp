@@ -184,6 +184,69 @@ TEST_F(Transcoding, AReinviteBringsTheTwoTogether)
     EXPECT_GT(static_cast<std::int32_t>(heard->header.timestamp - before.timestamp), 0);
 }
 
+TEST_F(Transcoding, LongPacketsAreOneTalkSpurt)
+{
+    call = makeCallOfTheSameLoop();
+    join(a, *call, {PCMA});
+    MediaDescription description = DESCRIBE(b.far, {});
+    description.formats.add({VoipCodec(PCMU, 60), {0, 0}});
+    join(b, *call, description);
+    talk(a, PCMA, Sound::VOICE(8000, 16000), b, PCMU);
+    ASSERT_GE(headers.size(), 30u);
+    for (std::size_t i = 1; i < headers.size(); ++i)
+    {
+        EXPECT_FALSE(headers[i].marker);
+        EXPECT_EQ(headers[i].timestamp, headers[0].timestamp + 480 * i);
+    }
+}
+
+TEST_F(Transcoding, ADigitIsMadeAnewAmongTranscodedSpeech)
+{
+    call = makeCallOfTheSameLoop();
+    MediaDescription description = DESCRIBE(a.far, {PCMA});
+    description.telephoneEvent = {101, 101};
+    join(a, *call, description);
+    description = DESCRIBE(b.far, {PCMU});
+    description.telephoneEvent = {96, 96};
+    join(b, *call, description);
+    talk(a, PCMA, Sound::VOICE(8000, 4000), b, PCMU);
+    RtpHeader event = a.far.next;
+    event.type = 101;
+    for (unsigned char packet = 1; packet <= 8; ++packet, ++event.sequence)
+    {
+        unsigned char const duration = static_cast<unsigned char>(std::min<int>(packet, 5));
+        a.far.send(event, {5, static_cast<unsigned char>(packet > 5 ? 0x8a : 0x0a), duration, 0}); // 32 ms each
+        pass(20);
+    }
+    pass(400);
+    EXPECT_EQ(a.told, "5160 ");
+    std::vector<std::uint32_t> timestamps;
+    unsigned int ends = 0;
+    for (FarEnd::Received const& received : b.far.hearAll())
+    {
+        if (received.header.type != 96)
+            continue;
+        timestamps.push_back(received.header.timestamp);
+        ends += received.payload[1] >> 7;
+    }
+    EXPECT_EQ(ends, 3u);
+    EXPECT_EQ(timestamps, std::vector<std::uint32_t>(10, timestamps.at(0))); // 160 ms, and the end twice more
+}
+
+TEST_F(Transcoding, TicksThatCameMuchTooLateAreNotAllMadeUpFor)
+{
+    connect({PCMA}, {PCMA});
+    a.leg->playTone(MG_Tones::ECallProgressTone::DIAL);
+    pass(100);
+    a.far.hearAll();
+    clock.advance(1000);
+    turn();
+    EXPECT_EQ(a.far.hearAll().size(), 4u); // the one that is due, and three
+    EXPECT_EQ(layer->getLoop(0).getCounters().skippedTicks, 46u);
+    pass(100);
+    EXPECT_EQ(a.far.hearAll().size(), 5u);
+}
+
 TEST_F(Transcoding, TakesNoMemoryOnceItRuns)
 {
     connect({PCMA}, {G722});
