@@ -83,6 +83,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
                     0,
                     false,
                     [this] { stopIfIdle(); }}
+    , m_freeMemory(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)

@@ -2,6 +2,7 @@
 
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
+#include "host/FreeMemory.h"
 #include "operation/Recording.h"
 #include "operation/StateDump.h"
 #include "platform/eventloop/TYEventLoop.h"
@@ -79,6 +80,7 @@ private:
     StateDump m_dump;
     CallControlHost m_host;
     SipEnvironment m_environment;
+    FreeMemory m_freeMemory;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
     std::vector<std::unique_ptr<Port>> m_ports;

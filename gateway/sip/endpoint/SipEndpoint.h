@@ -159,7 +159,7 @@ private:
     nta_leg_t* m_leg = nullptr;
     nta_incoming_t* m_transaction = nullptr; // the INVITE received
     nta_outgoing_t* m_invite = nullptr;      // the INVITE sent; kept for answers that are repeated
-    nta_outgoing_t* m_ack = nullptr;
+
     nta_outgoing_t* m_bye = nullptr;
     unsigned int m_inviteSequence = 0;
     TYTimer m_timer; // calling side: a dial failed, the INVITE expires; called side: its answer or its end is awaited

@@ -22,6 +22,7 @@ using namespace SipProperty;
 namespace
 {
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 69;
+constexpr unsigned int LONGEST_REPETITION = 32000; // milliseconds for which a peer repeats an answer by default
 
 void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State state)
 {
@@ -183,7 +184,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
             acknowledge({});
         return;
     }
-    m_timer.stop();
+    m_timer.start(std::max(m_interface.getConfiguration().t1x64, LONGEST_REPETITION));
     confirmDialog(response);
     m_wasAnswered = true;
     std::string const session = SESSION_OF(response);
@@ -218,6 +219,11 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
+    if (m_wasAnswered) // no answer is repeated after this time
+    {
+        forgetInvite();
+        return;
+    }
     if (m_dialog == Dialog::CANCELLED)
     {
         forgetInvite();
@@ -246,12 +252,13 @@ void SipEndpoint::acknowledge(std::string const& sessionDescription)
     bool const hasSession = !sessionDescription.empty();
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
     m_isAckLate = false;
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(m_ack);
-    m_ack = nta_outgoing_tcreate(m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr,
-                                 SIPTAG_CSEQ_STR(sequence.c_str()),
-                                 TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                                 TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
+    // without a transaction, which would keep its message for as long as the call; a repeated answer gets another
+    nta_outgoing_t* const ack = nta_outgoing_tcreate(
+        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, NTATAG_STATELESS(1),
+        SIPTAG_CSEQ_STR(sequence.c_str()), TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
+    if (ack != nullptr)
+        nta_outgoing_destroy(ack);
 }
 
 /// The other side's answer to the offer that came with our 200 is here.
@@ -276,8 +283,6 @@ void SipEndpoint::cancel(SipCause const& cause)
 
 void SipEndpoint::forgetInvite()
 {
-    if (m_ack != nullptr)
-        nta_outgoing_destroy(std::exchange(m_ack, nullptr));
     if (m_invite == nullptr)
         return;
     nta_outgoing_bind(m_invite, nullptr, nullptr);
