@@ -252,10 +252,10 @@ void SipEndpoint::acknowledge(std::string const& sessionDescription)
     bool const hasSession = !sessionDescription.empty();
     trace(std::string("-> ACK") + (hasSession ? " with a session description" : ""));
     m_isAckLate = false;
-    // without a transaction, which would keep its message for as long as the call; a repeated answer gets another
+    // given up at once: the stack keeps it for its time, not for as long as the call; a repeated answer gets another
     nta_outgoing_t* const ack = nta_outgoing_tcreate(
-        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, NTATAG_STATELESS(1),
-        SIPTAG_CSEQ_STR(sequence.c_str()), TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
+        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
     if (ack != nullptr)
         nta_outgoing_destroy(ack);
