@@ -88,6 +88,7 @@ Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
                     configuration.relaysMedia,
                     false,
                     [this] { stopIfIdle(); }}
+    , m_freeMemory(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)

@@ -2,6 +2,7 @@
 
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
+#include "host/FreeMemory.h"
 #include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
 #include "operation/StateDump.h"
@@ -81,6 +82,7 @@ private:
     StateDump m_dump;
     CallControlHost m_host;
     SipEnvironment m_environment;
+    FreeMemory m_freeMemory;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
     std::vector<std::unique_ptr<Port>> m_ports;

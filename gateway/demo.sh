@@ -74,6 +74,9 @@ find_ports
 cat >"$WORK/gateway.toml" <<END
 [gateway]
 clear-after = 2
+max-calls = 0
+max-calls-per-second = 0
+max-calls-per-source = 0
 
 [[interface]]
 name = "a"

@@ -61,7 +61,7 @@ void SipEndpoint::ON_TIMER(void* endpoint)
         [&]
         {
             if (self.m_dialog == SipDialogState::UP)
-                self.onReferralTimeout();
+                self.onUpTimer();
             else
                 self.m_isCalling ? self.onCallingTimer() : self.onAnswerTimeout();
         });

@@ -77,7 +77,6 @@ private:
     struct Invitation
     {
         nta_outgoing_t* transaction = nullptr;
-        nta_outgoing_t* ack = nullptr;
         unsigned int sequence = 0;
 
         void forget();
@@ -176,9 +175,11 @@ private:
     void askPeerToTransfer(std::string const& number, std::string const& headers);
     void notifyReferrer(unsigned int status, char const* phrase);
     void endReferral(QCause cause);
+    void onUpTimer();
     void onReferralTimeout();
     void tellTransferStatus(QCause cause);
     void onBlindTransfer(CC_ServiceBlindTransfer const& transfer);
+    void transferTo(std::string const& number);
     void dialTarget(std::string const& number);
     void followTarget();
     void joinTarget();
@@ -281,6 +282,7 @@ private:
     bool m_hadPeer = false;
     bool m_isInCall = false;
     bool m_isFinished = false;
+    std::string m_transferAfterAnswer; // the number
     SipQuality m_quality;
     SipMedia m_media{[this](unsigned int seconds) { onSilence(seconds); }};
     SipOfferAnswer m_negotiation;

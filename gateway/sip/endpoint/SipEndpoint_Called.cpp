@@ -23,6 +23,7 @@ using namespace SipProperty;
 namespace
 {
 constexpr unsigned int DEFAULT_MAX_FORWARDS = 69;
+constexpr unsigned int LONGEST_REPETITION = 32000; // milliseconds for which a peer repeats an answer by default
 
 void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State state)
 {
@@ -218,6 +219,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::takeAnswer(sip_t const* response)
 {
     m_wasAnswered = true;
+    m_timer.start(std::max(m_interface.getConfiguration().t1x64, LONGEST_REPETITION));
     noteAllow(response);
     takeTimerOfAnswer(response);
     Fork const* const fork = findFork(response);
@@ -363,12 +365,13 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
         m_lateAck = nullptr;
     if (hasSession)
         m_ownSession = sessionDescription;
-    if (invitation.ack != nullptr)
-        nta_outgoing_destroy(invitation.ack);
-    invitation.ack = nta_outgoing_tcreate(
+    // given up at once: the stack keeps it for its time, not for as long as the call; a repeated answer gets another
+    nta_outgoing_t* const ack = nta_outgoing_tcreate(
         m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
         TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
+    if (ack != nullptr)
+        nta_outgoing_destroy(ack);
 }
 
 void SipEndpoint::cancel(SipCause const& cause)
@@ -382,8 +385,6 @@ void SipEndpoint::cancel(SipCause const& cause)
 
 void SipEndpoint::Invitation::forget()
 {
-    if (ack != nullptr)
-        nta_outgoing_destroy(std::exchange(ack, nullptr));
     if (transaction == nullptr)
         return;
     nta_outgoing_bind(transaction, nullptr, nullptr);

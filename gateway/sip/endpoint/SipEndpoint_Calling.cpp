@@ -373,6 +373,8 @@ void SipEndpoint::answerWith(std::string const& session)
         m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
+    if (std::string const number = std::exchange(m_transferAfterAnswer, {}); !number.empty())
+        transferTo(number);
 }
 
 /// With the called party's identity, as far as the network vouches for it.

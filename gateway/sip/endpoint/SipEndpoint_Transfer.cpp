@@ -145,6 +145,15 @@ void SipEndpoint::endReferral(QCause cause)
     leaveCall({QCause::NORMAL_CALL_CLEARING, 0, {}});
 }
 
+/// No answer is repeated after this time; or who referred us is to be told something.
+void SipEndpoint::onUpTimer()
+{
+    if (m_isReferring || !m_isInCall)
+        onReferralTimeout();
+    else if (m_lateAck != &m_invite)
+        m_invite.forget();
+}
+
 void SipEndpoint::onReferralTimeout()
 {
     if (!m_isInCall)
@@ -166,11 +175,18 @@ void SipEndpoint::onBlindTransfer(CC_ServiceBlindTransfer const& transfer)
 {
     std::string const number(transfer.getNumber().view());
     trace("told transfer to " + number);
-    bool const isUp =
-        m_dialog == SipDialogState::UP || m_dialog == SipDialogState::ANSWERED; // the ACK may be on its way
-    if (!isUp || m_isTransferring)
+    bool const isUp = m_dialog == SipDialogState::UP || m_dialog == SipDialogState::ANSWERED; // its ACK is on the way
+    if (m_dialog == SipDialogState::INVITE_RECEIVED && m_transferAfterAnswer.empty())
+        m_transferAfterAnswer = number; // a service is heard at once, the other side's answer in the loop's next turn
+    else if (!isUp || m_isTransferring)
         tellTransferStatus(QCause::TEMPORARY_FAILURE);
-    else if (m_interface.getConfiguration().transfersOnWire)
+    else
+        transferTo(number);
+}
+
+void SipEndpoint::transferTo(std::string const& number)
+{
+    if (m_interface.getConfiguration().transfersOnWire)
         refer(number);
     else
         dialTarget(number);

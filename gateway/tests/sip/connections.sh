@@ -77,7 +77,8 @@ close_connections
 expect_call -t t1 # those that are gone do not count
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 
-# as many descriptors as the gateway needs itself, and a few
+# as many descriptors as the gateway needs itself, and a few; not with a sanitizer, which needs some for its own checks
+grep -qa __ubsan_handle "$GATEWAY" && finish
 served=$GATEWAY
 GATEWAY=$WORK/limited
 printf '#!/bin/bash\nulimit -n 28\nexec "%s" "$@"\n' "$served" >"$GATEWAY"
