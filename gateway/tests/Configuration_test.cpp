@@ -249,3 +249,45 @@ TEST(Configuration, AFileThatCannotBeReadIsNamed)
         EXPECT_STREQ(error.what(), "/nonexistent/file.toml: file: cannot be read");
     }
 }
+
+TEST(ConfigurationOfMedia, IsDirectUnlessAskedForOtherwise)
+{
+    Configuration const configuration = Configuration::PARSE(std::string(TWO_INTERFACES), "g.toml");
+    EXPECT_FALSE(configuration.relaysMedia);
+    EXPECT_EQ(configuration.media.firstPort, 16384);
+    EXPECT_EQ(configuration.media.lastPort, 32767);
+    EXPECT_EQ(configuration.media.threads, 1u);
+    EXPECT_EQ(configuration.media.silence, 0u);
+    EXPECT_EQ(configuration.media.differentiation, 46u);
+}
+
+TEST(ConfigurationOfMedia, IsRelayedFromTheAddressThatTheInterfaceListensOn)
+{
+    std::string const text =
+        std::string("[media]\nmode = \"relay\"\nfirst-port = 30000\nlast-port = 30999\nthreads = 2\nsilence = 30\n"
+                    "dscp = 0\n") +
+        TWO_INTERFACES;
+    Configuration const configuration = Configuration::PARSE(text, "g.toml");
+    EXPECT_TRUE(configuration.relaysMedia);
+    EXPECT_EQ(configuration.media.firstPort, 30000);
+    EXPECT_EQ(configuration.media.lastPort, 30999);
+    EXPECT_EQ(configuration.media.threads, 2u);
+    EXPECT_EQ(configuration.media.silence, 30u);
+    EXPECT_EQ(configuration.media.differentiation, 0u);
+    for (Configuration::Interface const& interface : configuration.interfaces)
+        EXPECT_EQ(interface.mediaAddress, interface.listen.host);
+}
+
+TEST(ConfigurationOfMedia, IsRefusedByKeyWhereItCannotBe)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    std::string const relayed = "[media]\nmode = \"relay\"\n" + interfaces;
+    EXPECT_NE(COMPLAINT("[media]\nmode = \"both\"\n" + interfaces).find("media.mode"), std::string::npos);
+    EXPECT_NE(COMPLAINT("[media]\nfirst-port = 20000\nlast-port = 20000\n" + interfaces).find("media.last-port"),
+              std::string::npos);
+    EXPECT_NE(COMPLAINT("[media]\nports = 1\n" + interfaces).find("media.ports"), std::string::npos);
+    EXPECT_NE(COMPLAINT("[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\npeer = \"127.0.0.1:2\"\n"
+                        "media-address = \"0.0.0.0\"\n[media]\nmode = \"relay\"\n")
+                  .find("media-address"),
+              std::string::npos);
+}

@@ -1,0 +1,58 @@
+# Phones for tests with speech, beside lib.bash: baresip, which says what stands in a file and writes down what it hears.
+# Each has a folder of its name in $WORK: said.wav, and heard.wav when it has ended.
+
+# start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 100 above its own
+start_phone() {
+    local folder="$WORK/$1"
+    mkdir -p "$folder"
+    python3 "$HERE/speech.py" say "$2" 60 "$folder/said.wav"
+    cat >"$folder/config" <<END
+sip_listen $HOST:$2
+rtp_ports $4-$(($4 + 3))
+audio_source aufile,$folder/said.wav
+audio_player aufile,$folder/played.wav
+module_path $(dirname "$(find /usr/lib -path '*/baresip/modules/account.so' | head -n 1)")
+module g711.so
+module aufile.so
+module sndfile.so
+module_tmp account.so
+module_app menu.so
+module_app ctrl_tcp.so
+ctrl_tcp_listen $HOST:$(($2 + 100))
+snd_path $folder
+END
+    echo "<sip:$1@$HOST:$2>;regint=0;audio_codecs=PCMU;outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
+    touch "$folder/contacts"
+    baresip -f "$folder" </dev/null >"$WORK/$1.log" 2>&1 &
+    background+=($!)
+    wait_for_port $! "$2" udp || fail "phone $1 does not start"
+    wait_for_port $! $(($2 + 100)) tcp || fail "phone $1 takes no commands"
+}
+
+# tell_phone PORT COMMAND [PARAMETERS]
+tell_phone() {
+    local text="{\"command\":\"$2\",\"params\":\"${3:-}\"}"
+    exec 9<>"/dev/tcp/$HOST/$(($1 + 100))" || fail "the phone does not listen"
+    printf '%d:%s,' ${#text} "$text" >&9
+    local answer
+    IFS= read -r -t 1 -n 20 answer <&9
+    exec 9>&-
+}
+
+# stop_phones: so that what they heard is written to its end
+stop_phones() {
+    local pid
+    for pid in "${background[@]}"; do
+        kill -TERM "$pid" 2>/dev/null
+        wait "$pid" 2>/dev/null
+    done
+    background=()
+}
+
+# expect_speech FROM TO FRAMES: at least so many frames of what FROM said were heard by TO as they were
+expect_speech() {
+    local heard
+    heard=$(find "$WORK/$2" -name '*-dec.wav' | head -n 1)
+    [[ -n $heard ]] || fail "phone $2 heard nothing"
+    python3 "$HERE/speech.py" compare "$WORK/$1/said.wav" "$heard" "$3" || fail "speech from $1 to $2"
+}

@@ -1,0 +1,33 @@
+# Two phones call each other through the gateway, which relays what they say: each hears the other to the bit, also after
+# one of them has held and resumed. What was measured is in the quality record.
+. "$(dirname "$0")/../lib.bash"
+. "$HERE/phones.bash"
+
+write_configuration
+cat >>"$WORK/gateway.toml" <<END
+
+[media]
+mode = "relay"
+first-port = $((PORT + 8))
+last-port = $((PORT + 15))
+END
+start_gateway
+start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 16))
+start_phone bob "$PORT_CALLEE" "$PORT_B" $((PORT + 20)) answermode=auto
+
+tell_phone "$PORT_CALLER" dial "sip:bob@$HOST:$PORT_A"
+expect_log 'Accept call'
+sleep 6
+tell_phone "$PORT_CALLER" hold
+sleep 0.5
+tell_phone "$PORT_CALLER" resume
+sleep 1
+tell_phone "$PORT_CALLER" hangup
+expect_causes 1 16
+stop_phones
+expect_speech alice bob 250
+expect_speech bob alice 250
+expect_trace 'State=HELD'
+expect_trace 'Quality-Of-Service=.*PCMU'
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+finish

@@ -1,0 +1,34 @@
+# A phone transfers the one that it talks to: that one and the target then hear each other, on the ports they had.
+. "$(dirname "$0")/../lib.bash"
+. "$HERE/target.bash"
+. "$HERE/phones.bash"
+
+write_configuration
+add_target
+cat >>"$WORK/gateway.toml" <<END
+
+[media]
+mode = "relay"
+first-port = $((PORT + 10))
+last-port = $((PORT + 17))
+END
+start_gateway
+start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 18))
+start_phone bob "$PORT_CALLEE" "$PORT_B" $((PORT + 22)) answermode=auto
+start_phone 77 "$PORT_TARGET" "$PORT_C" $((PORT + 26)) answermode=auto
+
+tell_phone "$PORT_CALLER" dial "sip:bob@$HOST:$PORT_A"
+expect_log 'Accept call'
+sleep 3
+tell_phone "$PORT_CALLEE" transfer "sip:77@$HOST:$PORT_B"
+expect_log 'Transfer call'
+sleep 3
+tell_phone "$PORT_CALLER" hangup
+expect_log 'call 2 c \(called side\) released: cause 16 '
+stop_phones
+expect_speech alice bob 100
+expect_speech bob alice 100
+expect_speech alice 77 100
+expect_speech 77 alice 100
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+finish
