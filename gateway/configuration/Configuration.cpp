@@ -311,6 +311,7 @@ Configuration READ_TABLE(toml::table const& table, std::string const& file)
 {
     Configuration configuration;
     configuration.file = file;
+    configuration.media.silence = 0;
     Section const root(file, {}, table);
     root.allow({"gateway", "media", "interface", "route"});
     if (toml::node const* const node = table.get("gateway"))

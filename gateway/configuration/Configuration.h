@@ -88,7 +88,7 @@ struct Configuration
     std::string recording;                 ///< the recorder's file; empty: in memory
     unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
     bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
-    MediaOptions media{.silence = 0};
+    MediaOptions media;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Interface> interfaces;
     std::vector<Route> routes;

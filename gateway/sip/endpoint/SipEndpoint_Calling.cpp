@@ -336,7 +336,7 @@ void SipEndpoint::useFork(unsigned int fork)
     char const* const old = nta_incoming_gettag(m_transaction);
     char const* const tag = nta_leg_get_tag(m_leg);
     if (old != nullptr && std::strlen(old) == std::strlen(tag))
-        std::memcpy(const_cast<char*>(old), tag, std::strlen(tag));
+        std::copy_n(tag, std::strlen(tag), const_cast<char*>(old));
 }
 
 nta_leg_t* SipEndpoint::makeFork()
