@@ -243,7 +243,8 @@ void Interpreter::perform(Operation const& operation)
     case Code::STOP_OBSERVING:
         observe(operation, -1);
         break;
-    case Code::FAIL_ALLOCATION:
+    case Code::FAIL_ALLOCATION: // maybe inside an operation that lacks memory itself
+        m_world.m_wasShortOfMemory = m_world.m_wasShortOfMemory || Memory::HAS_FAILED();
         Memory::FAIL_NTH(1 + operation[0]);
         m_isToFail = true;
         break;
