@@ -11,18 +11,21 @@ void SipMedia::turnOn(IpAddress const& local)
     m_local = local;
 }
 
+bool SipMedia::open(MG_IContext* context)
+{
+    if (!m_isOn || m_leg != nullptr)
+        return true;
+    CallMedia* const call = CallMedia::OF(context);
+    m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
+    return m_leg != nullptr;
+}
+
 std::string SipMedia::toPeer(std::string const& description, MG_IContext* context)
 {
     if (!m_isOn || description.empty())
         return description;
-    if (m_leg == nullptr)
-    {
-        CallMedia* const call = CallMedia::OF(context);
-        m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
-        if (m_leg == nullptr)
-            throw NoPort();
-        settle();
-    }
+    if (!open(context))
+        throw NoPort();
     if (description == m_source)
         return m_written;
     m_written = SipStream::WITH_ADDRESS(description, {m_leg->getLocalRtp(), m_leg->getNumber(), ++m_version});

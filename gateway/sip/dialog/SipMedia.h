@@ -35,6 +35,8 @@ public:
 
     /// Before the first description: ports are taken on this address.
     void turnOn(IpAddress const& local);
+    /// Takes ports in the media context of the call, unless it has some. Whether there were any.
+    bool open(MG_IContext* context);
     /// A description of the other side's as the peer is to read it; `context`: the call's. Throws NoPort.
     std::string toPeer(std::string const& description, MG_IContext* context);
     /// A description that went to the peer (`isOurs`) or came from it.

@@ -97,7 +97,7 @@ private:
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
     void startExpiry(sip_t const* request);
-    void failDialLater();
+    void failDialLater(QCause cause);
     void onCallingTimer();
     static int HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t* transaction, sip_t const* request);
     void onAck(sip_t const* request);
@@ -267,7 +267,7 @@ private:
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isOverTcp = false;              // the dialog: where its Contact points
-    bool m_hasDialFailed = false;
+    QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_allowsReliable = false; // calling side: our peer

@@ -78,6 +78,8 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
         trace("did  accept as " + called.getText() + ", State=TRYING");
     if (m_interface.isPeerBusy())
         clear({QCause::TEMPORARY_FAILURE, 503, {}});
+    else if (!m_media.open(m_adapter.getDatapathContext()))
+        clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});
     else if (!sendInvite(called, properties))
         clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
     return XCode::OK;

@@ -48,7 +48,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     {
         if (m_transaction != nullptr)
         {
-            failDialLater();
+            failDialLater(QCause::NETWORK_OUT_OF_ORDER);
             return 0;
         }
         m_dialog = SipDialogState::OVER;
@@ -81,7 +81,9 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     trace("-> 100");
     startExpiry(request);
     if (!dial(request, provider, called).isOk())
-        failDialLater();
+        failDialLater(QCause::NETWORK_OUT_OF_ORDER);
+    else if (!m_media.open(m_adapter.getDatapathContext()))
+        failDialLater(QCause::RESOURCE_UNAVAILABLE);
     return 0;
 }
 
@@ -94,17 +96,17 @@ void SipEndpoint::startExpiry(sip_t const* request)
 }
 
 /// Who has handed us the transaction still holds it, and it must not end under him.
-void SipEndpoint::failDialLater()
+void SipEndpoint::failDialLater(QCause cause)
 {
-    m_hasDialFailed = true;
+    m_dialFailure = cause;
     m_timer.start(0);
 }
 
 void SipEndpoint::onCallingTimer()
 {
-    if (m_hasDialFailed)
+    if (m_dialFailure != QCause::NONE)
     {
-        clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
+        clear({m_dialFailure, 0, {}});
         return;
     }
     if (m_dialog != SipDialogState::INVITE_RECEIVED)
