@@ -54,5 +54,6 @@ expect_speech() {
     local heard
     heard=$(find "$WORK/$2" -name '*-dec.wav' | head -n 1)
     [[ -n $heard ]] || fail "phone $2 heard nothing"
+    echo -n "$1 to $2: "
     python3 "$HERE/speech.py" compare "$WORK/$1/said.wav" "$heard" "$3" || fail "speech from $1 to $2"
 }
