@@ -30,7 +30,7 @@ public:
     Mailbox& operator=(Mailbox const&) = delete;
 
     /// Whether there was memory for it.
-    bool post(Value&& value)
+    bool post(Value value)
     {
         Letter* const letter = new (std::nothrow) Letter{std::move(value), m_newest.load(std::memory_order_relaxed)};
         if (letter == nullptr)

@@ -166,4 +166,4 @@ void MediaLoop::onQuality(RtpTermination& leg)
     tell({leg.getNumber(), MediaNews::QUALITY, '\0', 0, leg.getQuality()});
 }
 
-void MediaLoop::tell(MediaNews news) { m_news.post(std::move(news)); }
+void MediaLoop::tell(MediaNews const& news) { m_news.post(news); }

@@ -98,7 +98,7 @@ private:
     void onSilence(RtpTermination const& leg, unsigned int seconds) override;
     void onSpeech(RtpTermination const& leg) override;
     void onQuality(RtpTermination& leg) override;
-    void tell(MediaNews news);
+    void tell(MediaNews const& news);
 
     Mailbox<MediaNews>& m_news;
     ToneTable const& m_tones;
