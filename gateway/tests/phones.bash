@@ -1,7 +1,7 @@
 # Phones for tests with speech, beside lib.bash: baresip, which says what stands in a file and writes down what it hears.
 # Each has a folder of its name in $WORK: said.wav, and heard.wav when it has ended.
 
-# start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 100 above its own
+# start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 32 above its own
 start_phone() {
     local folder="$WORK/$1"
     mkdir -p "$folder"
@@ -18,7 +18,7 @@ module sndfile.so
 module_tmp account.so
 module_app menu.so
 module_app ctrl_tcp.so
-ctrl_tcp_listen $HOST:$(($2 + 100))
+ctrl_tcp_listen $HOST:$(($2 + 32))
 snd_path $folder
 END
     echo "<sip:$1@$HOST:$2>;regint=0;audio_codecs=PCMU;outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
@@ -26,13 +26,13 @@ END
     baresip -f "$folder" </dev/null >"$WORK/$1.log" 2>&1 &
     background+=($!)
     wait_for_port $! "$2" udp || fail "phone $1 does not start"
-    wait_for_port $! $(($2 + 100)) tcp || fail "phone $1 takes no commands"
+    wait_for_port $! $(($2 + 32)) tcp || fail "phone $1 takes no commands"
 }
 
 # tell_phone PORT COMMAND [PARAMETERS]
 tell_phone() {
     local text="{\"command\":\"$2\",\"params\":\"${3:-}\"}"
-    exec 9<>"/dev/tcp/$HOST/$(($1 + 100))" || fail "the phone does not listen"
+    exec 9<>"/dev/tcp/$HOST/$(($1 + 32))" || fail "the phone does not listen"
     printf '%d:%s,' ${#text} "$text" >&9
     local answer
     IFS= read -r -t 1 -n 20 answer <&9
