@@ -1,16 +1,9 @@
 # Nobody reads what the gateway says: calls go on, and as soon as somebody reads he is told how much he has missed. A dump
 # of many calls does not hold them up either.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/plain_call.bash"
 
 CALLS=40
-caller() { call_up; pause 100; send_bye; expect 200; }
-callee() {
-    expect_invite
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
 
 # both streams lead into pipes that are full after a few calls
 mkfifo "$WORK/err" "$WORK/out"

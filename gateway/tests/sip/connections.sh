@@ -1,6 +1,7 @@
 # Connections that bring no calls: those that carried garbage, half a message or nothing are closed after their time; a
 # source has only so many; and without any descriptor left the gateway neither spins nor stops taking calls.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/plain_call.bash"
 
 open=()
 # open_connections NUMBER TEXT
@@ -41,19 +42,6 @@ expect_connections() {
 }
 ticks() { awk '{ print $14 + $15 }' "/proc/$gateway_pid/stat"; } # of processor time, 10 ms each
 
-caller() { call_up; pause 100; send_bye; expect 200; }
-callee() {
-    expect_invite
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
-expect_call() {
-    start_callee callee
-    expect_caller caller 4989123 "$@"
-    expect_callee
-}
 
 TCP='transports = ["udp", "tcp"]'
 write_configuration '' "$TCP"$'\ntcp-idle = 1'

@@ -1,6 +1,7 @@
 # The torture messages of RFC 4475, each as a datagram and as a connection of its own: the answer that the RFC asks for, or
 # silence, and a call between two ordinary peers works in the middle of it and after it.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/plain_call.bash"
 
 # A message is told by what is odd about it: torture NAME ANSWER START-LINE [HEADER]... A header takes the place of the
 # ordinary one of its name; "-Name" leaves that out; "body:TEXT" is the body. Escapes are printf's. ANSWER is a regular
@@ -97,19 +98,6 @@ torture sdp01 '100 404|404|406' 'INVITE sip:user@example.com SIP/2.0' 'Accept: t
 # 3.4
 torture inv2543 '100 404|404|400' 'INVITE sip:UserB@example.com SIP/2.0' "Via: SIP/2.0/TRANSPORT $HOST:9;rport" -Max-Forwards 'From: <sip:iamalegal2543@h>' -Contact
 
-caller() { call_up; send_bye; expect 200; }
-callee() {
-    expect_invite
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
-expect_call() {
-    start_callee callee
-    expect_caller caller 4989123 "$@"
-    expect_callee
-}
 message() { sed "s|SIP/2.0/TRANSPORT|SIP/2.0/$2|" "$WORK/$1.message"; }
 # expect_answers TRANSPORT FILE: the statuses that came for each message, provisional ones before the final one
 expect_answers() {
