@@ -76,6 +76,6 @@ endif()
 # the programs
 must(${EMULATOR} ${WORK}/installed/bin/records decode Charge 8100)
 if(EXISTS ${BUILD}/gateway/callcontrol-gateway)
-    file(WRITE ${WORK}/gateway.toml "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:21990\"\npeer = \"127.0.0.1:21991\"\n")
+    file(WRITE ${WORK}/gateway.toml "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:21990\"\npeer = \"127.0.0.1:21991\"\n")
     must(${EMULATOR} ${WORK}/installed/bin/callcontrol-gateway --config ${WORK}/gateway.toml --check)
 endif()

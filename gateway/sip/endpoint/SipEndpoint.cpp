@@ -50,7 +50,7 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_lengthTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_LENGTH_TIMER, this)
     , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
-    if (m_interface.getEnvironment().relaysMedia)
+    if (m_interface.getEnvironment().host.relaysMedia)
         m_media.turnOn(m_interface.getMediaAddress());
 }
 
@@ -203,7 +203,7 @@ void SipEndpoint::leaveCall(SipCause const& cause)
     m_media.end();
     if (m_isCalling)
     {
-        Counters& counters = m_interface.getEnvironment().counters;
+        Counters& counters = m_interface.getEnvironment().host.counters;
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
     spdlog::info("call {} {} ({} side) released: cause {} ({}), SIP {}{}{}{}", m_callNumber, getName().view(),

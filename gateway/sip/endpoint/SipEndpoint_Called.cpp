@@ -58,7 +58,7 @@ XCode SipEndpoint::handleOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
 {
-    m_ladder = m_interface.getEnvironment().trace.find(m_callNumber);
+    m_ladder = m_interface.getEnvironment().host.trace.find(m_callNumber);
     if (isTraced())
         trace("told offer " + std::string(name.view()) + (properties.isEmpty() ? "" : ", ") + TEXT_OF(properties));
     String adapterName;
@@ -87,7 +87,7 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties)
 {
-    Configuration::Interface const& configuration = m_interface.getConfiguration();
+    SipConfiguration const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));

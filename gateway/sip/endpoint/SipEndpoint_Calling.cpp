@@ -60,7 +60,8 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
 int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                             SipParty const& called)
 {
-    m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
+    m_ladder =
+        m_interface.getEnvironment().host.trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
     noteAllow(request);
     if (takeTimer(transaction, request) != 0)
@@ -155,7 +156,7 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
         return bound;
     SipParty const& party = caller.party;
-    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), STRING(called.getUser()),
+    return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
                           true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
@@ -374,7 +375,7 @@ void SipEndpoint::answerWith(std::string const& session)
     if (unsigned int const longest = m_interface.getConfiguration().longestCall; longest != 0)
         m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
-    ++m_interface.getEnvironment().counters.answered;
+    ++m_interface.getEnvironment().host.counters.answered;
     if (std::string const number = std::exchange(m_transferAfterAnswer, {}); !number.empty())
         transferTo(number);
 }
