@@ -1,6 +1,8 @@
 #include "configuration/Configuration.h"
 
+#include "media/context/MediaDescription.h"
 #include "platform/base/IpAddress.h"
+#include "sip/message/SipCodec.h"
 
 #include <toml++/toml.h>
 
@@ -211,11 +213,47 @@ void READ_ADDRESSES(Section const& section, Configuration::Interface& interface)
         section.refuse("peer", "is the interface itself");
 }
 
+/// By the names that session descriptions have for them.
+void READ_CODECS(Section const& section, Configuration::Interface& interface)
+{
+    if (!section.has("codecs"))
+        return;
+    interface.codecs.clear();
+    for (std::string const& name : section.texts("codecs", {}))
+    {
+        MG_Rtp::ECodec::Type const codec = SipCodec::NAMED(name);
+        if (codec == MG_Rtp::ECodec::NONE)
+            section.refuse("codecs", "'" + name + "' is no codec");
+        if (std::find(interface.codecs.begin(), interface.codecs.end(), codec) != interface.codecs.end())
+            section.refuse("codecs", "'" + name + "' is in it twice");
+        interface.codecs.push_back(codec);
+    }
+    if (interface.codecs.size() > MediaFormats::MOST)
+        section.refuse("codecs", "may have " + std::to_string(MediaFormats::MOST) + " of them");
+}
+
 Configuration::Interface READ_INTERFACE(Section const& section)
 {
-    section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
-                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout",
-                   "transfer", "media-address", "session-expires", "min-se", "max-call-duration"});
+    section.allow({"name",
+                   "listen",
+                   "advertise",
+                   "peer",
+                   "transport",
+                   "transports",
+                   "allow",
+                   "max-message-size",
+                   "max-header-size",
+                   "max-connections-per-source",
+                   "tcp-idle",
+                   "t1",
+                   "t1x64",
+                   "answer-timeout",
+                   "codecs",
+                   "transfer",
+                   "media-address",
+                   "session-expires",
+                   "min-se",
+                   "max-call-duration"});
     Configuration::Interface interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
@@ -230,6 +268,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
+    READ_CODECS(section, interface);
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
     interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);

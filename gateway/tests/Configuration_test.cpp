@@ -291,3 +291,24 @@ TEST(ConfigurationOfMedia, IsRefusedByKeyWhereItCannotBe)
                   .find("media-address"),
               std::string::npos);
 }
+
+TEST(ConfigurationOfCodecs, AreThoseOfTheListInItsOrder)
+{
+    std::string text = TWO_INTERFACES;
+    text.insert(text.find("listen"), "codecs = [\"G729\", \"opus\", \"L16\"]\n");
+    Configuration const configuration = Configuration::PARSE(text, "g.toml");
+    EXPECT_EQ(
+        configuration.interfaces[0].codecs,
+        (std::vector<MG_Rtp::ECodec::Type>{MG_Rtp::ECodec::G729, MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::L16_MONO}));
+    EXPECT_EQ(configuration.interfaces[1].codecs.front(), MG_Rtp::ECodec::PCMA) << "the default";
+}
+
+TEST(ConfigurationOfCodecs, AreRefusedWhereTheyAreNone)
+{
+    for (char const* const list : {"[\"PCMX\"]", "[\"PCMA\", \"pcma\"]", "[]", "\"PCMA\""})
+    {
+        std::string text = TWO_INTERFACES;
+        text.insert(text.find("listen"), std::string("codecs = ") + list + "\n");
+        EXPECT_NE(COMPLAINT(text).find("codecs"), std::string::npos) << list;
+    }
+}
