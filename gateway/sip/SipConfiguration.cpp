@@ -1,7 +1,10 @@
 #include "sip/SipConfiguration.h"
 
 #include "configuration/ConfigurationSection.h"
+#include "media/context/MediaDescription.h"
+#include "sip/message/SipCodec.h"
 
+#include <algorithm>
 #include <limits>
 #include <stdexcept>
 
@@ -57,6 +60,25 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
         section.refuse("peer", "is the interface itself");
 }
 
+/// By the names that session descriptions have for them.
+void READ_CODECS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    if (!section.has("codecs"))
+        return;
+    interface.codecs.clear();
+    for (std::string const& name : section.texts("codecs", {}))
+    {
+        MG_Rtp::ECodec::Type const codec = SipCodec::NAMED(name);
+        if (codec == MG_Rtp::ECodec::NONE)
+            section.refuse("codecs", "'" + name + "' is no codec");
+        if (std::find(interface.codecs.begin(), interface.codecs.end(), codec) != interface.codecs.end())
+            section.refuse("codecs", "'" + name + "' is in it twice");
+        interface.codecs.push_back(codec);
+    }
+    if (interface.codecs.size() > MediaFormats::MOST)
+        section.refuse("codecs", "may have " + std::to_string(MediaFormats::MOST) + " of them");
+}
+
 void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
 {
     try
@@ -73,9 +95,26 @@ void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration c
 
 SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, bool relaysMedia)
 {
-    section.allow({"name", "listen", "advertise", "peer", "transport", "transports", "allow", "max-message-size",
-                   "max-header-size", "max-connections-per-source", "tcp-idle", "t1", "t1x64", "answer-timeout",
-                   "transfer", "media-address", "session-expires", "min-se", "max-call-duration"});
+    section.allow({"name",
+                   "listen",
+                   "advertise",
+                   "peer",
+                   "transport",
+                   "transports",
+                   "allow",
+                   "max-message-size",
+                   "max-header-size",
+                   "max-connections-per-source",
+                   "tcp-idle",
+                   "t1",
+                   "t1x64",
+                   "answer-timeout",
+                   "codecs",
+                   "transfer",
+                   "media-address",
+                   "session-expires",
+                   "min-se",
+                   "max-call-duration"});
     SipConfiguration interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
@@ -90,6 +129,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
+    READ_CODECS(section, interface);
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
     interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);

@@ -2,6 +2,7 @@
 
 #include "configuration/AddressRange.h"
 #include "configuration/SocketAddress.h"
+#include "platform/media/MG_Rtp.h"
 
 #include <string>
 #include <vector>
@@ -31,7 +32,10 @@ struct SipConfiguration
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
     std::string mediaAddress;           ///< of this machine, where media come in; no name
-    bool transfersOnWire = false;       ///< a peer that is to be transferred is sent REFER; else we dial for it
+    /// That are offered and taken where media are relayed, the best liked first.
+    std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
+                                             MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
+    bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }

@@ -179,3 +179,18 @@ TEST(SipConfiguration, AMediaAddressThatNobodyReachesIsRefusedWhereMediaAreRelay
     EXPECT_EQ(COMPLAINT(std::string(LEAST) + "media-address = \"host\"\n", true),
               "f: sip[0].media-address: 'host' is not an address");
 }
+
+TEST(SipConfiguration, TheCodecsAreThoseOfTheListInItsOrder)
+{
+    std::vector<SipConfiguration> const interfaces =
+        READ(std::string(LEAST) + "codecs = [\"G729\", \"opus\", \"L16\"]\n" + LEAST);
+    EXPECT_EQ(interfaces.at(0).codecs, (std::vector<MG_Rtp::ECodec::Type>{MG_Rtp::ECodec::G729, MG_Rtp::ECodec::OPUS,
+                                                                          MG_Rtp::ECodec::L16_MONO}));
+    EXPECT_EQ(interfaces.at(1).codecs.front(), MG_Rtp::ECodec::PCMA) << "the default";
+}
+
+TEST(SipConfiguration, CodecsAreRefusedWhereTheyAreNone)
+{
+    for (char const* const list : {"[\"PCMX\"]", "[\"PCMA\", \"pcma\"]", "[]", "\"PCMA\""})
+        EXPECT_NE(COMPLAINT(std::string(LEAST) + "codecs = " + list + "\n").find("codecs"), std::string::npos) << list;
+}

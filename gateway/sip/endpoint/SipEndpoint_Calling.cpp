@@ -70,6 +70,8 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
         leaveCall({QCause::INTERWORKING, 422, {}});
         return 422;
     }
+    if (m_session.check(SESSION_OF(request)) != 0)
+        return refuseSession(transaction);
     m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
     m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
@@ -83,9 +85,21 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     startExpiry(request);
     if (!dial(request, provider, called).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
-    else if (!m_media.open(m_adapter.getDatapathContext()))
+    else if (!m_session.open())
         failDialLater(QCause::RESOURCE_UNAVAILABLE);
     return 0;
+}
+
+/// It offers nothing that could be understood on its own interface.
+int SipEndpoint::refuseSession(nta_incoming_t* transaction)
+{
+    SipCause const cause{QCause::INCOMPATIBLE_DESTINATION, 488, {}};
+    trace("-> 488");
+    nta_incoming_treply(transaction, SIP_488_NOT_ACCEPTABLE, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
+                        TAG_END());
+    m_dialog = SipDialogState::OVER;
+    leaveCall(cause);
+    return 488;
 }
 
 /// RFC 3261, 13.3.1: who calls wants no answer after that time.
@@ -107,7 +121,7 @@ void SipEndpoint::onCallingTimer()
 {
     if (m_dialFailure != QCause::NONE)
     {
-        clear({m_dialFailure, 0, {}});
+        clear({m_dialFailure, m_dialFailure == QCause::INCOMPATIBLE_DESTINATION ? 488u : 0u, {}});
         return;
     }
     if (m_dialog != SipDialogState::INVITE_RECEIVED)
@@ -231,6 +245,7 @@ void SipEndpoint::followPeer()
     {
         useFork(number);
         m_hasRung = m_hasEarlyMedia = false;
+        m_session.meetFork();
         m_negotiation = SipOfferAnswer(); // with this party nothing is agreed on
         if (m_hasOffer)
             m_negotiation.note(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE);
@@ -245,7 +260,7 @@ void SipEndpoint::followPeer()
     bool isNewSession = false;
     if (!isAgreedEarly()) // else what is new comes with UPDATE
     {
-        std::string session = hasData && m_hasOffer ? toPeer(m_session.readForInvite(true)) : std::string();
+        std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
         isNewSession = session != m_earlySession;
         m_earlySession = std::move(session);
     }
@@ -359,8 +374,13 @@ nta_leg_t* SipEndpoint::makeFork()
 
 void SipEndpoint::answer()
 {
-    std::string const session = isAgreedEarly() ? std::string() : toPeer(m_session.readForInvite(m_hasOffer));
+    std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
     m_session.noteSettled();
+    if (session.empty() && !m_session.isAgreed())
+    {
+        giveUp();
+        return;
+    }
     answerWith(session);
 }
 
@@ -387,8 +407,6 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress());
     if (m_hasOffer)
         m_quality.noteAnswer(session);
-    if (status < 200)
-        notePreview(SipOfferAnswer::SENT, session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
     std::string const headers = identity + (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())

@@ -355,6 +355,8 @@ XCode SipEndpoint::takePlaceOf(SipEndpoint& replaced, sip_t const* request)
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
-    m_session.takeOffer(session, false);
+    if (m_session.takeOffer(session, false) != 0)
+        failDialLater(QCause::INCOMPATIBLE_DESTINATION);
+    m_session.proceed();
     return XCode::OK;
 }
