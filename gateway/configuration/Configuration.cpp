@@ -85,6 +85,15 @@ public:
         return static_cast<unsigned int>(value);
     }
 
+    /// False where it is not.
+    bool flag(char const* key) const
+    {
+        toml::node const* const node = m_table.get(key);
+        if (node != nullptr && !node->is_boolean())
+            refuse(key, "expected true or false");
+        return node != nullptr && node->as_boolean()->get();
+    }
+
     std::string oneOf(char const* key, char const* fallback, std::initializer_list<char const*> allowed) const
     {
         std::string value = text(key, fallback);
@@ -249,6 +258,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "detect-digits",
                    "transfer",
                    "media-address",
                    "session-expires",
@@ -269,6 +279,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
     READ_CODECS(section, interface);
+    interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
     interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);

@@ -67,6 +67,7 @@ struct Configuration
         /// That are offered and taken where media are relayed, the best liked first.
         std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                                  MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
+        bool detectsDigits = false;   ///< in what its peers say; where media are relayed
         bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
 
         /// Where the peers reach it.

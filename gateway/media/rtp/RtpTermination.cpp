@@ -152,7 +152,7 @@ void RtpTermination::takeEvent(RtpPacket const& packet, RtpRoutes::Route const& 
 /// digit is made anew.
 void RtpTermination::tellEvent(std::optional<HeardDigit> const& heard)
 {
-    if (heard && m_passesDigitsOn && m_partner != nullptr)
+    if (heard && m_passesDigitsOn && m_partner != nullptr && !m_partner->m_areDigitsAside)
         m_partner->sendDigit(heard->digit, heard->milliseconds);
     tell(heard);
 }

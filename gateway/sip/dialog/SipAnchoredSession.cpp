@@ -19,6 +19,7 @@ using Negotiating = CC_PropertyCodecNegotiating;
 namespace
 {
 constexpr unsigned int NOT_ACCEPTABLE = 488;
+constexpr unsigned int USUAL_DIGIT = 100;     // milliseconds
 constexpr unsigned int TELEPHONE_RATE = 8000; // Hz: the clock of events that every phone knows
 
 /// As whoever is at the other end sees it.
@@ -54,6 +55,8 @@ bool SipAnchoredSession::open()
         return true;
     CallMedia* const call = CallMedia::OF(m_adapter.getDatapathContext());
     m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
+    if (m_leg != nullptr && m_interface.detectsDigits)
+        m_leg->detectDigits(true);
     return m_leg != nullptr;
 }
 
@@ -159,6 +162,7 @@ bool SipAnchoredSession::settle(SipStream const& far)
     m_leg->describe(agreed);
     m_codec = VoipCodecAndMode(agreed.formats.begin()->codec, ACROSS(agreed.mode));
     m_isAgreed = true;
+    settleDigits();
     return true;
 }
 
@@ -282,4 +286,44 @@ void SipAnchoredSession::onSilence(unsigned int seconds)
 {
     if (m_leg->getDescription().mode == VoipCodecAndMode::SEND_RECEIVE)
         m_wire.onSilence(seconds);
+}
+
+// --- digits ----------------------------------------------------------------------------------------------------------
+
+// Each goes to our peer by one way alone: as an event where these were agreed on, else in INFO if it takes that, else
+// as a sound. Events that the other side's peer sends, and sounds, the media layer passes on by itself.
+
+bool SipAnchoredSession::takesEvents() const
+{
+    return m_leg != nullptr && m_leg->getDescription().telephoneEvent.isAgreed();
+}
+
+void SipAnchoredSession::settleDigits()
+{
+    if (m_leg != nullptr)
+        m_leg->setDigitsAside(m_isInfoTaken && !takesEvents());
+}
+
+void SipAnchoredSession::noteInfo(bool isTaken)
+{
+    if (std::exchange(m_isInfoTaken, isTaken) != isTaken)
+        settleDigits();
+}
+
+void SipAnchoredSession::onDigit(char digit, unsigned int milliseconds)
+{
+    m_wire.onDigit(digit == 'F' ? '!' : digit, milliseconds);
+}
+
+bool SipAnchoredSession::sendDigit(char digit, unsigned int milliseconds)
+{
+    if (m_leg == nullptr)
+        return false;
+    CallMedia::DigitWay const way = m_leg->getCall().getDigitTold();
+    if (way == CallMedia::SOUND ? !takesEvents() : way == CallMedia::EVENT && (takesEvents() || !m_isInfoTaken))
+        return true; // it is there already
+    if (!takesEvents() && m_isInfoTaken)
+        return false;
+    m_leg->sendDigit(digit, milliseconds != 0 ? milliseconds : USUAL_DIGIT);
+    return true;
 }

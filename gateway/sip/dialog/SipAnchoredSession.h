@@ -55,6 +55,8 @@ public:
     void follow(bool isUp) override;
     void expectOffer() override {}
     void followCall() override;
+    void noteInfo(bool isTaken) override;
+    bool sendDigit(char digit, unsigned int milliseconds) override;
     MediaQuality const* getQuality() const override { return m_leg != nullptr ? &m_leg->getQuality() : nullptr; }
     void end() override { m_leg.reset(); }
 
@@ -63,6 +65,7 @@ private:
 
     // --- MediaObserver
     void onSilence(unsigned int seconds) override;
+    void onDigit(char digit, unsigned int milliseconds) override;
 
     SipCodecChoice::Across getAcross() const;
     Codecs getOffered(SipStream const& far) const;
@@ -72,6 +75,8 @@ private:
     bool settle(SipStream const& far);
     void tell(SipStream const& far);
     void addTo(CC_PropertyContainer& own, SipStream const& far) const;
+    bool takesEvents() const;
+    void settleDigits();
     bool isInUnison() const;
     bool isOurTurn() const;
 
@@ -89,5 +94,6 @@ private:
     std::string m_pending; // what our peer is to be answered once the dialog is ready
     bool m_isAgreed = false;
     bool m_isOffering = false;
+    bool m_isInfoTaken = false;
     VoipCodecAndMode m_codec;
 };
