@@ -8,6 +8,9 @@
                                         which codecs it was one after the other, "a,mu"
     speech.py speak SEED SECONDS FILE   writes a WAV that sounds like somebody speaking, each seed another one
     speech.py key DIGITS FILE           writes a WAV of these digits as they sound (ITU-T Q.23), after 2 s of silence
+    speech.py overhear SAID PORT PACKETS
+                                        takes so many packets of RTP on a port of 127.0.0.1: whether each is one of SRTP
+                                        with mu-law in it, and none bears what was said in the clear
     speech.py distance SAID HEARD DECIBELS [OTHER]
                                         whether what was heard sounds like what was said: by how much the levels of 17
                                         bands from 100 Hz to 3.4 kHz differ in the middle of all frames, the general
@@ -16,6 +19,7 @@
 import cmath
 import math
 import random
+import socket
 import struct
 import sys
 import wave
@@ -193,7 +197,29 @@ def distance(said_path, heard_path, limit, other_path=None):
         sys.exit(f"{heard_path}: it is as near to {other_path}")
 
 
+def overhear(said_path, port, wanted):
+    codes = {through_mu_law(value): code for code in range(256) for value in [of_mu_law(code)]}
+    said = bytes(codes[through_mu_law(sample)] for sample in read(said_path))
+    listener = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
+    listener.bind(("127.0.0.1", port))
+    listener.settimeout(10)
+    for _ in range(wanted):
+        packet = listener.recv(2000)
+        if len(packet) != 12 + FRAME + 10:
+            sys.exit(f"a packet has {len(packet)} octets")
+        if said.find(packet[12 : 12 + FRAME]) >= 0:
+            sys.exit("speech in the clear")
+    print(f"{wanted} packets, none in the clear")
+
+
+def of_mu_law(code):
+    code = ~code & 255
+    value = (((code & 15) * 2 + 33) << (code >> 4 & 7)) * 4 - 132
+    return -value if code & 128 else value
+
+
 COMMANDS = {
+    "overhear": lambda said, port, packets: overhear(said, int(port), int(packets)),
     "say": lambda seed, seconds, path: say(int(seed), int(seconds), path),
     "key": key,
     "speak": lambda seed, seconds, path: speak(int(seed), int(seconds), path),

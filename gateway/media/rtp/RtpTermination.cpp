@@ -251,7 +251,9 @@ void RtpTermination::setKeys(MediaKeys const& keys)
 {
     if (keys == m_description.keys)
         return; // the counters of the stream go on
-    m_srtp = SrtpSession::MAKE(keys);
+    std::unique_ptr<SrtpSession> const before = std::exchange(m_srtp, SrtpSession::MAKE(keys));
+    if (m_srtp != nullptr && before != nullptr)
+        m_srtp->takeOver(*before);
     m_isUnusable = keys.suite != MediaKeys::NONE && m_srtp == nullptr;
 }
 

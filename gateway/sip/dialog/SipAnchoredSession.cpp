@@ -74,6 +74,11 @@ SipCodecChoice::Codecs SipAnchoredSession::getOffered(SipStream const& far) cons
     return SipCodecChoice::COMMON(CODECS_OF(far), m_interface.codecs);
 }
 
+std::optional<SipStream> SipAnchoredSession::read(std::string const& description) const
+{
+    return SipStream::READ(description, m_interface.security);
+}
+
 // --- what the other side is told -------------------------------------------------------------------------------------
 
 void SipAnchoredSession::addTo(CC_PropertyContainer& own, SipStream const& far) const
@@ -131,7 +136,21 @@ std::string SipAnchoredSession::makeOffer()
             if (std::find(m_frame.events.begin(), m_frame.events.end(), ours.events.back()) == m_frame.events.end())
                 m_frame.events.push_back(ours.events.back());
         }
+    if (m_interface.security != SipStream::PLAIN)
+        ours.keys = {getKey(1, MediaKeys::AES_CM_128_HMAC_SHA1_80), getKey(2, MediaKeys::AES_CM_128_HMAC_SHA1_32)};
+    if (m_interface.security == SipStream::SECURED)
+        ours.isSecuredProfile = true;
     return write(std::move(ours));
+}
+
+/// The same each time, so that a stream that goes on keeps its counters.
+SipCrypto SipAnchoredSession::getKey(unsigned int tag, MediaKeys::Suite suite)
+{
+    auto const known =
+        std::find_if(m_keys.begin(), m_keys.end(), [suite](SipCrypto const& one) { return one.suite == suite; });
+    SipCrypto key = known != m_keys.end() ? *known : m_keys.emplace_back(SipCrypto::MAKE(tag, suite));
+    key.tag = tag;
+    return key;
 }
 
 /// Empty: nothing of it would be understood across. One codec alone is chosen, so that nobody changes it unasked.
@@ -148,6 +167,8 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
     ours.formats = {{codec, far.getType(codec)}};
     ours.events = EVENTS_FOR(far, codec);
     ours.mode = ACROSS(far.mode);
+    if (!far.keys.empty())
+        ours.keys = {getKey(far.keys.front().tag, far.keys.front().suite)};
     std::string const answer = write(std::move(ours));
     settle(far);
     return answer;
@@ -157,7 +178,7 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
 bool SipAnchoredSession::settle(SipStream const& far)
 {
     MediaDescription const agreed = SipStream::AGREED(m_ours, far);
-    if (m_leg == nullptr || agreed.formats.getSize() == 0)
+    if (m_leg == nullptr || agreed.formats.getSize() == 0 || !isSecuredEnough(agreed, far))
         return false;
     m_leg->describe(agreed);
     m_codec = VoipCodecAndMode(agreed.formats.begin()->codec, ACROSS(agreed.mode));
@@ -166,13 +187,20 @@ bool SipAnchoredSession::settle(SipStream const& far)
     return true;
 }
 
+/// Nothing goes out in the clear that somebody believes to be secured.
+bool SipAnchoredSession::isSecuredEnough(MediaDescription const& agreed, SipStream const& far) const
+{
+    bool const mustBe = m_interface.security == SipStream::SECURED || m_ours.isSecuredProfile || !far.keys.empty();
+    return !mustBe || agreed.keys.suite != MediaKeys::NONE;
+}
+
 // --- while the dialog comes up ---------------------------------------------------------------------------------------
 
 unsigned int SipAnchoredSession::check(std::string const& offer)
 {
     if (offer.empty())
         return 0; // the INVITE has none: we offer
-    m_offerOfInvite = SipStream::READ(offer);
+    m_offerOfInvite = read(offer);
     return m_offerOfInvite && !getOffered(*m_offerOfInvite).empty() ? 0 : NOT_ACCEPTABLE;
 }
 
@@ -184,7 +212,7 @@ void SipAnchoredSession::addOffer(CC_PropertyContainer& own, std::string const&)
 
 void SipAnchoredSession::addAnswer(CC_PropertyContainer& own, std::string const& description, bool)
 {
-    std::optional<SipStream> const far = SipStream::READ(description);
+    std::optional<SipStream> const far = read(description);
     if (far && settle(*far))
         addTo(own, *far);
 }
@@ -210,7 +238,7 @@ unsigned int SipAnchoredSession::takeOffer(std::string const& description, bool)
 {
     if (description.empty())
         m_pending = makeOffer();
-    else if (std::optional<SipStream> const far = SipStream::READ(description))
+    else if (std::optional<SipStream> const far = read(description))
     {
         m_pending = makeAnswer(*far);
         if (!m_pending.empty())
@@ -228,7 +256,7 @@ void SipAnchoredSession::proceed()
 void SipAnchoredSession::takeAnswer(std::string const& description)
 {
     m_isOffering = false;
-    std::optional<SipStream> const far = SipStream::READ(description);
+    std::optional<SipStream> const far = read(description);
     if (far && settle(*far))
         tell(*far);
     else

@@ -68,6 +68,9 @@ private:
     void onDigit(char digit, unsigned int milliseconds) override;
 
     SipCodecChoice::Across getAcross() const;
+    std::optional<SipStream> read(std::string const& description) const;
+    SipCrypto getKey(unsigned int tag, MediaKeys::Suite suite);
+    bool isSecuredEnough(MediaDescription const& agreed, SipStream const& far) const;
     Codecs getOffered(SipStream const& far) const;
     std::string makeOffer();
     std::string makeAnswer(SipStream const& far);
@@ -86,10 +89,11 @@ private:
     IpAddress m_local;
     std::unique_ptr<LegMedia> m_leg;
     std::optional<SipStream> m_offerOfInvite;
-    std::string m_forInvite; // what was made of it
-    SipStream m_frame;       // the streams of the session and all payload types that were ever in it
-    SipStream m_ours;        // our last description
-    std::string m_written;   // the same as text
+    std::string m_forInvite;       // what was made of it
+    SipStream m_frame;             // the streams of the session and all payload types that were ever in it
+    SipStream m_ours;              // our last description
+    std::string m_written;         // the same as text
+    std::vector<SipCrypto> m_keys; // of ours, one of each suite for as long as the dialog
     unsigned int m_version = 0;
     std::string m_pending; // what our peer is to be answered once the dialog is ready
     bool m_isAgreed = false;
