@@ -299,7 +299,8 @@ private:
     template <class Target, class Written>
     XCode writeFiltered(CC_PropertyView& view, Target* target, Written const& written);
     template <class Target>
-    XCode writeCopy(CC_PropertyView& view, Target& target, CC_PropertyFilterContainer const& filters);
+    XCode writeCopy(Attempt const& attempt, CC_PropertyView& view, Target& target,
+                    CC_PropertyFilterContainer const& filters);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
     XCode setOwnPropertyPlainly(CC_Property const& property);

@@ -55,15 +55,14 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
     CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return WRITE(*target, written);
-    return writeCopy(view, *target, *filters);
+    return writeCopy(attempt, view, *target, *filters);
 }
 
 /// Apart, so that a call without filters does not pay for it.
 template <class Target>
-__attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view, Target& target,
+__attribute__((noinline)) XCode CC_CallAdapter::writeCopy(Attempt const& attempt, CC_PropertyView& view, Target& target,
                                                           CC_PropertyFilterContainer const& filters)
 {
-    Attempt const attempt(*this);
     CC_FilterNotes notes;
     CC_Writing const throughFilters(notes);
     Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view);
