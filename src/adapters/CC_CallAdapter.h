@@ -316,6 +316,8 @@ private:
     static void GIVE_UP_RELEASED(CC_CallLeg& leg);
     void observeCall(CC_Call& call);
     void unobserveCall();
+    template <class Take>
+    void takeOver(CC_PropertyView& view, CC_PropertyContainer const& source, Take const& take);
     void updateOwnCallLeg(CC_Flags const& changed);
     void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);

@@ -21,6 +21,14 @@ public:
     }
     bool isOver() const { return !m_self.isAlive() || m_adapter.m_attempt != m_number; }
 
+    /// After properties were stored in the adapter's view: if a module's class has ended the attempt meanwhile, an idle
+    /// adapter sees nothing.
+    void settle(CC_PropertyView& view) const
+    {
+        if (isOver() && m_self.isAlive() && m_adapter.m_ownCallLeg == nullptr) [[unlikely]]
+            view.clear();
+    }
+
     /// Whether a step went well and the attempt goes on; one that failed is logged with the reason.
     bool survives(XCode step, char const* reason) const
     {

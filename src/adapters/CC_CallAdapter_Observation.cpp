@@ -154,6 +154,17 @@ CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 }
 } // namespace
 
+/// Lets the view take the source over. With a module's properties among them the attempt may have ended then.
+template <class Take>
+void CC_CallAdapter::takeOver(CC_PropertyView& view, CC_PropertyContainer const& source, Take const& take)
+{
+    if (source.isSelfContained() && view.getProperties().isSelfContained())
+        return take();
+    Attempt const attempt(*this);
+    take();
+    attempt.settle(view);
+}
+
 void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
 {
     CC_CallLeg const& leg = *m_ownCallLeg;
@@ -162,7 +173,7 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
     {
         CC_PropertyView::Told const told = TOLD(leg, &changed);
         if (!std::exchange(m_isWritingOwn, false) || !m_ownView.hasWritten(leg.getProperties(), told))
-            m_ownView.assign(leg.getProperties(), told);
+            takeOver(m_ownView, leg.getProperties(), [&] { m_ownView.assign(leg.getProperties(), told); });
         return;
     }
     filterOwnCallLeg(changed, *filters);
@@ -181,6 +192,7 @@ __attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& 
     XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
         m_ownView.assignMarked(copy.get(), copy.settle(), 0);
+    attempt.settle(m_ownView);
 }
 
 /// Tells the module. One class for the views of peer and call, so that what follows them is there once.
@@ -226,7 +238,7 @@ void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer cons
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
     {
-        view.follow(source, told, onDifference);
+        takeOver(view, source, [&] { view.follow(source, told, onDifference); });
         return;
     }
     filterView(view, source, serial, told, onDifference, *filters);
@@ -246,6 +258,7 @@ __attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view,
     std::ignore = filters.applyFilters(copy.get()); // what the filters leave is what the module sees
     if (!attempt.isOver() && refresh == m_refreshes)
         view.followMarked(copy.get(), copy.settle(), told.number, onDifference);
+    attempt.settle(view);
 }
 
 void CC_CallAdapter::mark(unsigned int id)

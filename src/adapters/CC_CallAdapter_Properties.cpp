@@ -50,6 +50,7 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
+    attempt.settle(view);
     if (!seen.isOk() || attempt.isOver())
         return XCode::FAILURE;
     CC_PropertyFilterContainer const* const filters = getInputFilters();
@@ -79,6 +80,7 @@ XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Wri
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
+    attempt.settle(view);
     return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
 }
 
@@ -131,6 +133,7 @@ XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
     XCode const seen = m_ownView.write(property);
+    attempt.settle(m_ownView);
     if (!seen.isOk() || attempt.isOver())
         return XCode::FAILURE;
     m_isWritingOwn = true;
