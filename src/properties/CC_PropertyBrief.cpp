@@ -43,9 +43,12 @@ void COPY(char* to, std::string_view text)
 
 void SET_TEXT(Brief& brief, std::string_view text)
 {
+    constexpr std::size_t WORD = CC_RecordFormat::WORDS_OF(1);
     constexpr std::size_t MOST_LENGTH = std::numeric_limits<std::uint16_t>::max();
     brief.textLength = static_cast<std::uint16_t>(std::min(text.size(), MOST_LENGTH));
     brief.textSize = static_cast<std::uint8_t>(std::min<std::size_t>(text.size(), Brief::MOST_TEXT));
+    if (std::size_t const begun = brief.textSize % WORD; begun != 0) // the same value leaves the same octets
+        std::memset(brief.text + brief.textSize - begun, 0, WORD);
     COPY(brief.text, {text.data(), brief.textSize});
 }
 

@@ -106,6 +106,7 @@ void CC_RecordWriter::appendFilter(unsigned int propertyId)
     std::string_view const name = std::string_view(note->name).substr(0, LARGEST_TEXT);
     change.filterPlace = static_cast<std::uint8_t>(std::min(note->place, 255U));
     change.filterNameSize = static_cast<std::uint8_t>(name.size());
+    std::memset(m_at + WORDS_OF(name.size()) - WORDS_OF(1), 0, WORDS_OF(1)); // a name is never empty
     std::memcpy(m_at, name.data(), name.size());
     m_at += WORDS_OF(name.size());
 }
