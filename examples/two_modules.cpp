@@ -49,11 +49,8 @@ int main()
     if (!sip.m_adapter.dial("SWITCH", "isdn", "4989123", {}, {}, {}, nullptr).isOk())
         return 1;
     loop.runTurn(); // tells each side what the other has become
-    for (State::State const state : {State::ALERTING, State::CONNECTED})
-    {
-        std::ignore = isdn.m_adapter.setOwnProperty(State(CC_PropertyId::STATE, state));
-        loop.runTurn();
-    }
+    for (auto const state : {State::ALERTING, State::CONNECTED})
+        std::ignore = isdn.m_adapter.setOwnProperty(State(CC_PropertyId::STATE, state)), loop.runTurn();
     for (Module* module : {&isdn, &sip}) // drop releases a side: the other hears of it, and the last one ends the call
         module->m_adapter.drop(QCause::NORMAL_CALL_CLEARING, 0), loop.runTurn();
     std::printf("calls left: %u\n", CallControl::GET_NUMBER_OF_CALLS());
