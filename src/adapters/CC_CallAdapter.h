@@ -317,7 +317,7 @@ private:
     void observeCall(CC_Call& call);
     void unobserveCall();
     template <class Take>
-    void takeOver(CC_PropertyView& view, CC_PropertyContainer const& source, Take const& take);
+    void takeOverForeign(CC_PropertyView& view, Take const& take);
     void updateOwnCallLeg(CC_Flags const& changed);
     void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);

@@ -50,9 +50,8 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
-    attempt.settle(view);
     if (!seen.isOk() || attempt.isOver())
-        return XCode::FAILURE;
+        return attempt.emptyWhenIdle(view);
     CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return WRITE(*target, written);
@@ -80,8 +79,7 @@ XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Wri
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
-    attempt.settle(view);
-    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
+    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : attempt.emptyWhenIdle(view);
 }
 
 CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
@@ -133,9 +131,8 @@ XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
     XCode const seen = m_ownView.write(property);
-    attempt.settle(m_ownView);
     if (!seen.isOk() || attempt.isOver())
-        return XCode::FAILURE;
+        return attempt.emptyWhenIdle(m_ownView);
     m_isWritingOwn = true;
     XCode const result = WRITE(*m_ownCallLeg, property);
     if (!attempt.isOver())
