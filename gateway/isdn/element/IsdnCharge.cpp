@@ -67,7 +67,8 @@ Charge CHARGE_OF(Advice const& advice, Q956::ETypeOfChargingInfo::Type type, int
         else
             READ(advice.recorded.unit, specific.m_recorded.select(specific.m_recorded.m_unitsList));
         if (advice.billing_id >= SHIFT && advice.billing_id <= lastBillingId)
-            specific.setPresent(specific.m_billingId) = static_cast<Q956::EAOCEBillingId::Type>(advice.billing_id - SHIFT);
+            specific.setPresent(specific.m_billingId) =
+                static_cast<Q956::EAOCEBillingId::Type>(advice.billing_id - SHIFT);
     }
     return charge;
 }
