@@ -16,7 +16,11 @@ install(FILES ${PROJECT_BINARY_DIR}/callcontrolConfig.cmake ${PROJECT_BINARY_DIR
 
 file(RELATIVE_PATH PREFIX_FROM_PC /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 string(REGEX REPLACE "/$" "" PREFIX_FROM_PC "${PREFIX_FROM_PC}")
-foreach(package callcontrol callcontrol-diagnosis callcontrol-testing)
+set(packages callcontrol callcontrol-diagnosis callcontrol-testing)
+if(CALLCONTROL_BUILD_GATEWAY)
+    list(APPEND packages callcontrol-gateway)
+endif()
+foreach(package IN LISTS packages)
     configure_file(packaging/${package}.pc.in ${package}.pc @ONLY)
     install(FILES ${PROJECT_BINARY_DIR}/${package}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()

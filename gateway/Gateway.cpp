@@ -4,6 +4,7 @@
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/CallControl.h"
 #include "callcontrol/provider/CC_Endpoint.h"
+#include "callcontrol/provider/CC_Provider.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "diagnosis/CC_Explanation.h"
@@ -13,8 +14,6 @@
 #include "operation/Log.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
-#include "sip/message/SipCause.h"
-#include "sip/message/SipPropertyId.h"
 
 #include <spdlog/spdlog.h>
 
@@ -72,58 +71,54 @@ unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
     return ofCalls + ofModules + inside;
 }
 
-Gateway::Gateway(Configuration const& configuration, unsigned int tracedCalls)
+Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned int tracedCalls)
     : m_configuration(configuration)
     , m_media(configuration.relaysMedia ? std::make_unique<MediaLayer>(configuration.media, m_callControlLoop)
                                         : nullptr)
+    , m_loop(findLoop(modules))
     , m_recording(configuration)
-    , m_host(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
-    , m_environment{m_stack,
-                    m_host.getContextName(),
-                    Routing(configuration.routes),
-                    Admission(configuration.maxCalls, configuration.maxCallsPerSecond, configuration.maxCallsPerSource),
-                    CallTrace(tracedCalls),
-                    {},
-                    0,
-                    configuration.relaysMedia,
-                    false,
-                    [this] { stopIfIdle(); }}
+    , m_callControl(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
+    , m_host{m_loop,
+             m_callControl.getContextName(),
+             Routing(configuration.routes),
+             Admission(configuration.maxCalls, configuration.maxCallsPerSecond, configuration.maxCallsPerSource),
+             CallTrace(tracedCalls),
+             {},
+             0,
+             configuration.relaysMedia,
+             false,
+             [this] { stopIfIdle(); }}
     , m_freeMemory(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
+    , m_modules(std::move(modules))
 {
-    if (!SipPropertyId::DECLARE().isOk())
-        throw std::runtime_error("the names of the SIP properties cannot be declared");
-    std::ignore = CallControl::SET_MAX_HOPS(m_host.getContextName(), configuration.maxHops); // the context is there
-    m_stack.attach(m_callControlLoop);
-    m_stack.attach(m_datapathLoop);
-    m_stack.watch(m_signals.get(), [this] { onSignal(); });
-    openPorts();
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
+    m_loop.attach(m_callControlLoop);
+    m_loop.attach(m_datapathLoop);
+    m_loop.watch(m_signals.get(), [this] { onSignal(); });
+    for (auto const& [name, module] : m_modules)
+        module->open(m_host);
     if (m_media != nullptr)
         m_media->start();
 }
 
-void Gateway::openPorts()
+SignallingLoop& Gateway::findLoop(Modules const& modules)
 {
-    for (std::size_t i = 0; i < m_configuration.interfaces.size(); ++i)
-        try
-        {
-            m_ports.push_back(std::make_unique<Port>(m_environment, m_host, m_configuration.interfaces[i]));
-        }
-        catch (std::runtime_error const& error)
-        {
-            throw ConfigurationError(m_configuration.file, "interface[" + std::to_string(i) + "].listen", error.what());
-        }
+    SignallingLoop* found = nullptr;
+    for (auto const& [name, module] : modules)
+        if (SignallingLoop* const loop = module->getLoop(); found != nullptr && loop != nullptr)
+            throw ConfigurationError(m_configuration.file, name, "needs the outermost loop, which another module has");
+        else if (loop != nullptr)
+            found = loop;
+    if (found != nullptr)
+        return *found;
+    m_ownLoop = std::make_unique<EpollLoop>();
+    return *m_ownLoop;
 }
 
-void Gateway::run()
-{
-    for (auto const& port : m_ports)
-        spdlog::info("interface {} listens on {}, its peer is {}", port->interface.getName().view(),
-                     port->interface.getConfiguration().listen.text(), port->interface.getConfiguration().peer.text());
-    m_stack.run();
-}
+void Gateway::run() { m_loop.run(); }
 
 void Gateway::onSignal()
 {
@@ -159,12 +154,12 @@ void Gateway::onHangUp()
 /// The first request lets the calls go on for a while, another one clears them at once.
 void Gateway::end()
 {
-    if (m_environment.isEnding)
+    if (m_host.isEnding)
     {
         clearCalls();
         return;
     }
-    m_environment.isEnding = true;
+    m_host.isEnding = true;
     spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
                  m_configuration.clearAfter);
     m_clearTimer.start(m_configuration.clearAfter * 1000);
@@ -176,7 +171,7 @@ void Gateway::onClearTimer()
     if (!m_isClearing)
         clearCalls();
     else
-        m_stack.stop(); // a peer does not answer; we have waited for as long as its transaction lives
+        m_loop.stop(); // a peer does not answer; we have waited for as long as its transaction lives
 }
 
 void Gateway::clearCalls()
@@ -184,33 +179,30 @@ void Gateway::clearCalls()
     m_isClearing = true;
     spdlog::info("ending: {} calls are cleared", CallControl::GET_NUMBER_OF_CALLS());
     unsigned int wait = 0;
-    for (auto const& port : m_ports)
-    {
-        port->interface.clearCalls({QCause::TEMPORARY_FAILURE, 0, {}});
-        wait = std::max(wait, port->interface.getConfiguration().t1x64);
-    }
+    for (auto const& [name, module] : m_modules)
+        wait = std::max(wait, module->clearCalls(QCause::TEMPORARY_FAILURE));
     m_clearTimer.start(wait);
     stopIfIdle();
 }
 
 void Gateway::stopIfIdle()
 {
-    if (m_environment.isEnding && !hasEndpoints())
-        m_stack.stop();
+    if (m_host.isEnding && !hasEndpoints())
+        m_loop.stop();
 }
 
 bool Gateway::hasEndpoints() const
 {
-    return std::any_of(m_ports.begin(), m_ports.end(),
-                       [](auto const& port) { return port->interface.getNumberOfEndpoints() != 0; });
+    return std::any_of(m_modules.begin(), m_modules.end(),
+                       [](auto const& module) { return module.second->getNumberOfEndpoints() != 0; });
 }
 
 /// In the process that tells it, which is a copy of this one.
 std::string Gateway::getState() const
 {
     InfoContainer info;
-    CallControl::GET_PROVIDER_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
-    CallControl::GET_CALL_INFO(info, m_host.getContextName(), EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
+    CallControl::GET_PROVIDER_INFO(info, m_host.contextName, EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
+    CallControl::GET_CALL_INFO(info, m_host.contextName, EVERYTHING, 0, EVERYTHING, 0, String::s_empty);
     // why each call is still up, and what became of those before
     info.add(0, 0, "holders", String::s_empty);
     CC_Explanation::OF_CALLS_OLDER_THAN(0).getInfo(info, EVERYTHING, 1, EVERYTHING, 0, String::s_empty);
@@ -220,17 +212,13 @@ std::string Gateway::getState() const
         CC_RecordingReport::ADD(info, 1, CC_RecordingReport(CC_Recording::READ(CC_Recorder::GET_IMAGE())).getCalls());
     CC_CallPool::Statistics& pool = CC_CallPool::s_statistics;
     pool.prepareGet();
-    Counters const& counters = m_environment.counters;
+    Counters const& counters = m_host.counters;
     unsigned int const up = CallControl::GET_NUMBER_OF_CALLS();
     std::string text = fmt::format("state: {} calls up\n{}", up, info.getString_TreeFormat().view());
     text += fmt::format("pool: {} calls added, {} removed, at most {} at once, {} ms of calls\n", pool.m_callsAdded,
                         pool.m_callsRemoved, pool.m_maxActiveCalls, pool.m_callTime);
-    for (auto const& port : m_ports)
-    {
-        SipGuard::Counters const& guard = port->interface.getGuardCounters();
-        text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
-                            port->interface.getName().view(), guard.strangers, guard.tooLarge, guard.connections);
-    }
+    for (auto const& [name, module] : m_modules)
+        text += module->describe();
     text += fmt::format("log: {} lines dropped\n", GET_DROPPED_LOG_LINES());
     text += fmt::format("counters: {} placed, {} answered, {} cleared, {} failed, {} refused, {} up\n", counters.placed,
                         counters.answered, counters.cleared, counters.failed, counters.refused, up);

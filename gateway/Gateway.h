@@ -2,36 +2,39 @@
 
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
+#include "host/EpollLoop.h"
 #include "host/FreeMemory.h"
+#include "host/GatewayHost.h"
+#include "host/SignallingModule.h"
 #include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
 #include "operation/StateDump.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
-#include "sip/endpoint/SipEnvironment.h"
-#include "sip/endpoint/SipInterface.h"
-#include "sip/stack/SipStack.h"
 
+#include <map>
 #include <memory>
-#include <vector>
+#include <string>
 
-/// The gateway at work: call control and the SIP interfaces of a configuration, on the calling thread.
+/// The gateway at work: call control and the signalling modules of a configuration, on the calling thread.
 ///
 ///     Gateway::BLOCK_SIGNALS();
-///     Gateway gateway(configuration, 1);
+///     Gateway gateway(configuration, std::move(modules), 1);
 ///     gateway.run(); // until SIGTERM or SIGINT and the end of the calls
 class Gateway
 {
 public:
-    /// Listens on all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
-    /// ConfigurationError for an address that cannot be listened on.
-    Gateway(Configuration const& configuration, unsigned int tracedCalls);
+    using Modules = std::map<std::string, std::unique_ptr<SignallingModule>>; // by name
+
+    /// Opens all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
+    /// ConfigurationError for an interface that cannot be opened.
+    Gateway(Configuration const& configuration, Modules modules, unsigned int tracedCalls);
     Gateway(Gateway const&) = delete;
     Gateway& operator=(Gateway const&) = delete;
 
     /// Serves calls until it was asked to end and the calls are over, or were cleared in the configured time.
     void run();
-    Counters const& getCounters() const { return m_environment.counters; }
+    Counters const& getCounters() const { return m_host.counters; }
 
     /// The signals that `run()` takes from a descriptor. To be called before any thread is made.
     static void BLOCK_SIGNALS();
@@ -52,17 +55,8 @@ private:
     private:
         int m_descriptor;
     };
-    struct Port
-    {
-        Port(SipEnvironment& environment, CallControlHost const& host, Configuration::Interface const& configuration)
-            : interface(environment, configuration), registration(host, interface.getName(), interface)
-        {
-        }
-        SipInterface interface;
-        CallControlHost::Registration registration; // taken back before the provider ends
-    };
-
-    void openPorts();
+    SignallingLoop& findLoop(Modules const& modules);
+    void openModules();
     void onSignal();
     void end();
     void clearCalls();
@@ -76,14 +70,15 @@ private:
     TYEventLoop m_callControlLoop;
     TYEventLoop m_datapathLoop; // idle when the media layer has loops of its own
     std::unique_ptr<MediaLayer> m_media;
-    SipStack m_stack;
+    std::unique_ptr<EpollLoop> m_ownLoop; // null where a module brings one
+    SignallingLoop& m_loop;
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
-    CallControlHost m_host;
-    SipEnvironment m_environment;
+    CallControlHost m_callControl;
+    GatewayHost m_host;
     FreeMemory m_freeMemory;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
-    std::vector<std::unique_ptr<Port>> m_ports;
+    Modules m_modules; // they end first
 };

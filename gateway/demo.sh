@@ -78,12 +78,12 @@ max-calls = 0
 max-calls-per-second = 0
 max-calls-per-source = 0
 
-[[interface]]
+[[sip]]
 name = "a"
 listen = "$HOST:$PORT"
 peer = "$HOST:$((PORT + 1))"
 
-[[interface]]
+[[sip]]
 name = "b"
 listen = "$HOST:$((PORT + 2))"
 peer = "$HOST:$((PORT + 3))"

@@ -1,5 +1,7 @@
-// callcontrol-gateway: SIP clients call each other through the call-control library. README.md tells how it is used.
+// callcontrol-gateway: peers of its signalling modules call each other through the call-control library. README.md
+// tells how it is used.
 #include "Gateway.h"
+#include "host/ModuleLoader.h"
 #include "operation/Log.h"
 #include "operation/Output.h"
 
@@ -9,6 +11,7 @@
 #include <exception>
 #include <string>
 #include <unistd.h>
+#include <utility>
 
 namespace
 {
@@ -25,6 +28,7 @@ struct Arguments
     bool isCheck = false;
     unsigned int tracedCalls = 0;
     std::string logLevel;
+    std::string modules = ModuleLoader::GET_INSTALLED_FOLDER();
 };
 
 int COMPLAIN(char const* what)
@@ -38,15 +42,16 @@ void DECLARE(CLI::App& app, Arguments& arguments)
     app.add_option("-c,--config", arguments.file, "The configuration file (TOML)")->required();
     app.add_flag("--check", arguments.isCheck, "Only read the configuration file");
     app.add_option("--trace-calls", arguments.tracedCalls, "Print a ladder of each of the first N calls");
+    app.add_option("--modules", arguments.modules, "The folder of the signalling modules");
     app.add_option("--log-level", arguments.logLevel, "Instead of the configuration's log-level")
         ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
 }
 
-int SERVE(Configuration const& configuration, unsigned int tracedCalls)
+int SERVE(Configuration const& configuration, Gateway::Modules modules, unsigned int tracedCalls)
 {
     Counters counters;
     {
-        Gateway gateway(configuration, tracedCalls);
+        Gateway gateway(configuration, std::move(modules), tracedCalls);
         gateway.run();
         counters = gateway.getCounters();
     }
@@ -59,7 +64,10 @@ int SERVE(Configuration const& configuration, unsigned int tracedCalls)
 
 int RUN(Arguments const& arguments)
 {
-    Configuration configuration = Configuration::READ(arguments.file);
+    Configuration const configuration = Configuration::READ(arguments.file);
+    Gateway::Modules modules;
+    for (auto const& [name, interfaces] : configuration.modules)
+        modules[name] = ModuleLoader(arguments.modules).load(name, configuration);
     if (arguments.isCheck)
     {
         std::printf("%s: all right\n", arguments.file.c_str());
@@ -73,14 +81,14 @@ int RUN(Arguments const& arguments)
     static MonitorWriter writer;
     RTD::REPOSITORY::SET_WRITER(&writer);
     RTD::REPOSITORY::ENABLE(CALL_CONTROL_MONITOR, configuration.callControlLogLevel);
-    return SERVE(configuration, arguments.tracedCalls);
+    return SERVE(configuration, std::move(modules), arguments.tracedCalls);
 }
 
 /// Reads the command line and runs; what is wrong with either is told in one line.
 int START(int argc, char** argv)
 {
     Arguments arguments;
-    CLI::App app("A media gateway's call control between SIP interfaces");
+    CLI::App app("A media gateway's call control between its signalling modules");
     DECLARE(app, arguments);
     try
     {

@@ -75,3 +75,9 @@ bool AddressRange::contains(InternetAddress const& address) const
             return false;
     return true;
 }
+
+bool AddressRange::CONTAINS(std::vector<AddressRange> const& ranges, InternetAddress const& address)
+{
+    return std::any_of(ranges.begin(), ranges.end(),
+                       [&](AddressRange const& range) { return range.contains(address); });
+}

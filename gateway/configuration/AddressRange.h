@@ -2,6 +2,7 @@
 
 #include <array>
 #include <string>
+#include <vector>
 
 struct sockaddr;
 
@@ -24,6 +25,8 @@ public:
 
     InternetAddress const& getFirst() const { return m_first; }
     bool contains(InternetAddress const& address) const;
+    /// Whether one of them does.
+    static bool CONTAINS(std::vector<AddressRange> const& ranges, InternetAddress const& address);
 
 private:
     InternetAddress m_first = {};

@@ -1,73 +1,23 @@
 #pragma once
 
-#include "configuration/AddressRange.h"
+#include "configuration/ConfigurationSection.h"
 #include "media/context/MediaOptions.h"
 
-#include <cstdint>
-#include <stdexcept>
+#include <map>
 #include <string>
 #include <string_view>
 #include <vector>
 
-/// An address of the internet and a port, as a configuration writes it: "192.0.2.1:5060" or "[2001:db8::1]:5060".
-struct SocketAddress
-{
-    std::string host; ///< an address, never a name; version 6 without its brackets
-    std::uint16_t port = 0;
-
-    bool isVersion6() const { return host.find(':') != std::string::npos; }
-    bool isUnspecified() const; ///< "0.0.0.0" or "[::]": every address of the host
-    bool isMulticast() const;
-    friend bool operator==(SocketAddress const&, SocketAddress const&) = default;
-    /// The form above.
-    std::string text() const;
-    /// Throws std::invalid_argument with the reason for anything else, port 0 included.
-    static SocketAddress PARSE(std::string const& text);
-};
-
-/// What cannot be served in a configuration: one line, "FILE: KEY: REASON".
-class ConfigurationError : public std::runtime_error
-{
-public:
-    ConfigurationError(std::string const& file, std::string const& key, std::string const& reason);
-};
-
-/// The gateway's configuration file as read: complete, checked, with defaults filled in. A plain value.
+/// The gateway's configuration file as read: complete, checked, with defaults filled in, but for the tables of the
+/// signalling modules, which these read. A plain value.
 ///
 ///     Configuration const configuration = Configuration::READ("/etc/callcontrol-gateway.toml");
-///     for (Configuration::Interface const& interface : configuration.interfaces)
-///         ...
+///     for (auto const& [name, interfaces] : configuration.modules)
+///         ... // a module of that name is needed
 ///
 /// README.md lists the keys.
 struct Configuration
 {
-    /// One SIP interface: where it listens, and the peer to which its calls go.
-    struct Interface
-    {
-        std::string name;
-        SocketAddress listen;
-        SocketAddress advertise; ///< what the peers are told instead of `listen`; port 0: nothing
-        SocketAddress peer;
-        bool usesTcp = false;     ///< towards the peer
-        bool listensOnUdp = true; ///< one of the two at least
-        bool listensOnTcp = false;
-        std::vector<AddressRange> allow;     ///< who is served; empty: the peer's address alone
-        unsigned int maxMessageSize = 65535; ///< octets
-        unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
-        unsigned int maxConnectionsPerSource = 16;
-        unsigned int tcpIdle = 120;         ///< seconds that a connection may stay without a message
-        unsigned int t1 = 500;              ///< milliseconds: the first retransmission
-        unsigned int t1x64 = 32000;         ///< milliseconds: how long a transaction waits for its answer
-        unsigned int answerTimeout = 180;   ///< seconds that the peer may ring
-        unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
-        unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
-        unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
-        std::string mediaAddress;           ///< of this machine, where media come in; no name
-        bool transfersOnWire = false;       ///< a peer that is to be transferred is sent REFER; else we dial for it
-
-        /// Where the peers reach it.
-        SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
-    };
     /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
     struct Route
     {
@@ -90,13 +40,12 @@ struct Configuration
     bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
     MediaOptions media;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
-    std::vector<Interface> interfaces;
     std::vector<Route> routes;
+    /// By the module's name, its interfaces. Each has a `name` that no other interface has.
+    std::map<std::string, std::vector<ConfigurationSection>> modules;
 
     /// Throws ConfigurationError.
     static Configuration READ(std::string const& file);
     /// The same from the text itself; `file` names it in errors.
     static Configuration PARSE(std::string_view text, std::string const& file);
-
-    Interface const* findInterface(std::string_view name) const;
 };

@@ -41,8 +41,8 @@ void CallControlHost::runPending()
     }
 }
 
-CallControlHost::Registration::Registration(CallControlHost const& host, String const& name, CC_Provider& provider)
-    : m_contextName(host.getContextName()), m_name(name)
+CallControlHost::Registration::Registration(String const& contextName, String const& name, CC_Provider& provider)
+    : m_contextName(contextName), m_name(name)
 {
     if (!CallControl::ADD_PROVIDER(m_contextName, m_name, provider).isOk())
         throw std::runtime_error("the name is taken");

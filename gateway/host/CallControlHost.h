@@ -24,12 +24,12 @@ public:
     CallControlHost(CallControlHost const&) = delete;
     CallControlHost& operator=(CallControlHost const&) = delete;
 
-    /// A provider in the host's context, as long as this lives.
+    /// A provider in the context of that name, as long as this lives.
     class Registration
     {
     public:
         /// Throws std::runtime_error when the name is taken or memory is out.
-        Registration(CallControlHost const& host, String const& name, CC_Provider& provider);
+        Registration(String const& contextName, String const& name, CC_Provider& provider);
         ~Registration();
         Registration(Registration const&) = delete;
         Registration& operator=(Registration const&) = delete;

@@ -55,7 +55,8 @@ class SipDriver : public ModuleDriver
 {
 public:
     SipDriver()
-        : m_environment{m_stack, "SWITCH", Routing({{NAME, "", PEER}}), Admission(0, 0), CallTrace(0)}
+        : m_host{m_stack, "SWITCH", Routing({{NAME, "", PEER}}), Admission(0, 0), CallTrace(0)}
+        , m_environment{m_host, m_stack}
         , m_interface(m_environment, CONFIGURATION(m_agent.getAddress()))
     {
         spdlog::set_level(spdlog::level::off);
@@ -140,9 +141,9 @@ private:
         FailingAllocator::Pause const unseen;
         work();
     }
-    static Configuration::Interface CONFIGURATION(SocketAddress const& peer)
+    static SipConfiguration CONFIGURATION(SocketAddress const& peer)
     {
-        Configuration::Interface configuration;
+        SipConfiguration configuration;
         configuration.name = NAME;
         configuration.listen = {"127.0.0.1", FREE_PORT()};
         configuration.peer = peer;
@@ -165,6 +166,7 @@ private:
     unsigned long m_turns = 0;
     SipUserAgent m_agent;
     SipStack m_stack;
+    GatewayHost m_host;
     SipEnvironment m_environment;
     SipInterface m_interface;
 };

@@ -48,13 +48,13 @@ write_configuration() {
 call-control-log-level = 2
 ${1:-}
 
-[[interface]]
+[[sip]]
 name = "a"
 listen = "$HOST:$PORT_A"
 peer = "$HOST:$PORT_CALLER"
 ${2:-}
 
-[[interface]]
+[[sip]]
 name = "b"
 listen = "$HOST:$PORT_B"
 peer = "$HOST:$PORT_CALLEE"

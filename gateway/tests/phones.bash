@@ -1,27 +1,30 @@
 # Phones for tests with speech, beside lib.bash: baresip, which says what stands in a file and writes down what it hears.
 # Each has a folder of its name in $WORK: said.wav, and heard.wav when it has ended.
 
-# start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 32 above its own
+# start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 32 above its own. Before
+# it may stand CODECS, as baresip names them, SOUND: "say" or "speak" (speech.py), and MODULES besides.
 start_phone() {
-    local folder="$WORK/$1"
+    local folder="$WORK/$1" module
     mkdir -p "$folder"
-    python3 "$HERE/speech.py" say "$2" 60 "$folder/said.wav"
+    python3 "$HERE/speech.py" "${SOUND:-say}" "$2" "${SECONDS_OF_SOUND:-60}" "$folder/said.wav"
     cat >"$folder/config" <<END
 sip_listen $HOST:$2
 rtp_ports $4-$(($4 + 3))
 audio_source aufile,$folder/said.wav
 audio_player aufile,$folder/played.wav
+ausrc_srate 8000
 module_path $(dirname "$(find /usr/lib -path '*/baresip/modules/account.so' | head -n 1)")
 module g711.so
 module aufile.so
 module sndfile.so
+$(for module in ${MODULES:-}; do echo "module $module.so"; done)
 module_tmp account.so
 module_app menu.so
 module_app ctrl_tcp.so
 ctrl_tcp_listen $HOST:$(($2 + 32))
 snd_path $folder
 END
-    echo "<sip:$1@$HOST:$2>;regint=0;audio_codecs=PCMU;outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
+    echo "<sip:$1@$HOST:$2>;regint=0;audio_codecs=${CODECS:-PCMU};outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
     touch "$folder/contacts"
     baresip -f "$folder" </dev/null >"$WORK/$1.log" 2>&1 &
     background+=($!)
@@ -49,11 +52,23 @@ stop_phones() {
     background=()
 }
 
-# expect_speech FROM TO FRAMES: at least so many frames of what FROM said were heard by TO as they were
+# heard_by NAME: the file of what it heard
+heard_by() { find "$WORK/$1" -name '*-dec.wav' | head -n 1; }
+
+# expect_speech FROM TO FRAMES [LAWS]: at least so many frames of what FROM said were heard by TO as they were
 expect_speech() {
     local heard
-    heard=$(find "$WORK/$2" -name '*-dec.wav' | head -n 1)
+    heard=$(heard_by "$2")
     [[ -n $heard ]] || fail "phone $2 heard nothing"
     echo -n "$1 to $2: "
-    python3 "$HERE/speech.py" compare "$WORK/$1/said.wav" "$heard" "$3" || fail "speech from $1 to $2"
+    python3 "$HERE/speech.py" compare "$WORK/$1/said.wav" "$heard" "$3" ${4:+"$4"} || fail "speech from $1 to $2"
+}
+
+# expect_voice FROM TO DECIBELS: what TO heard sounds like what FROM said, and not like what it said itself
+expect_voice() {
+    local heard
+    heard=$(heard_by "$2")
+    [[ -n $heard ]] || fail "phone $2 heard nothing"
+    echo -n "$1 to $2: "
+    python3 "$HERE/speech.py" distance "$WORK/$1/said.wav" "$heard" "$3" "$WORK/$2/said.wav" || fail "speech from $1 to $2"
 }

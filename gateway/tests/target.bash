@@ -8,7 +8,7 @@ add_target() {
     sed -i '0,/^from = "b"$/s//from = "b"\nprefix = "4"/' "$WORK/gateway.toml"
     cat >>"$WORK/gateway.toml" <<END
 
-[[interface]]
+[[sip]]
 name = "c"
 listen = "$HOST:$PORT_C"
 peer = "$HOST:$PORT_TARGET"

@@ -73,9 +73,24 @@ if(PKG_CONFIG AND NOT TOOLCHAIN)
     build_and_run(memory_user callcontrol-testing ${SOURCE}/memory_user.cpp ${replaced_new})
 endif()
 
+# a module of somebody else's for the installed gateway
+function(build_module name source)
+    must(${PKG_CONFIG} --cflags callcontrol-gateway callcontrol-testing)
+    separate_arguments(cflags UNIX_COMMAND "${output}")
+    must(${PKG_CONFIG} --libs callcontrol-gateway callcontrol-testing)
+    separate_arguments(libraries UNIX_COMMAND "${output}")
+    must(${PKG_CONFIG} --variable=modules callcontrol-gateway)
+    string(STRIP "${output}" folder)
+    must(${COMPILER} -std=c++20 -shared -fPIC ${FLAGS} ${cflags} ${source}
+        -o ${folder}/callcontrol-gateway-${name}.so ${libraries})
+endfunction()
+
 # the programs
 must(${EMULATOR} ${WORK}/installed/bin/records decode Charge 8100)
 if(EXISTS ${BUILD}/gateway/callcontrol-gateway)
-    file(WRITE ${WORK}/gateway.toml "[[interface]]\nname = \"a\"\nlisten = \"127.0.0.1:21990\"\npeer = \"127.0.0.1:21991\"\n")
+    file(WRITE ${WORK}/gateway.toml "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:21990\"\npeer = \"127.0.0.1:21991\"\n")
+    must(${EMULATOR} ${WORK}/installed/bin/callcontrol-gateway --config ${WORK}/gateway.toml --check)
+    build_module(fakes ${SOURCE}/../../gateway/tests/module/FakesModule.cpp)
+    file(APPEND ${WORK}/gateway.toml "[[fakes]]\nname = \"b\"\n")
     must(${EMULATOR} ${WORK}/installed/bin/callcontrol-gateway --config ${WORK}/gateway.toml --check)
 endif()

@@ -21,31 +21,26 @@ public:
     SipDirectSession(CC_CallAdapterE164& adapter, SipSessionWire& wire) : m_adapter(adapter), m_wire(wire) {}
 
     // --- SipSession
+    unsigned int check(std::string const&) override { return 0; } // the other side's peer says what it takes
+    bool open() override { return true; }
+    void addOffer(CC_PropertyContainer& own, std::string const& description) override;
+    void addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding) override;
+    std::string readFirstOffer() override; ///< it counts as taken
+    bool isAnswerBinding() const override;
+    std::string readForInvite(bool hadOffer) override;
+    void noteSettled() override { m_ours = Wish::NONE; }
+    void meetFork() override {}
+    bool isAgreed() const override { return true; }
     unsigned int takeOffer(std::string const& description, bool isQuick) override;
+    void proceed() override {}
     void takeAnswer(std::string const& description) override;
     void takeRefusal(unsigned int status) override;
     void withdraw() override;
-
-    // --- while the dialog comes up: what is said goes into properties that the endpoint writes itself
-
-    /// Our peer's offer in its INVITE, or in the answer to ours.
-    void addOffer(CC_PropertyContainer& own, std::string const& description);
-    /// Our peer's answer to the other side's first offer; it may say another thing later unless it is binding.
-    void addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding);
-    /// The other side's offer for our INVITE; it counts as taken. Empty without one.
-    std::string readFirstOffer();
-    /// Whether what `readForInvite` reads for an offer of ours is binding.
-    bool isAnswerBinding() const;
-    /// What the other side says to our INVITE's offer, or offers because it had none; as it is now.
-    std::string readForInvite(bool hadOffer);
-
-    /// The other side's answer to our INVITE's offer was passed on.
-    void noteSettled() { m_ours = Wish::NONE; }
-    /// The peer of the adapter may have said something, or be another.
-    void follow(bool isUp);
-    bool isWaitingForPeer() const { return m_ours != Wish::NONE; }
-    /// The next new other side will offer by itself: nothing is asked.
-    void expectOffer() { m_expectsOffer = true; }
+    void follow(bool isUp) override;
+    void expectOffer() override { m_expectsOffer = true; }
+    void followCall() override {}
+    MediaQuality const* getQuality() const override { return nullptr; }
+    void end() override {}
 
 private:
     enum class Wish

@@ -1,13 +1,21 @@
 #include "sip/dialog/SipStream.h"
 
+#include "media/rtp/RtpRoutes.h"
 #include "sip/dialog/SipParsedDescription.h"
 #include "sip/message/SipCodec.h"
 #include "sip/message/SipText.h"
 
+#include <algorithm>
+
 namespace
 {
+using Mode = VoipCodecAndMode::Mode;
+
 constexpr unsigned int LONGEST_PERIOD = 200; // milliseconds
 constexpr unsigned int DEFAULT_PERIOD = 20;  // RFC 3551, 4.2
+constexpr unsigned char FIRST_DYNAMIC = 96;  // RFC 3551, 6
+constexpr unsigned char LAST_DYNAMIC = 127;
+constexpr unsigned char USUAL_OF_EVENTS = 101;
 
 bool IS_CARRIED(sdp_media_t const& media)
 {
@@ -29,55 +37,12 @@ MG_Rtp::ECodec::Type CODEC_OF(sdp_rtpmap_t const& format)
     return SipCodec::OF(std::to_string(format.rm_pt), NAME_OF(format));
 }
 
-bool IS_COMPANION(sdp_rtpmap_t const& format)
-{
-    return SipCodec::IS_COMPANION(std::to_string(format.rm_pt), NAME_OF(format));
-}
-
-bool IS_NAMED(sdp_rtpmap_t const& format, char const* encoding)
-{
-    return format.rm_encoding != nullptr && SipText::IS_ONE_OF(format.rm_encoding, {encoding});
-}
-
-/// Takes out of a list what is not to stay.
-template <class Element, class IsToStay>
-void FILTER(Element*& first, Element* Element::*next, IsToStay const& isToStay)
-{
-    for (Element** place = &first; *place != nullptr;)
-        if (isToStay(**place))
-            place = &((*place)->*next);
-        else
-            *place = (*place)->*next;
-}
-
-bool MAY_STAY(sdp_attribute_t const& attribute)
-{
-    return SipText::IS_ONE_OF(attribute.a_name, {"ptime", "maxptime", "silenceSupp"});
-}
-
-void TAKE_OVER(sdp_media_t& media, unsigned short port)
-{
-    media.m_port = port;
-    media.m_number_of_ports = 0;
-    FILTER(media.m_rtpmaps, &sdp_rtpmap_t::rm_next,
-           [](sdp_rtpmap_t const& format) { return CODEC_OF(format) != MG_Rtp::ECodec::NONE || IS_COMPANION(format); });
-}
-
-bool HAS_CODEC(sdp_media_t const& media)
-{
-    for (sdp_rtpmap_t const* format = media.m_rtpmaps; format != nullptr; format = format->rm_next)
-        if (CODEC_OF(*format) != MG_Rtp::ECodec::NONE)
-            return true;
-    return false;
-}
-
-unsigned int PERIOD_OF(sdp_media_t const& media)
+char const* VALUE_OF(sdp_media_t const& media, char const* name)
 {
     for (sdp_attribute_t const* attribute = media.m_attributes; attribute != nullptr; attribute = attribute->a_next)
-        if (SipText::IS_ONE_OF(attribute->a_name, {"ptime"}) && attribute->a_value != nullptr)
-            if (unsigned int const period = SipText::NUMBER(attribute->a_value, 1, LONGEST_PERIOD); period != 0)
-                return period;
-    return DEFAULT_PERIOD;
+        if (SipText::IS_ONE_OF(attribute->a_name, {name}) && attribute->a_value != nullptr)
+            return attribute->a_value;
+    return "";
 }
 
 MediaAddress ADDRESS_OF(sdp_media_t const& media)
@@ -88,104 +53,193 @@ MediaAddress ADDRESS_OF(sdp_media_t const& media)
     return MediaAddress::OF(connection->c_address, static_cast<unsigned short>(media.m_port));
 }
 
-VoipCodecAndMode::Mode MODE_OF(sdp_media_t const& ours, sdp_media_t const& far)
+Mode MODE_OF(bool sends, bool receives)
 {
-    bool const sends = (ours.m_mode & sdp_sendonly) != 0 && (far.m_mode & sdp_recvonly) != 0;
-    bool const receives = (ours.m_mode & sdp_recvonly) != 0 && (far.m_mode & sdp_sendonly) != 0;
     if (sends)
         return receives ? VoipCodecAndMode::SEND_RECEIVE : VoipCodecAndMode::SEND_ONLY;
     return receives ? VoipCodecAndMode::RECEIVE_ONLY : VoipCodecAndMode::INACTIVE;
 }
 
-bool IS_SAME(sdp_rtpmap_t const& ours, sdp_rtpmap_t const& far)
+bool SENDS(Mode mode) { return mode == VoipCodecAndMode::SEND_RECEIVE || mode == VoipCodecAndMode::SEND_ONLY; }
+
+bool RECEIVES(Mode mode) { return mode == VoipCodecAndMode::SEND_RECEIVE || mode == VoipCodecAndMode::RECEIVE_ONLY; }
+
+char const* NAME_OF(Mode mode)
 {
-    MG_Rtp::ECodec::Type const codec = CODEC_OF(ours);
-    if (codec != MG_Rtp::ECodec::NONE)
-        return codec == CODEC_OF(far);
-    return ours.rm_encoding != nullptr && IS_NAMED(far, ours.rm_encoding) && ours.rm_rate == far.rm_rate;
+    static constexpr char const* NAMES[] = {"sendrecv", "sendonly", "recvonly", "inactive"};
+    return NAMES[mode];
 }
 
-sdp_rtpmap_t const* FIND(sdp_media_t const& media, sdp_rtpmap_t const& format)
+/// "video 0 RTP/AVP 31"
+std::string REFUSED(sdp_media_t const& media)
 {
-    sdp_rtpmap_t const* found = media.m_rtpmaps;
-    while (found != nullptr && !IS_SAME(*found, format))
-        found = found->rm_next;
-    return found;
+    std::string format = "0";
+    if (media.m_rtpmaps != nullptr)
+        format = std::to_string(media.m_rtpmaps->rm_pt);
+    else if (media.m_format != nullptr && media.m_format->l_text != nullptr)
+        format = media.m_format->l_text;
+    return std::string(media.m_type_name) + " 0 " + media.m_proto_name + " " + format;
 }
 
-MediaDescription DESCRIBE(sdp_media_t const& ours, sdp_media_t const& far)
+template <class Elements, class IsIt>
+auto FIND(Elements const& elements, IsIt const& isIt)
 {
-    MediaDescription result;
-    result.rtp = ADDRESS_OF(far);
-    result.mode = MODE_OF(ours, far);
-    for (sdp_rtpmap_t const* format = far.m_rtpmaps; format != nullptr; format = format->rm_next)
+    auto const found = std::find_if(elements.begin(), elements.end(), isIt);
+    return found != elements.end() ? &*found : nullptr;
+}
+
+void READ_FORMAT(SipStream& stream, sdp_rtpmap_t const& format)
+{
+    auto const type = static_cast<unsigned char>(format.rm_pt);
+    auto const rate = static_cast<unsigned int>(format.rm_rate);
+    if (format.rm_encoding != nullptr && SipText::IS_ONE_OF(format.rm_encoding, {"telephone-event"}))
     {
-        sdp_rtpmap_t const* const same = FIND(ours, *format);
-        if (same == nullptr)
-            continue;
-        MediaPayloadTypes const types{static_cast<unsigned char>(same->rm_pt),
-                                      static_cast<unsigned char>(format->rm_pt)};
-        if (IS_NAMED(*format, "telephone-event"))
-            result.telephoneEvent = result.telephoneEvent.isAgreed() ? result.telephoneEvent : types;
-        else if (IS_NAMED(*format, "CN"))
-            result.comfortNoise = types;
-        else if (result.formats.find(CODEC_OF(*format)) == nullptr)
-            result.formats.add({VoipCodec(CODEC_OF(*format), PERIOD_OF(far)), types});
+        if (FIND(stream.events, [rate](SipStream::Events const& known) { return known.rate == rate; }) == nullptr)
+            stream.events.push_back({rate, type});
+        return;
     }
-    return result;
+    SipStream::Codec const codec = CODEC_OF(format);
+    if (codec != MG_Rtp::ECodec::NONE &&
+        FIND(stream.formats, [codec](SipStream::Format const& known) { return known.codec == codec; }) == nullptr)
+        stream.formats.push_back({codec, type});
+}
+
+void READ_STREAM(SipStream& stream, sdp_media_t const& media)
+{
+    stream.rtp = ADDRESS_OF(media);
+    stream.mode = MODE_OF((media.m_mode & sdp_sendonly) != 0, (media.m_mode & sdp_recvonly) != 0);
+    stream.period = SipText::NUMBER(VALUE_OF(media, "ptime"), 1, LONGEST_PERIOD);
+    for (sdp_rtpmap_t const* format = media.m_rtpmaps; format != nullptr; format = format->rm_next)
+        READ_FORMAT(stream, *format);
+}
+
+/// RFC 3551, 4.5 and RFC 7587; with the annexes that would let a codec fall silent, which the other side may not know.
+std::string LINES_OF(SipStream::Format const& format)
+{
+    std::string const type = std::to_string(format.type);
+    std::string lines = "a=rtpmap:" + type + " " + SipCodec::ENCODING(format.codec) + "\r\n";
+    if (format.codec == MG_Rtp::ECodec::G729)
+        lines += "a=fmtp:" + type + " annexb=no\r\n";
+    else if (format.codec == MG_Rtp::ECodec::G723)
+        lines += "a=fmtp:" + type + " annexa=no\r\n";
+    return lines;
+}
+
+std::string LINES_OF(SipStream::Events const& events)
+{
+    std::string const type = std::to_string(events.type);
+    return "a=rtpmap:" + type + " telephone-event/" + std::to_string(events.rate) + "\r\na=fmtp:" + type + " 0-16\r\n";
+}
+
+MediaPayloadTypes EVENTS_AGREED(SipStream const& ours, SipStream const& far, unsigned int rate)
+{
+    for (SipStream::Events const& theirs : far.events)
+        if (auto const* same = FIND(ours.events, [&](SipStream::Events const& one) { return one.rate == theirs.rate; });
+            same != nullptr && theirs.rate == rate)
+            return {same->type, theirs.type};
+    return {};
 }
 } // namespace
 
-std::string SipStream::WITH_ADDRESS(std::string_view description, Origin const& origin)
+std::optional<SipStream> SipStream::READ(std::string_view description)
 {
     SipParsedDescription const parsed(description);
-    sdp_session_t* const session = parsed.get();
-    if (session == nullptr)
-        return {};
-    String buffer;
-    std::string const host = origin.rtp.host.getIpAddrAsString(buffer).c_str();
-    sdp_connection_t address{};
-    address.c_size = sizeof address;
-    address.c_nettype = sdp_net_in;
-    address.c_addrtype = origin.rtp.host.getVersion() == 6 ? sdp_addr_ip6 : sdp_addr_ip4;
-    address.c_address = host.c_str();
-    sdp_origin_t from{};
-    from.o_size = sizeof from;
-    from.o_username = "gateway";
-    from.o_id = origin.session;
-    from.o_version = origin.version;
-    from.o_address = &address;
-    session->sdp_origin = &from;
-    session->sdp_connection = &address;
-    FILTER(session->sdp_attributes, &sdp_attribute_t::a_next, MAY_STAY);
+    if (parsed.get() == nullptr)
+        return std::nullopt;
+    SipStream stream;
     bool isFound = false;
-    for (sdp_media_t* media = session->sdp_media; media != nullptr; media = media->m_next)
+    for (sdp_media_t const* media = parsed.get()->sdp_media; media != nullptr; media = media->m_next)
     {
-        media->m_connections = nullptr;
-        FILTER(media->m_attributes, &sdp_attribute_t::a_next, MAY_STAY);
-        bool const isIt = !isFound && IS_CARRIED(*media);
-        if (isIt)
-            TAKE_OVER(*media, origin.rtp.port);
-        isFound = isFound || isIt;
-        if (!isIt || !HAS_CODEC(*media))
+        if (!isFound && IS_CARRIED(*media))
         {
-            media->m_port = 0;
-            media->m_rejected = 1;
+            isFound = true;
+            stream.place = stream.streams.size();
+            READ_STREAM(stream, *media);
         }
+        stream.streams.push_back(REFUSED(*media));
     }
-    return parsed.print();
+    return isFound ? std::optional<SipStream>(std::move(stream)) : std::nullopt;
 }
 
-std::optional<MediaDescription> SipStream::AGREED(std::string_view ours, std::string_view far)
+SipStream SipStream::getReply() const
 {
-    SipParsedDescription const parsedOurs(ours);
-    SipParsedDescription const parsedFar(far);
-    if (parsedOurs.get() == nullptr || parsedFar.get() == nullptr)
-        return std::nullopt;
-    sdp_media_t const* theirs = parsedFar.get()->sdp_media;
-    for (sdp_media_t const* media = parsedOurs.get()->sdp_media; media != nullptr && theirs != nullptr;
-         media = media->m_next, theirs = theirs->m_next)
-        if (IS_CARRIED(*media) && IS_CARRIED(*theirs))
-            return DESCRIBE(*media, *theirs);
-    return std::nullopt;
+    SipStream reply;
+    reply.streams = streams;
+    reply.place = place;
+    reply.period = period;
+    return reply;
+}
+
+std::string SipStream::write(Origin const& origin) const
+{
+    String buffer;
+    std::string const host = rtp.host.getIpAddrAsString(buffer).c_str();
+    std::string const address = (rtp.host.getVersion() == 6 ? "IN IP6 " : "IN IP4 ") + host + "\r\n";
+    std::string types;
+    std::string lines;
+    for (Format const& format : formats)
+    {
+        types += " " + std::to_string(format.type);
+        lines += LINES_OF(format);
+    }
+    for (Events const& one : events)
+    {
+        types += " " + std::to_string(one.type);
+        lines += LINES_OF(one);
+    }
+    std::string text = "v=0\r\no=gateway " + std::to_string(origin.session) + " " + std::to_string(origin.version) +
+                       " " + address + "s=-\r\nc=" + address + "t=0 0\r\n";
+    for (std::size_t i = 0; i < std::max<std::size_t>(streams.size(), 1); ++i)
+    {
+        if (i != place)
+        {
+            text += "m=" + streams[i] + "\r\n";
+            continue;
+        }
+        text += "m=audio " + std::to_string(rtp.port) + " RTP/AVP" + types + "\r\n" + lines;
+        text += "a=ptime:" + std::to_string(period != 0 ? period : DEFAULT_PERIOD) + "\r\n";
+        text += std::string("a=") + NAME_OF(mode) + "\r\n";
+    }
+    return text;
+}
+
+unsigned char SipStream::getType(Codec codec) const
+{
+    if (auto const* const found = FIND(formats, [codec](Format const& format) { return format.codec == codec; }))
+        return found->type;
+    if (codec < FIRST_DYNAMIC)
+        return static_cast<unsigned char>(codec); // its fixed one
+    for (unsigned char type = FIRST_DYNAMIC; type < LAST_DYNAMIC; ++type)
+        if (type != USUAL_OF_EVENTS && !FIND(formats, [type](Format const& format) { return format.type == type; }) &&
+            !FIND(events, [type](Events const& one) { return one.type == type; }))
+            return type;
+    return LAST_DYNAMIC;
+}
+
+unsigned char SipStream::getEventsType(unsigned int rate) const
+{
+    if (auto const* const found = FIND(events, [rate](Events const& one) { return one.rate == rate; }))
+        return found->type;
+    for (unsigned char type = USUAL_OF_EVENTS; type < LAST_DYNAMIC; ++type)
+        if (!FIND(formats, [type](Format const& format) { return format.type == type; }) &&
+            !FIND(events, [type](Events const& one) { return one.type == type; }))
+            return type;
+    return LAST_DYNAMIC;
+}
+
+MediaDescription SipStream::AGREED(SipStream const& ours, SipStream const& far)
+{
+    MediaDescription result;
+    result.rtp = far.rtp;
+    result.mode = MODE_OF(SENDS(ours.mode) && RECEIVES(far.mode), RECEIVES(ours.mode) && SENDS(far.mode));
+    unsigned int const period = far.period != 0 ? far.period : DEFAULT_PERIOD;
+    for (Format const& theirs : far.formats)
+        if (auto const* same = FIND(ours.formats, [&](Format const& one) { return one.codec == theirs.codec; }))
+            result.formats.add({VoipCodec(theirs.codec, period), {same->type, theirs.type}});
+    if (result.formats.getSize() != 0)
+        result.telephoneEvent =
+            EVENTS_AGREED(ours, far, RtpRoutes::CLOCK_RATE(result.formats.begin()->codec.getCodec()));
+    if (result.formats.getSize() != 0 && !result.telephoneEvent.isAgreed())
+        result.telephoneEvent = EVENTS_AGREED(ours, far, 8000); // many phones know no other clock
+    return result;
 }

@@ -45,13 +45,13 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
+    , m_anchored(m_adapter, *this, interface.getConfiguration(), interface.getMediaAddress())
+    , m_session(interface.getEnvironment().host.relaysMedia ? static_cast<SipSession&>(m_anchored) : m_direct)
     , m_sessionTimer(interface.getConfiguration().sessionExpires, interface.getConfiguration().leastExpires)
     , m_refreshTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_REFRESH_TIMER, this)
     , m_lengthTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_LENGTH_TIMER, this)
     , m_offerTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_OFFER_TIMER, this)
 {
-    if (m_interface.getEnvironment().relaysMedia)
-        m_media.turnOn(m_interface.getMediaAddress());
 }
 
 void SipEndpoint::ON_TIMER(void* endpoint)
@@ -114,7 +114,7 @@ void SipEndpoint::notifyPeerPropertyChange(CC_CallAdapter& adapter, CC_Flags con
 void SipEndpoint::followCall(CC_Flags const& flags)
 {
     traceFlags(flags);
-    m_media.follow(m_adapter.getDatapathContext());
+    m_session.followCall();
     if (isPeerReleased())
     {
         if (!m_isTransferring) // else our peer is to have the target
@@ -200,10 +200,10 @@ void SipEndpoint::leaveCall(SipCause const& cause)
     if (std::exchange(m_isTransferring, false) && m_target != nullptr)
         m_target->drop(cause.cause, 0); // our peer has gone: nobody is there to be transferred
     m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);
-    m_media.end();
+    m_session.end();
     if (m_isCalling)
     {
-        Counters& counters = m_interface.getEnvironment().counters;
+        Counters& counters = m_interface.getEnvironment().host.counters;
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
     spdlog::info("call {} {} ({} side) released: cause {} ({}), SIP {}{}{}{}", m_callNumber, getName().view(),
@@ -233,7 +233,7 @@ bool SipEndpoint::sayWhy(SipCause const& cause)
 /// While the leg is still in the call, so that the other side sees it.
 void SipEndpoint::recordQuality()
 {
-    std::optional<CC_QoS> const record = m_quality.getRecord(m_media.getQuality());
+    std::optional<CC_QoS> const record = m_quality.getRecord(m_session.getQuality());
     if (!record)
         return;
     if (isTraced())

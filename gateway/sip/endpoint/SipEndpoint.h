@@ -5,9 +5,9 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/CallTrace.h"
 #include "platform/eventloop/TYTimer.h"
+#include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDialogState.h"
 #include "sip/dialog/SipDirectSession.h"
-#include "sip/dialog/SipMedia.h"
 #include "sip/dialog/SipOfferAnswer.h"
 #include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -36,8 +36,8 @@ class SipInterface;
 ///
 /// How the dialog itself goes on is the table of SipDialogState; while it is up,
 ///
-///     State HELD: our peer holds     Session-Offer, Session-Answer: what SipDirectSession makes of re-INVITE and
-///     UPDATE
+///     State HELD: our peer holds     re-INVITE and UPDATE: what its SipSession makes of them, which is a
+///     SipAnchoredSession where media go through the gateway, else a SipDirectSession
 ///
 /// Owned by its interface, which destroys it once both the dialog is over and the leg dropped. Belongs to the thread of
 /// the stack's loop, which is also that of the call-control loop.
@@ -94,6 +94,7 @@ private:
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                    SipParty const& called);
+    int refuseSession(nta_incoming_t* transaction);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
     void startExpiry(sip_t const* request);
@@ -160,9 +161,8 @@ private:
     void tryAgainLater();
     static void ON_OFFER_TIMER(void* endpoint);
     void followHold();
-    std::string toPeer(std::string const& description);
-    void notePreview(SipOfferAnswer::Direction direction, std::string const& session);
-    void onSilence(unsigned int seconds);
+    void giveUp() override;
+    void onSilence(unsigned int seconds) override;
     void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
     void forgetOffer();
     void endOffers();
@@ -284,9 +284,10 @@ private:
     bool m_isFinished = false;
     std::string m_transferAfterAnswer; // the number
     SipQuality m_quality;
-    SipMedia m_media{[this](unsigned int seconds) { onSilence(seconds); }};
     SipOfferAnswer m_negotiation;
-    SipDirectSession m_session{m_adapter, *this};
+    SipDirectSession m_direct{m_adapter, *this};
+    SipAnchoredSession m_anchored;
+    SipSession& m_session;                     // one of the two
     nta_incoming_t* m_offerReceived = nullptr; // a re-INVITE or UPDATE that is not done
     bool m_isOfferAnswered = false;            // that re-INVITE: its ACK is outstanding
     Invitation m_reinvite;                     // or UPDATE

@@ -58,7 +58,7 @@ XCode SipEndpoint::handleOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties)
 {
-    m_ladder = m_interface.getEnvironment().trace.find(m_callNumber);
+    m_ladder = m_interface.getEnvironment().host.trace.find(m_callNumber);
     if (isTraced())
         trace("told offer " + std::string(name.view()) + (properties.isEmpty() ? "" : ", ") + TEXT_OF(properties));
     String adapterName;
@@ -78,8 +78,10 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
         trace("did  accept as " + called.getText() + ", State=TRYING");
     if (m_interface.isPeerBusy())
         clear({QCause::TEMPORARY_FAILURE, 503, {}});
-    else if (!m_media.open(m_adapter.getDatapathContext()))
+    else if (!m_session.open())
         clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});
+    else if (m_ownSession = m_session.readFirstOffer(); m_ownSession.empty() && !m_session.isAgreed())
+        giveUp(); // neither of the two sides would understand the other
     else if (!sendInvite(called, properties))
         clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
     return XCode::OK;
@@ -87,7 +89,7 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties)
 {
-    Configuration::Interface const& configuration = m_interface.getConfiguration();
+    SipConfiguration const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
@@ -107,7 +109,6 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
         hops != nullptr && hops->getValue() != 0)
         m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
-    m_ownSession = toPeer(m_session.readFirstOffer());
     m_isOverTcp = configuration.usesTcp;
     return startInvite();
 }
@@ -170,7 +171,6 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     ADD_CONNECTED(own, response);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
-    notePreview(SipOfferAnswer::RECEIVED, session);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
         noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::RELIABLE, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
@@ -245,7 +245,9 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     ADD_CONNECTED(own, response);
     addSession(own, session, true);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
-    if (!writeOwn(own).isOk())
+    if (!m_session.isAgreed())
+        giveUp();
+    else if (!writeOwn(own).isOk())
         clear({QCause::RESOURCE_UNAVAILABLE, 0, {}}); // nobody would ever hear of the answer
 }
 

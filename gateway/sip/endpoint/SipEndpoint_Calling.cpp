@@ -60,7 +60,8 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
 int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                             SipParty const& called)
 {
-    m_ladder = m_interface.getEnvironment().trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
+    m_ladder =
+        m_interface.getEnvironment().host.trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
     trace("<- INVITE to " + called.getUser());
     noteAllow(request);
     if (takeTimer(transaction, request) != 0)
@@ -69,6 +70,8 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
         leaveCall({QCause::INTERWORKING, 422, {}});
         return 422;
     }
+    if (m_session.check(SESSION_OF(request)) != 0)
+        return refuseSession(transaction);
     m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
     m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
@@ -82,9 +85,21 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     startExpiry(request);
     if (!dial(request, provider, called).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
-    else if (!m_media.open(m_adapter.getDatapathContext()))
+    else if (!m_session.open())
         failDialLater(QCause::RESOURCE_UNAVAILABLE);
     return 0;
+}
+
+/// It offers nothing that could be understood on its own interface.
+int SipEndpoint::refuseSession(nta_incoming_t* transaction)
+{
+    SipCause const cause{QCause::INCOMPATIBLE_DESTINATION, 488, {}};
+    trace("-> 488");
+    nta_incoming_treply(transaction, SIP_488_NOT_ACCEPTABLE, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
+                        TAG_END());
+    m_dialog = SipDialogState::OVER;
+    leaveCall(cause);
+    return 488;
 }
 
 /// RFC 3261, 13.3.1: who calls wants no answer after that time.
@@ -106,7 +121,7 @@ void SipEndpoint::onCallingTimer()
 {
     if (m_dialFailure != QCause::NONE)
     {
-        clear({m_dialFailure, 0, {}});
+        clear({m_dialFailure, m_dialFailure == QCause::INCOMPATIBLE_DESTINATION ? 488u : 0u, {}});
         return;
     }
     if (m_dialog != SipDialogState::INVITE_RECEIVED)
@@ -155,7 +170,7 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
         return bound;
     SipParty const& party = caller.party;
-    return m_adapter.dial(m_interface.getEnvironment().contextName, provider.c_str(), STRING(called.getUser()),
+    return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
                           true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
@@ -230,6 +245,7 @@ void SipEndpoint::followPeer()
     {
         useFork(number);
         m_hasRung = m_hasEarlyMedia = false;
+        m_session.meetFork();
         m_negotiation = SipOfferAnswer(); // with this party nothing is agreed on
         if (m_hasOffer)
             m_negotiation.note(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE);
@@ -244,7 +260,7 @@ void SipEndpoint::followPeer()
     bool isNewSession = false;
     if (!isAgreedEarly()) // else what is new comes with UPDATE
     {
-        std::string session = hasData && m_hasOffer ? toPeer(m_session.readForInvite(true)) : std::string();
+        std::string session = hasData && m_hasOffer ? m_session.readForInvite(true) : std::string();
         isNewSession = session != m_earlySession;
         m_earlySession = std::move(session);
     }
@@ -358,8 +374,13 @@ nta_leg_t* SipEndpoint::makeFork()
 
 void SipEndpoint::answer()
 {
-    std::string const session = isAgreedEarly() ? std::string() : toPeer(m_session.readForInvite(m_hasOffer));
+    std::string const session = isAgreedEarly() ? std::string() : m_session.readForInvite(m_hasOffer);
     m_session.noteSettled();
+    if (session.empty() && !m_session.isAgreed())
+    {
+        giveUp();
+        return;
+    }
     answerWith(session);
 }
 
@@ -374,7 +395,7 @@ void SipEndpoint::answerWith(std::string const& session)
     if (unsigned int const longest = m_interface.getConfiguration().longestCall; longest != 0)
         m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
-    ++m_interface.getEnvironment().counters.answered;
+    ++m_interface.getEnvironment().host.counters.answered;
     if (std::string const number = std::exchange(m_transferAfterAnswer, {}); !number.empty())
         transferTo(number);
 }
@@ -386,8 +407,6 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress());
     if (m_hasOffer)
         m_quality.noteAnswer(session);
-    if (status < 200)
-        notePreview(SipOfferAnswer::SENT, session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
     std::string const headers = identity + (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())

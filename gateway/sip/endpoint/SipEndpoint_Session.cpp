@@ -48,31 +48,16 @@ unsigned int REFUSAL_FOR_OTHER_SIDE(unsigned int status)
 void SipEndpoint::noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier,
                               std::string const& session)
 {
-    m_media.note(direction == SipOfferAnswer::SENT, session);
     if (!session.empty())
         m_negotiation.note(direction, carrier);
     else if (carrier == SipOfferAnswer::INVITE)
         m_negotiation.noteOfferlessInvite();
     else if (carrier == SipOfferAnswer::FINAL || carrier == SipOfferAnswer::ACK)
         m_negotiation.fail(); // a peer that agrees on nothing
-    if (m_negotiation.getState() == SipOfferAnswer::AGREED)
-        m_media.settle();
 }
 
-/// An answer that binds nobody yet: media may come by it.
-void SipEndpoint::notePreview(SipOfferAnswer::Direction direction, std::string const& session)
-{
-    if (session.empty())
-        return;
-    m_media.note(direction == SipOfferAnswer::SENT, session);
-    m_media.settle();
-}
-
-/// What the other side says, as our peer is to read it.
-std::string SipEndpoint::toPeer(std::string const& description)
-{
-    return m_media.toPeer(description, m_adapter.getDatapathContext());
-}
+/// Nothing can be understood across, or our peer has agreed to nothing.
+void SipEndpoint::giveUp() { clear({QCause::INCOMPATIBLE_DESTINATION, 488, {}}); }
 
 void SipEndpoint::onSilence(unsigned int seconds)
 {
@@ -164,12 +149,12 @@ int SipEndpoint::takeOffer(nta_incoming_t* transaction, std::string const& descr
     m_offerTimer.start(isUpdate ? patience / 2 : patience * 2);
     if (!isUpdate)
         nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
+    m_session.proceed();
     return 0;
 }
 
-void SipEndpoint::sendAnswer(std::string const& answer)
+void SipEndpoint::sendAnswer(std::string const& description)
 {
-    std::string const description = toPeer(answer);
     if (m_lateAck != nullptr)
     {
         noteSession(SipOfferAnswer::SENT, SipOfferAnswer::ACK, description);
@@ -320,7 +305,7 @@ void SipEndpoint::sendOffer(std::string const& description, bool isQuick)
         m_session.takeRefusal(504);
         return;
     }
-    m_offer = toPeer(description);
+    m_offer = description;
     m_isOfferQuick = isQuick;
     m_refusals = 0;
     m_isOfferWaiting = true;

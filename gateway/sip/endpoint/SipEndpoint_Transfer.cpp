@@ -196,8 +196,8 @@ void SipEndpoint::transferTo(std::string const& number)
 void SipEndpoint::dialTarget(std::string const& number)
 {
     SipEnvironment& environment = m_interface.getEnvironment();
-    std::string const* const provider = environment.routing.find(m_interface.getConfiguration().name, number);
-    if (provider == nullptr || environment.isEnding)
+    std::string const* const provider = environment.host.routing.find(m_interface.getConfiguration().name, number);
+    if (provider == nullptr || environment.host.isEnding)
     {
         tellTransferStatus(QCause::NO_ROUTE_TO_DESTINATION);
         return;
@@ -209,7 +209,7 @@ void SipEndpoint::dialTarget(std::string const& number)
     if (auto const* const headers = getPeer<CC_PropertyString>(SipPropertyId::HEADERS_FOR_TARGET))
         ADD(offer, *headers);
     CC_PropertyContainer call;
-    ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, ++environment.lastCallNumber));
+    ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, ++environment.host.lastCallNumber));
     String name;
     name.format("%u-transfer", m_callNumber);
     m_isTransferring = true;
@@ -217,7 +217,7 @@ void SipEndpoint::dialTarget(std::string const& number)
     trace("did  dial " + *provider + " (" + number + ") for the transfer");
     if (m_target->setup(name, *this, this).isOk() &&
         m_target
-            ->dial(environment.contextName, provider->c_str(), STRING(number), m_adapter.getOwnE164(),
+            ->dial(environment.host.contextName, provider->c_str(), STRING(number), m_adapter.getOwnE164(),
                    m_adapter.getOwnTypeOfNumber(), m_adapter.getOwnNumberingPlan(),
                    m_adapter.getOwnPresentationIndicator(), m_adapter.getOwnScreeningIndicator(),
                    m_adapter.getOwnName(), STRING(called.number), called.type, called.plan, String(), true,
@@ -266,7 +266,7 @@ void SipEndpoint::endTransfer(QCause cause)
 /// On the wire: our peer calls the target by itself.
 void SipEndpoint::refer(std::string const& number)
 {
-    Configuration::Interface const& configuration = m_interface.getConfiguration();
+    SipConfiguration const& configuration = m_interface.getConfiguration();
     std::string const uri = SipAddress::MAKE_URI(number, configuration.peer, configuration.usesTcp);
     std::string const self = SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp);
     trace("-> REFER to " + uri);
@@ -317,7 +317,7 @@ int SipEndpoint::receiveReplacing(nta_incoming_t* transaction, sip_t const* requ
 {
     m_isCalling = true;
     m_isReplacing = true;
-    m_ladder = m_interface.getEnvironment().trace.find(replaced.m_callNumber);
+    m_ladder = m_interface.getEnvironment().host.trace.find(replaced.m_callNumber);
     trace("<- INVITE with Replaces");
     if (!makeServerDialog(transaction, request))
     {
@@ -355,6 +355,8 @@ XCode SipEndpoint::takePlaceOf(SipEndpoint& replaced, sip_t const* request)
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
-    m_session.takeOffer(session, false);
+    if (m_session.takeOffer(session, false) != 0)
+        failDialLater(QCause::INCOMPATIBLE_DESTINATION);
+    m_session.proceed();
     return XCode::OK;
 }

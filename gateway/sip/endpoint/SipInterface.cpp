@@ -40,7 +40,7 @@ InternetAddress SOURCE_OF(nta_incoming_t* transaction)
 }
 } // namespace
 
-SipInterface::SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration)
+SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& configuration)
     : CC_Provider(configuration.name.c_str(), "sip")
     , m_environment(environment)
     , m_configuration(configuration)
@@ -161,7 +161,8 @@ int SipInterface::refuseMethod(nta_incoming_t* transaction, sip_t const* request
 /// As an INVITE would be answered: who asks wants to know whether to send calls.
 int SipInterface::answerOptions(nta_incoming_t* transaction) const
 {
-    bool const hasRoom = !m_environment.isEnding && m_environment.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS());
+    bool const hasRoom =
+        !m_environment.host.isEnding && m_environment.host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS());
     if (!hasRoom)
         nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
                             TAG_END());
@@ -180,9 +181,9 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         return receiveReplacing(transaction, request);
     SipParty const called = SipIdentity::READ_CALLED(request);
     std::string const number = called.getUser();
-    unsigned int const callNumber = ++m_environment.lastCallNumber;
-    ++m_environment.counters.placed;
-    std::string const* const to = m_environment.routing.find(m_configuration.name, number);
+    unsigned int const callNumber = ++m_environment.host.lastCallNumber;
+    ++m_environment.host.counters.placed;
+    std::string const* const to = m_environment.host.routing.find(m_configuration.name, number);
     if (to == nullptr)
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
@@ -193,7 +194,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     }
     catch (std::bad_alloc const&)
     {
-        ++m_environment.counters.failed;
+        ++m_environment.host.counters.failed;
         return 503;
     }
     return endpoint->receiveInvite(transaction, request, *to, called);
@@ -218,8 +219,8 @@ int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* req
         return 481;
     if (request->sip_replaces->rp_early_only)
         return 486;
-    unsigned int const callNumber = ++m_environment.lastCallNumber;
-    ++m_environment.counters.placed;
+    unsigned int const callNumber = ++m_environment.host.lastCallNumber;
+    ++m_environment.host.counters.placed;
     InternetAddress const source = SOURCE_OF(transaction);
     return makeEndpoint(callNumber, &source).receiveReplacing(transaction, request, *replaced);
 }
@@ -227,7 +228,7 @@ int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* req
 int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
 {
     SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
-    ++m_environment.counters.failed;
+    ++m_environment.host.counters.failed;
     spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
                  m_configuration.name, number);
     nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
@@ -248,11 +249,11 @@ int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request)
 
 bool SipInterface::admits(InternetAddress const& source)
 {
-    if (!m_environment.isEnding && m_environment.admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
+    if (!m_environment.host.isEnding && m_environment.host.admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
         return true;
-    ++m_environment.counters.refused;
+    ++m_environment.host.counters.refused;
     spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
-                  m_environment.isEnding ? "the gateway is ending" : "too many calls");
+                  m_environment.host.isEnding ? "the gateway is ending" : "too many calls");
     return false;
 }
 
@@ -289,7 +290,7 @@ SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber, InternetAddress
     owned.endpoint = std::move(owner);
     if (source != nullptr)
     {
-        m_environment.admission.begin(*source);
+        m_environment.host.admission.begin(*source);
         owned.source = *source;
     }
     return endpoint;
@@ -311,10 +312,10 @@ void SipInterface::cleanUp()
         if (found == m_endpoints.end())
             continue;
         if (found->second.source)
-            m_environment.admission.end(*found->second.source);
+            m_environment.host.admission.end(*found->second.source);
         m_endpoints.erase(found);
     }
     m_finished.clear();
-    if (m_environment.onEndpointGone)
-        m_environment.onEndpointGone();
+    if (m_environment.host.onEndpointGone)
+        m_environment.host.onEndpointGone();
 }

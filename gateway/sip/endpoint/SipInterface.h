@@ -1,9 +1,9 @@
 #pragma once
 
 #include "callcontrol/provider/CC_Provider.h"
-#include "configuration/Configuration.h"
 #include "platform/base/IpAddress.h"
 #include "platform/base/TYTime.h"
+#include "sip/SipConfiguration.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/stack/SipGuard.h"
@@ -22,16 +22,16 @@ struct SipCause;
 /// One SIP interface: listens on one address, on UDP, TCP or both, and sends its calls to one peer. A provider of call
 /// control under the interface's name.
 ///
-/// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the gateway;
+/// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the SIP module;
 /// belongs to the thread of the stack's loop, which is also that of the call-control loop.
 ///
-///     SipInterface interface(environment, configuration.interfaces[0]);
+///     SipInterface interface(environment, configuration);
 ///     std::ignore = CallControl::ADD_PROVIDER("", interface.getName(), interface);
 class SipInterface : public CC_Provider, public SipRequestHandler
 {
 public:
     /// Throws std::runtime_error with the reason when the address cannot be listened on.
-    SipInterface(SipEnvironment& environment, Configuration::Interface const& configuration);
+    SipInterface(SipEnvironment& environment, SipConfiguration const& configuration);
     ~SipInterface() override; ///< ends what is still up without a word to the peers
 
     // --- CC_Provider
@@ -45,7 +45,7 @@ public:
     int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
 
     String const& getName() const { return m_name; }
-    Configuration::Interface const& getConfiguration() const { return m_configuration; }
+    SipConfiguration const& getConfiguration() const { return m_configuration; }
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
     /// Where the peer reaches us, for what goes over TCP or UDP.
@@ -54,7 +54,7 @@ public:
     sip_allow_t const* getAllow() const { return m_allow; }
     sip_supported_t const* getSupported() const { return m_supported; }
     /// @}
-    SipGuard::Counters const& getGuardCounters() const { return m_guard.getCounters(); }
+    SipGuard const& getGuard() const { return m_guard; }
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
@@ -88,7 +88,7 @@ private:
     void cleanUp();
 
     SipEnvironment& m_environment;
-    Configuration::Interface m_configuration;
+    SipConfiguration m_configuration;
     String m_name;
     IpAddress m_mediaAddress;
     std::string m_contact;

@@ -1,5 +1,6 @@
 #include "sip/message/SipCodec.h"
 
+#include "media/rtp/RtpRoutes.h"
 #include "sip/message/SipText.h"
 
 #include <algorithm>
@@ -36,4 +37,19 @@ MG_Rtp::ECodec::Type SipCodec::OF(std::string_view payloadType, std::string_view
     };
     auto const* const found = std::find_if(std::begin(CODECS), std::end(CODECS), fits);
     return found != std::end(CODECS) ? *found : Codec::NONE;
+}
+
+std::string SipCodec::ENCODING(MG_Rtp::ECodec::Type codec)
+{
+    std::string const name = Codec::NAME(codec);
+    if (name.find('/') != std::string::npos)
+        return name;
+    return name + "/" + std::to_string(RtpRoutes::CLOCK_RATE(codec)) + (codec == Codec::OPUS ? "/2" : "");
+}
+
+MG_Rtp::ECodec::Type SipCodec::NAMED(std::string_view name)
+{
+    if (SipText::EQUALS_IGNORING_CASE(name, "L16"))
+        return Codec::L16_MONO;
+    return name.empty() ? Codec::NONE : OF({}, name);
 }

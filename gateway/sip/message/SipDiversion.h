@@ -1,6 +1,6 @@
 #pragma once
 
-#include "configuration/Configuration.h"
+#include "configuration/SocketAddress.h"
 #include "platform/signalling/QPresentationIndicator.h"
 #include "platform/signalling/QReasonForRedirection.h"
 #include "platform/signalling/QScreeningIndicator.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "configuration/Configuration.h"
+#include "configuration/SocketAddress.h"
 #include "sip/message/SipParty.h"
 
 #include <optional>

@@ -3,17 +3,13 @@
 #include "sip/stack/SipStack.h"
 
 #include <algorithm>
-#include <array>
-#include <cerrno>
 #include <dlfcn.h>
-#include <fcntl.h>
 #include <netdb.h>
 #include <netinet/in.h>
 #include <stdexcept>
 #include <string>
 #include <sys/ioctl.h>
 #include <sys/socket.h>
-#include <sys/stat.h>
 #include <unistd.h>
 #include <utility>
 
@@ -29,100 +25,31 @@ enum Called : unsigned int
 {
     NEXT = 1,
     DELIVER = 2,
-    TAKE = 4,
-    SIZE = 8,
-    DURATION = 16,
-    REGISTER = 32,
-    ALL = 63
+    SIZE = 4,
+    DURATION = 8,
+    REGISTER = 16,
+    ALL = 31
 };
 unsigned int s_called = 0;
 
-/// The function of that name that the stack would have called without us.
+/// The stack's own function of that name, which it would have called without us.
 template <class Function>
 Function* ORIGINAL(char const* name)
 {
-    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
+    static void* const s_stack = dlopen("libsofia-sip-ua.so.0", RTLD_NOW | RTLD_NOLOAD);
+    return reinterpret_cast<Function*>(dlsym(s_stack, name));
 }
 
-// --- connections -----------------------------------------------------------------------------------------------------
-
-/// A connection as it was when it came. Nobody tells of its end; but a socket's inode is never that of another.
-struct Connection
-{
-    InternetAddress source;
-    ino_t inode = 0; ///< 0: none
-};
-std::vector<Connection> s_connections; // by descriptor
-
-ino_t INODE_OF(int descriptor)
-{
-    struct stat status = {};
-    return fstat(descriptor, &status) == 0 ? status.st_ino : 0;
-}
-
-std::size_t NUMBER_OF_CONNECTIONS(InternetAddress const& source)
-{
-    std::size_t number = 0;
-    for (std::size_t i = 0; i < s_connections.size(); ++i)
-    {
-        Connection& connection = s_connections[i];
-        if (connection.inode == 0 || connection.source != source)
-            continue;
-        if (INODE_OF(static_cast<int>(i)) == connection.inode)
-            ++number;
-        else
-            connection.inode = 0;
-    }
-    return number;
-}
-
-void CLOSE_AT_ONCE(int descriptor)
-{
-    linger const none = {1, 0}; // with a reset: nothing of it stays in the system
-    setsockopt(descriptor, SOL_SOCKET, SO_LINGER, &none, sizeof none);
-    close(descriptor);
-}
-
-/// A descriptor kept for the moment at which there is no other. A connection that cannot be taken would stay in its
-/// queue and wake the loop again at once, for ever; so it is taken with this one, and closed.
-class Spare
-{
-public:
-    Spare() { open(); }
-    void refuse(int listening)
-    {
-        if (m_descriptor >= 0)
-            close(m_descriptor);
-        m_descriptor = -1;
-        if (int const refused = accept4(listening, nullptr, nullptr, SOCK_CLOEXEC | SOCK_NONBLOCK); refused >= 0)
-            CLOSE_AT_ONCE(refused);
-        open();
-    }
-
-private:
-    void open() { m_descriptor = ::open("/dev/null", O_RDONLY | O_CLOEXEC); }
-    int m_descriptor = -1;
-};
-
-bool IS_AT(SocketAddress const& address, sockaddr_storage const& storage)
-{
-    std::uint16_t const port = storage.ss_family == AF_INET6 ? reinterpret_cast<sockaddr_in6 const&>(storage).sin6_port
-                                                             : reinterpret_cast<sockaddr_in const&>(storage).sin_port;
-    return ntohs(port) == address.port && (storage.ss_family == AF_INET6) == address.isVersion6() &&
-           AddressRange::ADDRESS_OF(reinterpret_cast<sockaddr const&>(storage)) ==
-               AddressRange::PARSE(address.host).getFirst();
-}
+bool IS_ASKED() { return s_called == ALL && ConnectionGuard::GET_NUMBER_OF_CALLS() != 0; }
 } // namespace
 
-SipGuard::SipGuard(Configuration::Interface const& configuration)
-    : m_listen(configuration.listen)
-    , m_allow(configuration.allow)
+SipGuard::SipGuard(SipConfiguration const& configuration)
+    : m_allow(configuration.allow.empty() ? std::vector{AddressRange::PARSE(configuration.peer.host)}
+                                          : configuration.allow)
     , m_maxMessageSize(configuration.maxMessageSize)
     , m_maxHeaderSize(configuration.maxHeaderSize)
-    , m_maxConnectionsPerSource(configuration.maxConnectionsPerSource)
+    , m_connections(configuration.listen, m_allow, configuration.maxConnectionsPerSource)
 {
-    if (m_allow.empty())
-        m_allow.push_back(AddressRange::PARSE(configuration.peer.host));
     s_guards.push_back(this);
 }
 
@@ -135,68 +62,9 @@ void SipGuard::watch(nta_agent_t* agent)
         m_ports.push_back(port);
 }
 
-usize_t SipGuard::LIMIT_OF(Configuration::Interface const& configuration)
+usize_t SipGuard::LIMIT_OF(SipConfiguration const& configuration)
 {
     return configuration.maxMessageSize + LARGEST_READ + ROUNDING;
-}
-
-bool SipGuard::isServed(InternetAddress const& source) const
-{
-    return std::any_of(m_allow.begin(), m_allow.end(),
-                       [&](AddressRange const& range) { return range.contains(source); });
-}
-
-SipGuard* SipGuard::FIND(int listening)
-{
-    sockaddr_storage local = {};
-    socklen_t length = sizeof local;
-    if (getsockname(listening, reinterpret_cast<sockaddr*>(&local), &length) != 0)
-        return nullptr;
-    auto const found =
-        std::find_if(s_guards.begin(), s_guards.end(), [&](SipGuard* guard) { return IS_AT(guard->m_listen, local); });
-    return found != s_guards.end() ? *found : nullptr;
-}
-
-int SipGuard::ACCEPT(int listening, sockaddr* from, socklen_t* length)
-{
-    static Spare s_spare;
-    int const descriptor = accept4(listening, from, length, SOCK_CLOEXEC);
-    SipGuard* const guard = FIND(listening);
-    if (descriptor < 0)
-    {
-        if (guard != nullptr && (errno == EMFILE || errno == ENFILE))
-        {
-            s_spare.refuse(listening);
-            ++guard->m_counters.connections;
-            errno = 0; // nothing that the stack should do something about
-        }
-        return -1;
-    }
-    if (guard == nullptr || guard->takesConnection(descriptor, *from))
-        return descriptor;
-    CLOSE_AT_ONCE(descriptor);
-    ++guard->m_counters.connections;
-    errno = 0;
-    return -1;
-}
-
-bool SipGuard::takesConnection(int descriptor, sockaddr const& from)
-{
-    InternetAddress const source = AddressRange::ADDRESS_OF(from);
-    auto const index = static_cast<std::size_t>(descriptor);
-    if (!isServed(source) || NUMBER_OF_CONNECTIONS(source) >= m_maxConnectionsPerSource)
-        return false;
-    try
-    {
-        if (s_connections.size() <= index)
-            s_connections.resize(index + 1);
-        s_connections[index] = {source, INODE_OF(descriptor)};
-        return true;
-    }
-    catch (std::bad_alloc const&)
-    {
-        return false;
-    }
 }
 
 bool SipGuard::ADMIT(tport_t const* port, msg_t* message)
@@ -210,7 +78,7 @@ bool SipGuard::ADMIT(tport_t const* port, msg_t* message)
 
 bool SipGuard::admit(msg_t* message)
 {
-    if (!isServed(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
+    if (!AddressRange::CONTAINS(m_allow, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
     {
         ++m_counters.strangers;
         return false;
@@ -304,16 +172,16 @@ void NOTHING(su_root_magic_t*, su_timer_t*, su_timer_arg_t*) {}
 
 void SipGuard::PROVE(SipStack& stack, std::string const& host)
 {
-    if (s_called == ALL)
+    if (IS_ASKED())
         return;
     su_timer_t* const timer = su_timer_create(su_root_task(stack.getRoot()), FAR_AWAY);
     su_timer_set(timer, NOTHING, nullptr);
     Proof const proof(stack.getRoot(), host);
     proof.send();
-    for (int i = 0; i < TURNS && s_called != ALL; ++i)
+    for (int i = 0; i < TURNS && !IS_ASKED(); ++i)
         su_root_step(stack.getRoot(), TURN);
     su_timer_destroy(timer);
-    if (s_called != ALL)
+    if (!IS_ASKED())
         throw std::runtime_error("the SIP stack does not ask what it may take (" + std::to_string(s_called) + ")");
 }
 
@@ -341,12 +209,6 @@ IN_PLACE void tport_deliver(tport_t* port, msg_t* message, msg_t* next, void* co
         s_original(port, message, next, compressor, now);
     else
         msg_destroy(message);
-}
-
-IN_PLACE int accept(int listening, sockaddr* from, socklen_t* length)
-{
-    s_called |= TAKE;
-    return SipGuard::ACCEPT(listening, from, length);
 }
 
 /// The stack starts the time of a connection with its first message; one that never brings any must end as well.

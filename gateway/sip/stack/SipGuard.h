@@ -1,6 +1,7 @@
 #pragma once
 
-#include "configuration/Configuration.h"
+#include "host/ConnectionGuard.h"
+#include "sip/SipConfiguration.h"
 #include "sip/stack/Sofia.h"
 
 #include <cstddef>
@@ -14,21 +15,20 @@ class SipStack;
 ///     SipGuard guard(configuration);
 ///     guard.watch(agent); // after the agent has its ports
 ///
-/// The stack has no place to ask, and of a stream's messages it limits only the first. So the executable defines some
-/// of the functions that the stack calls, which the dynamic linker then prefers to the stack's and the system's own;
-/// they ask the guards and call on. `PROVE` sees to it that this is so. Owned by its interface, which ends the agent
-/// first; belongs to the thread of the stack's loop.
+/// The stack has no place to ask, and of a stream's messages it limits only the first. So this module defines some of
+/// the functions that the stack calls, which the dynamic linker then prefers to the stack's own; they ask the guards
+/// and call on. `PROVE` sees to it that this is so. Owned by its interface, which ends the agent first; belongs to the
+/// thread of the stack's loop.
 class SipGuard
 {
 public:
     struct Counters
     {
-        unsigned long long strangers = 0;   ///< messages from elsewhere, dropped without a word
-        unsigned long long tooLarge = 0;    ///< messages, answered with 413 where they are requests
-        unsigned long long connections = 0; ///< refused: from elsewhere, or more than a source may have
+        unsigned long long strangers = 0; ///< messages from elsewhere, dropped without a word
+        unsigned long long tooLarge = 0;  ///< messages, answered with 413 where they are requests
     };
 
-    explicit SipGuard(Configuration::Interface const& configuration);
+    explicit SipGuard(SipConfiguration const& configuration);
     ~SipGuard();
     SipGuard(SipGuard const&) = delete;
     SipGuard& operator=(SipGuard const&) = delete;
@@ -36,6 +36,7 @@ public:
     /// Guards the agent's ports from now on.
     void watch(nta_agent_t* agent);
     Counters const& getCounters() const { return m_counters; }
+    ConnectionGuard const& getConnections() const { return m_connections; }
 
     /// Two messages go over a connection of the process with itself, on a free port of the `host`: throws
     /// std::runtime_error unless the stack then called every function that it should. Once per process.
@@ -43,24 +44,19 @@ public:
 
     /// What the stack is to be told as the limit of a message, so that `maxMessageSize` can be kept exactly: it gives
     /// up a connection whose waiting octets do not fit beside what it has.
-    static usize_t LIMIT_OF(Configuration::Interface const& configuration);
+    static usize_t LIMIT_OF(SipConfiguration const& configuration);
 
     // --- what the stack calls
-    static int ACCEPT(int listening, sockaddr* from, socklen_t* length);
     /// Whether the stack may have the message; one that it may not have is the caller's to give up.
     static bool ADMIT(tport_t const* port, msg_t* message);
 
 private:
-    bool isServed(InternetAddress const& source) const;
     bool admit(msg_t* message);
-    bool takesConnection(int descriptor, sockaddr const& from);
-    static SipGuard* FIND(int listening);
 
-    SocketAddress m_listen;
     std::vector<AddressRange> m_allow;
     std::size_t m_maxMessageSize;
     std::size_t m_maxHeaderSize;
-    std::size_t m_maxConnectionsPerSource;
+    ConnectionGuard m_connections;
     std::vector<tport_t const*> m_ports;
     Counters m_counters;
 };

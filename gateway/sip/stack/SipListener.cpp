@@ -5,7 +5,9 @@
 #include "sip/stack/SipStack.h"
 
 #include <arpa/inet.h>
+#include <bit>
 #include <cerrno>
+#include <cstdint>
 #include <cstring>
 #include <netinet/in.h>
 #include <stdexcept>
@@ -58,16 +60,17 @@ void CHECK_PORT(SocketAddress const& address, int type, char const* transport)
 
 namespace
 {
-url_string_t const* const NO_PORT = reinterpret_cast<url_string_t const*>(-1); // null would be one on every address
+url_string_t const* const NO_PORT =
+    std::bit_cast<url_string_t const*>(std::intptr_t{-1}); // null would be one on every address
 
-std::string MAKE_BINDING(Configuration::Interface const& configuration, char const* transport)
+std::string MAKE_BINDING(SipConfiguration const& configuration, char const* transport)
 {
     std::string const uri = SipAddress::MAKE_URI({}, configuration.getAddress(), false) + ";transport=" + transport;
     return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard,
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard,
                                  nta_message_f* onMessage, SipInterface* interface)
 {
     SipGuard::PROVE(stack, configuration.listen.host);

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "configuration/Configuration.h"
+#include "sip/SipConfiguration.h"
 #include "sip/stack/SipHandles.h"
 
 class SipGuard;
@@ -12,6 +12,6 @@ namespace SipListener
 /// A transaction engine that listens on the interface's address, on the transports that it has, with the interface's
 /// timers and limits, and lets in what the guard does. `onMessage` is told of every message that belongs to no
 /// transaction and no dialog. Throws std::runtime_error with the reason when a port is taken or the system refuses.
-SipAgent MAKE_AGENT(SipStack& stack, Configuration::Interface const& configuration, SipGuard& guard,
-                    nta_message_f* onMessage, SipInterface* interface);
+SipAgent MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard, nta_message_f* onMessage,
+                    SipInterface* interface);
 } // namespace SipListener

@@ -1,8 +1,21 @@
 #include "sip/stack/SipStack.h"
 
-#include "platform/eventloop/TYEventLoop.h"
-
 #include <stdexcept>
+
+/// What is told when a descriptor that the stack watches becomes readable.
+class SipDescriptorHandler : public std::enable_shared_from_this<SipDescriptorHandler>
+{
+public:
+    explicit SipDescriptorHandler(std::function<void()> onReadable) : m_onReadable(std::move(onReadable)) {}
+    void onReadable()
+    {
+        auto const self = shared_from_this();
+        m_onReadable();
+    }
+
+private:
+    std::function<void()> m_onReadable;
+};
 
 SipStack::SipStack()
 {
@@ -19,27 +32,31 @@ SipStack::SipStack()
 
 SipStack::~SipStack()
 {
-    for (int const registration : m_registrations)
-        su_root_deregister(m_root, registration);
+    for (auto const& [descriptor, watched] : m_watched)
+        su_root_deregister(m_root, watched.registration);
     su_root_destroy(m_root);
     su_deinit();
 }
 
 void SipStack::watch(int descriptor, std::function<void()> onReadable)
 {
-    m_handlers.push_back(std::make_unique<SipDescriptorHandler>(std::move(onReadable)));
+    auto const handler = std::make_shared<SipDescriptorHandler>(std::move(onReadable));
     su_wait_t wait[1] = {};
     if (su_wait_create(wait, descriptor, SU_WAIT_IN) < 0)
         throw std::runtime_error("the SIP stack's event loop takes no descriptor");
-    int const registration = su_root_register(m_root, wait, ON_READABLE, m_handlers.back().get(), 0);
+    int const registration = su_root_register(m_root, wait, ON_READABLE, handler.get(), 0);
     if (registration < 0)
         throw std::runtime_error("the SIP stack's event loop takes no descriptor");
-    m_registrations.push_back(registration);
+    m_watched[descriptor] = {registration, handler};
 }
 
-void SipStack::attach(TYEventLoop& loop)
+void SipStack::forget(int descriptor)
 {
-    watch(loop.getPollFd(), [&loop] { loop.runTurn(); });
+    auto const found = m_watched.find(descriptor);
+    if (found == m_watched.end())
+        return;
+    su_root_deregister(m_root, found->second.registration);
+    m_watched.erase(found);
 }
 
 void SipStack::run() { su_root_run(m_root); }

@@ -25,12 +25,12 @@ refused "$WORK: file: cannot be read" --config "$WORK"
 bad "gateway.max-cals: is not a key" 's/^call-control-log-level.*/max-cals = 3/'
 bad "gateway.max-calls: expected a whole number" 's/^call-control-log-level.*/max-calls = "3"/'
 bad "gateway.max-calls: must be from 0 to " 's/^call-control-log-level.*/max-calls = -1/'
-bad "interface\[1\].listen: 'localhost' is not an address" "s/listen = \"$HOST:$PORT_B\"/listen = \"localhost:5060\"/"
-bad "interface\[0\].peer: is missing" "/peer = \"$HOST:$PORT_CALLER\"/d"
-bad "interface\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
+bad "sip\[1\].listen: 'localhost' is not an address" "s/listen = \"$HOST:$PORT_B\"/listen = \"localhost:5060\"/"
+bad "sip\[0\].peer: is missing" "/peer = \"$HOST:$PORT_CALLER\"/d"
+bad "sip\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
 bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
 bad "line 2: " '2s/.*/call = = 3/'
-bad "interface: is missing" '/^\[\[interface/,$d'
+bad "interfaces: are missing" '/^\[\[sip/,$d'
 
 # a port in use; the first interface is given back, too
 write_configuration
@@ -38,7 +38,7 @@ start_gateway
 sed "s/:$PORT_A\"/:$((PORT + 30))\"/" "$WORK/gateway.toml" >"$WORK/second.toml"
 mv "$WORK/gateway.err" "$WORK/first.err"
 mv "$WORK/gateway.out" "$WORK/first.out"
-refused "$WORK/second.toml: interface\[1\].listen: cannot listen on $HOST:$PORT_B \(udp\): Address already in use" \
+refused "$WORK/second.toml: sip\[1\].listen: cannot listen on $HOST:$PORT_B \(udp\): Address already in use" \
     --config "$WORK/second.toml"
 kill -TERM $gateway_pid
 wait $gateway_pid || fail "the first gateway: exit status $?"

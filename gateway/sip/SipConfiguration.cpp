@@ -1,0 +1,141 @@
+#include "sip/SipConfiguration.h"
+
+#include "configuration/ConfigurationSection.h"
+#include "media/context/MediaDescription.h"
+#include "sip/message/SipCodec.h"
+
+#include <algorithm>
+#include <limits>
+#include <stdexcept>
+
+namespace
+{
+constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
+constexpr unsigned int LEAST_MESSAGE = 1024;   // octets
+constexpr unsigned int MOST_MESSAGE = 1 << 20; // of a stream; a datagram ends at 65535
+
+/// Without `transports` an interface listens on what it speaks to its peer.
+void READ_TRANSPORTS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    std::string const towardsPeer = section.oneOf("transport", "udp", {"udp", "tcp"});
+    interface.usesTcp = towardsPeer == "tcp";
+    interface.listensOnUdp = interface.listensOnTcp = false;
+    for (std::string const& transport : section.texts("transports", {towardsPeer}))
+        if (transport == "udp")
+            interface.listensOnUdp = true;
+        else if (transport == "tcp")
+            interface.listensOnTcp = true;
+        else
+            section.refuse("transports", "must be some of udp, tcp");
+    if (!(interface.usesTcp ? interface.listensOnTcp : interface.listensOnUdp))
+        section.refuse("transports", "must have '" + towardsPeer + "', which is the peer's");
+}
+
+/// Where others find it: no address that is everybody's, or many's.
+SocketAddress READ_REACHABLE(ConfigurationSection const& section, char const* key)
+{
+    SocketAddress address = section.address(key);
+    if (address.isUnspecified())
+        section.refuse(key, "'" + address.host + "' is nobody's address");
+    if (address.isMulticast())
+        section.refuse(key, "'" + address.host + "' is a multicast address");
+    return address;
+}
+
+void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.listen = section.address("listen");
+    if (section.has("advertise"))
+        interface.advertise = READ_REACHABLE(section, "advertise");
+    else if (interface.listen.isUnspecified())
+        section.refuse("listen", "'" + interface.listen.host + "' cannot be told to peers: advertise is needed");
+    if (interface.listen.isMulticast())
+        section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
+    interface.peer = READ_REACHABLE(section, "peer");
+    if (interface.peer.isVersion6() != interface.listen.isVersion6())
+        section.refuse("peer", "is not of the version of the internet protocol that listen is of");
+    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
+        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
+    if (interface.peer == interface.listen || interface.peer == interface.advertise)
+        section.refuse("peer", "is the interface itself");
+}
+
+/// By the names that session descriptions have for them.
+void READ_CODECS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    if (!section.has("codecs"))
+        return;
+    interface.codecs.clear();
+    for (std::string const& name : section.texts("codecs", {}))
+    {
+        MG_Rtp::ECodec::Type const codec = SipCodec::NAMED(name);
+        if (codec == MG_Rtp::ECodec::NONE)
+            section.refuse("codecs", "'" + name + "' is no codec");
+        if (std::find(interface.codecs.begin(), interface.codecs.end(), codec) != interface.codecs.end())
+            section.refuse("codecs", "'" + name + "' is in it twice");
+        interface.codecs.push_back(codec);
+    }
+    if (interface.codecs.size() > MediaFormats::MOST)
+        section.refuse("codecs", "may have " + std::to_string(MediaFormats::MOST) + " of them");
+}
+
+void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
+{
+    try
+    {
+        if (SocketAddress::PARSE(SocketAddress{interface.mediaAddress, 1}.text()).isUnspecified())
+            section.refuse("media-address", "'" + interface.mediaAddress + "' cannot be told to peers");
+    }
+    catch (std::invalid_argument const& error)
+    {
+        section.refuse("media-address", error.what());
+    }
+}
+} // namespace
+
+SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, bool relaysMedia)
+{
+    section.allow({"name",
+                   "listen",
+                   "advertise",
+                   "peer",
+                   "transport",
+                   "transports",
+                   "allow",
+                   "max-message-size",
+                   "max-header-size",
+                   "max-connections-per-source",
+                   "tcp-idle",
+                   "t1",
+                   "t1x64",
+                   "answer-timeout",
+                   "codecs",
+                   "transfer",
+                   "media-address",
+                   "session-expires",
+                   "min-se",
+                   "max-call-duration"});
+    SipConfiguration interface;
+    interface.name = section.neededText("name");
+    READ_ADDRESSES(section, interface);
+    READ_TRANSPORTS(section, interface);
+    interface.allow = section.ranges("allow");
+    interface.maxMessageSize =
+        section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxHeaderSize = section.number("max-header-size", interface.maxHeaderSize, LEAST_MESSAGE, MOST_MESSAGE);
+    interface.maxConnectionsPerSource =
+        section.number("max-connections-per-source", interface.maxConnectionsPerSource, 1, UNLIMITED);
+    interface.tcpIdle = section.number("tcp-idle", interface.tcpIdle, 1, 86400);
+    interface.t1 = section.number("t1", interface.t1, 10, 10000);
+    interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
+    interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
+    READ_CODECS(section, interface);
+    interface.mediaAddress = section.text("media-address", interface.listen.host);
+    interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
+    interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);
+    interface.longestCall = section.number("max-call-duration", interface.longestCall, 0, 86400);
+    interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
+    if (relaysMedia)
+        CHECK_MEDIA_ADDRESS(section, interface);
+    return interface;
+}

@@ -1,0 +1,46 @@
+#pragma once
+
+#include "configuration/AddressRange.h"
+#include "configuration/SocketAddress.h"
+#include "platform/media/MG_Rtp.h"
+
+#include <string>
+#include <vector>
+
+class ConfigurationSection;
+
+/// One SIP interface, [[sip]] in the configuration: where it listens, and the peer to which its calls go. A plain
+/// value; README.md lists the keys.
+struct SipConfiguration
+{
+    std::string name;
+    SocketAddress listen;
+    SocketAddress advertise; ///< what the peers are told instead of `listen`; port 0: nothing
+    SocketAddress peer;
+    bool usesTcp = false;     ///< towards the peer
+    bool listensOnUdp = true; ///< one of the two at least
+    bool listensOnTcp = false;
+    std::vector<AddressRange> allow;     ///< who is served; empty: the peer's address alone
+    unsigned int maxMessageSize = 65535; ///< octets
+    unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
+    unsigned int maxConnectionsPerSource = 16;
+    unsigned int tcpIdle = 120;         ///< seconds that a connection may stay without a message
+    unsigned int t1 = 500;              ///< milliseconds: the first retransmission
+    unsigned int t1x64 = 32000;         ///< milliseconds: how long a transaction waits for its answer
+    unsigned int answerTimeout = 180;   ///< seconds that the peer may ring
+    unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
+    unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
+    unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
+    std::string mediaAddress;           ///< of this machine, where media come in; no name
+    /// That are offered and taken where media are relayed, the best liked first.
+    std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
+                                             MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
+    bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
+
+    /// Where the peers reach it.
+    SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
+
+    /// Checked and with defaults filled in. `relaysMedia`: of use is only a media address that peers can reach. Throws
+    /// ConfigurationError.
+    static SipConfiguration READ(ConfigurationSection const& section, bool relaysMedia);
+};

@@ -1,0 +1,68 @@
+#include "sip/SipModule.h"
+
+#include "configuration/Configuration.h"
+#include "sip/message/SipCause.h"
+#include "sip/message/SipPropertyId.h"
+
+#include <spdlog/spdlog.h>
+
+#include <algorithm>
+#include <stdexcept>
+
+SipModule::SipModule(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)
+    : m_file(configuration.file)
+{
+    for (ConfigurationSection const& interface : interfaces)
+        m_configurations.push_back(SipConfiguration::READ(interface, configuration.relaysMedia));
+}
+
+void SipModule::open(GatewayHost& host)
+{
+    if (!SipPropertyId::DECLARE().isOk())
+        throw std::runtime_error("the names of the SIP properties cannot be declared");
+    m_environment.emplace(SipEnvironment{host, m_stack});
+    for (std::size_t i = 0; i < m_configurations.size(); ++i)
+        try
+        {
+            m_ports.push_back(std::make_unique<Port>(*m_environment, m_configurations[i]));
+        }
+        catch (std::runtime_error const& error)
+        {
+            throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].listen", error.what());
+        }
+    for (SipConfiguration const& configuration : m_configurations)
+        spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
+                     configuration.peer.text());
+}
+
+unsigned int SipModule::clearCalls(QCause cause)
+{
+    unsigned int patience = 0;
+    for (auto const& port : m_ports)
+    {
+        port->interface.clearCalls({cause, 0, {}});
+        patience = std::max(patience, port->interface.getConfiguration().t1x64);
+    }
+    return patience;
+}
+
+std::size_t SipModule::getNumberOfEndpoints() const
+{
+    std::size_t number = 0;
+    for (auto const& port : m_ports)
+        number += port->interface.getNumberOfEndpoints();
+    return number;
+}
+
+std::string SipModule::describe() const
+{
+    std::string text;
+    for (auto const& port : m_ports)
+    {
+        SipGuard const& guard = port->interface.getGuard();
+        text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
+                            port->interface.getName().view(), guard.getCounters().strangers,
+                            guard.getCounters().tooLarge, guard.getConnections().getNumberOfRefused());
+    }
+    return text;
+}

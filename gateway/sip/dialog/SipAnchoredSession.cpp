@@ -1,0 +1,285 @@
+#include "sip/dialog/SipAnchoredSession.h"
+
+#include "adapters/CC_CallAdapterE164.h"
+#include "media/context/CallMedia.h"
+#include "media/rtp/RtpRoutes.h"
+#include "properties/CC_PropertyCodec.h"
+#include "properties/CC_PropertyCodecNegotiating.h"
+#include "properties/CC_PropertyCodecs.h"
+#include "properties/CC_PropertyId.h"
+#include "sip/message/SipProperty.h"
+
+#include <algorithm>
+#include <tuple>
+#include <utility>
+
+using namespace SipProperty;
+using Negotiating = CC_PropertyCodecNegotiating;
+
+namespace
+{
+constexpr unsigned int NOT_ACCEPTABLE = 488;
+constexpr unsigned int TELEPHONE_RATE = 8000; // Hz: the clock of events that every phone knows
+
+/// As whoever is at the other end sees it.
+VoipCodecAndMode::Mode ACROSS(VoipCodecAndMode::Mode mode)
+{
+    if (mode == VoipCodecAndMode::SEND_ONLY)
+        return VoipCodecAndMode::RECEIVE_ONLY;
+    return mode == VoipCodecAndMode::RECEIVE_ONLY ? VoipCodecAndMode::SEND_ONLY : mode;
+}
+
+SipCodecChoice::Codecs CODECS_OF(SipStream const& stream)
+{
+    SipCodecChoice::Codecs codecs;
+    for (SipStream::Format const& format : stream.formats)
+        codecs.push_back(format.codec);
+    return codecs;
+}
+
+/// The clock of the voice beside them wins; many phones know but one.
+std::vector<SipStream::Events> EVENTS_FOR(SipStream const& far, SipStream::Codec codec)
+{
+    for (unsigned int const rate : {RtpRoutes::CLOCK_RATE(codec), TELEPHONE_RATE})
+        for (SipStream::Events const& events : far.events)
+            if (events.rate == rate)
+                return {events};
+    return {};
+}
+} // namespace
+
+bool SipAnchoredSession::open()
+{
+    if (m_leg != nullptr)
+        return true;
+    CallMedia* const call = CallMedia::OF(m_adapter.getDatapathContext());
+    m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
+    return m_leg != nullptr;
+}
+
+SipCodecChoice::Across SipAnchoredSession::getAcross() const
+{
+    SipCodecChoice::Across across;
+    across.codec = m_adapter.getPeerCodec().getCodec().getCodec();
+    for (VoipCodec const& codec : m_adapter.getPeerSupportedCodecs().getList(VoipCodecListSet::SEND_RECEIVE))
+        across.supported.push_back(codec.getCodec());
+    return across;
+}
+
+SipCodecChoice::Codecs SipAnchoredSession::getOffered(SipStream const& far) const
+{
+    return SipCodecChoice::COMMON(CODECS_OF(far), m_interface.codecs);
+}
+
+// --- what the other side is told -------------------------------------------------------------------------------------
+
+void SipAnchoredSession::addTo(CC_PropertyContainer& own, SipStream const& far) const
+{
+    VoipCodecListSet supported;
+    unsigned int const period = far.period;
+    for (SipStream::Codec const codec : SipCodecChoice::COMMON(m_interface.codecs, CODECS_OF(far)))
+        std::ignore = supported.getList(VoipCodecListSet::SEND_RECEIVE).append(VoipCodec(codec, period));
+    ADD(own, CC_PropertyCodecs(CC_PropertyId::SUPPORTED_CODECS, supported));
+    ADD(own, Negotiating(CC_PropertyId::CODEC_NEGOTIATING, m_isOffering ? Negotiating::REQUEST : Negotiating::IDLE));
+    if (m_isAgreed)
+        ADD(own, CC_PropertyCodec(CC_PropertyId::CURRENT_CODEC, m_codec));
+}
+
+/// Without memory the other side goes on as it is, and what it sends is transcoded if it can be.
+void SipAnchoredSession::tell(SipStream const& far)
+{
+    CC_PropertyContainer own;
+    addTo(own, far);
+    std::ignore = m_adapter.setOwnProperties(own);
+}
+
+// --- descriptions of ours --------------------------------------------------------------------------------------------
+
+/// With another version if it says another thing than the last one (RFC 3264, 8).
+std::string SipAnchoredSession::write(SipStream&& ours)
+{
+    m_ours = std::move(ours);
+    if (m_ours.write({m_leg->getNumber(), m_version}) != m_written)
+        m_written = m_ours.write({m_leg->getNumber(), ++m_version});
+    return m_written;
+}
+
+/// Empty: our peer could be understood in nothing that the interface allows.
+std::string SipAnchoredSession::makeOffer()
+{
+    if (!open())
+        throw NoPort();
+    Codecs const codecs = SipCodecChoice::FOR_OFFER(m_interface.codecs, getAcross());
+    if (codecs.empty())
+        return {};
+    SipStream ours = m_frame.getReply();
+    ours.rtp = m_leg->getLocalRtp();
+    for (SipStream::Codec const codec : codecs)
+    {
+        ours.formats.push_back({codec, m_frame.getType(codec)});
+        if (std::find(m_frame.formats.begin(), m_frame.formats.end(), ours.formats.back()) == m_frame.formats.end())
+            m_frame.formats.push_back(ours.formats.back());
+    }
+    bool const hasOpus = std::find(codecs.begin(), codecs.end(), MG_Rtp::ECodec::OPUS) != codecs.end();
+    for (unsigned int const rate : {TELEPHONE_RATE, RtpRoutes::CLOCK_RATE(MG_Rtp::ECodec::OPUS)})
+        if (rate == TELEPHONE_RATE || hasOpus)
+        {
+            ours.events.push_back({rate, m_frame.getEventsType(rate)});
+            if (std::find(m_frame.events.begin(), m_frame.events.end(), ours.events.back()) == m_frame.events.end())
+                m_frame.events.push_back(ours.events.back());
+        }
+    return write(std::move(ours));
+}
+
+/// Empty: nothing of it would be understood across. One codec alone is chosen, so that nobody changes it unasked.
+std::string SipAnchoredSession::makeAnswer(SipStream const& far)
+{
+    SipStream::Codec const codec = SipCodecChoice::FOR_ANSWER(getOffered(far), getAcross());
+    if (codec == MG_Rtp::ECodec::NONE)
+        return {};
+    if (!open())
+        throw NoPort();
+    m_frame = far;
+    SipStream ours = far.getReply();
+    ours.rtp = m_leg->getLocalRtp();
+    ours.formats = {{codec, far.getType(codec)}};
+    ours.events = EVENTS_FOR(far, codec);
+    ours.mode = ACROSS(far.mode);
+    std::string const answer = write(std::move(ours));
+    settle(far);
+    return answer;
+}
+
+/// False: they have nothing in common; what was agreed on before stays.
+bool SipAnchoredSession::settle(SipStream const& far)
+{
+    MediaDescription const agreed = SipStream::AGREED(m_ours, far);
+    if (m_leg == nullptr || agreed.formats.getSize() == 0)
+        return false;
+    m_leg->describe(agreed);
+    m_codec = VoipCodecAndMode(agreed.formats.begin()->codec, ACROSS(agreed.mode));
+    m_isAgreed = true;
+    return true;
+}
+
+// --- while the dialog comes up ---------------------------------------------------------------------------------------
+
+unsigned int SipAnchoredSession::check(std::string const& offer)
+{
+    if (offer.empty())
+        return 0; // the INVITE has none: we offer
+    m_offerOfInvite = SipStream::READ(offer);
+    return m_offerOfInvite && !getOffered(*m_offerOfInvite).empty() ? 0 : NOT_ACCEPTABLE;
+}
+
+void SipAnchoredSession::addOffer(CC_PropertyContainer& own, std::string const&)
+{
+    if (m_offerOfInvite)
+        addTo(own, *m_offerOfInvite);
+}
+
+void SipAnchoredSession::addAnswer(CC_PropertyContainer& own, std::string const& description, bool)
+{
+    std::optional<SipStream> const far = SipStream::READ(description);
+    if (far && settle(*far))
+        addTo(own, *far);
+}
+
+/// The first answer stays, whatever the called side says later: what differs is transcoded.
+std::string SipAnchoredSession::readForInvite(bool hadOffer)
+{
+    if (!m_forInvite.empty())
+        return m_forInvite;
+    if (!hadOffer)
+        m_forInvite = makeOffer();
+    else if (m_offerOfInvite)
+    {
+        m_forInvite = makeAnswer(*m_offerOfInvite);
+        tell(*m_offerOfInvite);
+    }
+    return m_forInvite;
+}
+
+// --- once it is up ---------------------------------------------------------------------------------------------------
+
+unsigned int SipAnchoredSession::takeOffer(std::string const& description, bool)
+{
+    if (description.empty())
+        m_pending = makeOffer();
+    else if (std::optional<SipStream> const far = SipStream::READ(description))
+    {
+        m_pending = makeAnswer(*far);
+        if (!m_pending.empty())
+            tell(*far);
+    }
+    return m_pending.empty() ? NOT_ACCEPTABLE : 0;
+}
+
+void SipAnchoredSession::proceed()
+{
+    if (std::string const description = std::exchange(m_pending, {}); !description.empty())
+        m_wire.sendAnswer(description);
+}
+
+void SipAnchoredSession::takeAnswer(std::string const& description)
+{
+    m_isOffering = false;
+    std::optional<SipStream> const far = SipStream::READ(description);
+    if (far && settle(*far))
+        tell(*far);
+    else
+        takeRefusal(NOT_ACCEPTABLE);
+}
+
+/// A refusal that is for now alone ends nothing: the next change has us try again.
+void SipAnchoredSession::takeRefusal(unsigned int status)
+{
+    m_isOffering = false;
+    if (!m_isAgreed || (status == NOT_ACCEPTABLE && !isInUnison()))
+        m_wire.giveUp();
+}
+
+bool SipAnchoredSession::isInUnison() const
+{
+    return !m_adapter.existsPeerCodec() ||
+           SipCodecChoice::ARE_COMPATIBLE(m_codec.getCodec().getCodec(),
+                                          m_adapter.getPeerCodec().getCodec().getCodec());
+}
+
+bool SipAnchoredSession::isOurTurn() const
+{
+    return m_adapter.getPeerCodecNegotiatingState() == Negotiating::NOT_CAPABLE ||
+           m_adapter.getOwnCallLegId() > m_adapter.getPeerCallLegId();
+}
+
+void SipAnchoredSession::follow(bool isUp)
+{
+    if (!isUp || !m_isAgreed || m_isOffering || isInUnison() || !isOurTurn())
+        return;
+    std::string const offer = makeOffer();
+    if (offer.empty())
+    {
+        m_wire.giveUp();
+        return;
+    }
+    m_isOffering = true;
+    std::ignore =
+        m_adapter.setOwnProperty(Negotiating(CC_PropertyId::CODEC_NEGOTIATING, Negotiating::REQUEST)); // for the trace
+    m_wire.sendOffer(offer, true);
+}
+
+// --- media of ours ---------------------------------------------------------------------------------------------------
+
+void SipAnchoredSession::followCall()
+{
+    CallMedia* const call = m_leg != nullptr ? CallMedia::OF(m_adapter.getDatapathContext()) : nullptr;
+    if (call != nullptr && call != &m_leg->getCall())
+        m_leg->moveTo(*call);
+}
+
+/// Who holds may be silent.
+void SipAnchoredSession::onSilence(unsigned int seconds)
+{
+    if (m_leg->getDescription().mode == VoipCodecAndMode::SEND_RECEIVE)
+        m_wire.onSilence(seconds);
+}

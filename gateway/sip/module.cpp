@@ -1,0 +1,5 @@
+#include "sip/SipModule.h"
+
+#include "configuration/Configuration.h"
+
+CALLCONTROL_GATEWAY_MODULE(SipModule)

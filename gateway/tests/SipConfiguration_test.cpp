@@ -1,0 +1,196 @@
+#include "sip/SipConfiguration.h"
+
+#include "configuration/ConfigurationSection.h"
+
+#include <gtest/gtest.h>
+
+namespace
+{
+/// The interfaces of a text that has nothing else.
+std::vector<SipConfiguration> READ(std::string const& text, bool relaysMedia = false)
+{
+    std::vector<SipConfiguration> result;
+    for (ConfigurationSection const& section : ConfigurationSection::PARSE(text, "f").sections("sip"))
+        result.push_back(SipConfiguration::READ(section, relaysMedia));
+    return result;
+}
+
+std::string COMPLAINT(std::string const& text, bool relaysMedia = false)
+{
+    try
+    {
+        READ(text, relaysMedia);
+    }
+    catch (ConfigurationError const& error)
+    {
+        return error.what();
+    }
+    return "none";
+}
+
+char const* const LEAST = "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:5060\"\npeer = \"192.0.2.7:5070\"\n";
+} // namespace
+
+TEST(SipConfiguration, WhatIsLeftOutHasItsDefault)
+{
+    SipConfiguration const a = READ(LEAST).at(0);
+    EXPECT_FALSE(a.usesTcp);
+    EXPECT_TRUE(a.listensOnUdp);
+    EXPECT_FALSE(a.listensOnTcp);
+    EXPECT_TRUE(a.allow.empty());
+    EXPECT_EQ(a.maxMessageSize, 65535u);
+    EXPECT_EQ(a.maxHeaderSize, 32768u);
+    EXPECT_EQ(a.maxConnectionsPerSource, 16u);
+    EXPECT_EQ(a.tcpIdle, 120u);
+    EXPECT_EQ(a.t1, 500u);
+    EXPECT_EQ(a.t1x64, 32000u);
+    EXPECT_EQ(a.answerTimeout, 180u);
+    EXPECT_EQ(a.peer.text(), "192.0.2.7:5070");
+    EXPECT_EQ(a.getAddress().text(), "127.0.0.1:5060");
+    EXPECT_EQ(a.mediaAddress, "127.0.0.1");
+    EXPECT_FALSE(a.transfersOnWire);
+    EXPECT_EQ(a.sessionExpires, 1800u);
+    EXPECT_EQ(a.leastExpires, 90u);
+    EXPECT_EQ(a.longestCall, 0u);
+}
+
+TEST(SipConfiguration, EveryKeyIsRead)
+{
+    SipConfiguration const b = READ(R"([[sip]]
+name = "b"
+listen = "127.0.0.1:5061"
+peer = "192.0.2.1:5060"
+transport = "tcp"
+transfer = "refer"
+session-expires = 0
+min-se = 120
+max-call-duration = 3600
+media-address = "192.0.2.9"
+t1 = 100
+transports = ["tcp", "udp"]
+allow = ["192.0.2.0/24", "2001:db8::7"]
+max-message-size = 2000
+max-header-size = 1500
+max-connections-per-source = 3
+tcp-idle = 4
+t1x64 = 3200
+answer-timeout = 30
+)")
+                                   .at(0);
+    EXPECT_EQ(b.name, "b");
+    EXPECT_TRUE(b.usesTcp);
+    EXPECT_TRUE(b.listensOnUdp);
+    EXPECT_TRUE(b.listensOnTcp);
+    EXPECT_EQ(b.allow.size(), 2u);
+    EXPECT_EQ(b.maxMessageSize, 2000u);
+    EXPECT_EQ(b.maxHeaderSize, 1500u);
+    EXPECT_EQ(b.maxConnectionsPerSource, 3u);
+    EXPECT_EQ(b.tcpIdle, 4u);
+    EXPECT_TRUE(b.transfersOnWire);
+    EXPECT_EQ(b.sessionExpires, 0u);
+    EXPECT_EQ(b.leastExpires, 120u);
+    EXPECT_EQ(b.longestCall, 3600u);
+    EXPECT_EQ(b.mediaAddress, "192.0.2.9");
+    EXPECT_EQ(b.t1, 100u);
+    EXPECT_EQ(b.t1x64, 3200u);
+    EXPECT_EQ(b.answerTimeout, 30u);
+}
+
+TEST(SipConfiguration, WithoutListOfTransportsAnInterfaceListensOnWhatItSpeaksToItsPeer)
+{
+    SipConfiguration const a = READ(std::string(LEAST) + "transport = \"tcp\"\n").at(0);
+    EXPECT_TRUE(a.listensOnTcp);
+    EXPECT_FALSE(a.listensOnUdp);
+}
+
+TEST(SipConfiguration, ALongerTimeOfTransactionsFollowsFromALongerFirstRetransmission)
+{
+    EXPECT_EQ(READ(std::string(LEAST) + "t1 = 1000\n").at(0).t1x64, 64000u);
+}
+
+TEST(SipConfiguration, AnAddressForThePeersLetsItListenOnAll)
+{
+    SipConfiguration const a = READ("[[sip]]\nname = \"a\"\nlisten = \"0.0.0.0:5060\"\nadvertise = \"192.0.2.1:5070\"\n"
+                                    "peer = \"192.0.2.7:5060\"\n")
+                                   .at(0);
+    EXPECT_EQ(a.listen.text(), "0.0.0.0:5060");
+    EXPECT_EQ(a.getAddress().text(), "192.0.2.1:5070");
+}
+
+TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
+{
+    struct Row
+    {
+        std::string text;
+        std::string complaint;
+    };
+    std::string const first = "[[sip]]\nname = \"a\"\n";
+    std::string const whole = LEAST;
+    auto const addresses = [&](std::string const& listen, std::string const& peer)
+    { return first + "listen = \"" + listen + "\"\npeer = \"" + peer + "\"\n"; };
+    Row const rows[] = {
+        {first, "f: sip[0].listen: is missing"},
+        {first + "listen = 5060", "f: sip[0].listen: expected a text"},
+        {first + "listen = \"\"", "f: sip[0].listen: must not be empty"},
+        {first + "listen = \"127.0.0.1\"",
+         "f: sip[0].listen: expected an address and a port, as in \"192.0.2.1:5060\""},
+        {first + "listen = \"host:5060\"", "f: sip[0].listen: 'host' is not an address"},
+        {first + "listen = \"10.0.0.0/8:5060\"", "f: sip[0].listen: '10.0.0.0/8' is not an address"},
+        {first + "listen = \"2001:db8::1:5060\"", "f: sip[0].listen: '2001:db8::1' is not an address"},
+        {first + "listen = \"[127.0.0.1]:5060\"", "f: sip[0].listen: '[127.0.0.1]' is not an address"},
+        {first + "listen = \"127.0.0.1:0\"", "f: sip[0].listen: '0' is not a port"},
+        {first + "listen = \"127.0.0.1:65536\"", "f: sip[0].listen: '65536' is not a port"},
+        {first + "listen = \"127.0.0.1:5x\"", "f: sip[0].listen: '5x' is not a port"},
+        {whole + whole + "t2 = 1", "f: sip[1].t2: is not a key"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2"),
+         "f: sip[0].listen: '0.0.0.0' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2"), "f: sip[0].listen: '::' cannot be told to peers: advertise is needed"},
+        {addresses("[::]:1", "[::1]:2") + "advertise = \"127.0.0.1:1\"",
+         "f: sip[0].advertise: is not of the version of the internet protocol that listen is of"},
+        {addresses("0.0.0.0:1", "127.0.0.1:2") + "advertise = \"0.0.0.0:1\"",
+         "f: sip[0].advertise: '0.0.0.0' is nobody's address"},
+        {addresses("224.0.0.1:1", "127.0.0.1:2"), "f: sip[0].listen: '224.0.0.1' is a multicast address"},
+        {addresses("127.0.0.1:1", "239.1.2.3:2"), "f: sip[0].peer: '239.1.2.3' is a multicast address"},
+        {addresses("[::1]:1", "[ff02::1]:2"), "f: sip[0].peer: 'ff02::1' is a multicast address"},
+        {addresses("127.0.0.1:1", "0.0.0.0:2"), "f: sip[0].peer: '0.0.0.0' is nobody's address"},
+        {addresses("127.0.0.1:1", "[::1]:2"),
+         "f: sip[0].peer: is not of the version of the internet protocol that listen is of"},
+        {addresses("127.0.0.1:1", "127.0.0.1:1"), "f: sip[0].peer: is the interface itself"},
+        {"[[sip]]\nname = \"a\\nb\"", "f: sip[0].name: has a line break or another control character"},
+        {whole + "transports = []", "f: sip[0].transports: expected a list of texts"},
+        {whole + "transports = \"tcp\"", "f: sip[0].transports: expected a list of texts"},
+        {whole + "transports = [3]", "f: sip[0].transports: expected a list of texts"},
+        {whole + "transports = [\"sctp\"]", "f: sip[0].transports: must be some of udp, tcp"},
+        {whole + "transports = [\"tcp\"]", "f: sip[0].transports: must have 'udp', which is the peer's"},
+        {whole + "allow = [\"host\"]", "f: sip[0].allow: 'host' is not an address"},
+        {whole + "allow = [\"10.0.0.1/8\"]", "f: sip[0].allow: '10.0.0.1/8' has bits beyond its prefix"},
+        {whole + "max-message-size = 100", "f: sip[0].max-message-size: must be from 1024 to 1048576"},
+        {whole + "tcp-idle = 0", "f: sip[0].tcp-idle: must be from 1 to 86400"},
+    };
+    for (Row const& row : rows)
+        EXPECT_EQ(COMPLAINT(row.text), row.complaint) << row.text;
+}
+
+TEST(SipConfiguration, AMediaAddressThatNobodyReachesIsRefusedWhereMediaAreRelayed)
+{
+    std::string const text = std::string(LEAST) + "media-address = \"0.0.0.0\"\n";
+    EXPECT_EQ(COMPLAINT(text), "none");
+    EXPECT_EQ(COMPLAINT(text, true), "f: sip[0].media-address: '0.0.0.0' cannot be told to peers");
+    EXPECT_EQ(COMPLAINT(std::string(LEAST) + "media-address = \"host\"\n", true),
+              "f: sip[0].media-address: 'host' is not an address");
+}
+
+TEST(SipConfiguration, TheCodecsAreThoseOfTheListInItsOrder)
+{
+    std::vector<SipConfiguration> const interfaces =
+        READ(std::string(LEAST) + "codecs = [\"G729\", \"opus\", \"L16\"]\n" + LEAST);
+    EXPECT_EQ(interfaces.at(0).codecs, (std::vector<MG_Rtp::ECodec::Type>{MG_Rtp::ECodec::G729, MG_Rtp::ECodec::OPUS,
+                                                                          MG_Rtp::ECodec::L16_MONO}));
+    EXPECT_EQ(interfaces.at(1).codecs.front(), MG_Rtp::ECodec::PCMA) << "the default";
+}
+
+TEST(SipConfiguration, CodecsAreRefusedWhereTheyAreNone)
+{
+    for (char const* const list : {"[\"PCMX\"]", "[\"PCMA\", \"pcma\"]", "[]", "\"PCMA\""})
+        EXPECT_NE(COMPLAINT(std::string(LEAST) + "codecs = " + list + "\n").find("codecs"), std::string::npos) << list;
+}

@@ -1,0 +1,1 @@
+// A shared object without a module's entry.

@@ -1,0 +1,44 @@
+# Two phones that have no codec in common hear each other: the gateway makes of each one's speech what the other takes. Of
+# G.711 either way it is the sound to the bit; of the others it is as near as the codec lets it be.
+. "$(dirname "$0")/../lib.bash"
+. "$HERE/phones.bash"
+
+write_configuration
+cat >>"$WORK/gateway.toml" <<END
+
+[media]
+mode = "relay"
+first-port = $((PORT + 8))
+last-port = $((PORT + 15))
+END
+start_gateway
+
+talk() { # CODECS of alice, of bob
+    CODECS=$1 start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 16))
+    CODECS=$2 start_phone bob "$PORT_CALLEE" "$PORT_B" $((PORT + 20)) answermode=auto
+    tell_phone "$PORT_CALLER" dial "sip:bob@$HOST:$PORT_A"
+    expect_log 'Accept call' "$3"
+    sleep 5
+    tell_phone "$PORT_CALLER" hangup
+    expect_causes "$3" 16
+    stop_phones
+}
+
+talk PCMA PCMU 1
+expect_trace 'told peer Current Codec=PCMA'
+expect_trace 'told peer Current Codec=PCMU'
+expect_speech alice bob 150 a,mu
+expect_speech bob alice 150 mu,a
+rm -r "$WORK/alice" "$WORK/bob"
+
+export SOUND=speak SECONDS_OF_SOUND=12 MODULES="g722 opus"
+talk PCMA G722 2
+expect_voice alice bob 3
+expect_voice bob alice 3
+rm -r "$WORK/alice" "$WORK/bob"
+
+talk opus PCMU 3
+expect_voice alice bob 4
+expect_voice bob alice 4
+stop_gateway "3 calls placed, 3 answered, 3 cleared, 0 failed"
+finish
