@@ -5,7 +5,9 @@
 #include <bitset>
 #include <string>
 
-/// A table `[[isdn]]` of the configuration.
+class ConfigurationSection;
+
+/// A primary-rate line, [[isdn]] in the configuration. A plain value; README.md lists the keys.
 struct IsdnConfiguration
 {
     /// How a digit that is keyed in during a call reaches the far side.
@@ -24,4 +26,7 @@ struct IsdnConfiguration
     Digits digits = Digits::KEYPAD;
     std::bitset<32> channels{0xfffefffe}; ///< B channels in service, by timeslot
     IsdnTimers timers{};
+
+    /// Checked and with defaults filled in. Throws ConfigurationError.
+    static IsdnConfiguration READ(ConfigurationSection const& section);
 };

@@ -42,7 +42,7 @@ long MILLISECONDS_UNTIL(timeval const& then)
 }
 } // namespace
 
-IsdnLink::IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, IsdnWatch& watch,
+IsdnLink::IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, SignallingLoop& watch,
                    IsdnLinkObserver& observer)
     : m_line(line)
     , m_options(options)
@@ -69,7 +69,7 @@ IsdnLink::IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, Is
 IsdnLink::~IsdnLink()
 {
     if (m_line.getDescriptor() >= 0)
-        m_watch.unwatch(m_line.getDescriptor());
+        m_watch.forget(m_line.getDescriptor());
     m_line.close();
     pri_set_userdata(m_stack, nullptr);
     LEFT_STACKS().push_back(m_stack);
@@ -143,7 +143,7 @@ void IsdnLink::closeLine()
 {
     if (m_line.getDescriptor() < 0)
         return;
-    m_watch.unwatch(m_line.getDescriptor());
+    m_watch.forget(m_line.getDescriptor());
     m_line.close();
     m_reopening.start(m_options.timers.reopening);
 }

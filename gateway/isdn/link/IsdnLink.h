@@ -1,8 +1,8 @@
 #pragma once
 
+#include "host/SignallingLoop.h"
 #include "isdn/line/IsdnLine.h"
 #include "isdn/link/IsdnTimers.h"
-#include "isdn/link/IsdnWatch.h"
 #include "isdn/link/LibPri.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -41,7 +41,8 @@ public:
     };
 
     /// Throws std::bad_alloc.
-    IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, IsdnWatch& watch, IsdnLinkObserver& observer);
+    IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, SignallingLoop& watch,
+             IsdnLinkObserver& observer);
     ~IsdnLink();
     IsdnLink(IsdnLink const&) = delete;
     IsdnLink& operator=(IsdnLink const&) = delete;
@@ -82,7 +83,7 @@ private:
 
     IsdnLine& m_line;
     Options m_options;
-    IsdnWatch& m_watch;
+    SignallingLoop& m_watch;
     IsdnLinkObserver& m_observer;
     pri* m_stack = nullptr;
     bool m_isUp = false;

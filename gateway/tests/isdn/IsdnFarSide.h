@@ -15,7 +15,7 @@ class IsdnFarSide : public IsdnLinkObserver
 public:
     using Lines = std::vector<std::string>;
 
-    IsdnFarSide(IsdnLine& line, IsdnLink::Options const& options, TYEventLoop& loop, IsdnWatch& watch)
+    IsdnFarSide(IsdnLine& line, IsdnLink::Options const& options, TYEventLoop& loop, SignallingLoop& watch)
         : m_link(line, options, loop, watch, *this)
     {
         m_link.open();

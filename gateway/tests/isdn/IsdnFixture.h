@@ -70,10 +70,11 @@ struct IsdnFixture : testing::Test, CallControlFixture
     IsdnTestLoop watch{loop};
     std::string provider = "other";
     unsigned int calls = 0;
+    Counters counters;
     IsdnEnvironment environment{watch, "SWITCH",
                                 [this](std::string const&, std::string const& number)
                                 { return number.size() >= 4 ? provider : std::string(); },
-                                [this] { return ++calls; }};
+                                [this] { return ++calls; }, counters};
     IsdnConfiguration configuration;
     IsdnLink::Options farOptions;
     std::unique_ptr<IsdnSocketLine> near, far;

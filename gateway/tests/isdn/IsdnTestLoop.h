@@ -1,6 +1,6 @@
 #pragma once
 
-#include "isdn/link/IsdnWatch.h"
+#include "host/SignallingLoop.h"
 #include "platform/eventloop/TYEventLoop.h"
 
 #include <chrono>
@@ -9,7 +9,7 @@
 #include <vector>
 
 /// An event loop and whatever descriptors are waited for, on the test's thread.
-class IsdnTestLoop : public IsdnWatch
+class IsdnTestLoop : public SignallingLoop
 {
 public:
     explicit IsdnTestLoop(TYEventLoop& loop) : m_loop(loop) { loop.getPollFd(); }
@@ -18,7 +18,10 @@ public:
     {
         m_handlers[descriptor] = std::move(onReadable);
     }
-    void unwatch(int descriptor) override { m_handlers.erase(descriptor); }
+    void forget(int descriptor) override { m_handlers.erase(descriptor); }
+
+    void run() override {} // turned by hand
+    void stop() override {}
 
     /// Until it is done, or will not be: whether it is.
     template <class IsDone>
