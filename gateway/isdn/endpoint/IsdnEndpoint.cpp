@@ -99,6 +99,7 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
         leaveCall(cause);
         return;
     }
+    openMedia(); // the call may be another one
     if (m_isCalling)
         followPeer();
     tellCharge(flags);
@@ -214,6 +215,7 @@ void IsdnEndpoint::leaveCall(QCause cause)
         return;
     }
     m_adapter.drop(cause, 0);
+    m_media.reset();
     if (m_isCalling)
     {
         Counters& counters = m_interface.getEnvironment().counters;

@@ -7,9 +7,12 @@
 #include "isdn/endpoint/IsdnCallState.h"
 #include "isdn/endpoint/IsdnChannels.h"
 #include "isdn/link/LibPri.h"
+#include "media/context/LegMedia.h"
+#include "media/context/MediaObserver.h"
 #include "platform/eventloop/TYTimer.h"
 #include "properties/CC_PropertyCallLegState.h"
 
+#include <memory>
 #include <new>
 #include <string>
 
@@ -28,7 +31,7 @@ class IsdnInterface;
 ///
 /// Owned by its interface, which destroys it once both the call on the wire is over and the leg dropped. Belongs to the
 /// call-control loop's thread.
-class IsdnEndpoint : public CC_Endpoint, public CC_CallAdapterObserver
+class IsdnEndpoint : public CC_Endpoint, public CC_CallAdapterObserver, private MediaObserver
 {
 public:
     IsdnEndpoint(IsdnInterface& interface, unsigned int callNumber);
@@ -107,6 +110,9 @@ private:
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
     void tellHold();
+    void addCodecs(CC_PropertyContainer& own) const;
+    void openMedia();
+    void onDigit(char digit, unsigned int milliseconds) override;
     void sendUserUser();
     void endWire(QCause cause);
     void lookForEnd();
@@ -141,5 +147,7 @@ private:
     std::string m_digits; // called side: not sent yet
     TYTimer m_timer;      // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
+    std::unique_ptr<LegMedia> m_media;
+    unsigned int m_mediaTimeslot = IsdnChannels::NONE;
     CC_CallAdapterE164 m_adapter; // last: silenced first
 };

@@ -48,6 +48,10 @@ XCode IsdnEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCo
     m_isInCall = true;
     m_hadPeer = true;
     bool const isComplete = !m_adapter.getPeerSupportsOverlapSending();
+    m_own.clear();
+    addCodecs(m_own);
+    if (!m_own.isEmpty())
+        std::ignore = m_adapter.setOwnProperties(m_own);
     if (!m_interface.getLink().isUp())
         clear(QCause::NETWORK_OUT_OF_ORDER);
     else if (m_timeslot = m_interface.getChannels().take(); m_timeslot == IsdnChannels::NONE)
@@ -169,6 +173,7 @@ void IsdnEndpoint::tellPeer(LegState::State state, int progressMask, pri_subcomm
 {
     if (!m_isInCall)
         return;
+    openMedia();
     IsdnProgress const progress = IsdnProgress::OF(progressMask);
     m_own.clear();
     readCommands(commands, m_own);

@@ -67,6 +67,7 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     ADD(m_own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
     ADD(m_own, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
                                                         IsdnBearer::OF(ring.ctype).capability));
+    addCodecs(m_own);
     readCommands(ring.subcmds, m_own);
     readUserUser(ring.useruserinfo, m_own);
 }
@@ -134,6 +135,7 @@ void IsdnEndpoint::dial(std::string const& provider, bool isComplete)
         ask([&](pri* stack) { return pri_proceeding(stack, m_call, getChannel(), 0); });
     else if (!isComplete)
         requestDigits();
+    openMedia();
 }
 
 /// Brings the SETUP's answers up to where the peer leg has come.
@@ -154,9 +156,12 @@ void IsdnEndpoint::tellProgress(LegState::State state)
     if (state == LegState::ALERTING && advance(IsdnCallState::ALERTING_OUT) == IsdnCallState::GO_ON)
     {
         m_timer.stop();
+        bool const needsTone = m_interface.getConfiguration().isNetwork && !hasData && m_media != nullptr;
+        if (needsTone)
+            m_media->playTone(MG_Tones::ECallProgressTone::RINGING);
         m_hasToldData = m_hasToldData || hasData;
         sendUserUser();
-        ask([&](pri* stack) { return pri_acknowledge(stack, m_call, getChannel(), hasData); });
+        ask([&](pri* stack) { return pri_acknowledge(stack, m_call, getChannel(), hasData || needsTone); });
     }
     else if (state == LegState::PROCEEDING && advance(IsdnCallState::PROCEEDING_OUT) == IsdnCallState::GO_ON)
     {
@@ -176,6 +181,8 @@ void IsdnEndpoint::tellConnected()
     if (advance(IsdnCallState::CONNECT_OUT) != IsdnCallState::GO_ON)
         return;
     m_timer.stop();
+    if (m_media != nullptr)
+        m_media->playTone(MG_Tones::ECallProgressTone::NONE);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
     pri_party_connected_line connected = {};

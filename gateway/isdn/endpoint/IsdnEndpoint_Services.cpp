@@ -5,6 +5,7 @@
 #include "isdn/element/IsdnText.h"
 #include "isdn/element/IsdnUserUser.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "media/context/CallMedia.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyKeys.h"
 #include "services/CC_ServiceUserInput.h"
@@ -16,6 +17,7 @@ using namespace IsdnProperty;
 namespace
 {
 constexpr std::string_view DIGITS = "0123456789*#ABCD";
+constexpr unsigned int DIGIT_TIME = 100; // milliseconds
 
 std::string DIGITS_OF(std::string_view text)
 {
@@ -151,6 +153,10 @@ void IsdnEndpoint::onUserInput(CC_ServiceUserInput const& input)
         m_digits += digits;
     if (m_state == IsdnCallState::OVERLAP_SENDING)
         dialOn();
+    else if (m_state == IsdnCallState::ACTIVE && m_media != nullptr &&
+             m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
+        for (char const digit : digits)
+            m_media->sendDigit(digit, input.getDuration() != 0 ? input.getDuration() : DIGIT_TIME);
     else if (m_state == IsdnCallState::ACTIVE)
         ask([&](pri* stack) { return pri_keypad_facility(stack, m_call, digits.c_str()); });
 }
@@ -179,4 +185,48 @@ void IsdnEndpoint::tellCharge(CC_Flags const& flags)
     }
     pri_subcmd_aoc_d const advice = IsdnCharge::TO_D(*charge);
     ask([&](pri* stack) { return pri_aoc_d_send(stack, m_call, &advice); });
+}
+
+// --- media -----------------------------------------------------------------------------------------------------------
+
+/// A line speaks A-law (G.711) and nothing else.
+void IsdnEndpoint::addCodecs(CC_PropertyContainer& own) const
+{
+    if (!m_interface.getEnvironment().relaysMedia)
+        return;
+    VoipCodec const codec(MG_Rtp::ECodec::PCMA, 20);
+    VoipCodecListSet supported;
+    std::ignore = supported.getList(VoipCodecListSet::SEND_RECEIVE).append(codec);
+    ADD(own, CC_PropertyCodecs(CC_PropertyId::SUPPORTED_CODECS, supported));
+    ADD(own, CC_PropertyCodec(CC_PropertyId::CURRENT_CODEC, VoipCodecAndMode(codec, VoipCodecAndMode::SEND_RECEIVE)));
+    ADD(own, CC_PropertyCodecNegotiating(CC_PropertyId::CODEC_NEGOTIATING, CC_PropertyCodecNegotiating::NOT_CAPABLE));
+}
+
+/// The B channel becomes a termination of the call's media, or follows it into another call.
+void IsdnEndpoint::openMedia()
+{
+    CallMedia* const call = m_isInCall && m_interface.getEnvironment().relaysMedia
+                                ? CallMedia::OF(m_adapter.getDatapathContext())
+                                : nullptr;
+    if (call == nullptr || m_timeslot == IsdnChannels::NONE)
+        return;
+    if (m_media == nullptr || m_mediaTimeslot != m_timeslot)
+    {
+        m_mediaTimeslot = m_timeslot;
+        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this);
+        if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
+            m_media->detectDigits(true);
+    }
+    else if (&m_media->getCall() != call)
+        m_media->moveTo(*call);
+}
+
+void IsdnEndpoint::onDigit(char digit, unsigned int milliseconds)
+{
+    handle(
+        [&]
+        {
+            CC_ServiceUserInput input(STRING(std::string_view(&digit, 1)), milliseconds);
+            m_adapter.invokeSynchronousService(input);
+        });
 }

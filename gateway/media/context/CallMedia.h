@@ -38,6 +38,10 @@ public:
     /// address is not ours, memory is out or the media layer has ended.
     std::unique_ptr<LegMedia> addLeg(IpAddress const& local, MediaObserver& observer);
 
+    /// The same for a leg on a 64 kbit/s channel of a line, whose descriptor the termination takes over
+    /// (ChannelTermination): it speaks A-law both ways from now on, and has no ports. Null as above.
+    std::unique_ptr<LegMedia> addChannel(int channel, MediaObserver& observer);
+
     /// The number of contexts alive.
     static std::atomic<unsigned int> s_numberOfInstances;
 
