@@ -16,3 +16,8 @@ std::unique_ptr<LegMedia> CallMedia::addLeg(IpAddress const& local, MediaObserve
 {
     return m_core->createLeg(*this, local, observer);
 }
+
+std::unique_ptr<LegMedia> CallMedia::addChannel(int channel, MediaObserver& observer)
+{
+    return m_core->createChannelLeg(*this, Descriptor(channel), observer);
+}

@@ -38,6 +38,10 @@ public:
     /// address is not ours, memory is out or the media layer has ended.
     std::unique_ptr<LegMedia> addLeg(IpAddress const& local, MediaObserver& observer);
 
+    /// The same for a leg on a 64 kbit/s channel of a line, whose descriptor the termination takes over
+    /// (ChannelTermination): it speaks A-law both ways from now on, and has no ports. Null as above.
+    std::unique_ptr<LegMedia> addChannel(int channel, MediaObserver& observer);
+
     /// By which way the digit came of which an observer of this call is being told: inside of that the other legs'
     /// modules can see what the media layer has done about it already. An EVENT has gone to the other leg of two as an
     /// event, or as a sound where there are none; a SOUND as what it is.

@@ -1,5 +1,7 @@
 #include "media/context/MediaCore.h"
 
+#include "media/rtp/ChannelTermination.h"
+
 #include <algorithm>
 #include <stdexcept>
 
@@ -58,11 +60,34 @@ XCode MediaCore::createContext(TYPtr<MG_IContext>& context)
     return XCode::OK;
 }
 
+RtpTermination::Seed MediaCore::makeSeed()
+{
+    return {static_cast<std::uint32_t>(m_random()), static_cast<std::uint16_t>(m_random()),
+            static_cast<std::uint32_t>(m_random()), m_random()};
+}
+
 std::unique_ptr<RtpTermination> MediaCore::createTermination(unsigned long long number, RtpPorts&& ports)
 {
-    RtpTermination::Seed const seed{static_cast<std::uint32_t>(m_random()), static_cast<std::uint16_t>(m_random()),
-                                    static_cast<std::uint32_t>(m_random()), m_random()};
-    return std::make_unique<RtpTermination>(number, std::move(ports), m_options, seed);
+    return std::make_unique<RtpTermination>(number, std::move(ports), m_options, makeSeed());
+}
+
+std::unique_ptr<LegMedia> MediaCore::createChannelLeg(CallMedia& call, Descriptor&& channel, MediaObserver& observer)
+try
+{
+    if (m_loops.empty() || channel.get() < 0)
+        return nullptr;
+    std::unique_ptr<LegMedia> leg(new LegMedia(call, observer, ++s_lastNumber));
+    m_legs[leg->m_number] = leg.get();
+    MediaOrder::Make make{
+        call.m_number, std::make_unique<ChannelTermination>(leg->m_number, std::move(channel), m_options, makeSeed())};
+    if (!getLoopOf(call)->post(std::move(make)))
+        return nullptr;
+    leg->describe(ChannelTermination::DESCRIPTION());
+    return leg;
+}
+catch (std::bad_alloc const&)
+{
+    return nullptr;
 }
 
 std::unique_ptr<LegMedia> MediaCore::createLeg(CallMedia& call, IpAddress const& local, MediaObserver& observer)

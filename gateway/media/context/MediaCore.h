@@ -17,6 +17,7 @@ public:
 
     XCode createContext(TYPtr<MG_IContext>& context) override;
     std::unique_ptr<LegMedia> createLeg(CallMedia& call, IpAddress const& local, MediaObserver& observer);
+    std::unique_ptr<LegMedia> createChannelLeg(CallMedia& call, Descriptor&& channel, MediaObserver& observer);
     void remove(LegMedia const& leg);
 
     void start();
@@ -30,6 +31,7 @@ public:
     MediaLoop* getLoopOf(CallMedia const& call) const;
 
 private:
+    RtpTermination::Seed makeSeed();
     std::unique_ptr<RtpTermination> createTermination(unsigned long long number, RtpPorts&& ports);
     void onNews();
     void take(MediaNews const& news);

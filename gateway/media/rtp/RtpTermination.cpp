@@ -77,8 +77,22 @@ void RtpTermination::receiveRtp(DatagramBatch& batch, long long now)
         else
             takeRtp(batch.getOctets(i), from, batch, now);
     }
+    sendRelayed(batch);
+}
+
+void RtpTermination::sendRelayed(DatagramBatch& batch)
+{
     if (m_partner != nullptr)
         batch.send(m_partner->getRtp());
+}
+
+void RtpTermination::sendDatagram(std::span<unsigned char const> octets, DatagramBatch* batch)
+{
+    DatagramAddress const& to = m_latch.getTarget();
+    if (batch != nullptr)
+        batch->queue({const_cast<unsigned char*>(octets.data()), octets.size()}, to);
+    else
+        sendto(getRtp(), octets.data(), octets.size(), 0, &to.any, to.length);
 }
 
 void RtpTermination::receiveRtcp(DatagramBatch& batch, long long now)
@@ -183,7 +197,7 @@ void RtpTermination::relay(RtpPacket const& packet, RtpRoutes::Route const& rout
     if (to.m_srtp != nullptr)
         length = to.m_srtp->protectRtp(start, length); // a received datagram has room behind it
     if (length != 0)
-        batch.queue({start, length}, to.m_latch.getTarget());
+        to.sendDatagram({start, length}, &batch);
 }
 
 void RtpTermination::takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now)
@@ -243,8 +257,7 @@ void RtpTermination::transmit(RtpHeader const& header, std::span<unsigned char c
         return;
     ++m_quality.sentPackets;
     m_quality.sentOctets += payload.size();
-    DatagramAddress const& to = m_latch.getTarget();
-    sendto(getRtp(), octets.data(), length, 0, &to.any, to.length);
+    sendDatagram(std::span(octets).first(length), nullptr);
 }
 
 void RtpTermination::setKeys(MediaKeys const& keys)

@@ -50,7 +50,7 @@ public:
     };
     /// @}
     RtpTermination(unsigned long long number, RtpPorts&& ports, MediaOptions const& options, Seed const& seed);
-    ~RtpTermination();
+    virtual ~RtpTermination();
     RtpTermination(RtpTermination const&) = delete;
     RtpTermination& operator=(RtpTermination const&) = delete;
 
@@ -70,7 +70,7 @@ public:
     bool isRelayable() const { return m_isRelayable; }
 
     /// Takes what has come to a socket, and sends on what is relayed.
-    void receiveRtp(DatagramBatch& batch, long long now);
+    virtual void receiveRtp(DatagramBatch& batch, long long now);
     void receiveRtcp(DatagramBatch& batch, long long now);
 
     bool sendDigit(char digit, unsigned int milliseconds) { return m_digits.add(digit, milliseconds); }
@@ -101,7 +101,15 @@ public:
     /// As of now.
     MediaQuality const& getQuality();
 
+protected:
+    void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
+    /// What was queued for the partner goes out.
+    void sendRelayed(DatagramBatch& batch);
+
 private:
+    /// An RTP packet on its way out; `batch`: where it is queued, null: it goes at once.
+    virtual void sendDatagram(std::span<unsigned char const> octets, DatagramBatch* batch);
+    virtual void sendReport(bool isBye, long long now);
     bool receives() const;
     bool sends() const;
     bool isOpen() const { return sends() && !m_isUnusable && m_latch.getTarget().isSomewhere(); }
@@ -113,7 +121,6 @@ private:
     void sendFrame(std::span<short const> frame, unsigned int rate, long long now);
     void prepareSender(unsigned int rate);
     unsigned int getClockRate() const { return m_routes.getClockRate(); }
-    void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
     void takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now);
     void takeEvent(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void noteArrival(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
@@ -124,7 +131,6 @@ private:
     void sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendTone(long long now);
     void sendSound(long long now);
-    void sendReport(bool isBye, long long now);
     void checkSilence(long long now);
 
     unsigned long long m_number;

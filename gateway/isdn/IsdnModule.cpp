@@ -1,0 +1,80 @@
+#include "isdn/IsdnModule.h"
+
+#include "callcontrol/CallControl.h"
+#include "configuration/Configuration.h"
+#include "host/GatewayHost.h"
+
+#include <spdlog/spdlog.h>
+
+namespace
+{
+constexpr unsigned int PATIENCE = 10000; // milliseconds: T305 and T308 (Q.931, 9.2) with what the line takes
+
+std::string ROUTE(GatewayHost const& host, std::string const& from, std::string const& number)
+{
+    std::string const* const to = host.routing.find(from, number);
+    return to != nullptr ? *to : std::string();
+}
+
+unsigned int BEGIN_CALL(GatewayHost& host)
+{
+    if (host.isEnding || !host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS()))
+    {
+        ++host.counters.refused;
+        return 0;
+    }
+    ++host.counters.placed;
+    return ++host.lastCallNumber;
+}
+} // namespace
+
+IsdnModule::IsdnModule(Configuration const&, std::vector<ConfigurationSection> const& interfaces)
+{
+    for (ConfigurationSection const& interface : interfaces)
+        m_configurations.push_back(IsdnConfiguration::READ(interface));
+}
+
+void IsdnModule::open(GatewayHost& host)
+{
+    m_environment.emplace(IsdnEnvironment{host.loop, host.contextName,
+                                          [&host](std::string const& from, std::string const& number)
+                                          { return ROUTE(host, from, number); },
+                                          [&host] { return BEGIN_CALL(host); }, host.counters, host.relaysMedia,
+                                          [&host]
+                                          {
+                                              if (host.onEndpointGone)
+                                                  host.onEndpointGone();
+                                          }});
+    for (IsdnConfiguration const& configuration : m_configurations)
+    {
+        m_ports.push_back(std::make_unique<Port>(*m_environment, configuration));
+        m_ports.back()->interface.open();
+        spdlog::info("interface {} is the {} side of the line {}", configuration.name,
+                     configuration.isNetwork ? "network" : "user", configuration.line);
+    }
+}
+
+unsigned int IsdnModule::clearCalls(QCause cause)
+{
+    for (auto const& port : m_ports)
+        port->interface.clearCalls(cause);
+    return PATIENCE;
+}
+
+std::size_t IsdnModule::getNumberOfEndpoints() const
+{
+    std::size_t number = 0;
+    for (auto const& port : m_ports)
+        number += port->interface.getNumberOfEndpoints();
+    return number;
+}
+
+std::string IsdnModule::describe() const
+{
+    std::string text;
+    for (auto const& port : m_ports)
+        text += fmt::format("interface {}: link {}, {} channels free\n", port->interface.getName().view(),
+                            port->interface.getLink().isUp() ? "up" : "down",
+                            port->interface.getChannels().getNumberOfFree());
+    return text;
+}

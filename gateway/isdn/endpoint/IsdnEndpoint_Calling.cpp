@@ -1,0 +1,198 @@
+// The calling side: the SETUP was received, the peer leg says how it is answered.
+#include "isdn/element/IsdnBearer.h"
+#include "isdn/element/IsdnProgress.h"
+#include "isdn/element/IsdnProperty.h"
+#include "isdn/element/IsdnRedirection.h"
+#include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "properties/CC_PropertyKeys.h"
+
+#include <spdlog/spdlog.h>
+
+#include <algorithm>
+
+using namespace IsdnProperty;
+
+namespace
+{
+constexpr int CHANNEL_MASK = 0xff;
+constexpr int ANY_CHANNEL = 0xff;
+constexpr int NO_CHANNEL = 0;
+constexpr char END_OF_NUMBER = '#';
+} // namespace
+
+void IsdnEndpoint::receiveSetup(pri_event_ring& ring)
+{
+    m_isCalling = true;
+    m_interface.know(ring.call, *this);
+    m_call = ring.call;
+    advance(IsdnCallState::SETUP_IN);
+    if (!m_interface.getConfiguration().channels.any() || !takeRequestedChannel(ring.channel, ring.flexible != 0))
+    {
+        bool const isAny = (ring.channel & CHANNEL_MASK) == ANY_CHANNEL || ring.flexible != 0;
+        clear(isAny ? QCause::NO_CIRCUIT_CHANNEL_AVAILABLE : QCause::REQUESTED_CIRCUIT_CHANNEL_NOT_AVAILABLE);
+        return;
+    }
+    bool const isComplete = ring.complete != 0 || !m_interface.getConfiguration().isOverlapReceiving;
+    handle(
+        [&]
+        {
+            readSetup(ring);
+            dialIfComplete(isComplete);
+        });
+}
+
+/// The one that the far side prefers, or another if that is not free and it does not insist (Q.931, 5.1.2, 5.2.3.1).
+bool IsdnEndpoint::takeRequestedChannel(int channel, bool isFlexible)
+{
+    IsdnChannels& channels = m_interface.getChannels();
+    auto const requested = static_cast<unsigned int>(channel & CHANNEL_MASK);
+    bool const isAny = requested == ANY_CHANNEL || channel < 0;
+    m_channelFlags = isAny ? 0 : channel & ~CHANNEL_MASK;
+    if (!isAny && requested == NO_CHANNEL)
+        return false; // a waiting call, of which this line has none
+    bool const isTaken =
+        !isAny && (channels.take(requested) || (m_interface.yieldChannel(requested) && channels.take(requested)));
+    m_timeslot = isTaken ? requested : isAny || isFlexible ? channels.take() : IsdnChannels::NONE;
+    return m_timeslot != IsdnChannels::NONE;
+}
+
+void IsdnEndpoint::readSetup(pri_event_ring const& ring)
+{
+    m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
+    if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
+        m_called.number = ring.keypad_digits;
+    IsdnParty::OF(ring.calling).addTo(m_own);
+    IsdnProgress const progress = IsdnProgress::OF(ring.progressmask);
+    ADD(m_own, CC_PropertyBoolean(CC_PropertyId::ENDPOINT_IS_ISDN, progress.isIsdn));
+    ADD(m_own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
+    ADD(m_own, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
+                                                        IsdnBearer::OF(ring.ctype).capability));
+    addCodecs(m_own);
+    readCommands(ring.subcmds, m_own);
+    readUserUser(ring.useruserinfo, m_own);
+}
+
+void IsdnEndpoint::collect(std::string_view digits)
+{
+    std::size_t const end = digits.find(END_OF_NUMBER);
+    m_called.number += digits.substr(0, end);
+    if (m_called.number.size() > IsdnParty::LONGEST_NUMBER)
+        clear(QCause::INVALID_NUMBER_FORMAT);
+    else
+        dialIfComplete(end != std::string_view::npos && m_interface.getConfiguration().collects);
+}
+
+/// Overlap receiving (Q.931, 5.1.3 and 5.2.4): what is not complete is collected, or dialled as soon as it has a route.
+void IsdnEndpoint::dialIfComplete(bool isComplete)
+{
+    m_isNumberComplete = m_isNumberComplete || isComplete;
+    bool const mayDial = m_isNumberComplete || !m_interface.getConfiguration().collects;
+    std::string const provider =
+        mayDial ? m_interface.getEnvironment().route(m_interface.getConfiguration().name, m_called.getText())
+                : std::string();
+    if (!provider.empty())
+        dial(provider, m_isNumberComplete);
+    else if (!m_isNumberComplete)
+        requestDigits();
+    else
+    {
+        spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination)", m_callNumber,
+                     getName().view(), m_called.getText());
+        clear(m_called.number.empty() ? QCause::INVALID_NUMBER_FORMAT : QCause::NO_ROUTE_TO_DESTINATION);
+    }
+}
+
+void IsdnEndpoint::requestDigits()
+{
+    if (advance(IsdnCallState::SETUP_ACK_OUT) == IsdnCallState::GO_ON)
+        ask([&](pri* stack) { return pri_setup_ack(stack, m_call, getChannel(), 0, 0); });
+    m_timer.start(m_interface.getLink().getTimers().t302);
+}
+
+void IsdnEndpoint::dial(std::string const& provider, bool isComplete)
+{
+    m_timer.stop();
+    String name;
+    name.format("%u", m_callNumber);
+    XCode result = m_adapter.setup(name, *this, this);
+    QInformationTransferCapability const bearer = VALUE_OF<CC_PropertyInformationTransferCapability>(
+        m_own.get(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY), CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY);
+    m_isInCall = true;
+    m_own.remove(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY); // the call's, not a party's
+    if (result.isOk())
+        result = m_adapter.dial({.contextName = m_interface.getEnvironment().contextName,
+                                 .providerName = STRING(provider),
+                                 .destination = STRING(m_called.getText()),
+                                 .called = {.number = STRING(m_called.number),
+                                            .typeOfNumber = m_called.type,
+                                            .numberingPlan = m_called.plan},
+                                 .sendingComplete = isComplete,
+                                 .informationTransferCapability = bearer,
+                                 .extraOwnProperties = &m_own});
+    if (!result.isOk())
+        clear(QCause::NETWORK_OUT_OF_ORDER);
+    else if (isComplete && advance(IsdnCallState::PROCEEDING_OUT) == IsdnCallState::GO_ON)
+        ask([&](pri* stack) { return pri_proceeding(stack, m_call, getChannel(), 0); });
+    else if (!isComplete)
+        requestDigits();
+    openMedia();
+}
+
+/// Brings the SETUP's answers up to where the peer leg has come.
+void IsdnEndpoint::followPeer()
+{
+    LegState::State const state = getPeerState();
+    m_hadPeer = m_hadPeer || m_adapter.getPeer(Key::STATE);
+    if (state >= LegState::HELD)
+        tellConnected();
+    else
+        tellProgress(state);
+}
+
+void IsdnEndpoint::tellProgress(LegState::State state)
+{
+    bool const hasData = hasPeerData();
+    bool const isNewData = hasData && !m_hasToldData;
+    if (state == LegState::ALERTING && advance(IsdnCallState::ALERTING_OUT) == IsdnCallState::GO_ON)
+    {
+        m_timer.stop();
+        bool const needsTone = m_interface.getConfiguration().isNetwork && !hasData && m_media != nullptr;
+        if (needsTone)
+            m_media->playTone(MG_Tones::ECallProgressTone::RINGING);
+        m_hasToldData = m_hasToldData || hasData;
+        sendUserUser();
+        ask([&](pri* stack) { return pri_acknowledge(stack, m_call, getChannel(), hasData || needsTone); });
+    }
+    else if (state == LegState::PROCEEDING && advance(IsdnCallState::PROCEEDING_OUT) == IsdnCallState::GO_ON)
+    {
+        m_timer.stop();
+        m_hasToldData = m_hasToldData || hasData;
+        ask([&](pri* stack) { return pri_proceeding(stack, m_call, getChannel(), hasData); });
+    }
+    else if (isNewData && advance(IsdnCallState::PROGRESS_OUT) == IsdnCallState::GO_ON)
+    {
+        m_hasToldData = true;
+        ask([&](pri* stack) { return pri_progress(stack, m_call, getChannel(), 1); });
+    }
+}
+
+void IsdnEndpoint::tellConnected()
+{
+    if (advance(IsdnCallState::CONNECT_OUT) != IsdnCallState::GO_ON)
+        return;
+    m_timer.stop();
+    if (m_media != nullptr)
+        m_media->playTone(MG_Tones::ECallProgressTone::NONE);
+    m_wasAnswered = true;
+    ++m_interface.getEnvironment().counters.answered;
+    pri_party_connected_line connected = {};
+    connected.id = IsdnParty::OF_PEER(m_adapter).getId();
+    bool const isIsdn = m_adapter.getPeer(Key::ENDPOINT_IS_ISDN, false);
+    sendUserUser();
+    ask(
+        [&](pri* stack)
+        {
+            pri_connected_line_update(stack, m_call, &connected);
+            return pri_answer(stack, m_call, getChannel(), !isIsdn);
+        });
+}

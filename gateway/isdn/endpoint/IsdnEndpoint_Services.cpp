@@ -1,0 +1,232 @@
+// What goes both ways beside the call itself: digits, charges, notifications, texts.
+#include "isdn/element/IsdnCharge.h"
+#include "isdn/element/IsdnProperty.h"
+#include "isdn/element/IsdnRedirection.h"
+#include "isdn/element/IsdnText.h"
+#include "isdn/element/IsdnUserUser.h"
+#include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "media/context/CallMedia.h"
+#include "properties/CC_Flags.h"
+#include "properties/CC_PropertyKeys.h"
+#include "services/CC_ServiceUserInput.h"
+
+#include <tuple>
+
+using namespace IsdnProperty;
+
+namespace
+{
+constexpr std::string_view DIGITS = "0123456789*#ABCD";
+constexpr unsigned int DIGIT_TIME = 100; // milliseconds
+
+std::string DIGITS_OF(std::string_view text)
+{
+    std::string digits(text);
+    std::erase_if(digits, [](char c) { return DIGITS.find(c) == std::string_view::npos; });
+    return digits;
+}
+} // namespace
+
+void IsdnEndpoint::onTimer()
+{
+    switch (m_state)
+    {
+    case IsdnCallState::OVERLAP_RECEIVING: // T302
+        if (!m_isInCall)
+            dialIfComplete(true);
+        else if (getPeerState() == LegState::ADDRESS_INCOMPLETE)
+            clear(QCause::INVALID_NUMBER_FORMAT);
+        break;
+    case IsdnCallState::NULL_STATE: // T302: no further digit has come from the other side
+        std::ignore = m_adapter.setOwn(Key::STATE, LegState::TRYING);
+        sendSetup(true);
+        break;
+    case IsdnCallState::OVERLAP_SENDING: // T304
+        clear(QCause::RECOVERY_ON_TIMER_EXPIRY);
+        break;
+    case IsdnCallState::CLEARING:
+        lookForEnd();
+        finishIfDone();
+        break;
+    default:
+        clear(m_state == IsdnCallState::CALL_DELIVERED ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING);
+    }
+}
+
+void IsdnEndpoint::readCommands(pri_subcommands const* commands, CC_PropertyContainer& own)
+{
+    for (int i = 0; commands != nullptr && i < commands->counter_subcmd; ++i)
+    {
+        pri_subcommand const& command = commands->subcmd[i];
+        switch (command.cmd)
+        {
+        case PRI_SUBCMD_REDIRECTING:
+            if (m_isCalling)
+                IsdnRedirection::OF(command.u.redirecting).addTo(own);
+            break;
+        case PRI_SUBCMD_CONNECTED_LINE:
+            IsdnParty::OF(command.u.connected_line.id).addTo(own);
+            break;
+        case PRI_SUBCMD_AOC_S:
+            ADD(own, CC_PropertyTariff(CC_PropertyId::TARIFF, IsdnCharge::OF_S(command.u.aoc_s)));
+            break;
+        case PRI_SUBCMD_AOC_D:
+            ADD(own, CC_PropertyCharge(CC_PropertyId::CHARGE, IsdnCharge::OF_D(command.u.aoc_d)));
+            break;
+        case PRI_SUBCMD_AOC_E:
+            ADD(own, CC_PropertyCharge(CC_PropertyId::CHARGE, IsdnCharge::OF_E(command.u.aoc_e)));
+            break;
+        case PRI_SUBCMD_DISPLAY_TEXT:
+            ADD_TEXT(own, CC_PropertyId::DISPLAY, IsdnText::FROM_WIRE(command.u.display.text));
+            break;
+        default:
+            break;
+        }
+    }
+}
+
+void IsdnEndpoint::readUserUser(char const* text, CC_PropertyContainer& own)
+{
+    if (*text != '\0')
+        ADD(own, CC_PropertyParametrizedString(CC_PropertyId::USER_TO_USER_INFORMATION, IsdnUserUser::FROM_WIRE(text)));
+}
+
+/// The next message takes it along.
+void IsdnEndpoint::sendUserUser()
+{
+    if (std::string const text = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser()); !text.empty())
+        pri_call_set_useruser(m_call, text.c_str());
+}
+
+/// EN 300 141-1, 7: the far side's user holds.
+void IsdnEndpoint::onNotify(int indicator)
+{
+    if (m_state != IsdnCallState::ACTIVE || !m_isInCall)
+        return;
+    if (indicator == PRI_NOTIFY_REMOTE_HOLD || indicator == PRI_NOTIFY_USER_SUSPENDED)
+        std::ignore = m_adapter.setOwn(Key::STATE, LegState::HELD);
+    else if (indicator == PRI_NOTIFY_REMOTE_RETRIEVAL || indicator == PRI_NOTIFY_USER_RESUMED)
+        std::ignore = m_adapter.setOwn(Key::STATE, LegState::CONNECTED);
+}
+
+void IsdnEndpoint::tellHold()
+{
+    bool const isHeld = getPeerState() == LegState::HELD;
+    if (m_state != IsdnCallState::ACTIVE || std::exchange(m_isPeerHeld, isHeld) == isHeld)
+        return;
+    ask([&](pri* stack)
+        { return pri_notify(stack, m_call, 0, isHeld ? PRI_NOTIFY_REMOTE_HOLD : PRI_NOTIFY_REMOTE_RETRIEVAL); });
+}
+
+void IsdnEndpoint::onDigits(char const* digits)
+{
+    std::string const keyed = DIGITS_OF(digits);
+    switch (advance(IsdnCallState::DIGITS_IN))
+    {
+    case IsdnCallState::COLLECT:
+        if (!m_isInCall)
+        {
+            collect(keyed);
+            break;
+        }
+        m_timer.start(m_interface.getLink().getTimers().t302);
+        [[fallthrough]];
+    case IsdnCallState::GO_ON:
+        if (m_isInCall && !keyed.empty())
+        {
+            CC_ServiceUserInput input(STRING(keyed));
+            m_adapter.invokeSynchronousService(input);
+        }
+        break;
+    default:
+        break;
+    }
+}
+
+void IsdnEndpoint::onUserInput(CC_ServiceUserInput const& input)
+{
+    std::string digits = DIGITS_OF(input.getInput().view());
+    bool const isOfNumber = m_state == IsdnCallState::CALL_INITIATED || m_state == IsdnCallState::OVERLAP_SENDING;
+    if (digits.empty())
+        return;
+    if (isOfNumber && !m_isNumberComplete)
+        m_digits += digits;
+    if (m_state == IsdnCallState::OVERLAP_SENDING)
+        dialOn();
+    else if (m_state == IsdnCallState::ACTIVE && m_media != nullptr &&
+             m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
+        for (char const digit : digits)
+            m_media->sendDigit(digit, input.getDuration() != 0 ? input.getDuration() : DIGIT_TIME);
+    else if (m_state == IsdnCallState::ACTIVE)
+        ask([&](pri* stack) { return pri_keypad_facility(stack, m_call, digits.c_str()); });
+}
+
+/// Only a network tells what a call costs.
+void IsdnEndpoint::tellCharge(CC_Flags const& flags)
+{
+    bool const isNetwork = m_interface.getConfiguration().isNetwork;
+    bool const hasCall = m_call != nullptr && m_state > IsdnCallState::CALL_INITIATED;
+    if (!isNetwork || !hasCall || m_state == IsdnCallState::CLEARING)
+        return;
+    auto const* const tariff = m_adapter.getPeerTariff();
+    if (flags.get(CC_PropertyId::TARIFF) && tariff != nullptr)
+    {
+        pri_subcmd_aoc_s const advice = IsdnCharge::TO_S(*tariff);
+        ask([&](pri* stack) { return pri_aoc_s_send(stack, m_call, &advice); });
+    }
+    auto const* const charge = m_adapter.getPeerCharge();
+    if (!flags.get(CC_PropertyId::CHARGE) || charge == nullptr)
+        return;
+    if (IsdnCharge::IS_TOTAL(*charge))
+    {
+        pri_subcmd_aoc_e const advice = IsdnCharge::TO_E(*charge);
+        ask([&](pri* stack) { return pri_aoc_e_send(stack, m_call, &advice); });
+        return;
+    }
+    pri_subcmd_aoc_d const advice = IsdnCharge::TO_D(*charge);
+    ask([&](pri* stack) { return pri_aoc_d_send(stack, m_call, &advice); });
+}
+
+// --- media -----------------------------------------------------------------------------------------------------------
+
+/// A line speaks A-law (G.711) and nothing else.
+void IsdnEndpoint::addCodecs(CC_PropertyContainer& own) const
+{
+    if (!m_interface.getEnvironment().relaysMedia)
+        return;
+    VoipCodec const codec(MG_Rtp::ECodec::PCMA, 20);
+    VoipCodecListSet supported;
+    std::ignore = supported.getList(VoipCodecListSet::SEND_RECEIVE).append(codec);
+    ADD(own, CC_PropertyCodecs(CC_PropertyId::SUPPORTED_CODECS, supported));
+    ADD(own, CC_PropertyCodec(CC_PropertyId::CURRENT_CODEC, VoipCodecAndMode(codec, VoipCodecAndMode::SEND_RECEIVE)));
+    ADD(own, CC_PropertyCodecNegotiating(CC_PropertyId::CODEC_NEGOTIATING, CC_PropertyCodecNegotiating::NOT_CAPABLE));
+}
+
+/// The B channel becomes a termination of the call's media, or follows it into another call.
+void IsdnEndpoint::openMedia()
+{
+    CallMedia* const call = m_isInCall && m_interface.getEnvironment().relaysMedia
+                                ? CallMedia::OF(m_adapter.getDatapathContext())
+                                : nullptr;
+    if (call == nullptr || m_timeslot == IsdnChannels::NONE)
+        return;
+    if (m_media == nullptr || m_mediaTimeslot != m_timeslot)
+    {
+        m_mediaTimeslot = m_timeslot;
+        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this);
+        if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
+            m_media->detectDigits(true);
+    }
+    else if (&m_media->getCall() != call)
+        m_media->moveTo(*call);
+}
+
+void IsdnEndpoint::onDigit(char digit, unsigned int milliseconds)
+{
+    handle(
+        [&]
+        {
+            CC_ServiceUserInput input(STRING(std::string_view(&digit, 1)), milliseconds);
+            m_adapter.invokeSynchronousService(input);
+        });
+}

@@ -1,0 +1,22 @@
+#pragma once
+
+#include "host/Counters.h"
+#include "host/SignallingLoop.h"
+#include "platform/base/String.h"
+
+#include <functional>
+#include <string>
+
+/// What all ISDN interfaces of the gateway share, and what they need of it. Outlives them.
+struct IsdnEnvironment
+{
+    SignallingLoop& watch;
+    String contextName; ///< of call control
+    /// The provider that carries a call of that interface to that number; empty: none.
+    std::function<std::string(std::string const& from, std::string const& number)> route;
+    /// A new call from a line: its number; 0: it is not admitted.
+    std::function<unsigned int()> beginCall;
+    Counters& counters;
+    bool relaysMedia = false;               ///< there is a media layer
+    std::function<void()> onEndpointGone{}; ///< told when an endpoint was destroyed; may be empty
+};

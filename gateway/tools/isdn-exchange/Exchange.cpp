@@ -1,0 +1,387 @@
+#include "Exchange.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace
+{
+constexpr int CHECK_SUM = 2;
+constexpr int CHANNEL_MASK = 0xff;
+constexpr int DEFLECTION = 4; // Q.931; the stack says 3
+constexpr std::size_t FIRST_DIGITS = 2;
+constexpr long long TICK = 20; // milliseconds
+
+pri_party_id PARTY(std::string const& number, std::string const& name, unsigned int plan, unsigned int presentation)
+{
+    pri_party_id party = {};
+    party.number.valid = !number.empty() || presentation != 0;
+    party.number.plan = static_cast<int>(plan);
+    party.number.presentation = static_cast<int>(presentation);
+    party.number.str[number.copy(party.number.str, sizeof party.number.str - 1)] = '\0';
+    party.name.valid = !name.empty();
+    party.name.char_set = PRI_CHAR_SET_ISO8859_1;
+    party.name.str[name.copy(party.name.str, sizeof party.name.str - 1)] = '\0';
+    return party;
+}
+
+int BEARER(std::string const& name)
+{
+    return name == "digital" ? PRI_TRANS_CAP_DIGITAL
+           : name == "audio" ? PRI_TRANS_CAP_3_1K_AUDIO
+                             : PRI_TRANS_CAP_SPEECH;
+}
+
+template <class Advice>
+void WRITE_CHARGE(std::string const& currency, unsigned int units, Advice& advice)
+{
+    advice.charge = currency.empty() ? PRI_AOC_DE_CHARGE_UNITS : PRI_AOC_DE_CHARGE_CURRENCY;
+    if (currency.empty())
+    {
+        advice.recorded.unit.num_items = 1;
+        advice.recorded.unit.item[0].number = static_cast<long>(units);
+        advice.recorded.unit.item[0].type = -1;
+        return;
+    }
+    auto& money = advice.recorded.money;
+    money.amount.cost = static_cast<long>(units);
+    money.amount.multiplier = PRI_AOC_MULTIPLIER_HUNDREDTH;
+    money.currency[currency.copy(money.currency, sizeof money.currency - 1)] = '\0';
+}
+} // namespace
+
+Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report& report)
+    : m_line(std::move(wires)), m_plan(plan), m_capture(capture), m_report(report)
+{
+    m_stack = pri_new_cb(0, PRI_NETWORK, PRI_SWITCH_EUROISDN_E1, READ, WRITE, this);
+    pri_set_overlapdial(m_stack, 1);
+    pri_facility_enable(m_stack);
+    pri_aoc_events_enable(m_stack, 1);
+    pri_hangup_fix_enable(m_stack, 1);
+}
+
+Exchange::~Exchange() { pri_set_userdata(m_stack, nullptr); }
+
+bool Exchange::isHit(unsigned int perCent) { return perCent != 0 && m_random() % 100 < perCent; }
+
+int Exchange::READ(pri* stack, void* buffer, int length)
+{
+    auto* const self = static_cast<Exchange*>(pri_get_userdata(stack));
+    if (self == nullptr || length < CHECK_SUM)
+        return 0;
+    auto* const octets = static_cast<unsigned char*>(buffer);
+    std::size_t const got = self->m_line.receive({octets, static_cast<std::size_t>(length - CHECK_SUM)});
+    self->m_hasRead = got != 0;
+    if (got == 0)
+        return 0;
+    self->m_capture.write({octets, got}, false);
+    if (self->isHit(self->m_plan.lost))
+        return 0;
+    std::memset(octets + got, 0, CHECK_SUM);
+    return static_cast<int>(got) + CHECK_SUM;
+}
+
+int Exchange::WRITE(pri* stack, void* buffer, int length)
+{
+    auto* const self = static_cast<Exchange*>(pri_get_userdata(stack));
+    if (self == nullptr || length <= CHECK_SUM)
+        return length;
+    std::span<unsigned char const> const frame(static_cast<unsigned char const*>(buffer),
+                                               static_cast<std::size_t>(length - CHECK_SUM));
+    self->m_capture.write(frame, true);
+    if (!self->isHit(self->m_plan.lost))
+        self->m_line.send(frame);
+    if (self->isHit(self->m_plan.repeated))
+        self->m_line.send(frame);
+    return length;
+}
+
+void Exchange::after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work)
+{
+    std::weak_ptr<Call> const watched = call;
+    m_timers.emplace(m_now + milliseconds,
+                     [this, watched, work]
+                     {
+                         CallHandle const still = watched.lock();
+                         if (still != nullptr && m_calls.count(still->handle) != 0)
+                             work(still);
+                     });
+}
+
+void Exchange::run(long long now)
+{
+    m_now = now;
+    do
+    {
+        m_hasRead = false;
+        if (pri_event* const event = pri_check_event(m_stack))
+            takeEvent(*event);
+    } while (m_hasRead && m_line.isOpen());
+    while (pri_event* const event = pri_schedule_run(m_stack))
+        takeEvent(*event);
+    while (!m_timers.empty() && m_timers.begin()->first <= now)
+        m_timers.extract(m_timers.begin()).mapped()();
+    for (m_nextTick = std::max(m_nextTick, now - 3 * TICK); m_nextTick <= now; m_nextTick += TICK)
+        for (auto const& [handle, call] : m_calls)
+            if (call->speech != nullptr)
+                call->speech->tick();
+}
+
+long long Exchange::getNext() const
+{
+    long long next = m_nextTick;
+    if (!m_timers.empty())
+        next = std::min(next, m_timers.begin()->first);
+    return next;
+}
+
+Exchange::CallHandle Exchange::find(q931_call* handle) const
+{
+    auto const found = m_calls.find(handle);
+    return found != m_calls.end() ? found->second : nullptr;
+}
+
+void Exchange::takeEvent(pri_event& event)
+{
+    switch (event.e)
+    {
+    case PRI_EVENT_DCHAN_UP:
+        if (!std::exchange(m_isUp, true))
+            for (Plan::Call const& own : m_plan.calls)
+                for (unsigned int i = 0; i < own.count; ++i)
+                    m_timers.emplace(m_now + own.after + i * own.interval, [this, &own] { place(own); });
+        break;
+    case PRI_EVENT_RING:
+        onRing(event.ring);
+        break;
+    case PRI_EVENT_INFO_RECEIVED:
+        if (CallHandle const call = find(event.ring.call); call != nullptr && call->subscriber == nullptr)
+        {
+            call->number += event.ring.callednum;
+            consider(call, event.ring.complete != 0);
+        }
+        break;
+    case PRI_EVENT_SETUP_ACK:
+        if (CallHandle const call = find(event.setup_ack.call))
+            dialOn(call);
+        break;
+    case PRI_EVENT_ANSWER:
+        onAnswer(event.answer);
+        break;
+    case PRI_EVENT_KEYPAD_DIGIT:
+        ++m_report.keyed[event.digit.digits];
+        break;
+    case PRI_EVENT_HANGUP_REQ:
+    case PRI_EVENT_HANGUP:
+    case PRI_EVENT_HANGUP_ACK:
+        onHangUp(event);
+        break;
+    default:
+        break;
+    }
+}
+
+void Exchange::onRing(pri_event_ring const& ring)
+{
+    ++m_report.received;
+    auto const call = std::make_shared<Call>();
+    call->handle = ring.call;
+    call->channel = ring.channel;
+    call->number = ring.callednum;
+    m_calls[ring.call] = call;
+    bool const isAny = ring.channel < 0 || (ring.channel & CHANNEL_MASK) == CHANNEL_MASK;
+    if (isAny)
+        call->channel = hunt();
+    consider(call, ring.complete != 0);
+}
+
+void Exchange::consider(CallHandle const& call, bool isComplete)
+{
+    bool mayBecome = false;
+    for (Plan::Subscriber const& subscriber : m_plan.subscribers)
+        if (subscriber.number == call->number)
+        {
+            call->subscriber = &subscriber;
+            begin(call);
+            return;
+        }
+        else
+            mayBecome = mayBecome || subscriber.number.starts_with(call->number);
+    if (!isComplete && mayBecome)
+    {
+        if (!std::exchange(call->isAcknowledged, true))
+            pri_setup_ack(m_stack, call->handle, call->channel, 0, 0);
+        return;
+    }
+    pri_proceeding(m_stack, call->handle, call->channel, 0);
+    release(call, PRI_CAUSE_UNALLOCATED);
+}
+
+void Exchange::begin(CallHandle const& call)
+{
+    Plan::Subscriber const& subscriber = *call->subscriber;
+    if (subscriber.does == "silent")
+        return;
+    pri_proceeding(m_stack, call->handle, call->channel, 0);
+    if (subscriber.does == "busy")
+        release(call, PRI_CAUSE_USER_BUSY);
+    else if (subscriber.does == "reject")
+        release(call, subscriber.cause);
+    else
+        after(subscriber.rings, call,
+              [this](CallHandle const& one)
+              {
+                  if (one->subscriber->isInBand)
+                      speak(one, one->subscriber->speaks, one->subscriber->file, one->subscriber->record);
+                  pri_acknowledge(m_stack, one->handle, one->channel, one->subscriber->isInBand);
+              });
+    if (subscriber.does == "answer")
+        after(subscriber.answers, call, [this](CallHandle const& one) { answer(one); });
+}
+
+void Exchange::answer(CallHandle const& call)
+{
+    Plan::Subscriber const& subscriber = *call->subscriber;
+    ++m_report.answered;
+    call->isUp = true;
+    pri_party_connected_line connected = {};
+    connected.id = PARTY(subscriber.connected.empty() ? subscriber.number : subscriber.connected, subscriber.name,
+                         PRI_NATIONAL_ISDN, PRI_PRES_NETWORK_NUMBER);
+    pri_connected_line_update(m_stack, call->handle, &connected);
+    if (!subscriber.userUser.empty())
+        pri_call_set_useruser(call->handle, subscriber.userUser.c_str());
+    pri_answer(m_stack, call->handle, call->channel, 0);
+    if (call->speech == nullptr)
+        speak(call, subscriber.speaks, subscriber.file, subscriber.record);
+    if (subscriber.units != 0)
+        after(subscriber.interval, call, [this](CallHandle const& one) { charge(one); });
+    if (subscriber.releases != 0)
+        after(subscriber.releases, call,
+              [this](CallHandle const& one) { release(one, one->subscriber->releaseCause); });
+}
+
+void Exchange::speak(CallHandle const& call, std::string const& what, std::string const& file,
+                     std::string const& record)
+{
+    IsdnDescriptor channel = m_line.openChannel(static_cast<unsigned int>(call->channel & CHANNEL_MASK));
+    if (channel.get() >= 0)
+        call->speech = std::make_unique<Speech>(std::move(channel), what, file, record);
+}
+
+/// AOC-D, again and again (EN 300 182-1).
+void Exchange::charge(CallHandle const& call)
+{
+    call->units += call->subscriber->units;
+    m_report.units += call->subscriber->units;
+    pri_subcmd_aoc_d advice = {};
+    WRITE_CHARGE(call->subscriber->currency, call->units, advice);
+    pri_aoc_d_send(m_stack, call->handle, &advice);
+    after(call->subscriber->interval, call, [this](CallHandle const& one) { charge(one); });
+}
+
+/// AOC-E: goes with the message that clears.
+void Exchange::chargeFinally(Call const& call)
+{
+    if (call.subscriber == nullptr || call.subscriber->units == 0 || !call.isUp)
+        return;
+    pri_subcmd_aoc_e advice = {};
+    WRITE_CHARGE(call.subscriber->currency, call.units, advice);
+    pri_aoc_e_send(m_stack, call.handle, &advice);
+}
+
+void Exchange::release(CallHandle const& call, int cause)
+{
+    chargeFinally(*call);
+    pri_hangup(m_stack, call->handle, cause);
+}
+
+void Exchange::onHangUp(pri_event& event)
+{
+    CallHandle const call = find(event.hangup.call);
+    int const cause = event.hangup.cause;
+    bool const isRequest = event.e == PRI_EVENT_HANGUP_REQ;
+    if (call != nullptr && event.e != PRI_EVENT_HANGUP_ACK)
+        ++m_report.causes[cause];
+    if (call != nullptr && isRequest)
+        chargeFinally(*call);
+    if (call != nullptr && call->own != nullptr && !isRequest)
+        ++m_report.over;
+    if (!isRequest)
+        m_calls.erase(event.hangup.call);
+    pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
+}
+
+// --- calls of its own ------------------------------------------------------------------------------------------------
+
+/// The network begins at the top.
+int Exchange::hunt() const
+{
+    for (int timeslot = static_cast<int>(IsdnLine::LAST_TIMESLOT); timeslot > 0; --timeslot)
+    {
+        bool const isTaken =
+            std::any_of(m_calls.begin(), m_calls.end(),
+                        [&](auto const& one) { return (one.second->channel & CHANNEL_MASK) == timeslot; });
+        if (!isTaken && IsdnLine::IS_B_CHANNEL(static_cast<unsigned int>(timeslot)))
+            return timeslot;
+    }
+    return 0;
+}
+
+void Exchange::place(Plan::Call const& own)
+{
+    ++m_report.placed;
+    auto const call = std::make_shared<Call>();
+    call->channel = hunt();
+    call->own = &own;
+    call->number = own.to;
+    if (call->channel == 0)
+    {
+        ++m_report.causes[PRI_CAUSE_NORMAL_CIRCUIT_CONGESTION];
+        ++m_report.over;
+        return;
+    }
+    call->handle = pri_new_call(m_stack);
+    m_calls[call->handle] = call;
+    call->dialled = own.isOverlap ? std::min(FIRST_DIGITS, own.to.size()) : own.to.size();
+    std::string first = own.to.substr(0, call->dialled);
+    pri_sr* const request = pri_sr_new();
+    pri_sr_set_channel(request, call->channel, own.isExclusive, 0);
+    pri_sr_set_bearer(request, BEARER(own.bearer), own.bearer == "digital" ? -1 : PRI_LAYER_1_ALAW);
+    pri_sr_set_called(request, first.data(), PRI_UNKNOWN | PRI_NPI_E163_E164, !own.isOverlap);
+    pri_party_id const caller =
+        PARTY(own.from, own.name, own.type << 4 | PRI_NPI_E163_E164, own.presentation << 5 | own.screening);
+    pri_sr_set_caller_party(request, &caller);
+    if (!own.redirecting.empty())
+    {
+        pri_party_redirecting redirecting = {};
+        redirecting.from = PARTY(own.redirecting, {}, PRI_NATIONAL_ISDN, 0);
+        redirecting.count = 1;
+        redirecting.reason =
+            static_cast<int>(own.reason) == DEFLECTION ? PRI_REDIR_DEFLECTION : static_cast<int>(own.reason);
+        pri_sr_set_redirecting_parties(request, &redirecting);
+    }
+    if (!own.userUser.empty())
+        pri_sr_set_useruser(request, own.userUser.c_str());
+    pri_setup(m_stack, call->handle, request);
+    pri_sr_free(request);
+}
+
+void Exchange::dialOn(CallHandle const& call)
+{
+    if (call->own == nullptr)
+        return;
+    for (; call->dialled < call->number.size(); ++call->dialled)
+        pri_information(m_stack, call->handle, call->number[call->dialled]);
+}
+
+void Exchange::onAnswer(pri_event_answer const& answer)
+{
+    CallHandle const call = find(answer.call);
+    if (call == nullptr || call->own == nullptr)
+        return;
+    ++m_report.placedAnswered;
+    call->channel = answer.channel;
+    speak(call, call->own->speaks, call->own->file, call->own->record);
+    if (!call->own->keys.empty())
+        pri_keypad_facility(m_stack, call->handle, call->own->keys.c_str());
+    after(call->own->length, call, [this](CallHandle const& one) { release(one, PRI_CAUSE_NORMAL_CLEARING); });
+}

@@ -1,0 +1,102 @@
+#pragma once
+
+#include "Capture.h"
+#include "Plan.h"
+#include "Speech.h"
+#include "isdn/line/IsdnSocketLine.h"
+
+#include <sys/time.h>
+
+extern "C"
+{
+#include <libpri.h>
+}
+
+#include <functional>
+#include <map>
+#include <memory>
+#include <random>
+#include <string>
+
+/// What became of the calls of an exchange.
+struct Report
+{
+    unsigned int received = 0;
+    unsigned int answered = 0;
+    unsigned int placed = 0;
+    unsigned int placedAnswered = 0;
+    unsigned int over = 0; ///< of those placed
+    unsigned int units = 0;
+    std::map<int, unsigned int> causes; ///< with which calls were cleared by the far side
+    std::map<std::string, unsigned int> keyed;
+};
+
+/// The network side of one line: answers calls by its plan, and places its own.
+///
+///     Exchange exchange(std::move(wires), plan, capture, report);
+///     // whenever its descriptor is readable, and at least every millisecond while it has something to do:
+///     exchange.run(now);
+class Exchange
+{
+public:
+    Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report& report);
+    ~Exchange();
+    Exchange(Exchange const&) = delete;
+    Exchange& operator=(Exchange const&) = delete;
+
+    int getDescriptor() const { return m_line.getDescriptor(); }
+    /// Takes what came and does what is due; `now` in milliseconds.
+    void run(long long now);
+    /// When it wants to be run again, at the latest.
+    long long getNext() const;
+    bool isGone() const { return !m_line.isOpen(); }
+
+private:
+    struct Call
+    {
+        q931_call* handle = nullptr;
+        int channel = 0;
+        std::string number; // that was called
+        std::size_t dialled = 0;
+        Plan::Subscriber const* subscriber = nullptr;
+        Plan::Call const* own = nullptr;
+        bool isUp = false;
+        bool isAcknowledged = false;
+        unsigned int units = 0;
+        std::unique_ptr<Speech> speech;
+    };
+    using CallHandle = std::shared_ptr<Call>;
+
+    static int READ(pri* stack, void* buffer, int length);
+    static int WRITE(pri* stack, void* buffer, int length);
+    bool isHit(unsigned int perCent);
+    void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work);
+    void takeEvent(pri_event& event);
+    CallHandle find(q931_call* handle) const;
+    void onRing(pri_event_ring const& ring);
+    void onAnswer(pri_event_answer const& answer);
+    void onHangUp(pri_event& event);
+    void consider(CallHandle const& call, bool isComplete);
+    void begin(CallHandle const& call);
+    void answer(CallHandle const& call);
+    void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
+    void charge(CallHandle const& call);
+    void chargeFinally(Call const& call);
+    void place(Plan::Call const& own);
+    void dialOn(CallHandle const& call);
+    int hunt() const;
+    void release(CallHandle const& call, int cause);
+
+    IsdnSocketLine m_line;
+    Plan const& m_plan;
+    Capture& m_capture;
+    Report& m_report;
+    pri* m_stack = nullptr;
+    bool m_hasRead = false;
+    bool m_isUp = false;
+    long long m_now = 0;
+    long long m_nextTick = 0;
+    std::multimap<long long, std::function<void()>> m_timers;
+    std::map<q931_call*, CallHandle> m_calls;
+    std::minstd_rand m_random; // the same in each run
+};

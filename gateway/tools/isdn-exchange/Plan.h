@@ -1,0 +1,66 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+/// What the exchange is to do, as its file says it (README.md lists the keys). A plain value.
+struct Plan
+{
+    /// One of its subscribers.
+    struct Subscriber
+    {
+        std::string number;
+        std::string does = "answer"; ///< answer, busy, ring, reject, silent
+        int cause = 21;              ///< of a reject
+        unsigned int rings = 20;     ///< milliseconds until it rings
+        unsigned int answers = 100;  ///< milliseconds until it answers
+        unsigned int releases = 0;   ///< milliseconds from then until it releases; 0: it does not
+        int releaseCause = 16;
+        std::string speaks = "silence"; ///< silence, echo, tone, file
+        std::string file;               ///< raw A-law
+        std::string record;             ///< where what it hears is kept, raw A-law
+        std::string connected;          ///< the number that answers, if another
+        std::string name;
+        std::string userUser;
+        bool isInBand = false;       ///< its ringing tone comes in the channel
+        unsigned int units = 0;      ///< charged each interval; 0: nothing is
+        unsigned int interval = 100; ///< milliseconds
+        std::string currency;        ///< in hundredths of it; empty: units
+    };
+    /// Calls of its own.
+    struct Call
+    {
+        std::string to;
+        std::string from;
+        unsigned int type = 0; ///< of the calling number, 0 to 7
+        unsigned int presentation = 0;
+        unsigned int screening = 0;
+        std::string name;
+        std::string redirecting;
+        unsigned int reason = 0;
+        std::string userUser;
+        std::string bearer = "speech"; ///< speech, audio, digital
+        bool isOverlap = false;
+        bool isExclusive = false;
+        unsigned int count = 1;
+        unsigned int after = 500;    ///< milliseconds until the first
+        unsigned int interval = 100; ///< milliseconds between two
+        unsigned int length = 500;   ///< milliseconds that an answered one lasts
+        std::string keys;            ///< keyed in once it is answered
+        std::string speaks = "silence";
+        std::string file;
+        std::string record;
+    };
+
+    std::string line;            ///< the path where lines come in
+    std::string capture;         ///< a file of packets for the D channel; empty: none
+    unsigned int seconds = 0;    ///< until it ends by itself; 0: it does not
+    bool endsAfterCalls = false; ///< when its own are over
+    unsigned int lost = 0;       ///< frames of the D channel, per cent
+    unsigned int repeated = 0;   ///< the same
+    std::vector<Subscriber> subscribers;
+    std::vector<Call> calls;
+
+    /// Throws std::runtime_error with one line.
+    static Plan READ(std::string const& file);
+};
