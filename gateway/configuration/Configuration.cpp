@@ -261,6 +261,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
                    "detect-digits",
                    "srtp",
                    "ringback",
+                   "conference",
                    "transfer",
                    "media-address",
                    "session-expires",
@@ -285,6 +286,7 @@ Configuration::Interface READ_INTERFACE(Section const& section)
     interface.security = srtp == "off"        ? SipStream::PLAIN
                          : srtp == "optional" ? SipStream::OPTIONAL
                                               : SipStream::SECURED;
+    interface.conference = section.text("conference", {});
     interface.ringsBack = section.flag("ringback");
     interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
@@ -391,6 +393,8 @@ Configuration READ_TABLE(toml::table const& table, std::string const& file)
                            section.refuse("name", "'" + interface.name + "' is taken by another interface");
                        if (configuration.relaysMedia)
                            CHECK_MEDIA_ADDRESS(section, interface);
+                       else if (!interface.conference.empty())
+                           section.refuse("conference", "needs media.mode \"relay\"");
                        configuration.interfaces.push_back(interface);
                    });
     if (configuration.interfaces.empty())

@@ -70,8 +70,9 @@ struct Configuration
                                                  MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
         /// SRTP towards the peer; where media are relayed.
         SipStream::Security security = SipStream::PLAIN;
-        bool ringsBack = false;       ///< a caller hears a tone of ours while the callee is alerted without media
-        bool detectsDigits = false;   ///< in what its peers say; where media are relayed
+        std::string conference;     ///< the number of the interface's conference; where media are relayed. Empty: none
+        bool ringsBack = false;     ///< a caller hears a tone of ours while the callee is alerted without media
+        bool detectsDigits = false; ///< in what its peers say; where media are relayed
         bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
 
         /// Where the peers reach it.

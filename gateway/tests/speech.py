@@ -8,6 +8,7 @@
                                         which codecs it was one after the other, "a,mu"
     speech.py speak SEED SECONDS FILE   writes a WAV that sounds like somebody speaking, each seed another one
     speech.py key DIGITS FILE           writes a WAV of these digits as they sound (ITU-T Q.23), after 2 s of silence
+    speech.py hum HERTZ SECONDS FILE    writes a WAV of one tone; of silence, for 0 Hz
     speech.py overhear SAID PORT PACKETS
                                         takes so many packets of RTP on a port of 127.0.0.1: whether each is one of SRTP
                                         with mu-law in it, and none bears what was said in the clear
@@ -239,7 +240,12 @@ def tone(path, hertz, least, most):
         sys.exit(f"{path}: expected {least} to {most} and nothing else")
 
 
+def hum(hertz, seconds, path):
+    write(path, [int(8000 * math.sin(2 * math.pi * hertz * i / 8000)) for i in range(8000 * seconds)])
+
+
 COMMANDS = {
+    "hum": lambda hertz, seconds, path: hum(float(hertz), int(seconds), path),
     "tone": lambda heard, hertz, least, most: tone(heard, float(hertz), int(least), int(most)),
     "overhear": lambda said, port, packets: overhear(said, int(port), int(packets)),
     "say": lambda seed, seconds, path: say(int(seed), int(seconds), path),

@@ -176,6 +176,7 @@ private:
     // SipEndpoint_Transfer.cpp
     int onRefer(nta_incoming_t* transaction, sip_t const* request);
     void joinCallOf(SipEndpoint& other);
+    void callIn(std::string const& number);
     void askPeerToTransfer(std::string const& number, std::string const& headers);
     void notifyReferrer(unsigned int status, char const* phrase);
     void endReferral(QCause cause);
@@ -244,6 +245,7 @@ private:
     XCode writeOwn(CC_PropertyContainer const& properties);
     static std::string REASON_OF(sip_t const* message);
     char const* getContact() const; // of the dialog
+    bool isInConference() const;
     static std::string SESSION_OF(sip_t const* message);
     template <class Property>
     Property const* getPeer(unsigned int id) const
