@@ -113,6 +113,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "detect-digits",
                    "srtp",
                    "ringback",
+                   "conference",
                    "transfer",
                    "media-address",
                    "session-expires",
@@ -137,6 +138,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.security = srtp == "off"        ? SipStream::PLAIN
                          : srtp == "optional" ? SipStream::OPTIONAL
                                               : SipStream::SECURED;
+    interface.conference = section.text("conference", {});
     interface.ringsBack = section.flag("ringback");
     interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
@@ -146,5 +148,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.answerTimeout = section.number("answer-timeout", interface.answerTimeout, 1, 3600);
     if (relaysMedia)
         CHECK_MEDIA_ADDRESS(section, interface);
+    else if (!interface.conference.empty())
+        section.refuse("conference", "needs media.mode \"relay\"");
     return interface;
 }

@@ -37,6 +37,7 @@ struct SipConfiguration
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
     SipStream::Security security = SipStream::PLAIN; ///< SRTP towards the peer; where media are relayed
+    std::string conference;       ///< the number of the interface's conference; where media are relayed. Empty: none
     bool ringsBack = false;       ///< a caller hears a tone of ours while the callee is alerted without media
     bool detectsDigits = false;   ///< in what its peers say; where media are relayed
     bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it

@@ -176,6 +176,7 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "max-message-size = 100", "f: sip[0].max-message-size: must be from 1024 to 1048576"},
         {whole + "srtp = \"on\"", "f: sip[0].srtp: must be one of off, optional, required"},
         {whole + "ringback = 1", "f: sip[0].ringback: expected true or false"},
+        {whole + "conference = \"77\"", "f: sip[0].conference: needs media.mode \"relay\""},
         {whole + "tcp-idle = 0", "f: sip[0].tcp-idle: must be from 1 to 86400"},
     };
     for (Row const& row : rows)
@@ -189,6 +190,12 @@ TEST(SipConfiguration, AMediaAddressThatNobodyReachesIsRefusedWhereMediaAreRelay
     EXPECT_EQ(COMPLAINT(text, true), "f: sip[0].media-address: '0.0.0.0' cannot be told to peers");
     EXPECT_EQ(COMPLAINT(std::string(LEAST) + "media-address = \"host\"\n", true),
               "f: sip[0].media-address: 'host' is not an address");
+}
+
+TEST(SipConfiguration, AConferenceHasANumberWhereMediaAreRelayed)
+{
+    EXPECT_EQ(READ(std::string(LEAST) + "conference = \"77\"\n", true).at(0).conference, "77");
+    EXPECT_EQ(READ(LEAST, true).at(0).conference, "");
 }
 
 TEST(SipConfiguration, TheCodecsAreThoseOfTheListInItsOrder)

@@ -8,9 +8,12 @@
                                         which codecs it was one after the other, "a,mu"
     speech.py speak SEED SECONDS FILE   writes a WAV that sounds like somebody speaking, each seed another one
     speech.py key DIGITS FILE           writes a WAV of these digits as they sound (ITU-T Q.23), after 2 s of silence
+    speech.py hum HERTZ SECONDS FILE    writes a WAV of one tone; of silence, for 0 Hz
     speech.py overhear SAID PORT PACKETS
                                         takes so many packets of RTP on a port of 127.0.0.1: whether each is one of SRTP
                                         with mu-law in it, and none bears what was said in the clear
+    speech.py tone HEARD HERTZ LEAST MOST
+                                        whether a tone is heard in so many frames of 20 ms, and nothing else
     speech.py distance SAID HEARD DECIBELS [OTHER]
                                         whether what was heard sounds like what was said: by how much the levels of 17
                                         bands from 100 Hz to 3.4 kHz differ in the middle of all frames, the general
@@ -218,7 +221,32 @@ def of_mu_law(code):
     return -value if code & 128 else value
 
 
+def tone(path, hertz, least, most):
+    """Of the frames in which anything is heard."""
+    samples = at_8000(path)
+    count = others = 0
+    for at in range(0, len(samples) - FRAME, FRAME):
+        frame = samples[at : at + FRAME]
+        energy = sum(s * s for s in frame)
+        if energy < FRAME * 10000:
+            continue
+        part = sum(s * cmath.exp(-2j * math.pi * hertz * i / 8000) for i, s in enumerate(frame))
+        if 2 * abs(part) ** 2 / FRAME > 0.8 * energy:
+            count += 1
+        else:
+            others += 1
+    print(f"{count} frames of {hertz} Hz, {others} of something else")
+    if not least <= count <= most or others > 10:
+        sys.exit(f"{path}: expected {least} to {most} and nothing else")
+
+
+def hum(hertz, seconds, path):
+    write(path, [int(8000 * math.sin(2 * math.pi * hertz * i / 8000)) for i in range(8000 * seconds)])
+
+
 COMMANDS = {
+    "hum": lambda hertz, seconds, path: hum(float(hertz), int(seconds), path),
+    "tone": lambda heard, hertz, least, most: tone(heard, float(hertz), int(least), int(most)),
     "overhear": lambda said, port, packets: overhear(said, int(port), int(packets)),
     "say": lambda seed, seconds, path: say(int(seed), int(seconds), path),
     "key": key,

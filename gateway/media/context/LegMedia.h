@@ -3,6 +3,7 @@
 #include "media/context/MediaDescription.h"
 #include "media/context/MediaObserver.h"
 #include "media/file/RecordedSound.h"
+#include "media/quality/QualityCell.h"
 #include "platform/base/TYPtr.h"
 #include "platform/media/MG_Tones.h"
 
@@ -64,8 +65,8 @@ public:
     /// is decoded for it, so it costs.
     void detectDigits(bool isWanted);
 
-    /// What the datapath told last; all 0 and absent before. At most five seconds old.
-    MediaQuality const& getQuality() const { return m_quality; }
+    /// As of a tenth of a second ago as long as something comes, else of a second. At once.
+    MediaQuality getQuality() const { return m_cell != nullptr ? m_cell->read() : MediaQuality(); }
     /// Has the observer told of the quality at once, a turn of each loop later.
     void askQuality();
 
@@ -80,5 +81,5 @@ private:
     MediaAddress m_rtp;
     MediaAddress m_rtcp;
     MediaDescription m_description;
-    MediaQuality m_quality;
+    std::shared_ptr<QualityCell const> m_cell;
 };

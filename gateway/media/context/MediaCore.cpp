@@ -101,6 +101,7 @@ try
     leg->m_rtcp = ports.getRtcp();
     m_legs[leg->m_number] = leg.get();
     MediaOrder::Make make{call.m_number, createTermination(leg->m_number, std::move(ports))};
+    leg->m_cell = make.leg->getCell();
     return getLoopOf(call)->post(std::move(make)) ? std::move(leg) : nullptr;
 }
 catch (std::bad_alloc const&)
@@ -154,8 +155,7 @@ void MediaCore::take(MediaNews const& news)
         leg.m_observer.onSpeech();
         break;
     case MediaNews::QUALITY:
-        leg.m_quality = news.quality;
-        leg.m_observer.onQuality(leg.m_quality);
+        leg.m_observer.onQuality(news.quality);
         break;
     }
 }

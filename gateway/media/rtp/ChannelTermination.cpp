@@ -40,7 +40,7 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
         std::uint32_t const timestamp = READ_32(block);
         RtpHeader{false, A_LAW, m_sequence++, timestamp, m_source}.write(octets.data());
         takeRtp(std::span(octets).first(RtpHeader::LENGTH + BLOCK), from, batch, now);
-        sendRelayed(batch);
+        sendRelayed(batch, now);
     }
 }
 

@@ -13,6 +13,7 @@ namespace
 {
 constexpr long long MILLISECOND = 1000000; // ns
 constexpr long long SECOND = 1000 * MILLISECOND;
+constexpr long long PUBLISHING = 100 * MILLISECOND;
 constexpr long long TELLING = 5 * SECOND; // between two records of quality
 } // namespace
 
@@ -77,13 +78,24 @@ void RtpTermination::receiveRtp(DatagramBatch& batch, long long now)
         else
             takeRtp(batch.getOctets(i), from, batch, now);
     }
-    sendRelayed(batch);
+    sendRelayed(batch, now);
 }
 
-void RtpTermination::sendRelayed(DatagramBatch& batch)
+void RtpTermination::sendRelayed(DatagramBatch& batch, long long now)
 {
-    if (m_partner != nullptr)
-        batch.send(m_partner->getRtp());
+    publish(now);
+    if (m_partner == nullptr)
+        return;
+    batch.send(m_partner->getRtp());
+    m_partner->publish(now);
+}
+
+void RtpTermination::publish(long long now)
+{
+    if (now - m_lastPublished < PUBLISHING && m_lastPublished != 0)
+        return;
+    m_lastPublished = now;
+    getQuality();
 }
 
 void RtpTermination::sendDatagram(std::span<unsigned char const> octets, DatagramBatch* batch)
@@ -283,6 +295,7 @@ bool RtpTermination::open(std::span<unsigned char>& octets,
 void RtpTermination::attend(long long now)
 {
     tellEvent(m_heard.expire(now));
+    publish(now);
     checkSilence(now);
     if (m_reports.isDue(now))
         sendReport(false, now);
@@ -334,5 +347,6 @@ MediaQuality const& RtpTermination::getQuality()
             EModel::SCORE(m_description.formats.begin()->codec.getCodec(), expected == 0 ? 0 : 100 * lost / expected,
                           m_quality.roundTripTime.value_or(0) / 2.0);
     }
+    m_cell->write(m_quality);
     return m_quality;
 }

@@ -3,6 +3,7 @@
 #include "media/context/MediaDescription.h"
 #include "media/context/MediaOptions.h"
 #include "media/file/RecordedSound.h"
+#include "media/quality/QualityCell.h"
 #include "media/rtp/DatagramBatch.h"
 #include "media/rtp/RtcpReports.h"
 #include "media/rtp/RtpLatch.h"
@@ -100,11 +101,13 @@ public:
     void end(long long now);
     /// As of now.
     MediaQuality const& getQuality();
+    /// Where it can be read from elsewhere, a tenth of a second old at most as long as something comes or goes.
+    std::shared_ptr<QualityCell const> getCell() const { return m_cell; }
 
 protected:
     void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
     /// What was queued for the partner goes out.
-    void sendRelayed(DatagramBatch& batch);
+    void sendRelayed(DatagramBatch& batch, long long now);
 
 private:
     /// An RTP packet on its way out; `batch`: where it is queued, null: it goes at once.
@@ -131,6 +134,7 @@ private:
     void sendAudibleEvent(TelephoneEventSender::Packet const& packet, long long now);
     void sendTone(long long now);
     void sendSound(long long now);
+    void publish(long long now);
     void checkSilence(long long now);
 
     unsigned long long m_number;
@@ -142,7 +146,9 @@ private:
     bool m_isDescribed = false;
     VoipCodecAndMode::Mode m_mode = VoipCodecAndMode::INACTIVE;
     long long m_lastArrival = 0; // or when it began to be waited for
-    long long m_lastTold = 0;    // of the quality
+    long long m_lastPublished = 0;
+    std::shared_ptr<QualityCell> const m_cell = std::make_shared<QualityCell>();
+    long long m_lastTold = 0; // of the quality
     long long m_silence;
     RtpLatch m_latch;
     RtpLatch m_rtcpLatch;

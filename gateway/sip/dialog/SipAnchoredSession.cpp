@@ -3,6 +3,7 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "media/context/CallMedia.h"
 #include "media/rtp/RtpRoutes.h"
+#include "properties/CC_PropertyCallProgressTone.h"
 #include "properties/CC_PropertyCodec.h"
 #include "properties/CC_PropertyCodecNegotiating.h"
 #include "properties/CC_PropertyCodecs.h"
@@ -228,6 +229,7 @@ std::string SipAnchoredSession::readForInvite(bool hadOffer)
     {
         m_forInvite = makeAnswer(*m_offerOfInvite);
         tell(*m_offerOfInvite);
+        followTone();
     }
     return m_forInvite;
 }
@@ -307,6 +309,19 @@ void SipAnchoredSession::followCall()
     CallMedia* const call = m_leg != nullptr ? CallMedia::OF(m_adapter.getDatapathContext()) : nullptr;
     if (call != nullptr && call != &m_leg->getCall())
         m_leg->moveTo(*call);
+    followTone();
+}
+
+/// The other side asks for it as a property, and ends it so; who has not been answered yet cannot hear it.
+void SipAnchoredSession::followTone()
+{
+    auto const* const asked =
+        CC_PropertyCallProgressTone::FROM(m_adapter.getPeerProperty(CC_PropertyId::CALL_PROGRESS_TONE));
+    auto const tone = asked != nullptr ? asked->getTone() : MG_Tones::ECallProgressTone::NONE;
+    if (m_leg == nullptr || !m_isAgreed || tone == m_tone)
+        return;
+    m_tone = tone;
+    m_leg->playTone(tone);
 }
 
 /// Who holds may be silent.

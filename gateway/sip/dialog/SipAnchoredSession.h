@@ -57,7 +57,10 @@ public:
     void followCall() override;
     void noteInfo(bool isTaken) override;
     bool sendDigit(char digit, unsigned int milliseconds) override;
-    MediaQuality const* getQuality() const override { return m_leg != nullptr ? &m_leg->getQuality() : nullptr; }
+    std::optional<MediaQuality> getQuality() const override
+    {
+        return m_leg != nullptr ? std::optional<MediaQuality>(m_leg->getQuality()) : std::nullopt;
+    }
     void end() override { m_leg.reset(); }
 
 private:
@@ -66,6 +69,7 @@ private:
     // --- MediaObserver
     void onSilence(unsigned int seconds) override;
     void onDigit(char digit, unsigned int milliseconds) override;
+    void onQuality(MediaQuality const&) override { m_wire.onQuality(); }
 
     SipCodecChoice::Across getAcross() const;
     std::optional<SipStream> read(std::string const& description) const;
@@ -80,6 +84,7 @@ private:
     void addTo(CC_PropertyContainer& own, SipStream const& far) const;
     bool takesEvents() const;
     void settleDigits();
+    void followTone();
     bool isInUnison() const;
     bool isOurTurn() const;
 
@@ -99,5 +104,6 @@ private:
     bool m_isAgreed = false;
     bool m_isOffering = false;
     bool m_isInfoTaken = false;
+    MG_Tones::ECallProgressTone::Type m_tone = MG_Tones::ECallProgressTone::NONE; // that our peer hears
     VoipCodecAndMode m_codec;
 };

@@ -41,7 +41,7 @@ public:
     void followCall() override {}
     void noteInfo(bool) override {}
     bool sendDigit(char, unsigned int) override { return false; }
-    MediaQuality const* getQuality() const override { return nullptr; }
+    std::optional<MediaQuality> getQuality() const override { return std::nullopt; }
     void end() override {}
 
 private:

@@ -3,6 +3,7 @@
 #include "media/quality/MediaQuality.h"
 
 #include <new>
+#include <optional>
 #include <string>
 
 class CC_PropertyContainer;
@@ -28,6 +29,8 @@ public:
     /// Our peer has keyed it in: '0' to '9', '*', '#', 'A' to 'D', '!' for a flash of the hook. `milliseconds`: 0: not
     /// known.
     virtual void onDigit(char digit, unsigned int milliseconds) = 0;
+    /// Every five seconds.
+    virtual void onQuality() = 0;
 };
 
 /// Who makes and answers the offers of a dialog: the other side of the call, when the peers exchange media themselves
@@ -93,8 +96,8 @@ public:
     virtual void noteInfo(bool isTaken) = 0;
     /// The other side's digit, for our peer: whether it goes there with the media; else the dialog is to tell it.
     virtual bool sendDigit(char digit, unsigned int milliseconds) = 0;
-    /// The last known; null without media.
-    virtual MediaQuality const* getQuality() const = 0;
+    /// Of the media until now; nothing without any.
+    virtual std::optional<MediaQuality> getQuality() const = 0;
     /// Gives up what `open()` has taken.
     virtual void end() = 0;
 };

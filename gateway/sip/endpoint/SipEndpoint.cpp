@@ -233,12 +233,20 @@ bool SipEndpoint::sayWhy(SipCause const& cause)
 /// While the leg is still in the call, so that the other side sees it.
 void SipEndpoint::recordQuality()
 {
-    std::optional<CC_QoS> const record = m_quality.getRecord(m_session.getQuality());
+    std::optional<MediaQuality> const measured = m_session.getQuality();
+    std::optional<CC_QoS> const record = m_quality.getRecord(measured ? &*measured : nullptr);
     if (!record)
         return;
     if (isTraced())
         trace("did  " + TEXT_OF(CC_PropertyQoS(CC_PropertyId::QUALITY_OF_SERVICE, *record)));
     std::ignore = m_adapter.setOwnQoS(*record); // without memory the call ends without a record
+}
+
+/// Every ten seconds while the call is up, besides that of its end.
+void SipEndpoint::onQuality()
+{
+    if (m_dialog == SipDialogState::UP && m_isInCall && ++m_qualitiesTold % 2 == 0)
+        handle([&] { recordQuality(); });
 }
 
 SipDialogState::Action SipEndpoint::advance(SipDialogState::Event event)

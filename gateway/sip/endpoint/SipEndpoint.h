@@ -108,6 +108,7 @@ private:
     void followPeer();
     void answer();
     void answerWith(std::string const& session);
+    bool isToRingBack() const;
     void answerProvisionally(int status, char const* phrase);
     void repeatProvisional();
     bool answerReliably(int status, char const* phrase, std::string const& session);
@@ -128,6 +129,7 @@ private:
     void onProvisional(unsigned int status, sip_t const* response);
     void onAnswer(sip_t const* response);
     void takeAnswer(sip_t const* response);
+    void addTone(CC_PropertyContainer& own, bool isRinging);
     void addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding);
     void onRejected(unsigned int status, sip_t const* response);
     void onAnswerTimeout();
@@ -164,6 +166,7 @@ private:
     void giveUp() override;
     void onSilence(unsigned int seconds) override;
     void onDigit(char digit, unsigned int milliseconds) override;
+    void onQuality() override;
     void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
     void forgetOffer();
     void endOffers();
@@ -173,6 +176,7 @@ private:
     // SipEndpoint_Transfer.cpp
     int onRefer(nta_incoming_t* transaction, sip_t const* request);
     void joinCallOf(SipEndpoint& other);
+    void callIn(std::string const& number);
     void askPeerToTransfer(std::string const& number, std::string const& headers);
     void notifyReferrer(unsigned int status, char const* phrase);
     void endReferral(QCause cause);
@@ -241,6 +245,7 @@ private:
     XCode writeOwn(CC_PropertyContainer const& properties);
     static std::string REASON_OF(sip_t const* message);
     char const* getContact() const; // of the dialog
+    bool isInConference() const;
     static std::string SESSION_OF(sip_t const* message);
     template <class Property>
     Property const* getPeer(unsigned int id) const
@@ -271,6 +276,7 @@ private:
     QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
+    bool m_asksForTone = false;    // called side
     bool m_allowsReliable = false; // calling side: our peer
     bool m_wantsReliable = false;
     unsigned int m_unacknowledged = 0; // reliable responses without their PRACK
@@ -285,6 +291,7 @@ private:
     bool m_isFinished = false;
     std::string m_transferAfterAnswer; // the number
     SipQuality m_quality;
+    unsigned int m_qualitiesTold = 0;
     SipOfferAnswer m_negotiation;
     SipDirectSession m_direct{m_adapter, *this};
     SipAnchoredSession m_anchored;

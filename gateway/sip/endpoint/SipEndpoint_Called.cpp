@@ -4,6 +4,7 @@
 #include "calls/CC_Call.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyCallProgressTone.h"
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyString.h"
 #include "properties/CC_PropertyUnsigned.h"
@@ -17,6 +18,7 @@
 
 #include <algorithm>
 #include <tuple>
+#include <utility>
 
 using namespace SipProperty;
 
@@ -175,8 +177,20 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
         noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::RELIABLE, session);
     if (status == 183) // an announcement or a tone may come even when the description did earlier
         ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true));
+    bool const hasData = m_hasEarlyMedia || status == 183 || !session.empty();
+    m_hasEarlyMedia = hasData;
+    addTone(own, isRinging && !hasData);
     ADD_STATE(own, isRinging ? CC_PropertyCallLegState::ALERTING : CC_PropertyCallLegState::PROCEEDING);
     std::ignore = writeOwn(own); // what memory refuses the other side does not hear; the next answer may fit
+}
+
+/// Whether the other side is to have its peer hear that ours rings, since ours lets nothing be heard itself.
+void SipEndpoint::addTone(CC_PropertyContainer& own, bool isRinging)
+{
+    if (std::exchange(m_asksForTone, isRinging) != isRinging)
+        ADD(own, CC_PropertyCallProgressTone(CC_PropertyId::CALL_PROGRESS_TONE,
+                                             isRinging ? MG_Tones::ECallProgressTone::RINGING
+                                                       : MG_Tones::ECallProgressTone::NONE));
 }
 
 /// What an answer with a session description brings: the description, and that media may come.
@@ -244,6 +258,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     addFork(own, fork);
     ADD_CONNECTED(own, response);
     addSession(own, session, true);
+    addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
     if (!m_session.isAgreed())
         giveUp();

@@ -3,6 +3,7 @@
 
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
+#include "properties/CC_PropertyCallProgressTone.h"
 #include "properties/CC_PropertyId.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
@@ -238,7 +239,8 @@ void SipEndpoint::followPeer()
     m_hadPeer = true;
     auto const* const data = getPeer<CC_PropertyBoolean>(CC_PropertyId::PROVIDES_DATA);
     auto const* const fork = getPeer<CC_PropertyUnsigned>(SipPropertyId::FORK);
-    bool const hasData = data != nullptr && data->getValue();
+    bool const isRungBack = isToRingBack();
+    bool const hasData = (data != nullptr && data->getValue()) || isRungBack;
     unsigned int const number = fork != nullptr ? static_cast<unsigned int>(fork->getValue()) : 0;
     bool const isNews = number != m_fork; // of another party
     if (isNews)
@@ -266,9 +268,17 @@ void SipEndpoint::followPeer()
     }
     bool const hadEarlyMedia = std::exchange(m_hasEarlyMedia, m_hasEarlyMedia || hasData);
     if (state->getState() == CC_PropertyCallLegState::ALERTING && !std::exchange(m_hasRung, true))
-        answerProvisionally(SIP_180_RINGING);
+        isRungBack ? answerProvisionally(SIP_183_SESSION_PROGRESS) : answerProvisionally(SIP_180_RINGING);
     else if (hasData && (!hadEarlyMedia || isNewSession))
         answerProvisionally(SIP_183_SESSION_PROGRESS);
+}
+
+/// Whether our peer is to hear a tone of ours meanwhile.
+bool SipEndpoint::isToRingBack() const
+{
+    auto const* const tone = getPeer<CC_PropertyCallProgressTone>(CC_PropertyId::CALL_PROGRESS_TONE);
+    return tone != nullptr && tone->getTone() != MG_Tones::ECallProgressTone::NONE && m_hasOffer &&
+           m_interface.getConfiguration().ringsBack && m_interface.getEnvironment().host.relaysMedia;
 }
 
 void SipEndpoint::answerProvisionally(int status, char const* phrase)

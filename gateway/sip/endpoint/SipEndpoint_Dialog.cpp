@@ -3,6 +3,7 @@
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
 #include "sip/message/SipBody.h"
+#include "sip/message/SipPropertyId.h"
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
 {
@@ -127,6 +128,14 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
     return text;
 }
 
-char const* SipEndpoint::getContact() const { return m_interface.getContact(m_isOverTcp).c_str(); }
+char const* SipEndpoint::getContact() const
+{
+    return (isInConference() ? m_interface.getFocusContact(m_isOverTcp) : m_interface.getContact(m_isOverTcp)).c_str();
+}
+
+bool SipEndpoint::isInConference() const
+{
+    return m_adapter.getCallPropertyUnfiltered(SipPropertyId::CONFERENCE) != nullptr;
+}
 
 std::string SipEndpoint::SESSION_OF(sip_t const* message) { return SipBody::READ(message).session; }

@@ -15,6 +15,7 @@
 #include "properties/CC_PropertyUnsigned.h"
 #include "services/CC_ServiceBlindTransfer.h"
 #include "services/CC_ServiceBlindTransferStatus.h"
+#include "services/CC_ServiceConferenceRefer.h"
 
 #include <algorithm>
 #include <strings.h>
@@ -92,7 +93,9 @@ int SipEndpoint::onRefer(nta_incoming_t* transaction, sip_t const* request)
     m_isReferring = true;
     notifyReferrer(100, "Trying");
     SipEndpoint* const other = replaces != nullptr ? m_interface.findReplaced(replaces) : nullptr;
-    if (other != nullptr)
+    if (isInConference())
+        callIn(number);
+    else if (other != nullptr)
         joinCallOf(*other);
     else
         askPeerToTransfer(number, HEADERS_FOR_TARGET(home.get(), request, replaces));
@@ -105,6 +108,15 @@ void SipEndpoint::joinCallOf(SipEndpoint& other)
     XCode const result = m_adapter.transfer(other.m_adapter, true);
     trace(std::string("did  transfer, ") + (result.isOk() ? "joined" : "refused"));
     endReferral(result.isOk() ? QCause::NONE : QCause::TEMPORARY_FAILURE);
+}
+
+/// Another party is to come into the conference (RFC 4579, 5.5); its focus tells what becomes of it.
+void SipEndpoint::callIn(std::string const& number)
+{
+    CC_ServiceConferenceRefer refer(STRING(number));
+    trace("did  ask for " + number + " to be called in");
+    m_timer.start((m_interface.getConfiguration().answerTimeout + 10) * 1000);
+    m_adapter.invokeSynchronousService(refer);
 }
 
 void SipEndpoint::askPeerToTransfer(std::string const& number, std::string const& headers)
@@ -138,7 +150,7 @@ void SipEndpoint::endReferral(QCause cause)
     unsigned int const status = cause == QCause::NONE ? 200 : SipCause::STATUS_OF_CAUSE(cause);
     if (m_dialog == SipDialogState::UP)
         notifyReferrer(status, cause == QCause::NONE ? "OK" : sip_status_phrase(static_cast<int>(status)));
-    if (cause != QCause::NONE)
+    if (cause != QCause::NONE || isInConference())
         return;
     endOffers();
     m_timer.start(PATIENCE * m_interface.getConfiguration().t1);

@@ -6,6 +6,7 @@
 #include "platform/eventloop/TYEvent.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipEndpoint.h"
+#include "sip/endpoint/SipFocus.h"
 #include "sip/endpoint/SipRules.h"
 #include "sip/message/SipAddress.h"
 #include "sip/message/SipBody.h"
@@ -48,6 +49,8 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
     , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
     , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
+    , m_focus(m_contact + ";isfocus")
+    , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
@@ -56,12 +59,15 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
 {
     environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
+    if (!configuration.conference.empty())
+        m_conference = std::make_unique<SipFocus>(*this);
 }
 
 SipInterface::~SipInterface()
 {
     std::erase(m_environment.interfaces, this);
     m_endpoints.clear();
+    m_conference.reset();
     m_cleanUpEvent->destroy();
 }
 
@@ -183,7 +189,10 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     std::string const number = called.getUser();
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
-    std::string const* const to = m_environment.host.routing.find(m_configuration.name, number);
+    bool const isConference = m_conference != nullptr && number == m_configuration.conference;
+    std::string const conference = isConference ? m_conference->getName().c_str() : "";
+    std::string const* const to =
+        isConference ? &conference : m_environment.host.routing.find(m_configuration.name, number);
     if (to == nullptr)
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;

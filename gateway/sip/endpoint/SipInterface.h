@@ -16,6 +16,7 @@
 #include <vector>
 
 class SipEndpoint;
+class SipFocus;
 class TYEvent;
 struct SipCause;
 
@@ -50,6 +51,8 @@ public:
     nta_agent_t* getAgent() const { return m_agent.get(); }
     /// Where the peer reaches us, for what goes over TCP or UDP.
     std::string const& getContact(bool isOverTcp) const { return isOverTcp ? m_tcpContact : m_contact; }
+    /// The same for what belongs to a conference (RFC 4579, 4).
+    std::string const& getFocusContact(bool isOverTcp) const { return isOverTcp ? m_tcpFocus : m_focus; }
     /// The methods that we take. @{
     sip_allow_t const* getAllow() const { return m_allow; }
     sip_supported_t const* getSupported() const { return m_supported; }
@@ -93,6 +96,8 @@ private:
     IpAddress m_mediaAddress;
     std::string m_contact;
     std::string m_tcpContact;
+    std::string m_focus;
+    std::string m_tcpFocus;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
     sip_supported_t* m_supported;
@@ -107,5 +112,6 @@ private:
     };
     std::unordered_map<SipEndpoint*, Owned> m_endpoints;
     std::vector<SipEndpoint*> m_finished;
+    std::unique_ptr<SipFocus> m_conference; // null: none
     TY::Time m_peerBusyUntil;
 };

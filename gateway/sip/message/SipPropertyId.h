@@ -22,6 +22,9 @@ inline constexpr unsigned int FORK = CC_PropertyId::FIRST_OF_MODULES + 4;
 /// target
 inline constexpr unsigned int HEADERS_FOR_TARGET = CC_PropertyId::FIRST_OF_MODULES + 5;
 
+/// CC_PropertyBoolean, of a call: it is a conference
+inline constexpr unsigned int CONFERENCE = CC_PropertyId::FIRST_OF_MODULES + 6;
+
 /// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.
 XCode DECLARE();

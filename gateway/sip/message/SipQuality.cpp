@@ -89,8 +89,6 @@ int NUMBER(unsigned long long counter) { return static_cast<int>(counter); } // 
 
 void RECORD(CC_QoS& record, Rtp& rtp, MediaQuality const& measured)
 {
-    if (measured.receivedPackets == 0 && measured.sentPackets == 0)
-        return; // nothing was told yet
     auto& statistics = rtp.setPresent(rtp.m_statistics);
     auto& local = statistics.setPresent(statistics.m_local);
     local.m_rxPackets = NUMBER(measured.receivedPackets);

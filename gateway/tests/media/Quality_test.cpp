@@ -82,6 +82,23 @@ TEST_F(Quality, IsOfWhatIsReceivedSoFar)
     EXPECT_EQ(b.leg->getQuality(), b.quality);
 }
 
+TEST_F(Quality, CanBeReadAtOnceWhileSomethingComes)
+{
+    connect(PCMA);
+    EXPECT_EQ(a.leg->getQuality().receivedPackets, 0u) << "nothing has come";
+    for (unsigned int i = 0; i < 20; ++i)
+    {
+        a.far.say(SPEECH);
+        pass(20);
+    }
+    MediaQuality const quality = a.leg->getQuality();
+    EXPECT_GE(quality.receivedPackets, 15u);
+    EXPECT_EQ(quality.receivedPackets * SPEECH.size(), quality.receivedOctets);
+    EXPECT_EQ(quality.lostPackets, 0u);
+    EXPECT_TRUE(quality.meanOpinionScore.has_value());
+    EXPECT_GE(b.leg->getQuality().sentPackets, 15u);
+}
+
 TEST_F(Quality, IsToldEveryFiveSecondsUnasked)
 {
     connect(PCMA);

@@ -27,6 +27,10 @@ talk() { # CODECS of alice, of bob; the number of the call; "speak": not noise
 talk PCMA PCMU 1
 expect_trace 'told peer Current Codec=PCMA'
 expect_trace 'told peer Current Codec=PCMU'
+# as far as the record of a call of four seconds can be: each side's own, up to its last tenth of a second
+for codec in PCMA PCMU; do
+    expect_trace "did  Quality-Of-Service=MOS: [34].*$codec 20ms.*Transmitted packets: (1[5-9]|2[0-9])[0-9],.*Received packets: (1[5-9]|2[0-9])[0-9],"
+done
 expect_speech alice bob 150 a,mu
 expect_speech bob alice 150 mu,a
 rm -r "$WORK/alice" "$WORK/bob"
