@@ -300,7 +300,6 @@ void Interpreter::perform(Operation const& operation)
         newCall(operation);
         break;
     case Code::CHANGE_UNTOLD:
-        m_world.m_mayViewsDiffer = true;
         changeUntold(operation);
         break;
     case Code::ACCESSOR:
@@ -487,7 +486,8 @@ XCode Interpreter::setOfAdapter(Operation const& operation)
     Property const written = WRITTEN(operation, 1);
     if (operation.code == Code::SET_PEER && written.id == CC_PropertyId::STATE && !STORES_PEERS_STATE(*adapter))
         m_world.m_mayPeersBeStale = true;
-    m_world.m_mayViewsDiffer = m_world.m_mayViewsDiffer || operation.code == Code::SET_PEER;
+    if (operation.code == Code::SET_PEER)
+        m_world.line(operation[0]).hasWrittenToPeer = true;
     XCode result;
     if (way % 4 < 2)
     {

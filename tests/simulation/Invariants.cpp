@@ -89,8 +89,8 @@ void CHECK_PEER(World& world, unsigned int number, Line const& line)
 void CHECK_VIEW_OF_PEER(World& world, unsigned int number, Line const& line)
 {
     CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
-    if (!CAN_BE_COMPARED || peer == nullptr || world.m_hadOutputFilters || world.m_mayViewsDiffer ||
-        world.m_hasPropertyActed || world.m_wasShortOfMemory)
+    if (!CAN_BE_COMPARED || peer == nullptr || world.m_hadOutputFilters || line.hasWrittenToPeer ||
+        peer->mayChangeUntold() || world.m_hasPropertyActed || world.m_wasShortOfMemory)
         return;
     for (CC_Property const& held : peer->getProperties())
     {

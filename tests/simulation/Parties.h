@@ -206,6 +206,7 @@ struct Line
     AdapterObserver observer;
     std::unique_ptr<CC_CallAdapter> adapter;
     CC_CallAdapterE164* e164 = nullptr;
+    bool hasWrittenToPeer = false; // its view may hold what the peer's leg refuses
     bool isOverriding = false;
     bool isObserved = false;
     unsigned int adapters = 0; // so far, to tell one from the next
