@@ -77,7 +77,7 @@ public:
                 std::string called(number.view());
                 Call& call = m_calls.emplace_back();
                 call.handle = pri_new_call(stack);
-                call.channel = 31 - static_cast<int>(m_calls.size());
+                call.channel = 17 + static_cast<int>(m_calls.size() % 15); // the first are free again by the last
                 pri_sr_set_channel(request, call.channel, 0, 0);
                 pri_sr_set_bearer(request, PRI_TRANS_CAP_SPEECH, PRI_LAYER_1_ALAW);
                 pri_sr_set_called(request, called.data(), PRI_NATIONAL_ISDN, 1);
