@@ -53,6 +53,7 @@ start_exchange() {
         echo "capture = \"$CAPTURE\""
         cat
     } >"$WORK/plan.toml"
+    : >"$WORK/exchange.out"
     "$EXCHANGE" "$WORK/plan.toml" >"$WORK/exchange.out" 2>"$WORK/exchange.log" &
     exchange_pid=$!
     local i

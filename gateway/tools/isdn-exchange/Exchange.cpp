@@ -95,7 +95,8 @@ int Exchange::WRITE(pri* stack, void* buffer, int length)
     return length;
 }
 
-void Exchange::after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work)
+void Exchange::after(unsigned int milliseconds, CallHandle const& call,
+                     std::function<void(CallHandle const&)> const& work)
 {
     std::weak_ptr<Call> const watched = call;
     m_timers.emplace(m_now + milliseconds,

@@ -68,7 +68,7 @@ private:
     static int READ(pri* stack, void* buffer, int length);
     static int WRITE(pri* stack, void* buffer, int length);
     bool isHit(unsigned int perCent);
-    void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work);
+    void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> const& work);
     void takeEvent(pri_event& event);
     CallHandle find(q931_call* handle) const;
     void onRing(pri_event_ring const& ring);
