@@ -3,6 +3,7 @@
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKeys.h"
 #include "properties/CC_PropertyString.h"
 
 #include <cstdio>
@@ -160,14 +161,24 @@ CC_PropertyFilter* PrefixFilter::clone() const { return new (std::nothrow) Prefi
 
 XCode PrefixFilter::apply(CC_PropertyContainer& properties) const
 {
-    auto* const number = dynamic_cast<CC_PropertyString*>(properties.get(CC_PropertyId::E164_NUMBER));
-    if (number != nullptr && number->getValue().startsWith("00"))
-        number->setValue(String(number->getValue().view().substr(2)));
-    return XCode::OK;
+    auto const number = properties.get(Key::E164_NUMBER);
+    if (!number || !number->getValue().startsWith("00"))
+        return XCode::OK;
+    return properties.set(Key::E164_NUMBER, String(number->getValue().view().substr(2)));
 }
 
 InfoContainer& PrefixFilter::getInfo(InfoContainer& info, unsigned int, unsigned int, unsigned int, unsigned int,
                                      String const&) const
 {
     return info;
+}
+
+CC_PropertyFilter* WritingPrefixFilter::clone() const { return new (std::nothrow) WritingPrefixFilter; }
+
+XCode WritingPrefixFilter::apply(CC_PropertyContainer& properties) const
+{
+    auto* const number = CC_PropertyString::FROM(properties.get(CC_PropertyId::E164_NUMBER));
+    if (number != nullptr && number->getValue().startsWith("00"))
+        number->setValue(String(number->getValue().view().substr(2)));
+    return XCode::OK;
 }

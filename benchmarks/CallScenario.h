@@ -129,7 +129,7 @@ private:
     Exchange& m_right;
 };
 
-/// A filter as modules have them: it takes a number's international prefix away.
+/// A filter as modules have them: it takes a number's international prefix away, and writes only when there is one.
 class PrefixFilter : public CC_PropertyFilter
 {
 public:
@@ -137,4 +137,12 @@ public:
     XCode apply(CC_PropertyContainer& properties) const override;
     InfoContainer& getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level, unsigned int maxDetail,
                            unsigned int detail, String const& prefix) const override;
+};
+
+/// The same, but it asks for the number so that it may write to it: it counts as changed whatever comes of it.
+class WritingPrefixFilter : public PrefixFilter
+{
+public:
+    CC_PropertyFilter* clone() const override;
+    XCode apply(CC_PropertyContainer& properties) const override;
 };

@@ -1,6 +1,8 @@
 // What it costs to record: a leg's change with and without, nobody observing, and a record alone (a leg's name).
 #include "CallScenario.h"
 #include "calls/CC_CallLeg.h"
+#include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyString.h"
 #include "recorder/CC_Recorder.h"
 
 #include <benchmark/benchmark.h>

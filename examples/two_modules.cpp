@@ -1,4 +1,4 @@
-// Two signalling modules hold a call: one dials, the other accepts, rings and answers, the first hangs up.
+// Two signalling modules hold a call: one dials, the other accepts, rings, answers and hangs up.
 #include "adapters/CC_CallAdapter.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/CallControl.h"
@@ -48,12 +48,10 @@ int main()
     Module sip("sip"), isdn("isdn");
     if (!sip.m_adapter.dial("SWITCH", "isdn", "4989123", {}, {}, {}, nullptr).isOk())
         return 1;
-    for (State::State const state : {State::ALERTING, State::CONNECTED, State::RELEASED})
-    {
-        loop.runTurn(); // tells each side what the other has become
-        std::ignore = isdn.m_adapter.setOwnProperty(State(CC_PropertyId::STATE, state));
-    }
-    for (Module* module : {&isdn, &sip})
-        module->m_adapter.drop(QCause::NORMAL_CALL_CLEARING, 0), loop.runTurn(); // the last one ends the call
+    loop.runTurn(); // tells each side what the other has become
+    for (auto const state : {State::ALERTING, State::CONNECTED})
+        std::ignore = isdn.m_adapter.setOwnProperty(State(CC_PropertyId::STATE, state)), loop.runTurn();
+    for (Module* module : {&isdn, &sip}) // drop releases a side: the other hears of it, and the last one ends the call
+        module->m_adapter.drop(QCause::NORMAL_CALL_CLEARING, 0), loop.runTurn();
     std::printf("calls left: %u\n", CallControl::GET_NUMBER_OF_CALLS());
 }

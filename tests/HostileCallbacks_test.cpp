@@ -142,6 +142,25 @@ TEST_F(HostileCallbacks, TheRebootManagementMayDestroyTheContextThatAsksForTheLo
     EXPECT_EQ(CallControl::ACQUIRE_CALL("SWITCH"), nullptr);
     settle();
     EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0) << "the pool that asked for it never had a call";
+}
+
+TEST_F(HostileCallbacks, ALockThatEndsItsContextLeavesThatOfTheCallsThatWereAcquiredMeanwhile)
+{
+    FakeRebootMgmt reboot;
+    CC_Call* inside = nullptr;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        inside = CallControl::ACQUIRE_CALL("SWITCH");
+        CallControl::DESTROY_CONTEXT("SWITCH");
+    };
+    EXPECT_EQ(CallControl::ACQUIRE_CALL("SWITCH"), nullptr);
+    ASSERT_NE(inside, nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1) << "a call outlives its pool, and the lock stays with it";
+    inside->defer();
+    settle();
+    EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
 }
 
 TEST_F(HostileCallbacks, TheRebootManagementMayDestroyTheContextThatGivesTheLockBack)

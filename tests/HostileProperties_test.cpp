@@ -425,3 +425,36 @@ TEST_F(HostileProperties, ClearingEndsThoughAnEndingPropertyComesBackForEver)
     *deeds = {};
     act = nullptr;
 }
+
+TEST_F(HostileProperties, AnAdapterDroppedByAnyOfTheClonesOfAPropertySeesNothing)
+{
+    for (bool const isCalleeDropped : {false, true})
+        for (bool const areSeveral : {false, true})
+            for (unsigned int last = 1; last < 12; ++last)
+            {
+                Party anna("anna"), bert("bert");
+                connect(anna, bert);
+                Party& dropped = isCalleeDropped ? bert : anna;
+                unsigned int left = last;
+                deeds->onClone = [&]
+                {
+                    if (--left == 0)
+                        dropped.hangUp();
+                };
+                std::ignore = areSeveral ? anna.adapter->setOwnProperties(several(1))
+                                         : anna.adapter->setOwnProperty(acting(1)); // refused if its leg went
+                settle();
+                *deeds = {};
+                for (Party const* const party : {&anna, &bert})
+                {
+                    CC_PropertyContainer seen;
+                    EXPECT_EQ(party->adapter->getOwnProperties(seen, CC_PropertyContainer::ALL_GROUPS), XCode::OK);
+                    EXPECT_EQ(party->adapter->getPeerProperties(seen, CC_PropertyContainer::ALL_GROUPS), XCode::OK);
+                    EXPECT_EQ(party->adapter->getCallProperties(seen, CC_PropertyContainer::ALL_GROUPS), XCode::OK);
+                    bool const isIdle = party->adapter->getOwnCallLeg() == nullptr;
+                    EXPECT_TRUE(!isIdle || seen.isEmpty())
+                        << party->name.c_str() << ", clone " << last << ", of several: " << areSeveral;
+                }
+                expectNothingLeft({&anna, &bert});
+            }
+}

@@ -123,18 +123,21 @@ void MEASURE_STEPS(World& world, Modules& modules, OtherCalls& others)
 /// The called sides of two calls are connected with each other, or all but one of the legs brought into one call.
 void MEASURE_TRANSFER(char const* step, World& world, Modules& modules, bool isConference)
 {
-    TwoPartyCall first(modules.left, modules.right);
-    TwoPartyCall second(modules.left, modules.right);
-    for (TwoPartyCall* const call : {&first, &second})
     {
-        call->dial();
-        call->connect();
+        TwoPartyCall first(modules.left, modules.right);
+        TwoPartyCall second(modules.left, modules.right);
+        for (TwoPartyCall* const call : {&first, &second})
+        {
+            call->dial();
+            call->connect();
+        }
+        world.settle();
+        Steps::begin(step);
+        MUST(first.m_caller.transfer(second.m_caller, !isConference), "transfer");
+        Steps::end();
+        world.settle();
     }
-    world.settle();
-    Steps::begin(step);
-    MUST(first.m_caller.transfer(second.m_caller, !isConference), "transfer");
-    Steps::end();
-    world.settle();
+    world.settle(); // or what is measured next would clean up after these
 }
 
 void MEASURE_FLOOR()
@@ -167,9 +170,14 @@ int main(int argc, char** argv)
     Modules plain("1");
     Modules stepwise("2", nullptr, &Steps::next);
     CC_PropertyFilterContainer twoFilters;
+    CC_PropertyFilterContainer twoWritingFilters;
     for (int i = 0; i < 2; ++i)
+    {
         MUST(twoFilters.addFilter(PrefixFilter()), "addFilter");
+        MUST(twoWritingFilters.addFilter(WritingPrefixFilter()), "addFilter");
+    }
     Modules filtering("3", &twoFilters);
+    Modules writing("4", &twoWritingFilters);
 
     OtherCalls others(world, plain, calls);
     for (int i = 0; i < 2; ++i)
@@ -179,6 +187,7 @@ int main(int argc, char** argv)
         MEASURE_TRANSFER("conference", world, plain, true);
         MEASURE_WHOLE_CALL("whole call", world, plain);
         MEASURE_WHOLE_CALL("whole call, two filters at each end", world, filtering);
+        MEASURE_WHOLE_CALL("whole call, two filters at each end that write", world, writing);
         MUST(CC_Recorder::START(), "start of the recorder");
         MEASURE_WHOLE_CALL("whole call, recorded", world, plain);
         MEASURE_WHOLE_CALL("whole call, two filters at each end, recorded", world, filtering);

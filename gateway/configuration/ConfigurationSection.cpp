@@ -108,6 +108,14 @@ unsigned int ConfigurationSection::number(char const* key, unsigned int fallback
     return static_cast<unsigned int>(value);
 }
 
+bool ConfigurationSection::flag(char const* key) const
+{
+    toml::node const* const node = m_table->keys.get(key);
+    if (node != nullptr && !node->is_boolean())
+        refuse(key, "expected true or false");
+    return node != nullptr && node->as_boolean()->get();
+}
+
 std::string ConfigurationSection::oneOf(char const* key, char const* fallback,
                                         std::initializer_list<char const*> allowed) const
 {

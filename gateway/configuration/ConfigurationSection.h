@@ -41,6 +41,7 @@ public:
     std::string text(char const* key, std::string const& fallback) const;
     std::string neededText(char const* key) const; ///< not empty
     unsigned int number(char const* key, unsigned int fallback, unsigned int least, unsigned int most) const;
+    bool flag(char const* key) const; ///< false where it is not
     std::string oneOf(char const* key, char const* fallback, std::initializer_list<char const*> allowed) const;
     /// Of a list that, where it is, has one at least.
     std::vector<std::string> texts(char const* key, std::vector<std::string> fallback) const;

@@ -110,6 +110,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "detect-digits",
+                   "srtp",
+                   "ringback",
                    "transfer",
                    "media-address",
                    "session-expires",
@@ -130,6 +133,12 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);
     interface.transfersOnWire = section.oneOf("transfer", "dial", {"dial", "refer"}) == "refer";
     READ_CODECS(section, interface);
+    std::string const srtp = section.oneOf("srtp", "off", {"off", "optional", "required"});
+    interface.security = srtp == "off"        ? SipStream::PLAIN
+                         : srtp == "optional" ? SipStream::OPTIONAL
+                                              : SipStream::SECURED;
+    interface.ringsBack = section.flag("ringback");
+    interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);
     interface.sessionExpires = section.number("session-expires", interface.sessionExpires, 0, 86400);

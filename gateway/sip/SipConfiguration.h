@@ -3,6 +3,7 @@
 #include "configuration/AddressRange.h"
 #include "configuration/SocketAddress.h"
 #include "platform/media/MG_Rtp.h"
+#include "sip/dialog/SipStream.h"
 
 #include <string>
 #include <vector>
@@ -35,6 +36,9 @@ struct SipConfiguration
     /// That are offered and taken where media are relayed, the best liked first.
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
+    SipStream::Security security = SipStream::PLAIN; ///< SRTP towards the peer; where media are relayed
+    bool ringsBack = false;       ///< a caller hears a tone of ours while the callee is alerted without media
+    bool detectsDigits = false;   ///< in what its peers say; where media are relayed
     bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
 
     /// Where the peers reach it.

@@ -52,6 +52,9 @@ TEST(SipConfiguration, WhatIsLeftOutHasItsDefault)
     EXPECT_EQ(a.sessionExpires, 1800u);
     EXPECT_EQ(a.leastExpires, 90u);
     EXPECT_EQ(a.longestCall, 0u);
+    EXPECT_EQ(a.security, SipStream::PLAIN);
+    EXPECT_FALSE(a.ringsBack);
+    EXPECT_FALSE(a.detectsDigits);
 }
 
 TEST(SipConfiguration, EveryKeyIsRead)
@@ -66,6 +69,9 @@ session-expires = 0
 min-se = 120
 max-call-duration = 3600
 media-address = "192.0.2.9"
+srtp = "required"
+ringback = true
+detect-digits = true
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -91,6 +97,9 @@ answer-timeout = 30
     EXPECT_EQ(b.leastExpires, 120u);
     EXPECT_EQ(b.longestCall, 3600u);
     EXPECT_EQ(b.mediaAddress, "192.0.2.9");
+    EXPECT_EQ(b.security, SipStream::SECURED);
+    EXPECT_TRUE(b.ringsBack);
+    EXPECT_TRUE(b.detectsDigits);
     EXPECT_EQ(b.t1, 100u);
     EXPECT_EQ(b.t1x64, 3200u);
     EXPECT_EQ(b.answerTimeout, 30u);
@@ -165,6 +174,8 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "allow = [\"host\"]", "f: sip[0].allow: 'host' is not an address"},
         {whole + "allow = [\"10.0.0.1/8\"]", "f: sip[0].allow: '10.0.0.1/8' has bits beyond its prefix"},
         {whole + "max-message-size = 100", "f: sip[0].max-message-size: must be from 1024 to 1048576"},
+        {whole + "srtp = \"on\"", "f: sip[0].srtp: must be one of off, optional, required"},
+        {whole + "ringback = 1", "f: sip[0].ringback: expected true or false"},
         {whole + "tcp-idle = 0", "f: sip[0].tcp-idle: must be from 1 to 86400"},
     };
     for (Row const& row : rows)

@@ -77,3 +77,13 @@ TEST(SipSessionTimer, ARefusalRaisesWhatIsAskedForOnce)
     EXPECT_FALSE(timer.raise(3600));
     EXPECT_FALSE(timer.raise(0));
 }
+
+TEST(SipSessionTimer, TwoRefreshesInARowThatReachNobodyAreTheSessionsEnd)
+{
+    SipSessionTimer timer(1800, 90);
+    timer.takeResponse({});
+    EXPECT_FALSE(timer.miss());
+    timer.takeResponse({});
+    EXPECT_FALSE(timer.miss()) << "the one before was answered";
+    EXPECT_TRUE(timer.miss());
+}

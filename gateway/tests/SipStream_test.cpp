@@ -149,3 +149,46 @@ TEST(SipStreamAgreed, IsNothingWithoutACommonCodec)
 {
     EXPECT_EQ(SipStream::AGREED(OURS({{Codec::PCMA, 8}}), STREAM("m=audio 4000 RTP/AVP 0\r\n")).formats.getSize(), 0u);
 }
+
+namespace
+{
+std::string const CRYPTO = "a=crypto:1 AES_CM_128_HMAC_SHA1_80 inline:d0RmdmcmVCspeEc3QGZiNWpVLFJhQX1cfHAwJSoj\r\n";
+std::string const PLAIN_VOICE = "m=audio 4000 RTP/AVP 8\r\n";
+std::string const SECURED_VOICE = "m=audio 4002 RTP/SAVP 8\r\n" + CRYPTO;
+} // namespace
+
+TEST(SipStreamSecured, IsTakenWhereItMayBe)
+{
+    EXPECT_FALSE(SipStream::READ(SESSION(SECURED_VOICE)).has_value());
+    EXPECT_TRUE(SipStream::READ(SESSION(SECURED_VOICE), SipStream::OPTIONAL).has_value());
+    EXPECT_TRUE(SipStream::READ(SESSION(SECURED_VOICE), SipStream::SECURED).has_value());
+    EXPECT_TRUE(SipStream::READ(SESSION(PLAIN_VOICE + CRYPTO), SipStream::SECURED).has_value());
+    EXPECT_TRUE(SipStream::READ(SESSION(PLAIN_VOICE), SipStream::OPTIONAL).has_value());
+    EXPECT_FALSE(SipStream::READ(SESSION(PLAIN_VOICE), SipStream::SECURED).has_value());
+    EXPECT_FALSE(SipStream::READ(SESSION("m=audio 4002 RTP/SAVP 8\r\n"), SipStream::OPTIONAL).has_value()) << "no key";
+    EXPECT_TRUE(SipStream::READ(SESSION(PLAIN_VOICE + CRYPTO))->keys.empty());
+}
+
+TEST(SipStreamSecured, WinsOverThePlainOneBesideIt)
+{
+    EXPECT_EQ(SipStream::READ(SESSION(PLAIN_VOICE + SECURED_VOICE), SipStream::OPTIONAL)->place, 1u);
+    EXPECT_EQ(SipStream::READ(SESSION(SECURED_VOICE + PLAIN_VOICE), SipStream::OPTIONAL)->place, 0u);
+    EXPECT_EQ(SipStream::READ(SESSION(SECURED_VOICE + PLAIN_VOICE))->place, 1u);
+}
+
+TEST(SipStreamSecured, HasTheKeysUnderTheTagOfTheAnswer)
+{
+    SipStream ours = OURS({{Codec::PCMA, 8}});
+    ours.isSecuredProfile = true;
+    ours.keys = {SipCrypto::MAKE(1, MediaKeys::AES_CM_128_HMAC_SHA1_80),
+                 SipCrypto::MAKE(2, MediaKeys::AES_CM_128_HMAC_SHA1_32)};
+    std::string const text = ours.write({1, 1});
+    EXPECT_TRUE(HAS(text, "m=audio 30000 RTP/SAVP 8 101")) << text;
+    EXPECT_TRUE(HAS(text, "a=crypto:" + ours.keys[1].write())) << text;
+    SipStream far = ours;
+    far.keys = {SipCrypto::MAKE(2, MediaKeys::AES_CM_128_HMAC_SHA1_32)};
+    EXPECT_EQ(SipStream::AGREED(ours, far).keys,
+              (MediaKeys{MediaKeys::AES_CM_128_HMAC_SHA1_32, ours.keys[1].key, far.keys[0].key}));
+    far.keys[0].suite = MediaKeys::AES_CM_128_HMAC_SHA1_80; // not what that tag was
+    EXPECT_EQ(SipStream::AGREED(ours, far).keys, MediaKeys{});
+}

@@ -147,6 +147,17 @@ expect_trace() {
     fail "no line of the trace matches: $1"
 }
 
+# expect_no_calls SECONDS: after which no call is up any more
+expect_no_calls() {
+    local i
+    for ((i = 0; i < $1 * 5; i++)); do
+        kill -USR1 $gateway_pid
+        sleep 0.2
+        [[ $(grep -E '^state: ' "$WORK/gateway.out" | tail -n 1) == "state: 0 calls up" ]] && return 0
+    done
+    fail "$(grep -E '^state: ' "$WORK/gateway.out" | tail -n 1) after $1 s"
+}
+
 # expect_end COUNTERS: the gateway ends, by itself or when asked (stop_gateway), with status 0 and nothing left over.
 expect_end() {
     local status=0

@@ -2,11 +2,11 @@
 # Each has a folder of its name in $WORK: said.wav, and heard.wav when it has ended.
 
 # start_phone NAME PORT GATEWAY-PORT RTP-PORT [PARAMETER-OF-ACCOUNT]: commands for it go to the port 32 above its own. Before
-# it may stand CODECS, as baresip names them, SOUND: "say" or "speak" (speech.py), and MODULES besides.
+# it may stand CODECS, as baresip names them, SAID: how speech.py makes what it says, without the file, and MODULES besides.
 start_phone() {
     local folder="$WORK/$1" module
     mkdir -p "$folder"
-    python3 "$HERE/speech.py" "${SOUND:-say}" "$2" "${SECONDS_OF_SOUND:-60}" "$folder/said.wav"
+    python3 "$HERE/speech.py" ${SAID:-say $2 60} "$folder/said.wav"
     cat >"$folder/config" <<END
 sip_listen $HOST:$2
 rtp_ports $4-$(($4 + 3))
@@ -71,4 +71,15 @@ expect_voice() {
     [[ -n $heard ]] || fail "phone $2 heard nothing"
     echo -n "$1 to $2: "
     python3 "$HERE/speech.py" distance "$WORK/$1/said.wav" "$heard" "$3" "$WORK/$2/said.wav" || fail "speech from $1 to $2"
+}
+
+# expect_digits NAME DIGITS: the phone was told these by telephone events, each once and in this order
+expect_digits() {
+    local heard i
+    for ((i = 0; i < 60; i++)); do
+        heard=$(tr '\r' '\n' <"$WORK/$1.log" | grep -a "received event: .* (end=1)" | sed "s/.*event: '\(.\)'.*/\1/" | tr -d '\n')
+        [[ $heard == "$2" ]] && return 0
+        sleep 0.05
+    done
+    fail "phone $1 was told '$heard' instead of '$2'"
 }

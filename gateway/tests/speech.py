@@ -7,6 +7,10 @@
                                         without a bit changed, one after the other and none before its turn; LAWS: in
                                         which codecs it was one after the other, "a,mu"
     speech.py speak SEED SECONDS FILE   writes a WAV that sounds like somebody speaking, each seed another one
+    speech.py key DIGITS FILE           writes a WAV of these digits as they sound (ITU-T Q.23), after 2 s of silence
+    speech.py overhear SAID PORT PACKETS
+                                        takes so many packets of RTP on a port of 127.0.0.1: whether each is one of SRTP
+                                        with mu-law in it, and none bears what was said in the clear
     speech.py distance SAID HEARD DECIBELS [OTHER]
                                         whether what was heard sounds like what was said: by how much the levels of 17
                                         bands from 100 Hz to 3.4 kHz differ in the middle of all frames, the general
@@ -15,6 +19,7 @@
 import cmath
 import math
 import random
+import socket
 import struct
 import sys
 import wave
@@ -50,6 +55,16 @@ def speak(seed, seconds, path):
         samples += [0] * source.randint(200, 1200)
     peak = max(abs(sample) for sample in samples)
     write(path, [sample * 12000 // peak for sample in samples[: 8000 * seconds]])
+
+
+def key(digits, path):
+    samples = [0] * 16000
+    for digit in digits:
+        row, column = divmod("123A456B789C*0#D".index(digit), 4)
+        pair = [(697, 770, 852, 941)[row], (1209, 1336, 1477, 1633)[column]]
+        samples += [int(sum(6000 * math.sin(2 * math.pi * f * i / 8000) for f in pair)) for i in range(800)]
+        samples += [0] * 1600
+    write(path, samples + [0] * 16000)
 
 
 def write(path, samples):
@@ -116,7 +131,7 @@ def compare(said_path, heard_path, wanted, laws="mu"):
         sys.exit(f"{heard_path}: that is less than {wanted}")
 
 
-HOP = 80  # samples at 8 kHz
+HOP = 160  # samples at 8 kHz
 WINDOW = 256
 BANDS = [(3 + 6 * i, 9 + 6 * i) for i in range(17)]  # of the bins of a window
 
@@ -152,7 +167,7 @@ def measure(said, heard):
     """At the delay where they are nearest; in the frames in which somebody speaks. 99: they never are near."""
     best = 99.0
     speaking = [i for i, levels in enumerate(heard) if max(levels) > 75]
-    if len(speaking) < 100:
+    if len(speaking) < 50:
         return best
     for delay in range(-len(heard) // 2, len(said) - len(heard) // 2):
         some = [i for i in speaking[:: max(1, len(speaking) // 40)] if 0 <= i + delay < len(said)]
@@ -173,17 +188,40 @@ def median_distance(said, heard, delay, frames):
 
 
 def distance(said_path, heard_path, limit, other_path=None):
-    heard = band_levels(at_8000(heard_path))[100:400]
-    found = measure(band_levels(at_8000(said_path)[: 8000 * 12]), heard)
+    heard = band_levels(at_8000(heard_path))[50:200]
+    found = measure(band_levels(at_8000(said_path)[: 8000 * 8]), heard)
     print(f"{found:.1f} dB from what was said")
     if found > limit:
         sys.exit(f"{heard_path}: that is more than {limit}")
-    if other_path and measure(band_levels(at_8000(other_path)[: 8000 * 12]), heard) < 2 * limit:
+    if other_path and measure(band_levels(at_8000(other_path)[: 8000 * 8]), heard) < 2 * limit:
         sys.exit(f"{heard_path}: it is as near to {other_path}")
 
 
+def overhear(said_path, port, wanted):
+    codes = {through_mu_law(value): code for code in range(256) for value in [of_mu_law(code)]}
+    said = bytes(codes[through_mu_law(sample)] for sample in read(said_path))
+    listener = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
+    listener.bind(("127.0.0.1", port))
+    listener.settimeout(10)
+    for _ in range(wanted):
+        packet = listener.recv(2000)
+        if len(packet) != 12 + FRAME + 10:
+            sys.exit(f"a packet has {len(packet)} octets")
+        if said.find(packet[12 : 12 + FRAME]) >= 0:
+            sys.exit("speech in the clear")
+    print(f"{wanted} packets, none in the clear")
+
+
+def of_mu_law(code):
+    code = ~code & 255
+    value = (((code & 15) * 2 + 33) << (code >> 4 & 7)) * 4 - 132
+    return -value if code & 128 else value
+
+
 COMMANDS = {
+    "overhear": lambda said, port, packets: overhear(said, int(port), int(packets)),
     "say": lambda seed, seconds, path: say(int(seed), int(seconds), path),
+    "key": key,
     "speak": lambda seed, seconds, path: speak(int(seed), int(seconds), path),
     "compare": lambda said, heard, frames, *laws: compare(said, heard, int(frames), *laws),
     "distance": lambda said, heard, limit, *other: distance(said, heard, float(limit), *other),

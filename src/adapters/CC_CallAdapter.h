@@ -299,7 +299,8 @@ private:
     template <class Target, class Written>
     XCode writeFiltered(CC_PropertyView& view, Target* target, Written const& written);
     template <class Target>
-    XCode writeCopy(CC_PropertyView& view, Target& target, CC_PropertyFilterContainer const& filters);
+    XCode writeCopy(Attempt const& attempt, CC_PropertyView& view, Target& target,
+                    CC_PropertyFilterContainer const& filters);
     template <class Target, class Written>
     XCode writeUnfiltered(CC_PropertyView& view, Target* target, Written const& written);
     XCode setOwnPropertyPlainly(CC_Property const& property);
@@ -315,6 +316,8 @@ private:
     static void GIVE_UP_RELEASED(CC_CallLeg& leg);
     void observeCall(CC_Call& call);
     void unobserveCall();
+    template <class Take>
+    void takeOverForeign(CC_PropertyView& view, Take const& take);
     void updateOwnCallLeg(CC_Flags const& changed);
     void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);

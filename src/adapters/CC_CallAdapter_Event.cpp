@@ -30,7 +30,7 @@ void CC_CallAdapter::Event::record(CC_RecordWriter& recorder, CC_Flags const& fl
             ++count;
             return true;
         });
-    recorder.skip(std::min(count, CC_RecordFormat::MOST_LISTED_IDS) * sizeof *listed);
+    recorder.goOnAt(reinterpret_cast<char*>(listed + std::min(count, CC_RecordFormat::MOST_LISTED_IDS)));
     recorder.setDetail(count);
     recorder.end();
 }

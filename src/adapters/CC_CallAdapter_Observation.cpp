@@ -154,6 +154,23 @@ CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 }
 } // namespace
 
+/// As `take`, which lets the view take over properties with a module's among them: they may end the attempt.
+template <class Take>
+__attribute__((noinline)) void CC_CallAdapter::takeOverForeign(CC_PropertyView& view, Take const& take)
+{
+    Attempt const attempt(*this);
+    take();
+    std::ignore = attempt.emptyWhenIdle(view); // nobody asks what became of it
+}
+
+namespace
+{
+bool IS_CALLING_NOBODY(CC_PropertyView const& view, CC_PropertyContainer const& source)
+{
+    return source.isSelfContained() && view.getProperties().isSelfContained();
+}
+} // namespace
+
 void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
 {
     CC_CallLeg const& leg = *m_ownCallLeg;
@@ -161,9 +178,11 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
     if (filters == nullptr)
     {
         CC_PropertyView::Told const told = TOLD(leg, &changed);
-        if (!std::exchange(m_isWritingOwn, false) || !m_ownView.hasWritten(leg.getProperties(), told))
-            m_ownView.assign(leg.getProperties(), told);
-        return;
+        if (std::exchange(m_isWritingOwn, false) && m_ownView.hasWritten(leg.getProperties(), told))
+            return;
+        if (IS_CALLING_NOBODY(m_ownView, leg.getProperties()))
+            return m_ownView.assign(leg.getProperties(), told);
+        return takeOverForeign(m_ownView, [&] { m_ownView.assign(leg.getProperties(), told); });
     }
     filterOwnCallLeg(changed, *filters);
 }
@@ -181,6 +200,8 @@ __attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& 
     XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
         m_ownView.assignMarked(copy.get(), copy.settle(), 0);
+    if (attempt.isOver())
+        std::ignore = attempt.emptyWhenIdle(m_ownView); // as above
 }
 
 /// Tells the module. One class for the views of peer and call, so that what follows them is there once.
@@ -202,6 +223,23 @@ private:
     CC_Flags const* m_changed;
 };
 
+/// Brings a view up to date with its source and tells the ids that differ. When a filter brings about another refresh,
+/// that one is the later.
+[[gnu::always_inline]] inline void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source,
+                                                              unsigned long long serial,
+                                                              CC_PropertyView::Told const& told,
+                                                              OnDifference const& onDifference)
+{
+    CC_PropertyFilterContainer const* const filters = getOutputFilters();
+    if (filters == nullptr)
+    {
+        if (IS_CALLING_NOBODY(view, source))
+            return view.follow(source, told, onDifference);
+        return takeOverForeign(view, [&] { view.follow(source, told, onDifference); });
+    }
+    filterView(view, source, serial, told, onDifference, *filters);
+}
+
 /// `changed`: the ids of which the peer tells; null when the peer is another.
 void CC_CallAdapter::updatePeerCallLeg(CC_Flags const* changed)
 {
@@ -218,20 +256,6 @@ void CC_CallAdapter::updateCall()
         updateView(m_callView, call->getProperties(), 0, {}, {*this, nullptr});
 }
 
-/// Brings a view up to date with its source and tells the ids that differ. When a filter brings about another refresh,
-/// that one is the later.
-void CC_CallAdapter::updateView(CC_PropertyView& view, CC_PropertyContainer const& source, unsigned long long serial,
-                                CC_PropertyView::Told const& told, OnDifference const& onDifference)
-{
-    CC_PropertyFilterContainer const* const filters = getOutputFilters();
-    if (filters == nullptr)
-    {
-        view.follow(source, told, onDifference);
-        return;
-    }
-    filterView(view, source, serial, told, onDifference, *filters);
-}
-
 /// Apart, so that a call without filters does not pay for it.
 __attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view, CC_PropertyContainer const& source,
                                                           unsigned long long serial, CC_PropertyView::Told const& told,
@@ -246,6 +270,8 @@ __attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view,
     std::ignore = filters.applyFilters(copy.get()); // what the filters leave is what the module sees
     if (!attempt.isOver() && refresh == m_refreshes)
         view.followMarked(copy.get(), copy.settle(), told.number, onDifference);
+    if (attempt.isOver())
+        std::ignore = attempt.emptyWhenIdle(view);
 }
 
 void CC_CallAdapter::mark(unsigned int id)

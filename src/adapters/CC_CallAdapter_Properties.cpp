@@ -51,19 +51,18 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
     if (!seen.isOk() || attempt.isOver())
-        return XCode::FAILURE;
+        return attempt.emptyWhenIdle(view);
     CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return WRITE(*target, written);
-    return writeCopy(view, *target, *filters);
+    return writeCopy(attempt, view, *target, *filters);
 }
 
 /// Apart, so that a call without filters does not pay for it.
 template <class Target>
-__attribute__((noinline)) XCode CC_CallAdapter::writeCopy(CC_PropertyView& view, Target& target,
+__attribute__((noinline)) XCode CC_CallAdapter::writeCopy(Attempt const& attempt, CC_PropertyView& view, Target& target,
                                                           CC_PropertyFilterContainer const& filters)
 {
-    Attempt const attempt(*this);
     CC_FilterNotes notes;
     CC_Writing const throughFilters(notes);
     Copy const copy(attempt, *this, &view == &m_ownView ? Kept::OWN_INPUT : Kept::OTHER_INPUT, view);
@@ -80,7 +79,7 @@ XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Wri
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
-    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
+    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : attempt.emptyWhenIdle(view);
 }
 
 CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
@@ -133,7 +132,7 @@ XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
     Attempt const attempt(*this);
     XCode const seen = m_ownView.write(property);
     if (!seen.isOk() || attempt.isOver())
-        return XCode::FAILURE;
+        return attempt.emptyWhenIdle(m_ownView);
     m_isWritingOwn = true;
     XCode const result = WRITE(*m_ownCallLeg, property);
     if (!attempt.isOver())

@@ -243,9 +243,13 @@ void CC_CallPool::addReloadGracefulLock()
         if (m_rebootMgmt.isEmpty())
             return;
     }
+    TYLifeline::Watch const self(m_lifeline);
+    TYPPtr<IRebootMgmt> const own(m_rebootMgmt);
     RECORD(CC_RecordFormat::Kind::LOCK_TAKEN);
-    ASK(m_rebootMgmt, [](IRebootMgmt& rebootMgmt)
+    ASK(own, [](IRebootMgmt& rebootMgmt)
         { std::ignore = rebootMgmt.addGracefulLock(LOCK_OWNER, LOCK_REASON, 0); }); // a refusal stops no call
+    if (!self.isAlive())
+        RELEASE_LOCK(own); // nobody else would
 }
 
 void CC_CallPool::releaseReloadGracefulLock() { RELEASE_LOCK(m_rebootMgmt); }

@@ -198,11 +198,10 @@ __attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property* stored,
     if (!isUndisturbed)
         return replaceOfAnyKind(property);
     recorder.beginChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, property.getId());
-    CC_PropertyBrief::APPEND(recorder, *kind, stored);
-    CC_PropertyBrief::APPEND(recorder, *kind, &property);
-    XCode const result = m_properties.replace(stored, property);
-    result.isOk() ? recorder.end() : recorder.cancel();
-    return result;
+    CC_PropertyBrief::APPEND(recorder, *kind, stored, property);
+    bool const isStored = stored != nullptr ? kind->assign(*stored, property) : m_properties.appendCopy(property);
+    isStored ? recorder.end() : recorder.cancel();
+    return isStored ? XCode::OK : XCode::NO_ELEMENT;
 }
 
 /// As above, where others are called: they may change what is stored, and end the recording.
@@ -257,10 +256,11 @@ XCode CC_CallLeg::setMarked(CC_PropertyContainer const& properties, Marks& marks
 /// or not all, is stored.
 bool CC_CallLeg::storeMarked(CC_PropertyContainer const& properties, Marks& marks, CC_Flags& flags, XCode& result)
 {
-    if (marks == CC_PropertyContainer::ALL_MARKED || IS_LOGGED() || CC_RecordWriter::ON() != nullptr ||
-        !m_properties.isSelfContained() || !properties.isSelfContained() ||
-        properties.getNumberOfProperties() != m_properties.getNumberOfProperties())
+    if (marks == CC_PropertyContainer::ALL_MARKED || IS_LOGGED() || !m_properties.isSelfContained() ||
+        !properties.isSelfContained() || properties.getNumberOfProperties() != m_properties.getNumberOfProperties())
         return false;
+    CC_RecordWriter::Batch const together;
+    bool const isRecorded = CC_RecordWriter::ON() != nullptr;
     unsigned int differing = 0;
     CC_Property const* state = nullptr;
     auto const storeNext = [&](CC_Property& stored, CC_Property const& property, unsigned int mark)
@@ -273,7 +273,7 @@ bool CC_CallLeg::storeMarked(CC_PropertyContainer const& properties, Marks& mark
         differing |= mark;
         if (property.getId() == CC_PropertyId::STATE)
             state = &property;
-        else if (kind->assign(stored, property))
+        else if (isRecorded ? replaceRecorded(&stored, property).isOk() : kind->assign(stored, property))
             markChanged(property.getId(), flags);
         else if (result.isOk())
             result = XCode::REFUSED;

@@ -92,23 +92,19 @@ CC_CallLeg* CC_Call::findPushBackTarget() const
     if (m_callLegs.getSize() != 2)
         return nullptr;
     CC_CallLeg* const legs[2] = {m_callLegs[0], m_callLegs[1]};
-    CC_PropertyString const* networks[2];
-    CC_PropertyUnsigned const* ids[2];
-    for (unsigned int i = 0; i < 2; ++i)
-    {
-        CC_PropertyContainer const& properties = legs[i]->getProperties();
-        networks[i] = CC_PropertyString::FROM(properties.get(CC_PropertyId::NETWORK));
-        ids[i] = CC_PropertyUnsigned::FROM(properties.get(CC_PropertyId::CALL_LEG_ID));
-        if (networks[i] == nullptr || ids[i] == nullptr)
-            return nullptr;
-    }
-    if (!(networks[0]->getValue() == networks[1]->getValue()))
-        return nullptr;
     int const levels[2] = {legs[0]->getActivityLevel(), legs[1]->getActivityLevel()};
     if (std::max(levels[0], levels[1]) < CC_PropertyCallLegState::CONNECTED ||
         std::min(levels[0], levels[1]) < CC_PropertyCallLegState::ALERTING)
         return nullptr;
+    auto const* const network = CC_PropertyString::FROM(legs[0]->getProperties().get(CC_PropertyId::NETWORK));
+    auto const* const other = CC_PropertyString::FROM(legs[1]->getProperties().get(CC_PropertyId::NETWORK));
+    if (network == nullptr || other == nullptr || network->getValue() != other->getValue())
+        return nullptr;
+    auto const* const id = CC_PropertyUnsigned::FROM(legs[0]->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+    auto const* const otherId = CC_PropertyUnsigned::FROM(legs[1]->getProperties().get(CC_PropertyId::CALL_LEG_ID));
+    if (id == nullptr || otherId == nullptr)
+        return nullptr;
     if (levels[0] != levels[1])
         return levels[0] < levels[1] ? legs[0] : legs[1];
-    return ids[0]->getValue() < ids[1]->getValue() ? legs[0] : legs[1];
+    return id->getValue() < otherId->getValue() ? legs[0] : legs[1];
 }

@@ -17,12 +17,39 @@ namespace
 {
 using CC_RecordFormat::Brief;
 
+/// Both ends of so many octets, which together are all when these are no more than twice as many.
+template <std::size_t SIZE>
+void COPY_ENDS(char* to, std::string_view text)
+{
+    std::memcpy(to, text.data(), SIZE);
+    std::memcpy(to + text.size() - SIZE, text.data() + text.size() - SIZE, SIZE);
+}
+
+/// Without the detour through the C library, which costs more than the octets. REQUIRES: no more than 32.
+void COPY(char* to, std::string_view text)
+{
+    static_assert(Brief::MOST_TEXT <= 32);
+    if (text.size() >= 16)
+        COPY_ENDS<16>(to, text);
+    else if (text.size() >= 8)
+        COPY_ENDS<8>(to, text);
+    else if (text.size() >= 4)
+        COPY_ENDS<4>(to, text);
+    else if (text.size() >= 2)
+        COPY_ENDS<2>(to, text);
+    else if (text.size() == 1)
+        *to = text[0];
+}
+
 void SET_TEXT(Brief& brief, std::string_view text)
 {
+    constexpr std::size_t WORD = CC_RecordFormat::WORDS_OF(1);
     constexpr std::size_t MOST_LENGTH = std::numeric_limits<std::uint16_t>::max();
     brief.textLength = static_cast<std::uint16_t>(std::min(text.size(), MOST_LENGTH));
     brief.textSize = static_cast<std::uint8_t>(std::min<std::size_t>(text.size(), Brief::MOST_TEXT));
-    std::memcpy(brief.text, text.data(), brief.textSize);
+    if (std::size_t const begun = brief.textSize % WORD; begun != 0) // the same value leaves the same octets
+        std::memset(brief.text + brief.textSize - begun, 0, WORD);
+    COPY(brief.text, {text.data(), brief.textSize});
 }
 
 void SET(Brief& brief, unsigned long long number)
@@ -112,43 +139,51 @@ void DESCRIBE(CC_PropertyParametrizedString const& property, Brief& brief)
     SET_TEXT(brief, property.getContent().content);
 }
 
-using Describe = void (*)(CC_Property const&, Brief&);
+/// Describes so many properties of one class, one behind the other; null: no property. Returns the place behind them.
+using Describe = char* (*)(char* place, CC_Property const* const* properties, std::size_t count);
+
+template <class Property>
+char* DESCRIBE_EACH(char* place, CC_Property const* const* properties, std::size_t count)
+{
+    for (std::size_t i = 0; i < count; ++i)
+    {
+        auto& brief = *new (place) Brief;
+        if (properties[i] != nullptr)
+        {
+            brief.place = static_cast<std::uint8_t>(CC_PropertyClasses::PLACE_OF<Property>());
+            DESCRIBE(static_cast<Property const&>(*properties[i]), brief);
+        }
+        place += brief.getSize();
+    }
+    return place;
+}
 
 constexpr std::array<Describe, CC_PropertyClasses::SIZE> DESCRIPTIONS = []
 {
     std::array<Describe, CC_PropertyClasses::SIZE> result{};
     std::size_t place = 0;
-    CC_PropertyClasses::FOR_EACH(
-        [&]<class Property>()
-        {
-            result[place++] = [](CC_Property const& property, Brief& brief)
-            { DESCRIBE(static_cast<Property const&>(property), brief); };
-        });
+    CC_PropertyClasses::FOR_EACH([&]<class Property>() { result[place++] = &DESCRIBE_EACH<Property>; });
     return result;
 }();
 } // namespace
 
-void CC_PropertyBrief::APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* property)
+void CC_PropertyBrief::APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* before,
+                              CC_Property const& after)
 {
-    auto& brief = *new (recorder.getPlace()) Brief;
-    if (property != nullptr)
-    {
-        brief.place = static_cast<std::uint8_t>(kind.place);
-        DESCRIPTIONS[kind.place](*property, brief);
-    }
-    recorder.skip(brief.getSize());
+    CC_Property const* const both[] = {before, &after};
+    recorder.goOnAt(DESCRIPTIONS[kind.place](recorder.getPlace(), both, 2));
 }
 
 CC_PropertyBrief::CC_PropertyBrief(CC_Property const* property)
 {
-    auto& brief = *new (m_place.data()) Brief;
     CC_PropertyKind const* const kind = property != nullptr ? CC_PropertyKind::OF(*property) : nullptr;
     if (kind != nullptr)
     {
-        brief.place = static_cast<std::uint8_t>(kind->place);
-        DESCRIPTIONS[kind->place](*property, brief);
+        m_size = static_cast<std::size_t>(DESCRIPTIONS[kind->place](m_place.data(), &property, 1) - m_place.data());
+        return;
     }
-    else if (property != nullptr)
+    auto& brief = *new (m_place.data()) Brief;
+    if (property != nullptr)
     {
         brief.place = Brief::OTHER_CLASS;
         SET_TEXT(brief, typeid(*property).name());

@@ -32,9 +32,10 @@ public:
     void recordChange(CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg,
                       unsigned int propertyId, CC_Property const* after) const;
 
-    /// The value of a property of that kind, straight into the record that is being written. Null: no property.
+    /// The values of two properties of that kind, straight into the record that is being written. Null: no property.
     /// REQUIRES: the kind is self-contained, so that nobody is called.
-    static void APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* property);
+    static void APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* before,
+                       CC_Property const& after);
 
 private:
     alignas(CC_RecordFormat::Brief) std::array<char, sizeof(CC_RecordFormat::Brief)> m_place;

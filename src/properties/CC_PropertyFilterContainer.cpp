@@ -10,6 +10,7 @@
 #include <cstring>
 #include <new>
 #include <typeinfo>
+#include <utility>
 
 namespace
 {
@@ -83,22 +84,39 @@ XCode APPLY(CC_PropertyFilter const& filter, CC_PropertyContainer& properties)
     }
 }
 
-/// What a recording keeps of the properties that a filter is given, so that what it makes different is seen afterwards.
-class Before
+} // namespace
+
+/// Notes for a recording which filter makes which property different. Without notes, because the properties are not on
+/// their way to a leg or call, it does nothing.
+///
+/// Only what the filter has had for writing is looked at, and the container is walked as a constant one: its marks tell
+/// who copies it what is to be copied again.
+class CC_PropertyFilterContainer::Changes
 {
 public:
-    explicit Before(CC_PropertyContainer const& properties)
+    Changes(CC_PropertyContainer& properties, CC_FilterNotes* notes) : m_properties(properties), m_notes(notes)
     {
-        for (CC_Property const& property : properties)
-            if (m_count < MOST)
-                new (&m_values[m_count++]) Value{property.getId(), CC_PropertyBrief(&property)};
+        if (m_notes == nullptr)
+            return;
+        m_marks = m_properties.takeMarks();
+        for (CC_Property const& property : std::as_const(m_properties))
+            add(property);
     }
-    bool isDifferent(CC_Property const& property) const
+    ~Changes() { m_properties.mark(m_marks); }
+    Changes(Changes const&) = delete;
+    Changes& operator=(Changes const&) = delete;
+
+    /// Those since the last time, as that filter's. `name`: of its class, as the compiler writes it.
+    void note(char const* name, unsigned int place)
     {
-        for (std::size_t i = 0; i < m_count; ++i)
-            if (m_values[i].value.id == property.getId())
-                return !IS_SAME(m_values[i].value.brief, CC_PropertyBrief(&property));
-        return m_count < MOST;
+        CC_PropertyContainer::Marks const marks = m_notes != nullptr ? m_properties.takeMarks() : 0;
+        if (marks == 0)
+            return;
+        m_marks = static_cast<CC_PropertyContainer::Marks>(m_marks | marks);
+        unsigned int index = 0;
+        for (CC_Property const& property : std::as_const(m_properties))
+            if ((marks & CC_PropertyContainer::MARK_AT(index++)) != 0 && hasChanged(property))
+                m_notes->add({property.getId(), place, name});
     }
 
 private:
@@ -120,26 +138,32 @@ private:
         return left.get().textSize == right.get().textSize && std::memcmp(&left.get(), &right.get(), size) == 0;
     }
 
+    bool hasChanged(CC_Property const& property)
+    {
+        for (std::size_t i = 0; i < m_count; ++i)
+        {
+            Value& known = m_values[i].value;
+            if (known.id != property.getId())
+                continue;
+            CC_PropertyBrief const before = std::exchange(known.brief, CC_PropertyBrief(&property));
+            return !IS_SAME(before, known.brief);
+        }
+        return add(property);
+    }
+    bool add(CC_Property const& property)
+    {
+        if (m_count == MOST)
+            return false;
+        new (&m_values[m_count++]) Value{property.getId(), CC_PropertyBrief(&property)};
+        return true;
+    }
+
+    CC_PropertyContainer& m_properties;
+    CC_FilterNotes* m_notes;
+    CC_PropertyContainer::Marks m_marks = 0; // which we have taken
     std::size_t m_count = 0;
     std::array<Place, MOST> m_values;
 };
-
-/// As APPLY, while changes are recorded.
-XCode APPLY_RECORDED(CC_PropertyFilter const& filter, unsigned int place, CC_PropertyContainer& properties,
-                     CC_FilterNotes* notes)
-{
-    CC_Writing const pastTheAdapter(CC_RecordFormat::Writer::FILTER);
-    if (notes == nullptr)
-        return APPLY(filter, properties);
-    char const* const name = typeid(filter).name(); // the filter may be gone afterwards
-    Before const before(properties);
-    XCode const result = APPLY(filter, properties);
-    for (CC_Property const& property : properties)
-        if (before.isDifferent(property))
-            notes->add({property.getId(), place, name});
-    return result;
-}
-} // namespace
 
 XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties) const
 {
@@ -156,17 +180,19 @@ XCode CC_PropertyFilterContainer::applyFilters(CC_PropertyContainer& properties)
     return result;
 }
 
-/// `notes`: null when the properties are not on their way to a leg or call.
 XCode CC_PropertyFilterContainer::applyRecorded(CC_PropertyContainer& properties, CC_FilterNotes* notes) const
 {
+    Changes changes(properties, notes);
     XCode result = XCode::OK;
     unsigned int place = 0;
     forEach(
         [&](CC_PropertyFilter const& filter)
         {
-            if (XCode const applied = APPLY_RECORDED(filter, place, properties, notes); result.isOk())
+            CC_Writing const pastTheAdapter(CC_RecordFormat::Writer::FILTER);
+            char const* const name = typeid(filter).name(); // the filter may be gone afterwards
+            if (XCode const applied = APPLY(filter, properties); result.isOk())
                 result = applied;
-            ++place;
+            changes.note(name, place++);
         });
     return result;
 }

@@ -51,6 +51,7 @@ public:
 
 private:
     using Element = TYList<CC_PropertyFilter*>::Element;
+    class Changes;
     template <class Visit>
     void forEach(Visit const& visit) const;
     bool isThere(Element const* element) const;

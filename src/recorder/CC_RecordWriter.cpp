@@ -8,7 +8,6 @@
 #include "recorder/CC_FilterNotes.h"
 
 #include <algorithm>
-#include <atomic>
 #include <iterator>
 #include <new>
 #include <unistd.h>
@@ -31,11 +30,6 @@ long long NANOSECONDS(TY::Time::Source source)
 /// So many octets are given up at once, where the ring has them before its end.
 constexpr std::size_t ROOM_AT_ONCE = 2048;
 
-void PUBLISH(std::uint64_t& position, std::uint64_t value)
-{
-    std::atomic_ref(position).store(value, std::memory_order_release);
-}
-
 } // namespace
 
 CC_RecordWriter& CC_RecordWriter::INSTANCE()
@@ -48,8 +42,7 @@ void CC_RecordWriter::start(void* image, std::size_t size)
 {
     m_size = size;
     m_capacity = (size - sizeof(Header)) / ALIGNMENT * ALIGNMENT;
-    m_head = m_tail = 0;
-    m_left = m_capacity;
+    m_tail = 0;
     m_header = new (image) Header{};
     m_header->version = VERSION;
     m_header->byteOrder = BYTE_ORDER_MARK;
@@ -58,7 +51,8 @@ void CC_RecordWriter::start(void* image, std::size_t size)
     m_header->realtime = NANOSECONDS(TY::Time::REALTIME);
     m_header->process = static_cast<std::uint64_t>(getpid());
     std::copy(std::begin(MAGIC), std::end(MAGIC), m_header->magic);
-    m_ring = m_at = static_cast<char*>(image) + sizeof(Header);
+    m_ring = static_cast<char*>(image) + sizeof(Header);
+    startAt(0, m_capacity);
     m_writing = nullptr;
     s_on = this;
 }
@@ -79,28 +73,10 @@ Record& CC_RecordWriter::at(std::uint64_t position) const
     return *reinterpret_cast<Record*>(m_ring + position % m_capacity);
 }
 
-void CC_RecordWriter::begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
-{
-    if (m_left < LARGEST_RECORD) [[unlikely]]
-        makeRoom();
-    CC_Moment const now = CC_Moment::NOW();
-    m_record = reinterpret_cast<Record*>(m_at);
-    m_record->stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
-    m_record->kind = kind;
-    m_record->writer = m_writing != nullptr ? m_writing->m_writer : Writer::OUTSIDE;
-    m_record->nanoseconds = now.nanoseconds;
-    m_record->call = call;
-    m_record->leg = leg;
-    m_record->turn = static_cast<std::uint32_t>(now.turn);
-    m_record->detail = detail;
-    m_at += sizeof(Record);
-    m_changedLeg = 0;
-}
-
 void CC_RecordWriter::beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
 {
     bool const mayNote = m_writing != nullptr && m_writing->m_notes != nullptr;
-    if (m_isInBatch && !mayNote && m_changedLeg == leg && m_changedBy == m_writing && m_left >= LARGEST_RECORD)
+    if (m_isInBatch && !mayNote && m_changedLeg == leg && m_changedBy == m_writing && m_at <= m_lastPlace)
         return beginAlsoChanged(propertyId);
     begin(kind, call, leg, propertyId);
     auto& change = *new (m_at) Change{};
@@ -116,11 +92,8 @@ void CC_RecordWriter::beginChange(Kind kind, unsigned long long call, unsigned l
 inline void CC_RecordWriter::beginAlsoChanged(unsigned int propertyId)
 {
     m_record = reinterpret_cast<Record*>(m_at);
-    auto& also = reinterpret_cast<AlsoChanged&>(*m_at);
-    also.stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
-    also.kind = Kind::ALSO_CHANGED;
-    also.propertyId = propertyId;
-    m_at += sizeof also;
+    new (m_at) AlsoChanged{static_cast<std::uint32_t>(m_head / ALIGNMENT), 0, Kind::ALSO_CHANGED, 0, propertyId};
+    m_at += sizeof(AlsoChanged);
 }
 
 /// The filter that made the value different, if one did.
@@ -133,20 +106,9 @@ void CC_RecordWriter::appendFilter(unsigned int propertyId)
     std::string_view const name = std::string_view(note->name).substr(0, LARGEST_TEXT);
     change.filterPlace = static_cast<std::uint8_t>(std::min(note->place, 255U));
     change.filterNameSize = static_cast<std::uint8_t>(name.size());
+    std::memset(m_at + WORDS_OF(name.size()) - WORDS_OF(1), 0, WORDS_OF(1)); // a name is never empty
     std::memcpy(m_at, name.data(), name.size());
     m_at += WORDS_OF(name.size());
-}
-
-void CC_RecordWriter::end()
-{
-    std::memset(m_at, 0, ALIGNMENT); // of which the last group keeps what it does not need
-    auto const written = static_cast<std::size_t>(m_at - reinterpret_cast<char*>(m_record));
-    std::size_t const size = (written + ALIGNMENT - 1) / ALIGNMENT * ALIGNMENT;
-    m_record->size = static_cast<std::uint16_t>(size);
-    m_at = reinterpret_cast<char*>(m_record) + size;
-    m_head += size;
-    m_left -= size;
-    PUBLISH(m_header->head, m_head);
 }
 
 /// Gives up the oldest records, so that there is room for a record of any size at the head. When the ring's end is too
@@ -165,8 +127,15 @@ void CC_RecordWriter::makeRoom()
     PUBLISH(m_header->tail, m_tail);
     if (padding != 0)
         pad(padding);
-    m_at = m_ring + m_head % m_capacity;
-    m_left = static_cast<std::size_t>(std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head));
+    startAt(m_head, static_cast<std::size_t>(std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head)));
+}
+
+/// `left`: octets at the head that belong to no record.
+void CC_RecordWriter::startAt(std::uint64_t head, std::size_t left)
+{
+    m_head = head;
+    m_at = m_ring + head % m_capacity;
+    m_lastPlace = m_at + left - LARGEST_RECORD;
 }
 
 /// Fills the end of the ring.

@@ -3,6 +3,8 @@
 #include "environment/CC_Moment.h"
 #include "recorder/CC_RecordFormat.h"
 
+#include <atomic>
+#include <cstdint>
 #include <cstring>
 #include <span>
 #include <string_view>
@@ -42,7 +44,23 @@ public:
     // A record in pieces: `begin`, then `append` up to MOST_PAYLOAD octets in all, then `end`. Nothing else is recorded
     // in between.
 
-    void begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail);
+    void begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
+    {
+        if (m_at > m_lastPlace) [[unlikely]]
+            makeRoom();
+        CC_Moment const now = CC_Moment::NOW();
+        m_record = reinterpret_cast<CC_RecordFormat::Record*>(m_at);
+        m_record->stamp = static_cast<std::uint32_t>(m_head / CC_RecordFormat::ALIGNMENT);
+        m_record->kind = kind;
+        m_record->writer = getWriter();
+        m_record->nanoseconds = now.nanoseconds;
+        m_record->call = call;
+        m_record->leg = leg;
+        m_record->turn = static_cast<std::uint32_t>(now.turn);
+        m_record->detail = detail;
+        m_at += sizeof *m_record;
+        m_changedLeg = 0;
+    }
     /// A change with who writes just now; the old and the new value follow. Of several of a Batch the later ones take
     /// less room.
     void beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId);
@@ -59,9 +77,19 @@ public:
     /// Where the next octets come, for who writes so many there; a place for whole words as long as only such went
     /// before.
     char* getPlace() const { return m_at; }
-    void skip(std::size_t size) { m_at += size; }
+    void goOnAt(char* place) { m_at = place; }
     void setDetail(unsigned int detail) { m_record->detail = detail; }
-    void end();
+    void end()
+    {
+        std::memset(m_at, 0, CC_RecordFormat::ALIGNMENT); // of which the last group keeps what it does not need
+        auto const written = static_cast<std::size_t>(m_at - reinterpret_cast<char*>(m_record));
+        std::size_t const size =
+            (written + CC_RecordFormat::ALIGNMENT - 1) / CC_RecordFormat::ALIGNMENT * CC_RecordFormat::ALIGNMENT;
+        m_record->size = static_cast<std::uint16_t>(size);
+        m_at = reinterpret_cast<char*>(m_record) + size;
+        m_head += size;
+        PUBLISH(m_header->head, m_head);
+    }
     /// In place of `end`: there is no such record.
     void cancel() { m_at = reinterpret_cast<char*>(m_record); }
 
@@ -100,6 +128,12 @@ private:
 
     static constexpr std::size_t LARGEST_RECORD = sizeof(CC_RecordFormat::Record) + MOST_PAYLOAD + 8;
 
+    static void PUBLISH(std::uint64_t& position, std::uint64_t value)
+    {
+        std::atomic_ref(position).store(value, std::memory_order_release);
+    }
+    inline CC_RecordFormat::Writer getWriter() const;
+    void startAt(std::uint64_t head, std::size_t left);
     void beginAlsoChanged(unsigned int propertyId);
     void appendFilter(unsigned int propertyId);
     void makeRoom();
@@ -111,8 +145,8 @@ private:
     CC_RecordFormat::Header* m_header = nullptr;
     CC_RecordFormat::Record* m_record = nullptr; // that is being written; of an AlsoChanged only the first octets
     char* m_at = nullptr;                        // the next octet
+    char* m_lastPlace = nullptr;                 // up to here a record of any size may begin
     std::uint64_t m_head = 0;
-    std::size_t m_left = 0;                // octets at the head that belong to no record
     CC_Writing const* m_writing = nullptr; // null: code outside any adapter
     // of a change that another may follow: nothing has been recorded since
     unsigned long long m_changedLeg = 0; // 0: there is none
@@ -183,3 +217,8 @@ private:
     CC_FilterNotes* m_notes;
     CC_RecordFormat::Writer m_writer;
 };
+
+inline CC_RecordFormat::Writer CC_RecordWriter::getWriter() const
+{
+    return m_writing != nullptr ? m_writing->m_writer : CC_RecordFormat::Writer::OUTSIDE;
+}

@@ -113,6 +113,12 @@ public:
                 sendOnTheWay(operations);
             else if (m_isHostile && m_random.isOneIn(8))
                 strikeInside(operations);
+            else if (m_isHostile && m_random.isOneIn(80))
+                strikeARelease(operations);
+            else if (m_isHostile && m_random.isOneIn(80))
+                resetInside(operations);
+            else if (m_random.isOneIn(80))
+                leaveToTheCall(operations);
             else if (m_random.isOneIn(40))
                 keyIn(operations);
             else
@@ -150,6 +156,49 @@ private:
             operations.push_back(filled(m_random.isOneIn(3) ? Code::ADD_LEG : Code::MOVE_LEG));
             operations.back().arguments[0] = leg;
         }
+    }
+    /// A call that is given back ends, or its context does, while its context tells of it.
+    void strikeARelease(Operations& operations)
+    {
+        auto const guest = static_cast<std::uint8_t>(m_random.below(6));
+        std::uint8_t const context = m_random.isOneIn(2) ? 0 : static_cast<std::uint8_t>(m_random.below(3));
+        Operation const release{Code::RELEASE, {context, 0}};
+        operations.push_back({Code::CREATE_CONTEXT, {context}});
+        operations.push_back({Code::OBSERVE, {guest, 3, context}});
+        operations.push_back({Code::ACQUIRE, {context, static_cast<std::uint8_t>(m_random.below(8))}});
+        operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::CALL_RELEASED), 0, 1}});
+        operations.push_back(m_random.isOneIn(2) ? release : Operation{Code::DESTROY_CONTEXT, {context}});
+        operations.push_back(release);
+    }
+    /// A line that is being reset is set up again and dials while it gives its leg up.
+    void resetInside(Operations& operations)
+    {
+        static constexpr CallOut PLACES[] = {CallOut::LEG_CHANGED, CallOut::LEG_REMOVED,  CallOut::CALL_CHANGED,
+                                             CallOut::LOG_LINE,    CallOut::INPUT_FILTER, CallOut::ADAPTER_DROP};
+        auto const line = static_cast<std::uint8_t>(m_random.below(4));
+        Operation dial = filled(Code::DIAL);
+        dial.arguments[0] = line;
+        operations.push_back(dial);
+        operations.push_back(filled(Code::OBSERVE));
+        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back({Code::WHEN,
+                              {static_cast<std::uint8_t>(PLACES[m_random.below(std::size(PLACES))]),
+                               static_cast<std::uint8_t>(m_random.below(3)), 2}});
+        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
+        operations.push_back(dial);
+        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
+    }
+    /// A live leg that nobody holds but its call, which then looks after itself.
+    void leaveToTheCall(Operations& operations)
+    {
+        auto const leg = static_cast<std::uint8_t>(m_random.below(8));
+        operations.push_back({Code::NEW_LEG, {leg}});
+        operations.push_back(filled(Code::ADD_LEG));
+        operations.back().arguments[0] = leg;
+        operations.push_back({Code::SET_LEG, {leg, 0, static_cast<std::uint8_t>(m_random.below(9))}});
+        operations.push_back({Code::GIVE_UP_LEG, {leg}});
+        operations.push_back(filled(m_random.isOneIn(2) ? Code::CLEAN_UP_CALL : Code::DROP));
+        operations.push_back(filled(Code::TURN));
     }
     /// Digits for a callee that wants the number en bloc and has not enough of it.
     void keyIn(Operations& operations)

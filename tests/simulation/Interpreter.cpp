@@ -208,6 +208,7 @@ void Interpreter::perform(Operation const& operation)
     case Code::DESTROY_CONTEXT:
     {
         m_world.m_hasLostContext = true;
+        m_world.m_lostPools += CallControl::GET_NUMBER_OF_CALLS(String(context)) != 0 ? 1 : 0;
         Memory::Library const library;
         CallControl::DESTROY_CONTEXT(String(context));
         break;
@@ -299,6 +300,7 @@ void Interpreter::perform(Operation const& operation)
         newCall(operation);
         break;
     case Code::CHANGE_UNTOLD:
+        m_world.m_mayViewsDiffer = true;
         changeUntold(operation);
         break;
     case Code::ACCESSOR:
@@ -485,6 +487,7 @@ XCode Interpreter::setOfAdapter(Operation const& operation)
     Property const written = WRITTEN(operation, 1);
     if (operation.code == Code::SET_PEER && written.id == CC_PropertyId::STATE && !STORES_PEERS_STATE(*adapter))
         m_world.m_mayPeersBeStale = true;
+    m_world.m_mayViewsDiffer = m_world.m_mayViewsDiffer || operation.code == Code::SET_PEER;
     XCode result;
     if (way % 4 < 2)
     {

@@ -4,6 +4,7 @@
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKind.h"
 #include "tests/simulation/Library.h"
 #include "tests/simulation/World.h"
 
@@ -58,11 +59,10 @@ void CHECK_LINE(World& world, unsigned int number, Line const& line)
     std::string const name = "line " + std::to_string(number);
     if (!adapter.getCallLegName().isEmpty() && adapter.getEndpoint() == nullptr)
         return world.fail(name + " has a leg and is not set up");
-    // a property that drops the adapter while it is copied into a view stays there until the next call
-    bool const isIdle = CAN_BE_COMPARED && own == nullptr && !world.m_hasPropertyActed;
-    if (isIdle && (adapter.getOwnProperty(CC_PropertyId::STATE) != nullptr ||
-                   adapter.getPeerProperty(CC_PropertyId::STATE) != nullptr ||
-                   adapter.getCallProperty(CC_PropertyId::CONTEXT) != nullptr))
+    if (CAN_BE_COMPARED && own == nullptr &&
+        (adapter.getOwnProperty(CC_PropertyId::STATE) != nullptr ||
+         adapter.getPeerProperty(CC_PropertyId::STATE) != nullptr ||
+         adapter.getCallProperty(CC_PropertyId::CONTEXT) != nullptr))
         return world.fail(name + " is idle and still sees something");
     if (peer == nullptr)
         return;
@@ -83,6 +83,22 @@ void CHECK_PEER(World& world, unsigned int number, Line const& line)
         return;
     if (own->getCall()->getOtherMostActiveCallLeg(*own, peer) != peer)
         world.fail("line " + std::to_string(number) + " has a peer that is not the most active leg");
+}
+
+/// Without filters a line sees of its peer what the peer's leg holds.
+void CHECK_VIEW_OF_PEER(World& world, unsigned int number, Line const& line)
+{
+    CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
+    if (!CAN_BE_COMPARED || peer == nullptr || world.m_hadOutputFilters || world.m_mayViewsDiffer ||
+        world.m_hasPropertyActed || world.m_wasShortOfMemory)
+        return;
+    for (CC_Property const& held : peer->getProperties())
+    {
+        CC_Property const* const seen = line.adapter->getPeerProperty(held.getId());
+        CC_PropertyKind const* const kind = seen != nullptr ? CC_PropertyKind::OF_BOTH(*seen, held) : nullptr;
+        if (seen == nullptr || (kind != nullptr && !kind->isEqual(*seen, held)))
+            return world.fail("line " + std::to_string(number) + " does not see what its peer holds");
+    }
 }
 
 template <class Visit>
@@ -116,7 +132,7 @@ void CHECK_LOCKS(World& world)
     int const locks = world.m_reboot.m_locks;
     if (world.m_wasShortOfMemory)
         return; // a lock may not have been had
-    if (locks < pools || (locks != pools && !world.m_hasLostContext))
+    if (locks < pools || locks > pools + world.m_lostPools)
         world.fail(std::to_string(locks) + " reload locks are held while " + std::to_string(pools) +
                    " pools have calls");
 }
@@ -168,7 +184,12 @@ void CHECK_AT_REST(World& world)
     FOR_EACH_CALL([&](CC_Call const& call, unsigned int context) { CHECK_CALL_AT_REST(world, call, context); });
     CHECK_LOCKS(world);
     CHECK_STATISTICS(world);
-    FOR_EACH_LINE(world, [&](unsigned int number, Line const& line) { CHECK_PEER(world, number, line); });
+    FOR_EACH_LINE(world,
+                  [&](unsigned int number, Line const& line)
+                  {
+                      CHECK_PEER(world, number, line);
+                      CHECK_VIEW_OF_PEER(world, number, line);
+                  });
 }
 
 void CHECK_AT_THE_END(World& world)

@@ -120,6 +120,8 @@ public:
     unsigned int m_strikes = 0;      // reactions so far
     bool m_hasFailingFilter = false; // an input filter that keeps RELEASED from a leg: such a call may stay
     bool m_hasLostContext = false;   // a context was destroyed, maybe with calls
+    int m_lostPools = 0;             // destroyed with calls, whose reload lock stays
+    bool m_mayViewsDiffer = false;   // a line wrote into its view of a peer, or somebody changed a leg untold
     bool m_wasShortOfMemory = false;
     bool m_hasPropertyActed = false; // a property's operation did something
     bool m_hadOutputFilters = false; // somebody's, at some time

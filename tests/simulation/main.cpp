@@ -31,12 +31,14 @@ struct Arguments
     std::string replay;
     std::string output = "simulation-failure.txt";
     bool isToShrink = true;
+    bool isToRecord = false;
 };
 
 int USAGE()
 {
     std::fputs("usage: callcontrol-simulate [--seconds N] [--operations N] [--seed S] [--output FILE] [--no-shrink]\n"
-               "       callcontrol-simulate --replay FILE-OR-FOLDER [--shrink FILE]\n",
+               "       callcontrol-simulate --replay FILE-OR-FOLDER [--shrink FILE]\n"
+               "       callcontrol-simulate --records --seed S [--operations N]\n",
                stderr);
     return 2;
 }
@@ -51,6 +53,11 @@ bool READ(int count, char** texts, Arguments& arguments)
         if (name == "--no-shrink")
         {
             arguments.isToShrink = false;
+            continue;
+        }
+        if (name == "--records")
+        {
+            arguments.isToRecord = true;
             continue;
         }
         if (++i == count)
@@ -131,6 +138,19 @@ int SIMULATE(Arguments const& arguments)
     return TELL(GENERATE(report.seed), ended, arguments, "seed " + std::to_string(report.seed.load()));
 }
 
+/// The same for the same seed, in every process and on every day.
+int RECORD(Arguments const& arguments)
+{
+    std::size_t operations = 0;
+    for (std::uint64_t seed = arguments.seed; operations <= arguments.operations; ++seed)
+    {
+        Operations const generated = GENERATE(seed);
+        operations += generated.size();
+        std::printf("%llu: %s\n", static_cast<unsigned long long>(seed), RECORDS_OF(generated).c_str());
+    }
+    return 0;
+}
+
 int REPLAY_FILE(std::filesystem::path const& path, Arguments const& arguments)
 {
     std::ifstream stream(path);
@@ -172,5 +192,7 @@ int main(int count, char** texts)
     if (!READ(count, texts, arguments))
         return USAGE();
     PREPARE_RUNS();
+    if (arguments.isToRecord)
+        return RECORD(arguments);
     return arguments.replay.empty() ? SIMULATE(arguments) : REPLAY(arguments);
 }

@@ -42,6 +42,17 @@ public:
     /// (ChannelTermination): it speaks A-law both ways from now on, and has no ports. Null as above.
     std::unique_ptr<LegMedia> addChannel(int channel, MediaObserver& observer);
 
+    /// By which way the digit came of which an observer of this call is being told: inside of that the other legs'
+    /// modules can see what the media layer has done about it already. An EVENT has gone to the other leg of two as an
+    /// event, or as a sound where there are none; a SOUND as what it is.
+    enum DigitWay
+    {
+        NONE, ///< nobody is told of one
+        EVENT,
+        SOUND
+    };
+    DigitWay getDigitTold() const { return m_digitTold; }
+
     /// The number of contexts alive.
     static std::atomic<unsigned int> s_numberOfInstances;
 
@@ -53,4 +64,5 @@ private:
     TYPtr<MediaCore> m_core;
     unsigned long long m_number;
     unsigned int m_loop;
+    DigitWay m_digitTold = NONE;
 };

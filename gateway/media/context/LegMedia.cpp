@@ -56,6 +56,8 @@ void LegMedia::sendDigit(char digit, unsigned int milliseconds)
     m_call->m_core->post(*m_call, MediaOrder::Digit{m_number, digit, milliseconds});
 }
 
+void LegMedia::setDigitsAside(bool isAside) { m_call->m_core->post(*m_call, MediaOrder::Aside{m_number, isAside}); }
+
 void LegMedia::askQuality() { m_call->m_core->post(*m_call, MediaOrder::Ask{m_number}); }
 
 void LegMedia::detectDigits(bool isWanted) { m_call->m_core->post(*m_call, MediaOrder::Detect{m_number, isWanted}); }

@@ -56,6 +56,10 @@ public:
     /// that we can speak.
     void sendDigit(char digit, unsigned int milliseconds = 100);
 
+    /// Digits that the other leg's far side tells are not keyed in here, neither as events nor as sounds, since
+    /// signalling tells them. Of use where no telephone events were agreed on.
+    void setDigitsAside(bool isAside);
+
     /// Whether digits are also heard in what the far side says: for those that send no telephone events. What is said
     /// is decoded for it, so it costs.
     void detectDigits(bool isWanted);

@@ -127,6 +127,15 @@ void MediaCore::onNews()
     m_news->take([this](MediaNews const& news) { take(news); });
 }
 
+/// The call remembers by which way as long as the observer is told: it may end the leg, and the call with it.
+void MediaCore::tellDigit(LegMedia& leg, MediaNews const& news)
+{
+    TYPtr<CallMedia> const call(leg.m_call.get());
+    call->m_digitTold = news.isSound ? CallMedia::SOUND : CallMedia::EVENT;
+    leg.m_observer.onDigit(news.digit, news.amount);
+    call->m_digitTold = CallMedia::NONE;
+}
+
 void MediaCore::take(MediaNews const& news)
 {
     auto const found = m_legs.find(news.leg);
@@ -136,7 +145,7 @@ void MediaCore::take(MediaNews const& news)
     switch (news.kind)
     {
     case MediaNews::DIGIT:
-        leg.m_observer.onDigit(news.digit, news.amount);
+        tellDigit(leg, news);
         break;
     case MediaNews::SILENCE:
         leg.m_observer.onSilence(news.amount);

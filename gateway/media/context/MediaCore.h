@@ -35,6 +35,7 @@ private:
     std::unique_ptr<RtpTermination> createTermination(unsigned long long number, RtpPorts&& ports);
     void onNews();
     void take(MediaNews const& news);
+    static void tellDigit(LegMedia& leg, MediaNews const& news);
 
     MediaOptions m_options;
     std::unique_ptr<Mailbox<MediaNews>> m_news; // before the loops, who post to it; null after the end

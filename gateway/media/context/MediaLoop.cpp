@@ -151,7 +151,7 @@ void MediaLoop::attend()
 
 void MediaLoop::onDigit(RtpTermination const& leg, HeardDigit const& heard)
 {
-    tell({leg.getNumber(), MediaNews::DIGIT, heard.digit, heard.milliseconds});
+    tell({leg.getNumber(), MediaNews::DIGIT, heard.digit, heard.milliseconds, {}, heard.isSound});
 }
 
 void MediaLoop::onSilence(RtpTermination const& leg, unsigned int seconds)

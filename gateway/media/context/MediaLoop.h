@@ -80,6 +80,7 @@ private:
     void obey(MediaOrder::Play& order);
     void obey(MediaOrder::Detect& order);
     void obey(MediaOrder::Digit& order);
+    void obey(MediaOrder::Aside& order);
     void obey(MediaOrder::Ask& order);
     void obey(MediaOrder::End& order);
     void obey(MediaOrder::Stop& order);

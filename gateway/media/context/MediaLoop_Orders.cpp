@@ -158,6 +158,12 @@ void MediaLoop::obey(MediaOrder::Digit& order)
         leg->termination->sendDigit(order.digit, order.milliseconds);
 }
 
+void MediaLoop::obey(MediaOrder::Aside& order)
+{
+    if (Leg* const leg = find(order.leg))
+        leg->termination->setDigitsAside(order.isAside);
+}
+
 void MediaLoop::obey(MediaOrder::Ask& order)
 {
     if (Leg* const leg = find(order.leg))

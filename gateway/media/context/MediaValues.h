@@ -63,6 +63,11 @@ struct Digit
     char digit;
     unsigned int milliseconds;
 };
+struct Aside ///< digits of the others
+{
+    unsigned long long leg;
+    bool isAside;
+};
 struct Ask ///< for the quality
 {
     unsigned long long leg;
@@ -74,7 +79,7 @@ struct End
 struct Stop ///< the loop's running
 {
 };
-using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Play, Detect, Digit, Ask, End, Stop>;
+using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Play, Detect, Digit, Aside, Ask, End, Stop>;
 
 /// Which leg it is about; 0: none.
 unsigned long long LEG_OF(Any const& order);
@@ -95,4 +100,5 @@ struct MediaNews
     char digit = '\0';
     unsigned int amount = 0; ///< milliseconds of a digit, seconds of silence
     MediaQuality quality{};
+    bool isSound = false; ///< of a digit: heard in speech
 };

@@ -166,7 +166,7 @@ void RtpTermination::takeEvent(RtpPacket const& packet, RtpRoutes::Route const& 
 /// digit is made anew.
 void RtpTermination::tellEvent(std::optional<HeardDigit> const& heard)
 {
-    if (heard && m_passesDigitsOn && m_partner != nullptr)
+    if (heard && m_passesDigitsOn && m_partner != nullptr && !m_partner->m_areDigitsAside)
         m_partner->sendDigit(heard->digit, heard->milliseconds);
     tell(heard);
 }
@@ -264,7 +264,9 @@ void RtpTermination::setKeys(MediaKeys const& keys)
 {
     if (keys == m_description.keys)
         return; // the counters of the stream go on
-    m_srtp = SrtpSession::MAKE(keys);
+    std::unique_ptr<SrtpSession> const before = std::exchange(m_srtp, SrtpSession::MAKE(keys));
+    if (m_srtp != nullptr && before != nullptr)
+        m_srtp->takeOver(*before);
     m_isUnusable = keys.suite != MediaKeys::NONE && m_srtp == nullptr;
 }
 

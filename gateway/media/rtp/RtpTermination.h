@@ -74,6 +74,8 @@ public:
     void receiveRtcp(DatagramBatch& batch, long long now);
 
     bool sendDigit(char digit, unsigned int milliseconds) { return m_digits.add(digit, milliseconds); }
+    /// Digits that the partner's far side tells do not become digits or sounds of ours; its packets are relayed yet.
+    void setDigitsAside(bool isAside) { m_areDigitsAside = isAside; }
     /// Plays it instead of what the others say; null: ends it. It must outlive this.
     void playTone(Tone const* tone);
     /// The same with a sound.
@@ -154,6 +156,7 @@ private:
     bool m_isRelayable = true;
     bool m_isAllDecoded = false;
     bool m_passesDigitsOn = false;
+    bool m_areDigitsAside = false;
     bool m_isUnusable = false; // its keys cannot be used: nothing goes in or out in the clear
     std::unique_ptr<SrtpSession> m_srtp;
     std::unique_ptr<VoiceReceiver> m_receiver;

@@ -48,7 +48,7 @@ void RtpTermination::hearVoice(RtpPacket const& packet, RtpRoutes::Route const& 
         return;
     m_detector->hear(codec, packet.payload);
     while (std::optional<char> const digit = m_detector->take())
-        tell(HeardDigit{*digit, 0});
+        tell(HeardDigit{*digit, 0, true});
 }
 
 bool RtpTermination::listen(std::span<short> frame) { return m_receiver != nullptr && m_receiver->take(frame); }

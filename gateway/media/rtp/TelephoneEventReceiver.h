@@ -9,6 +9,7 @@ struct HeardDigit
 {
     char digit = '\0';
     unsigned int milliseconds = 0;
+    bool isSound = false; ///< it was heard in speech, and not told by an event
 
     friend bool operator==(HeardDigit const&, HeardDigit const&) = default;
 };

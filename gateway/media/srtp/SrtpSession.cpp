@@ -47,6 +47,16 @@ std::unique_ptr<SrtpSession> SrtpSession::MAKE(MediaKeys const& keys)
     return made != nullptr && made->m_send != nullptr && made->m_receive != nullptr ? std::move(made) : nullptr;
 }
 
+void SrtpSession::takeOver(SrtpSession& before)
+{
+    if (m_keys.suite != before.m_keys.suite)
+        return;
+    if (m_keys.send == before.m_keys.send)
+        m_send.swap(before.m_send);
+    if (m_keys.receive == before.m_keys.receive)
+        m_receive.swap(before.m_receive);
+}
+
 namespace
 {
 using Work = srtp_err_status_t (*)(srtp_t, void*, int*);

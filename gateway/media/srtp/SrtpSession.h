@@ -16,6 +16,9 @@ public:
     /// Null when the keys are none that can be used, or memory is out.
     static std::unique_ptr<SrtpSession> MAKE(MediaKeys const& keys);
 
+    /// In a direction whose key stays, the counters of that one go on: a key must never secure two packets of one
+    /// number.
+    void takeOver(SrtpSession& before);
     MediaKeys const& getKeys() const { return m_keys; }
     /// Work in place: the length afterwards; 0: refused. Those that secure need MOST_GROWTH octets of room behind. @{
     std::size_t protectRtp(unsigned char* octets, std::size_t length);

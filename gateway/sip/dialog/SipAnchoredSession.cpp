@@ -19,6 +19,7 @@ using Negotiating = CC_PropertyCodecNegotiating;
 namespace
 {
 constexpr unsigned int NOT_ACCEPTABLE = 488;
+constexpr unsigned int USUAL_DIGIT = 100;     // milliseconds
 constexpr unsigned int TELEPHONE_RATE = 8000; // Hz: the clock of events that every phone knows
 
 /// As whoever is at the other end sees it.
@@ -54,6 +55,8 @@ bool SipAnchoredSession::open()
         return true;
     CallMedia* const call = CallMedia::OF(m_adapter.getDatapathContext());
     m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
+    if (m_leg != nullptr && m_interface.detectsDigits)
+        m_leg->detectDigits(true);
     return m_leg != nullptr;
 }
 
@@ -69,6 +72,11 @@ SipCodecChoice::Across SipAnchoredSession::getAcross() const
 SipCodecChoice::Codecs SipAnchoredSession::getOffered(SipStream const& far) const
 {
     return SipCodecChoice::COMMON(CODECS_OF(far), m_interface.codecs);
+}
+
+std::optional<SipStream> SipAnchoredSession::read(std::string const& description) const
+{
+    return SipStream::READ(description, m_interface.security);
 }
 
 // --- what the other side is told -------------------------------------------------------------------------------------
@@ -128,7 +136,21 @@ std::string SipAnchoredSession::makeOffer()
             if (std::find(m_frame.events.begin(), m_frame.events.end(), ours.events.back()) == m_frame.events.end())
                 m_frame.events.push_back(ours.events.back());
         }
+    if (m_interface.security != SipStream::PLAIN)
+        ours.keys = {getKey(1, MediaKeys::AES_CM_128_HMAC_SHA1_80), getKey(2, MediaKeys::AES_CM_128_HMAC_SHA1_32)};
+    if (m_interface.security == SipStream::SECURED)
+        ours.isSecuredProfile = true;
     return write(std::move(ours));
+}
+
+/// The same each time, so that a stream that goes on keeps its counters.
+SipCrypto SipAnchoredSession::getKey(unsigned int tag, MediaKeys::Suite suite)
+{
+    auto const known =
+        std::find_if(m_keys.begin(), m_keys.end(), [suite](SipCrypto const& one) { return one.suite == suite; });
+    SipCrypto key = known != m_keys.end() ? *known : m_keys.emplace_back(SipCrypto::MAKE(tag, suite));
+    key.tag = tag;
+    return key;
 }
 
 /// Empty: nothing of it would be understood across. One codec alone is chosen, so that nobody changes it unasked.
@@ -145,6 +167,8 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
     ours.formats = {{codec, far.getType(codec)}};
     ours.events = EVENTS_FOR(far, codec);
     ours.mode = ACROSS(far.mode);
+    if (!far.keys.empty())
+        ours.keys = {getKey(far.keys.front().tag, far.keys.front().suite)};
     std::string const answer = write(std::move(ours));
     settle(far);
     return answer;
@@ -154,12 +178,20 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
 bool SipAnchoredSession::settle(SipStream const& far)
 {
     MediaDescription const agreed = SipStream::AGREED(m_ours, far);
-    if (m_leg == nullptr || agreed.formats.getSize() == 0)
+    if (m_leg == nullptr || agreed.formats.getSize() == 0 || !isSecuredEnough(agreed, far))
         return false;
     m_leg->describe(agreed);
     m_codec = VoipCodecAndMode(agreed.formats.begin()->codec, ACROSS(agreed.mode));
     m_isAgreed = true;
+    settleDigits();
     return true;
+}
+
+/// Nothing goes out in the clear that somebody believes to be secured.
+bool SipAnchoredSession::isSecuredEnough(MediaDescription const& agreed, SipStream const& far) const
+{
+    bool const mustBe = m_interface.security == SipStream::SECURED || m_ours.isSecuredProfile || !far.keys.empty();
+    return !mustBe || agreed.keys.suite != MediaKeys::NONE;
 }
 
 // --- while the dialog comes up ---------------------------------------------------------------------------------------
@@ -168,7 +200,7 @@ unsigned int SipAnchoredSession::check(std::string const& offer)
 {
     if (offer.empty())
         return 0; // the INVITE has none: we offer
-    m_offerOfInvite = SipStream::READ(offer);
+    m_offerOfInvite = read(offer);
     return m_offerOfInvite && !getOffered(*m_offerOfInvite).empty() ? 0 : NOT_ACCEPTABLE;
 }
 
@@ -180,7 +212,7 @@ void SipAnchoredSession::addOffer(CC_PropertyContainer& own, std::string const&)
 
 void SipAnchoredSession::addAnswer(CC_PropertyContainer& own, std::string const& description, bool)
 {
-    std::optional<SipStream> const far = SipStream::READ(description);
+    std::optional<SipStream> const far = read(description);
     if (far && settle(*far))
         addTo(own, *far);
 }
@@ -206,7 +238,7 @@ unsigned int SipAnchoredSession::takeOffer(std::string const& description, bool)
 {
     if (description.empty())
         m_pending = makeOffer();
-    else if (std::optional<SipStream> const far = SipStream::READ(description))
+    else if (std::optional<SipStream> const far = read(description))
     {
         m_pending = makeAnswer(*far);
         if (!m_pending.empty())
@@ -224,7 +256,7 @@ void SipAnchoredSession::proceed()
 void SipAnchoredSession::takeAnswer(std::string const& description)
 {
     m_isOffering = false;
-    std::optional<SipStream> const far = SipStream::READ(description);
+    std::optional<SipStream> const far = read(description);
     if (far && settle(*far))
         tell(*far);
     else
@@ -282,4 +314,44 @@ void SipAnchoredSession::onSilence(unsigned int seconds)
 {
     if (m_leg->getDescription().mode == VoipCodecAndMode::SEND_RECEIVE)
         m_wire.onSilence(seconds);
+}
+
+// --- digits ----------------------------------------------------------------------------------------------------------
+
+// Each goes to our peer by one way alone: as an event where these were agreed on, else in INFO if it takes that, else
+// as a sound. Events that the other side's peer sends, and sounds, the media layer passes on by itself.
+
+bool SipAnchoredSession::takesEvents() const
+{
+    return m_leg != nullptr && m_leg->getDescription().telephoneEvent.isAgreed();
+}
+
+void SipAnchoredSession::settleDigits()
+{
+    if (m_leg != nullptr)
+        m_leg->setDigitsAside(m_isInfoTaken && !takesEvents());
+}
+
+void SipAnchoredSession::noteInfo(bool isTaken)
+{
+    if (std::exchange(m_isInfoTaken, isTaken) != isTaken)
+        settleDigits();
+}
+
+void SipAnchoredSession::onDigit(char digit, unsigned int milliseconds)
+{
+    m_wire.onDigit(digit == 'F' ? '!' : digit, milliseconds);
+}
+
+bool SipAnchoredSession::sendDigit(char digit, unsigned int milliseconds)
+{
+    if (m_leg == nullptr)
+        return false;
+    CallMedia::DigitWay const way = m_leg->getCall().getDigitTold();
+    if (way == CallMedia::SOUND ? !takesEvents() : way == CallMedia::EVENT && (takesEvents() || !m_isInfoTaken))
+        return true; // it is there already
+    if (!takesEvents() && m_isInfoTaken)
+        return false;
+    m_leg->sendDigit(digit, milliseconds != 0 ? milliseconds : USUAL_DIGIT);
+    return true;
 }

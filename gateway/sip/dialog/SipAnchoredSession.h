@@ -55,6 +55,8 @@ public:
     void follow(bool isUp) override;
     void expectOffer() override {}
     void followCall() override;
+    void noteInfo(bool isTaken) override;
+    bool sendDigit(char digit, unsigned int milliseconds) override;
     MediaQuality const* getQuality() const override { return m_leg != nullptr ? &m_leg->getQuality() : nullptr; }
     void end() override { m_leg.reset(); }
 
@@ -63,8 +65,12 @@ private:
 
     // --- MediaObserver
     void onSilence(unsigned int seconds) override;
+    void onDigit(char digit, unsigned int milliseconds) override;
 
     SipCodecChoice::Across getAcross() const;
+    std::optional<SipStream> read(std::string const& description) const;
+    SipCrypto getKey(unsigned int tag, MediaKeys::Suite suite);
+    bool isSecuredEnough(MediaDescription const& agreed, SipStream const& far) const;
     Codecs getOffered(SipStream const& far) const;
     std::string makeOffer();
     std::string makeAnswer(SipStream const& far);
@@ -72,6 +78,8 @@ private:
     bool settle(SipStream const& far);
     void tell(SipStream const& far);
     void addTo(CC_PropertyContainer& own, SipStream const& far) const;
+    bool takesEvents() const;
+    void settleDigits();
     bool isInUnison() const;
     bool isOurTurn() const;
 
@@ -81,13 +89,15 @@ private:
     IpAddress m_local;
     std::unique_ptr<LegMedia> m_leg;
     std::optional<SipStream> m_offerOfInvite;
-    std::string m_forInvite; // what was made of it
-    SipStream m_frame;       // the streams of the session and all payload types that were ever in it
-    SipStream m_ours;        // our last description
-    std::string m_written;   // the same as text
+    std::string m_forInvite;       // what was made of it
+    SipStream m_frame;             // the streams of the session and all payload types that were ever in it
+    SipStream m_ours;              // our last description
+    std::string m_written;         // the same as text
+    std::vector<SipCrypto> m_keys; // of ours, one of each suite for as long as the dialog
     unsigned int m_version = 0;
     std::string m_pending; // what our peer is to be answered once the dialog is ready
     bool m_isAgreed = false;
     bool m_isOffering = false;
+    bool m_isInfoTaken = false;
     VoipCodecAndMode m_codec;
 };

@@ -33,5 +33,6 @@ std::string SipDescription::REFUSING(std::string_view offer)
         media->m_port = 0;
         media->m_rejected = 1;
     }
-    return parsed.print();
+    std::string answer = parsed.print();
+    return IS_READABLE(answer) ? answer : std::string(); // the stack reads some that it cannot write
 }

@@ -14,6 +14,7 @@ bool IS_READABLE(std::string_view description);
 /// older way, RFC 3264, 8.4). Streams that are refused do not count; false for a description without another.
 bool IS_HOLD(std::string_view description);
 
-/// An answer that refuses each stream of the offer (port 0, RFC 3264, 6); empty for an offer that cannot be read.
+/// An answer that refuses each stream of the offer (port 0, RFC 3264, 6); empty for an offer that cannot be read,
+/// or not be written again.
 std::string REFUSING(std::string_view offer);
 } // namespace SipDescription

@@ -39,6 +39,8 @@ public:
     void follow(bool isUp) override;
     void expectOffer() override { m_expectsOffer = true; }
     void followCall() override {}
+    void noteInfo(bool) override {}
+    bool sendDigit(char, unsigned int) override { return false; }
     MediaQuality const* getQuality() const override { return nullptr; }
     void end() override {}
 

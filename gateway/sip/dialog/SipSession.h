@@ -25,6 +25,9 @@ public:
     // --- what media of ours tell
 
     virtual void onSilence(unsigned int seconds) = 0;
+    /// Our peer has keyed it in: '0' to '9', '*', '#', 'A' to 'D', '!' for a flash of the hook. `milliseconds`: 0: not
+    /// known.
+    virtual void onDigit(char digit, unsigned int milliseconds) = 0;
 };
 
 /// Who makes and answers the offers of a dialog: the other side of the call, when the peers exchange media themselves
@@ -86,6 +89,10 @@ public:
 
     /// The leg may be in another call.
     virtual void followCall() = 0;
+    /// Whether our peer takes digits in INFO.
+    virtual void noteInfo(bool isTaken) = 0;
+    /// The other side's digit, for our peer: whether it goes there with the media; else the dialog is to tell it.
+    virtual bool sendDigit(char digit, unsigned int milliseconds) = 0;
     /// The last known; null without media.
     virtual MediaQuality const* getQuality() const = 0;
     /// Gives up what `open()` has taken.

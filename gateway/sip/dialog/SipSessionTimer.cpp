@@ -19,6 +19,7 @@ bool SipSessionTimer::takeRequest(Seen const& seen)
     else
         m_interval = wanted != 0 ? std::min(seen.interval, wanted) : seen.interval;
     m_isOurs = !seen.isSupported || seen.refresher == UAS;
+    m_isMissed = false;
     return true;
 }
 
@@ -26,6 +27,7 @@ void SipSessionTimer::takeResponse(Seen const& seen)
 {
     m_interval = seen.interval != 0 ? seen.interval : std::max(m_wanted, m_interval);
     m_isOurs = seen.interval == 0 || seen.refresher != UAS;
+    m_isMissed = false;
 }
 
 bool SipSessionTimer::raise(unsigned int least)

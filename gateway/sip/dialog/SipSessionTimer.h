@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <utility>
 
 /// What the two ends of a dialog agree on so that neither waits for ever for one that has vanished (RFC 4028): within
 /// which time the session is to be refreshed, and by whom. A plain value; the endpoint has the clock.
@@ -33,6 +34,8 @@ public:
     bool takeRequest(Seen const& seen);
     /// A 2xx to ours. One that says nothing: we refresh, if we have asked.
     void takeResponse(Seen const& seen);
+    /// A refresh of ours reached nobody. Whether that was the second one in a row: the session has expired.
+    bool miss() { return std::exchange(m_isMissed, true); }
     /// A 422 to ours. False when it asks for nothing that we have not offered already.
     bool raise(unsigned int least);
 
@@ -54,4 +57,5 @@ private:
     unsigned int m_leastOfPeer = 0;
     unsigned int m_interval = 0;
     bool m_isOurs = false;
+    bool m_isMissed = false;
 };

@@ -19,8 +19,8 @@ constexpr unsigned char USUAL_OF_EVENTS = 101;
 
 bool IS_CARRIED(sdp_media_t const& media)
 {
-    return media.m_type == sdp_media_audio && media.m_proto == sdp_proto_rtp && media.m_rejected == 0 &&
-           media.m_port != 0;
+    return media.m_type == sdp_media_audio && media.m_rejected == 0 && media.m_port != 0 &&
+           (media.m_proto == sdp_proto_rtp || media.m_proto == sdp_proto_srtp);
 }
 
 /// "opus/48000/2"
@@ -104,13 +104,39 @@ void READ_FORMAT(SipStream& stream, sdp_rtpmap_t const& format)
         stream.formats.push_back({codec, type});
 }
 
-void READ_STREAM(SipStream& stream, sdp_media_t const& media)
+void READ_KEYS(SipStream& stream, sdp_media_t const& media)
 {
+    for (sdp_attribute_t const* attribute = media.m_attributes; attribute != nullptr; attribute = attribute->a_next)
+        if (SipText::IS_ONE_OF(attribute->a_name, {"crypto"}) && attribute->a_value != nullptr)
+            if (std::optional<SipCrypto> const crypto = SipCrypto::READ(attribute->a_value))
+                stream.keys.push_back(*crypto);
+}
+
+void READ_STREAM(SipStream& stream, sdp_media_t const& media, SipStream::Security security)
+{
+    stream.isSecuredProfile = media.m_proto == sdp_proto_srtp;
+    if (security != SipStream::PLAIN)
+        READ_KEYS(stream, media);
     stream.rtp = ADDRESS_OF(media);
     stream.mode = MODE_OF((media.m_mode & sdp_sendonly) != 0, (media.m_mode & sdp_recvonly) != 0);
     stream.period = SipText::NUMBER(VALUE_OF(media, "ptime"), 1, LONGEST_PERIOD);
     for (sdp_rtpmap_t const* format = media.m_rtpmaps; format != nullptr; format = format->rm_next)
         READ_FORMAT(stream, *format);
+}
+
+bool IS_TAKEN(SipStream const& stream, SipStream::Security security)
+{
+    bool const mustHaveKeys = stream.isSecuredProfile || security == SipStream::SECURED;
+    return !mustHaveKeys || !stream.keys.empty();
+}
+
+MediaKeys KEYS_AGREED(SipStream const& ours, SipStream const& far)
+{
+    for (SipCrypto const& theirs : far.keys)
+        for (SipCrypto const& own : ours.keys)
+            if (own.tag == theirs.tag && own.suite == theirs.suite)
+                return {own.suite, own.key, theirs.key};
+    return {};
 }
 
 /// RFC 3551, 4.5 and RFC 7587; with the annexes that would let a codec fall silent, which the other side may not know.
@@ -141,24 +167,29 @@ MediaPayloadTypes EVENTS_AGREED(SipStream const& ours, SipStream const& far, uns
 }
 } // namespace
 
-std::optional<SipStream> SipStream::READ(std::string_view description)
+std::optional<SipStream> SipStream::READ(std::string_view description, Security security)
 {
     SipParsedDescription const parsed(description);
     if (parsed.get() == nullptr)
         return std::nullopt;
-    SipStream stream;
-    bool isFound = false;
+    std::vector<std::string> streams;
+    std::optional<SipStream> found;
     for (sdp_media_t const* media = parsed.get()->sdp_media; media != nullptr; media = media->m_next)
     {
-        if (!isFound && IS_CARRIED(*media))
+        SipStream stream;
+        if (IS_CARRIED(*media))
         {
-            isFound = true;
-            stream.place = stream.streams.size();
-            READ_STREAM(stream, *media);
+            stream.place = streams.size();
+            READ_STREAM(stream, *media, security);
+            bool const isBetter = !found || (found->keys.empty() && !stream.keys.empty());
+            if (isBetter && IS_TAKEN(stream, security))
+                found = std::move(stream);
         }
-        stream.streams.push_back(REFUSED(*media));
+        streams.push_back(REFUSED(*media));
     }
-    return isFound ? std::optional<SipStream>(std::move(stream)) : std::nullopt;
+    if (found)
+        found->streams = std::move(streams);
+    return found;
 }
 
 SipStream SipStream::getReply() const
@@ -167,6 +198,7 @@ SipStream SipStream::getReply() const
     reply.streams = streams;
     reply.place = place;
     reply.period = period;
+    reply.isSecuredProfile = isSecuredProfile;
     return reply;
 }
 
@@ -196,7 +228,10 @@ std::string SipStream::write(Origin const& origin) const
             text += "m=" + streams[i] + "\r\n";
             continue;
         }
-        text += "m=audio " + std::to_string(rtp.port) + " RTP/AVP" + types + "\r\n" + lines;
+        text += "m=audio " + std::to_string(rtp.port) + (isSecuredProfile ? " RTP/SAVP" : " RTP/AVP") + types + "\r\n" +
+                lines;
+        for (SipCrypto const& crypto : keys)
+            text += "a=crypto:" + crypto.write() + "\r\n";
         text += "a=ptime:" + std::to_string(period != 0 ? period : DEFAULT_PERIOD) + "\r\n";
         text += std::string("a=") + NAME_OF(mode) + "\r\n";
     }
@@ -231,6 +266,7 @@ MediaDescription SipStream::AGREED(SipStream const& ours, SipStream const& far)
 {
     MediaDescription result;
     result.rtp = far.rtp;
+    result.keys = KEYS_AGREED(ours, far);
     result.mode = MODE_OF(SENDS(ours.mode) && RECEIVES(far.mode), RECEIVES(ours.mode) && SENDS(far.mode));
     unsigned int const period = far.period != 0 ? far.period : DEFAULT_PERIOD;
     for (Format const& theirs : far.formats)

@@ -2,6 +2,8 @@
 
 #include "media/context/MediaDescription.h"
 
+#include "sip/dialog/SipCrypto.h"
+
 #include <optional>
 #include <string>
 #include <string_view>
@@ -43,6 +45,14 @@ struct SipStream
         unsigned long long version = 0;
     };
 
+    /// Whether SRTP is spoken (RFC 3711).
+    enum Security
+    {
+        PLAIN,
+        OPTIONAL, ///< if the far side has keys, under whatever profile
+        SECURED
+    };
+
     MediaAddress rtp;            ///< where its side listens; nowhere: it does not
     std::vector<Format> formats; ///< that the media layer relays at least, the best liked first, each once
     std::vector<Events> events;  ///< each rate once
@@ -50,9 +60,11 @@ struct SipStream
     VoipCodecAndMode::Mode mode = VoipCodecAndMode::SEND_RECEIVE; ///< seen from its side
     std::vector<std::string> streams; ///< all of the description, each as it is refused ("video 0 RTP/AVP 31")
     std::size_t place = 0;            ///< of this one among them
+    bool isSecuredProfile = false;    ///< RTP/SAVP; else RTP/AVP, which may have keys all the same
+    std::vector<SipCrypto> keys;      ///< the best liked first
 
-    /// Nothing for a description that cannot be read, or has no such stream.
-    static std::optional<SipStream> READ(std::string_view description);
+    /// Nothing for a description that cannot be read, or has no such stream, or none so secured.
+    static std::optional<SipStream> READ(std::string_view description, Security security = PLAIN);
     /// What answers it, or offers anew what is there: the same streams and payload types, but nothing agreed on yet.
     SipStream getReply() const;
     /// The session description: every other stream is refused.
@@ -62,6 +74,6 @@ struct SipStream
     unsigned char getEventsType(unsigned int rate) const;
 
     /// What a description of ours and the far side's agree on: the formats of both in the far side's order, none where
-    /// they have none in common.
+    /// they have none in common. Of keys that of ours under the tag that the answer has.
     static MediaDescription AGREED(SipStream const& ours, SipStream const& far);
 };

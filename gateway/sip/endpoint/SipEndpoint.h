@@ -163,6 +163,7 @@ private:
     void followHold();
     void giveUp() override;
     void onSilence(unsigned int seconds) override;
+    void onDigit(char digit, unsigned int milliseconds) override;
     void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
     void forgetOffer();
     void endOffers();

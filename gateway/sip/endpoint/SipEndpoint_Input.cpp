@@ -1,4 +1,4 @@
-// Digits that are keyed in during the call: INFO on the wire, user input on the leg.
+// Digits that are keyed in during the call: INFO on the wire, or what the media tell; user input on the leg.
 #include "services/CC_ServiceUserInput.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
@@ -37,11 +37,22 @@ int SipEndpoint::onInfo(nta_incoming_t* transaction, sip_t const* request)
     return 200;
 }
 
+void SipEndpoint::onDigit(char digit, unsigned int milliseconds)
+{
+    handle(
+        [&]
+        {
+            trace(std::string("heard digit ") + digit);
+            CC_ServiceUserInput input(STRING(std::string(1, digit)), milliseconds);
+            m_adapter.invokeSynchronousService(input);
+        });
+}
+
 /// One after the other, for INFOs may overtake each other.
 void SipEndpoint::onUserInput(CC_ServiceUserInput const& input)
 {
     for (char const digit : input.getInput().view())
-        if (m_digits.size() < MOST_WAITING)
+        if (!m_session.sendDigit(digit, input.getDuration()) && m_digits.size() < MOST_WAITING)
             m_digits.emplace_back(digit, input.getDuration());
     sendDigit();
 }

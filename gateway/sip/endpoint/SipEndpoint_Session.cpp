@@ -460,6 +460,8 @@ void SipEndpoint::endOffers()
 
 void SipEndpoint::noteAllow(sip_t const* message)
 {
-    if (message->sip_allow != nullptr)
-        m_allowsUpdate = sip_is_allowed(message->sip_allow, sip_method_update, nullptr) != 0;
+    if (message->sip_allow == nullptr)
+        return;
+    m_allowsUpdate = sip_is_allowed(message->sip_allow, sip_method_update, nullptr) != 0;
+    m_session.noteInfo(sip_is_allowed(message->sip_allow, sip_method_info, nullptr) != 0);
 }

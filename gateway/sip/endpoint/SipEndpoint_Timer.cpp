@@ -26,6 +26,15 @@ SipSessionTimer::Seen READ_TIMER(sip_t const* message)
         sip_has_feature(message->sip_supported, "timer") || sip_has_feature(message->sip_require, "timer");
     return seen;
 }
+
+/// Whether the last response has come over the network: one that the stack made up has no source.
+bool IS_FROM_PEER(nta_outgoing_t* transaction)
+{
+    msg_t* const response = nta_outgoing_getresponse(transaction);
+    bool const result = response != nullptr && msg_addr(response)->su_sa.sa_family != AF_UNSPEC;
+    msg_destroy(response);
+    return result;
+}
 } // namespace
 
 /// 0, or 422 which was sent.
@@ -83,6 +92,8 @@ void SipEndpoint::refresh()
     startOffer(m_allowsUpdate ? std::string() : m_ownSession, true);
 }
 
+/// What the peer answers shows that it is there, but 481; what the stack answers in its place (503, when the network
+/// gives the message back) may pass until the session expires.
 void SipEndpoint::onRefreshed(unsigned int status, sip_t const* response)
 {
     bool const isInvite = nta_outgoing_method(m_reinvite.transaction) == sip_method_invite;
@@ -93,14 +104,14 @@ void SipEndpoint::onRefreshed(unsigned int status, sip_t const* response)
         m_negotiation.fail(); // as it was
     if (status < 300)
         m_sessionTimer.takeResponse(READ_TIMER(response));
-    else if (status == 408 || status == 481)
+    else if (status == 408 || status == 481 || (!IS_FROM_PEER(m_reinvite.transaction) && m_sessionTimer.miss()))
     {
         clear({QCause::RECOVERY_ON_TIMER_EXPIRY, status, {}});
         return;
     }
     else if (status == 422)
         raiseTimer(response);
-    startSessionTimer(); // whatever it has answered, it is there
+    startSessionTimer();
     sendWaitingOffer();
 }
 

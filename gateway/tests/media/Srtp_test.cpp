@@ -114,6 +114,18 @@ TEST_P(Srtp, OtherKeysTakeEffect)
     EXPECT_TRUE(b.far.hear().has_value());
 }
 
+TEST_P(Srtp, ADirectionWhoseKeyStaysGoesOnWhenTheOtherOnesChanges)
+{
+    for (unsigned int i = 0; i < 50; ++i) // from 65500 past the end
+        saySecured(*far);
+    EXPECT_EQ(b.far.hearAll().size(), 50u);
+    secured.keys = KEYS(GetParam(), 9, 2);
+    a.leg->describe(secured);
+    turn();
+    saySecured(*far);
+    EXPECT_TRUE(b.far.hear().has_value());
+}
+
 TEST_P(Srtp, ReportsAreSecuredToo)
 {
     RtcpPacket packet;

@@ -215,3 +215,46 @@ TEST(TelephoneEventSender, TakesNoMoreThanThirtyTwo)
     EXPECT_FALSE(sender.add('0', 40));
     EXPECT_FALSE(TelephoneEventSender().add('F', 40));
 }
+
+namespace
+{
+/// By which way the call says that a digit came, as one asks it that is told of the digit.
+struct Asking : MediaObserver
+{
+    void onDigit(char, unsigned int) override { way = call->getDigitTold(); }
+
+    CallMedia* call = nullptr;
+    CallMedia::DigitWay way = CallMedia::NONE;
+};
+} // namespace
+
+TEST_F(TelephoneEvents, WhoIsToldOfADigitCanAskByWhichWayItCame)
+{
+    Asking asking;
+    asking.call = call.get();
+    FarEnd far("127.0.0.1");
+    std::unique_ptr<LegMedia> const leg = call->addLeg(far.getRtp().host, asking);
+    far.setPeer(leg->getLocalRtp());
+    MediaDescription description = DESCRIBE(far, {PCMA});
+    description.telephoneEvent = {101, 101};
+    leg->describe(description);
+    turn();
+    key(far, 5);
+    EXPECT_EQ(asking.way, CallMedia::EVENT);
+    EXPECT_EQ(call->getDigitTold(), CallMedia::NONE) << "nobody is told any more";
+}
+
+TEST_F(TelephoneEvents, AreNotMadeToSoundWhereSignallingTellsThem)
+{
+    b.leg->describe(DESCRIBE(b.far, {PCMA})); // takes no events
+    b.leg->setDigitsAside(true);
+    turn();
+    key(a.far, 5);
+    pass(200);
+    EXPECT_TRUE(b.far.hearAll().empty());
+    b.leg->setDigitsAside(false);
+    turn();
+    key(a.far, 5);
+    pass(200);
+    EXPECT_FALSE(b.far.hearAll().empty());
+}

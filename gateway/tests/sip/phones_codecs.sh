@@ -13,12 +13,12 @@ last-port = $((PORT + 15))
 END
 start_gateway
 
-talk() { # CODECS of alice, of bob
-    CODECS=$1 start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 16))
-    CODECS=$2 start_phone bob "$PORT_CALLEE" "$PORT_B" $((PORT + 20)) answermode=auto
+talk() { # CODECS of alice, of bob; the number of the call; "speak": not noise
+    CODECS=$1 SAID=${4:+"$4 1 8"} start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 16))
+    CODECS=$2 SAID=${4:+"$4 2 8"} start_phone bob "$PORT_CALLEE" "$PORT_B" $((PORT + 20)) answermode=auto
     tell_phone "$PORT_CALLER" dial "sip:bob@$HOST:$PORT_A"
     expect_log 'Accept call' "$3"
-    sleep 5
+    sleep 4
     tell_phone "$PORT_CALLER" hangup
     expect_causes "$3" 16
     stop_phones
@@ -31,13 +31,13 @@ expect_speech alice bob 150 a,mu
 expect_speech bob alice 150 mu,a
 rm -r "$WORK/alice" "$WORK/bob"
 
-export SOUND=speak SECONDS_OF_SOUND=12 MODULES="g722 opus"
-talk PCMA G722 2
+export MODULES="g722 opus"
+talk PCMA G722 2 speak
 expect_voice alice bob 3
 expect_voice bob alice 3
 rm -r "$WORK/alice" "$WORK/bob"
 
-talk opus PCMU 3
+talk opus PCMU 3 speak
 expect_voice alice bob 4
 expect_voice bob alice 4
 stop_gateway "3 calls placed, 3 answered, 3 cleared, 0 failed"

@@ -1,5 +1,6 @@
 #include "platform/base/String.h"
 
+#include <cstdint>
 #include <gtest/gtest.h>
 #include <string>
 #include <string_view>
@@ -143,7 +144,15 @@ TEST(String, NumbersAndTruthValuesHaveTexts)
     EXPECT_EQ("18446744073709551615", String::stringOf(18446744073709551615ULL).view());
 }
 
-TEST(String, AnAddressPrintsAsAPointer) { EXPECT_EQ("0x2a", String::addressOf(reinterpret_cast<void*>(42)).view()); }
+TEST(String, AnAddressPrintsAsAPointer)
+{
+    for (std::uintptr_t const address : {std::uintptr_t{0}, std::uintptr_t{42}, ~std::uintptr_t{0}})
+    {
+        auto* const object = reinterpret_cast<void*>(address);
+        EXPECT_EQ(String().format("%p", object), String::addressOf(object));
+    }
+    EXPECT_EQ("0x2a", String::addressOf(reinterpret_cast<void*>(42)).view());
+}
 
 TEST(String, TruthValuesHaveTheirTwoNames)
 {

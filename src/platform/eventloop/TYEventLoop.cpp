@@ -112,10 +112,52 @@ bool TYEventLoop::runTurn()
         return runTurnWithTimers();
     bool const hadWork = !m_turn.isEmpty();
     m_isInTurn = true;
-    while (!m_turn.isEmpty())
-        runFirstEvent();
+    try
+    {
+        while (!m_turn.isEmpty())
+            runFirstEvent();
+    }
+    catch (...)
+    {
+        leaveTurn();
+        throw;
+    }
     m_isInTurn = false;
     return hadWork;
+}
+
+/// Whoever called `runTurn` hears of a handler's exception. What has not run yet is the next turn's.
+[[gnu::cold]] void TYEventLoop::leaveTurn()
+{
+    m_isInTurn = false;
+    for (LinkedListManager_Untyped& due : m_dueTimers)
+        while (!due.isEmpty())
+        {
+            TYTimer& timer = static_cast<TYTimer&>(*due.getFirst());
+            due.unlink(timer);
+            --m_numberOfDueTimers;
+            timer.m_state = TYTimer::State::WAITING;
+            m_timers.add(timer);
+        }
+    settleTimers(true);
+    std::lock_guard const lock(m_mutex);
+    while (!m_turn.isEmpty())
+    {
+        unsigned int const priority = static_cast<TYEvent&>(*m_turn.getFirst()).m_priority;
+        LinkedListManager_Untyped rest; // before what was posted meanwhile
+        while (!m_turn.isEmpty() && static_cast<TYEvent&>(*m_turn.getFirst()).m_priority == priority)
+        {
+            TYEvent& event = static_cast<TYEvent&>(*m_turn.getFirst());
+            m_turn.unlink(event);
+            event.m_isInTurn = false;
+            std::ignore = rest.append(event); // it is in no list
+        }
+        rest.takeAll(m_pending[priority]);
+        m_pending[priority].takeAll(rest);
+    }
+    m_wasPosted.store(true, std::memory_order_release);
+    if (hasPending())
+        setPollFd();
 }
 
 /// A function of its own, so that turns without timers, which are most, pay one comparison for them.
@@ -124,13 +166,21 @@ bool TYEventLoop::runTurnWithTimers()
     takeDueTimers();
     bool const hadWork = !m_turn.isEmpty() || m_numberOfDueTimers != 0;
     m_isInTurn = true;
-    while (!m_turn.isEmpty())
+    try
     {
-        unsigned int const priority = static_cast<TYEvent&>(*m_turn.getFirst()).m_priority;
-        if (m_numberOfDueTimers == 0 || !runDueTimers(priority)) // what ran may have destroyed the event
-            runFirstEvent();
+        while (!m_turn.isEmpty())
+        {
+            unsigned int const priority = static_cast<TYEvent&>(*m_turn.getFirst()).m_priority;
+            if (m_numberOfDueTimers == 0 || !runDueTimers(priority)) // what ran may have destroyed the event
+                runFirstEvent();
+        }
+        runDueTimers(EventPrio::COUNT - 1);
     }
-    runDueTimers(EventPrio::COUNT - 1);
+    catch (...)
+    {
+        leaveTurn();
+        throw;
+    }
     settleTimers(hadWork);
     m_isInTurn = false;
     return hadWork;
@@ -142,9 +192,13 @@ void TYEventLoop::runFirstEvent()
     m_turn.unlink(event);
     event.m_isInTurn = false;
     event.m_isPending.exchange(false); // no plain store: it pairs with the exchange of whoever posts
-    event.addReference();
+    struct Reference
+    {
+        explicit Reference(TYEvent& held) : m_event(held) { m_event.addReference(); }
+        ~Reference() { m_event.removeReference(); }
+        TYEvent& m_event;
+    } const keepEvent(event);
     event.handle();
-    event.removeReference();
 }
 
 // Between turns the coarse clock may be behind what the turn before has read; time does not go back.

@@ -38,7 +38,8 @@ public:
     void run();
     /// Ends `run()` after the turn that is under way. From any thread; also before `run()`, which then ends at once.
     void stop();
-    /// Runs one turn without waiting: whether there was anything to do. Not from inside a handler.
+    /// Runs one turn without waiting: whether there was anything to do. Not from inside a handler. An exception of a
+    /// handler leaves it, and the turn is over; what has not run then is the next turn's.
     bool runTurn();
     /// A descriptor that is readable exactly while work is pending or a timer due, for poll() and its kin; -1 when the
     /// system has none left (it takes three). Do not read from it: `runTurn()` does. A timer that was stopped may make
@@ -79,6 +80,7 @@ private:
     void readTime();
     void takeTurn();
     void runFirstEvent();
+    void leaveTurn();
     /// Whether timers run, or the descriptor is armed for one that did.
     bool hasTimers() const { return !m_timers.isEmpty() || m_armed != NEVER; }
     __attribute__((noinline)) bool runTurnWithTimers();

@@ -1,11 +1,15 @@
 #include "platform/eventloop/TYEventLoop.h"
 
+#include "platform/eventloop/TYTimer.h"
+#include "testing/DrivenClock.h"
+
 #include <atomic>
 #include <functional>
 #include <gtest/gtest.h>
 #include <memory>
 #include <optional>
 #include <poll.h>
+#include <stdexcept>
 #include <string>
 #include <thread>
 #include <tuple>
@@ -192,6 +196,45 @@ TEST_F(TYEventLoopTest, AHostLoopSeesWorkOfAnotherThread)
     EXPECT_TRUE(m_loop->runTurn());
     EXPECT_EQ("p", m_order);
     poster.join();
+}
+
+TEST_F(TYEventLoopTest, AnExceptionOfAHandlerLeavesTheTurnAndTheRestRunsInTheNext)
+{
+    Event& thrower = event(EventPrio::HIGH, [] { throw std::runtime_error("a module's"); });
+    Event& first = event(EventPrio::HIGH, 'f');
+    Event& rest = event(EventPrio::LOW, 'r');
+    Event& posted = event(EventPrio::LOW, 'p');
+    int const fd = m_loop->getPollFd();
+    for (Event* const each : {&rest, &thrower, &first})
+        each->post();
+    EXPECT_THROW(m_loop->runTurn(), std::runtime_error);
+    EXPECT_FALSE(m_loop->isInTurn());
+    EXPECT_EQ(m_order, "");
+    EXPECT_TRUE(IS_READABLE(fd)) << "the host is to come back";
+    EXPECT_EQ(m_loop->getTimeout(), 0);
+    posted.post();
+    rest.post();
+    EXPECT_TRUE(m_loop->runTurn());
+    EXPECT_EQ(m_order, "frp");
+    EXPECT_FALSE(m_loop->runTurn());
+    thrower.post();
+    EXPECT_THROW(m_loop->runTurn(), std::runtime_error) << "it can be posted again";
+    EXPECT_FALSE(IS_READABLE(fd)) << "nothing is left";
+}
+
+TEST_F(TYEventLoopTest, AnExceptionBesideATimerLeavesTheTimerToTheNextTurn)
+{
+    DrivenClock const clock;
+    Event& thrower = event(EventPrio::HIGH, [] { throw std::runtime_error("a module's"); });
+    TYTimer timer(
+        *m_loop, EventPrio::LOW, [](void* order) { *static_cast<std::string*>(order) += 't'; }, &m_order);
+    timer.start(0);
+    thrower.post();
+    EXPECT_THROW(m_loop->runTurn(), std::runtime_error);
+    EXPECT_FALSE(m_loop->isInTurn());
+    EXPECT_TRUE(timer.isRunning());
+    EXPECT_TRUE(m_loop->runTurn());
+    EXPECT_EQ(m_order, "t");
 }
 
 TEST_F(TYEventLoopTest, StopBeforeRunEndsItAtOnceAndOnlyOnce)
