@@ -221,8 +221,12 @@ void IsdnEndpoint::leaveCall(QCause cause)
         Counters& counters = m_interface.getEnvironment().counters;
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
-    spdlog::info("call {} {} ({} side) released: cause {} ({})", m_callNumber, getName().view(),
-                 m_isCalling ? "calling" : "called", static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+    if (m_isCalling)
+        spdlog::info("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
+                     m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+    else // who dialled knows its number
+        spdlog::info("{} (called side, timeslot {}) released: cause {} ({})", getName().view(), m_timeslot,
+                     static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
     finishIfDone();
 }
 

@@ -132,19 +132,30 @@ void IsdnInterface::onRing(pri_event_ring& ring)
     unsigned int const callNumber = m_environment.beginCall();
     if (callNumber == 0)
     {
-        // the stack clears no call that it has not answered
-        m_link.ask([&](pri* stack) { return pri_proceeding(stack, ring.call, ring.channel, 0); });
-        refuse(ring.call, QCause::SWITCHING_EQUIPMENT_CONGESTION);
+        refuseNew(ring, QCause::SWITCHING_EQUIPMENT_CONGESTION);
         return;
     }
+    IsdnEndpoint* endpoint = nullptr;
     try
     {
-        makeEndpoint(callNumber).receiveSetup(ring);
+        endpoint = &makeEndpoint(callNumber);
+        endpoint->receiveSetup(ring);
     }
     catch (std::bad_alloc const&)
     {
-        refuse(ring.call, QCause::RESOURCE_UNAVAILABLE);
+        ++m_environment.counters.failed;
+        if (endpoint != nullptr)
+            finish(*endpoint);
+        refuseNew(ring, QCause::RESOURCE_UNAVAILABLE);
     }
+}
+
+/// The stack clears no call that it has not answered.
+void IsdnInterface::refuseNew(pri_event_ring const& ring, QCause cause)
+{
+    q931_call* const call = ring.call;
+    m_link.ask([&](pri* stack) { return pri_proceeding(stack, call, ring.channel, 0); });
+    refuse(call, cause);
 }
 
 void IsdnInterface::refuse(q931_call* call, QCause cause)

@@ -66,6 +66,7 @@ private:
 
     void onRing(pri_event_ring& ring);
     void onRestart(int channel);
+    void refuseNew(pri_event_ring const& ring, QCause cause);
     void refuse(q931_call* call, QCause cause);
     IsdnEndpoint& makeEndpoint(unsigned int callNumber);
     static void CLEAN_UP(void* interface);

@@ -7,6 +7,7 @@
 #include <new>
 #include <string_view>
 #include <sys/time.h>
+#include <utility>
 #include <vector>
 
 namespace
@@ -54,23 +55,32 @@ IsdnLink::IsdnLink(IsdnLine& line, Options const& options, TYEventLoop& loop, Si
     pri_set_message(LOG);
     pri_set_error(LOG);
     LEFT_STACKS().reserve(LEFT_STACKS().size() + 1);
+}
+
+/// Not before there is a line: what the stack says at once would be lost, and said again when calls are up already.
+bool IsdnLink::makeStack()
+{
+    if (m_stack != nullptr)
+        return true;
     m_stack = pri_new_cb(NO_DESCRIPTOR, m_options.isNetwork ? PRI_NETWORK : PRI_CPE, PRI_SWITCH_EUROISDN_E1, READ,
                          WRITE, this);
     if (m_stack == nullptr)
-        throw std::bad_alloc();
+        return false;
     pri_set_overlapdial(m_stack, m_options.isOverlap);
     pri_facility_enable(m_stack);
     pri_aoc_events_enable(m_stack, 1);
     pri_hangup_fix_enable(m_stack, 1); // Q.931, 5.3.2
     setTimers();
-    startTimer();
+    return true;
 }
 
 IsdnLink::~IsdnLink()
 {
-    if (m_line.getDescriptor() >= 0)
+    if (m_isWatched)
         m_watch.forget(m_line.getDescriptor());
     m_line.close();
+    if (m_stack == nullptr)
+        return;
     pri_set_userdata(m_stack, nullptr);
     LEFT_STACKS().push_back(m_stack);
 }
@@ -89,14 +99,15 @@ void IsdnLink::setTimers()
 
 void IsdnLink::open()
 {
-    if (m_line.isOpen() && m_line.getDescriptor() >= 0 && m_reopening.isRunning())
+    if (m_isWatched)
         return;
-    if (!m_line.open())
+    if (!m_line.open() || !makeStack())
     {
         m_reopening.start(m_options.timers.reopening);
         return;
     }
     m_watch.watch(m_line.getDescriptor(), [this] { onReadable(); });
+    m_isWatched = true;
     onReadable();
 }
 
@@ -141,7 +152,7 @@ void IsdnLink::onReadable()
 /// The far end has gone. What that means for the link its timers will say.
 void IsdnLink::closeLine()
 {
-    if (m_line.getDescriptor() < 0)
+    if (!std::exchange(m_isWatched, false))
         return;
     m_watch.forget(m_line.getDescriptor());
     m_line.close();

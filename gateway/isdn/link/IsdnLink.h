@@ -55,7 +55,8 @@ public:
     IsdnTimers const& getTimers() const { return m_options.timers; }
     IsdnLine& getLine() const { return m_line; }
 
-    /// Asks something of the stack, and has its timers run: what the work returns.
+    /// Asks something of the stack, which is null until the line was open once, and has its timers run: what the work
+    /// returns.
     template <class Work>
     auto ask(Work const& work)
     {
@@ -74,6 +75,7 @@ private:
     static int WRITE(pri* stack, void* buffer, int length);
     static void ON_TIMER(void* link);
     static void ON_REOPENING(void* link);
+    bool makeStack();
     void setTimers();
     void onReadable();
     void closeLine();
@@ -85,9 +87,10 @@ private:
     Options m_options;
     SignallingLoop& m_watch;
     IsdnLinkObserver& m_observer;
-    pri* m_stack = nullptr;
+    pri* m_stack = nullptr; // none before the line was open once
     bool m_isUp = false;
-    bool m_hasRead = false; // the stack says nothing of a frame that is no event
+    bool m_isWatched = false; // the line
+    bool m_hasRead = false;   // the stack says nothing of a frame that is no event
     TYTimer m_timer;
     TYTimer m_reopening;
 };

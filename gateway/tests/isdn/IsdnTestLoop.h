@@ -2,6 +2,7 @@
 
 #include "host/SignallingLoop.h"
 #include "platform/eventloop/TYEventLoop.h"
+#include "testing/FailingAllocator.h"
 
 #include <chrono>
 #include <map>
@@ -39,14 +40,7 @@ public:
     /// Whether there was anything to do within so many milliseconds.
     bool turn(int milliseconds)
     {
-        std::vector<pollfd> waiting{{m_loop.getPollFd(), POLLIN, 0}};
-        for (auto const& [descriptor, handler] : m_handlers)
-            waiting.push_back({descriptor, POLLIN, 0});
-        bool const hasWork = poll(waiting.data(), waiting.size(), milliseconds) > 0;
-        for (std::size_t i = 1; i < waiting.size(); ++i)
-            if (waiting[i].revents != 0)
-                if (auto const found = m_handlers.find(waiting[i].fd); found != m_handlers.end())
-                    std::function<void()>(found->second)();
+        bool const hasWork = takeReadable(milliseconds);
         return m_loop.runTurn() || hasWork;
     }
     /// Until nothing has happened for a while.
@@ -58,6 +52,26 @@ public:
     }
 
 private:
+    /// What the test itself needs of memory does not fail.
+    bool takeReadable(int milliseconds)
+    {
+        std::vector<std::function<void()>> ready;
+        bool hasWork = false;
+        {
+            FailingAllocator::Pause const unseen;
+            std::vector<pollfd> waiting{{m_loop.getPollFd(), POLLIN, 0}};
+            for (auto const& [descriptor, handler] : m_handlers)
+                waiting.push_back({descriptor, POLLIN, 0});
+            hasWork = poll(waiting.data(), waiting.size(), milliseconds) > 0;
+            for (std::size_t i = 1; i < waiting.size(); ++i)
+                if (waiting[i].revents != 0)
+                    ready.push_back(m_handlers[waiting[i].fd]);
+        }
+        for (std::function<void()> const& handler : ready)
+            handler();
+        return hasWork;
+    }
+
     TYEventLoop& m_loop;
     std::map<int, std::function<void()>> m_handlers;
 };

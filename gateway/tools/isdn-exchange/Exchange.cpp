@@ -95,7 +95,8 @@ int Exchange::WRITE(pri* stack, void* buffer, int length)
     return length;
 }
 
-void Exchange::after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work)
+void Exchange::after(unsigned int milliseconds, CallHandle const& call,
+                     std::function<void(CallHandle const&)> const& work)
 {
     std::weak_ptr<Call> const watched = call;
     m_timers.emplace(m_now + milliseconds,
@@ -124,14 +125,6 @@ void Exchange::run(long long now)
         for (auto const& [handle, call] : m_calls)
             if (call->speech != nullptr)
                 call->speech->tick();
-}
-
-long long Exchange::getNext() const
-{
-    long long next = m_nextTick;
-    if (!m_timers.empty())
-        next = std::min(next, m_timers.begin()->first);
-    return next;
 }
 
 Exchange::CallHandle Exchange::find(q931_call* handle) const
@@ -270,6 +263,8 @@ void Exchange::speak(CallHandle const& call, std::string const& what, std::strin
 /// AOC-D, again and again (EN 300 182-1).
 void Exchange::charge(CallHandle const& call)
 {
+    if (!call->isUp)
+        return; // it is being released
     call->units += call->subscriber->units;
     m_report.units += call->subscriber->units;
     pri_subcmd_aoc_d advice = {};
@@ -279,9 +274,10 @@ void Exchange::charge(CallHandle const& call)
 }
 
 /// AOC-E: goes with the message that clears.
-void Exchange::chargeFinally(Call const& call)
+void Exchange::chargeFinally(Call& call)
 {
-    if (call.subscriber == nullptr || call.subscriber->units == 0 || !call.isUp)
+    bool const wasUp = std::exchange(call.isUp, false);
+    if (call.subscriber == nullptr || call.subscriber->units == 0 || !wasUp)
         return;
     pri_subcmd_aoc_e advice = {};
     WRITE_CHARGE(call.subscriber->currency, call.units, advice);

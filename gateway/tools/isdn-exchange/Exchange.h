@@ -34,7 +34,7 @@ struct Report
 /// The network side of one line: answers calls by its plan, and places its own.
 ///
 ///     Exchange exchange(std::move(wires), plan, capture, report);
-///     // whenever its descriptor is readable, and at least every millisecond while it has something to do:
+///     // whenever its descriptor is readable, and every few milliseconds:
 ///     exchange.run(now);
 class Exchange
 {
@@ -47,8 +47,6 @@ public:
     int getDescriptor() const { return m_line.getDescriptor(); }
     /// Takes what came and does what is due; `now` in milliseconds.
     void run(long long now);
-    /// When it wants to be run again, at the latest.
-    long long getNext() const;
     bool isGone() const { return !m_line.isOpen(); }
 
 private:
@@ -70,7 +68,7 @@ private:
     static int READ(pri* stack, void* buffer, int length);
     static int WRITE(pri* stack, void* buffer, int length);
     bool isHit(unsigned int perCent);
-    void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> work);
+    void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> const& work);
     void takeEvent(pri_event& event);
     CallHandle find(q931_call* handle) const;
     void onRing(pri_event_ring const& ring);
@@ -81,7 +79,7 @@ private:
     void answer(CallHandle const& call);
     void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
     void charge(CallHandle const& call);
-    void chargeFinally(Call const& call);
+    void chargeFinally(Call& call);
     void place(Plan::Call const& own);
     void dialOn(CallHandle const& call);
     int hunt() const;

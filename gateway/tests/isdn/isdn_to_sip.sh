@@ -1,0 +1,38 @@
+# The exchange calls a SIP phone, digit by digit; who calls and who redirected the call is told, and the cause comes back.
+. "$(dirname "$0")/isdn.bash"
+
+write_isdn_configuration
+start_exchange <<END
+[[call]]
+to = "4420777#"
+from = "4989123"
+type = 1
+screening = 3
+name = "Ada"
+redirecting = "89200"
+reason = 1
+overlap = true
+length = 300
+after = 1500
+END
+
+callee() {
+    expect_invite To: "4420777@" From: "4989123@" Diversion: "89200@.*user-busy" body "m=audio"
+    respond "180 Ringing"
+    pause 100
+    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
+    expect_request ACK
+    expect_request BYE Reason: "Q.850;cause=16;"
+    respond_in_dialog "200 OK"
+}
+
+PORT_B=$PORT_A PORT_CALLEE=$PORT_CALLER start_callee callee
+start_isdn_gateway
+expect_callee
+expect_log 'call 1 b \(calling side, timeslot 31\) released: cause 16 '
+stop_exchange
+expect_report "0 calls received, 0 answered; 1 placed, 1 answered, 1 over; 0 units charged"
+expect_wellformed
+expect_wire 'q931.message_type == 0x7b' q931.called_party_number.digits '#'
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+finish
