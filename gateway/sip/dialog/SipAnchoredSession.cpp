@@ -170,7 +170,7 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
     ours.mode = ACROSS(far.mode);
     if (!far.keys.empty())
         ours.keys = {getKey(far.keys.front().tag, far.keys.front().suite)};
-    std::string const answer = write(std::move(ours));
+    std::string answer = write(std::move(ours));
     settle(far);
     return answer;
 }
