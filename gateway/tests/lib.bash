@@ -71,6 +71,18 @@ to = "a"
 END
 }
 
+# relay_media: where a test is to be of that, RELAYED is what every session description of the gateway has
+relay_media() {
+    [[ -n ${RELAYED:-} ]] || return 0
+    cat >>"$WORK/gateway.toml" <<END
+
+[media]
+mode = "relay"
+first-port = $((PORT + 32))
+last-port = $((PORT + 39))
+END
+}
+
 # start_gateway [ARGUMENT]...: with the configuration written before; the first call, or as many as TRACED says, is traced.
 start_gateway() {
     [[ -f $WORK/gateway.toml ]] || write_configuration

@@ -118,7 +118,7 @@ call_up() {
     send_invite "$@"
     expect 100
     expect_optional 180
-    expect 200 body "callee"
+    expect 200 body "${RELAYED:-callee}"
     send_ack
 }
 

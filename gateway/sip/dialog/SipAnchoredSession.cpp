@@ -82,11 +82,12 @@ std::optional<SipStream> SipAnchoredSession::read(std::string const& description
 
 // --- what the other side is told -------------------------------------------------------------------------------------
 
-void SipAnchoredSession::addTo(CC_PropertyContainer& own, SipStream const& far) const
+void SipAnchoredSession::addTo(CC_PropertyContainer& own, SipStream const& far)
 {
+    m_supported = SipCodecChoice::COMMON(m_interface.codecs, CODECS_OF(far));
     VoipCodecListSet supported;
     unsigned int const period = far.period;
-    for (SipStream::Codec const codec : SipCodecChoice::COMMON(m_interface.codecs, CODECS_OF(far)))
+    for (SipStream::Codec const codec : m_supported)
         std::ignore = supported.getList(VoipCodecListSet::SEND_RECEIVE).append(VoipCodec(codec, period));
     ADD(own, CC_PropertyCodecs(CC_PropertyId::SUPPORTED_CODECS, supported));
     ADD(own, Negotiating(CC_PropertyId::CODEC_NEGOTIATING, m_isOffering ? Negotiating::REQUEST : Negotiating::IDLE));
@@ -170,7 +171,7 @@ std::string SipAnchoredSession::makeAnswer(SipStream const& far)
     ours.mode = ACROSS(far.mode);
     if (!far.keys.empty())
         ours.keys = {getKey(far.keys.front().tag, far.keys.front().suite)};
-    std::string const answer = write(std::move(ours));
+    std::string answer = write(std::move(ours));
     settle(far);
     return answer;
 }
@@ -280,15 +281,31 @@ bool SipAnchoredSession::isInUnison() const
                                           m_adapter.getPeerCodec().getCodec().getCodec());
 }
 
+/// Of two that could, the one whose Call-Leg-ID is greater.
 bool SipAnchoredSession::isOurTurn() const
 {
-    return m_adapter.getPeerCodecNegotiatingState() == Negotiating::NOT_CAPABLE ||
-           m_adapter.getOwnCallLegId() > m_adapter.getPeerCallLegId();
+    return !canOtherSideChange() || m_adapter.getOwnCallLegId() > m_adapter.getPeerCallLegId();
+}
+
+bool SipAnchoredSession::canChange() const { return SipCodecChoice::HAS_COMPATIBLE(m_supported, getAcross().codec); }
+
+bool SipAnchoredSession::canOtherSideChange() const
+{
+    return m_adapter.getPeerCodecNegotiatingState() != Negotiating::NOT_CAPABLE &&
+           SipCodecChoice::HAS_COMPATIBLE(getAcross().supported, m_codec.getCodec().getCodec());
 }
 
 void SipAnchoredSession::follow(bool isUp)
 {
-    if (!isUp || !m_isAgreed || m_isOffering || isInUnison() || !isOurTurn())
+    if (!isUp || !m_isAgreed || m_isOffering || isInUnison())
+        return;
+    if (!canChange())
+    {
+        if (!canOtherSideChange())
+            m_wire.giveUp();
+        return;
+    }
+    if (!isOurTurn())
         return;
     std::string const offer = makeOffer();
     if (offer.empty())

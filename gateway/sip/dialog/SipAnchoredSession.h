@@ -81,12 +81,14 @@ private:
     std::string write(SipStream&& ours);
     bool settle(SipStream const& far);
     void tell(SipStream const& far);
-    void addTo(CC_PropertyContainer& own, SipStream const& far) const;
+    void addTo(CC_PropertyContainer& own, SipStream const& far);
     bool takesEvents() const;
     void settleDigits();
     void followTone();
     bool isInUnison() const;
     bool isOurTurn() const;
+    bool canChange() const;
+    bool canOtherSideChange() const;
 
     CC_CallAdapterE164& m_adapter;
     SipSessionWire& m_wire;
@@ -101,6 +103,7 @@ private:
     std::vector<SipCrypto> m_keys; // of ours, one of each suite for as long as the dialog
     unsigned int m_version = 0;
     std::string m_pending; // what our peer is to be answered once the dialog is ready
+    Codecs m_supported;    // as our peer has told last
     bool m_isAgreed = false;
     bool m_isOffering = false;
     bool m_isInfoTaken = false;

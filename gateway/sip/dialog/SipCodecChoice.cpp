@@ -62,6 +62,11 @@ Codec SipCodecChoice::FOR_ANSWER(Codecs const& offered, Across const& across)
     return HAS_SPOKEN(across.supported) ? FIRST_SPOKEN(offered) : MG_Rtp::ECodec::NONE;
 }
 
+bool SipCodecChoice::HAS_COMPATIBLE(Codecs const& codecs, Codec other)
+{
+    return std::any_of(codecs.begin(), codecs.end(), [other](Codec codec) { return ARE_COMPATIBLE(codec, other); });
+}
+
 bool SipCodecChoice::ARE_COMPATIBLE(Codec one, Codec other)
 {
     return one == other || (VoiceCodec::IS_SPOKEN(one) && VoiceCodec::IS_SPOKEN(other));

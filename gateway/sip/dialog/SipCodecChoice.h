@@ -28,6 +28,8 @@ Codecs FOR_OFFER(Codecs const& own, Across const& across);
 Codec FOR_ANSWER(Codecs const& offered, Across const& across);
 /// Whether what is said in the one can be heard in the other: they are the same, or both are spoken here.
 bool ARE_COMPATIBLE(Codec one, Codec other);
+/// Whether one of them is so.
+bool HAS_COMPATIBLE(Codecs const& codecs, Codec other);
 /// Those of `codecs` that `others` has too.
 Codecs COMMON(Codecs const& codecs, Codecs const& others);
 } // namespace SipCodecChoice

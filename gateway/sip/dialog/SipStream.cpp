@@ -228,8 +228,8 @@ std::string SipStream::write(Origin const& origin) const
             text += "m=" + streams[i] + "\r\n";
             continue;
         }
-        text += "m=audio " + std::to_string(rtp.port) + (isSecuredProfile ? " RTP/SAVP" : " RTP/AVP") + types + "\r\n" +
-                lines;
+        text += "m=audio " + std::to_string(rtp.port) + (isSecuredProfile ? " RTP/SAVP" : " RTP/AVP");
+        text.append(types).append("\r\n").append(lines);
         for (SipCrypto const& crypto : keys)
             text += "a=crypto:" + crypto.write() + "\r\n";
         text += "a=ptime:" + std::to_string(period != 0 ? period : DEFAULT_PERIOD) + "\r\n";

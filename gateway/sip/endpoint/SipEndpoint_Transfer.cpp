@@ -217,6 +217,9 @@ void SipEndpoint::dialTarget(std::string const& number)
     if (m_target == nullptr)
         m_target = std::make_unique<CC_CallAdapterE164>();
     SipParty const called = SipParty::OF_USER(number);
+    CC_PropertyContainer own; // of the leg that stands for our peer until ours joins
+    if (CC_Property const* const codecs = m_adapter.getOwnProperty(CC_PropertyId::SUPPORTED_CODECS))
+        ADD(own, *codecs);
     CC_PropertyContainer offer;
     if (auto const* const headers = getPeer<CC_PropertyString>(SipPropertyId::HEADERS_FOR_TARGET))
         ADD(offer, *headers);
@@ -233,7 +236,7 @@ void SipEndpoint::dialTarget(std::string const& number)
                    m_adapter.getOwnTypeOfNumber(), m_adapter.getOwnNumberingPlan(),
                    m_adapter.getOwnPresentationIndicator(), m_adapter.getOwnScreeningIndicator(),
                    m_adapter.getOwnName(), STRING(called.number), called.type, called.plan, String(), true,
-                   QInformationTransferCapability::SPEECH, nullptr, nullptr, &offer, &call)
+                   QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call)
             .isOk())
         return;
     endTransfer(QCause::NETWORK_OUT_OF_ORDER);

@@ -5,9 +5,11 @@
 
 caller() {
     call_up
-    expect_request INVITE body "o=newcomer"
-    respond_again "200 OK" "$(session caller 2)"
-    expect_request ACK
+    if [[ -z ${RELAYED:-} ]]; then
+        expect_request INVITE body "o=newcomer"
+        respond_again "200 OK" "$(session caller 2)"
+        expect_request ACK
+    fi
     expect_request BYE
     respond_in_dialog "200 OK"
 }
@@ -38,7 +40,7 @@ newcomer() {
     send_ack_of_failure 2
     send_again 3 "Replaces: $dialog;to-tag=$tag;from-tag=$(<"$WORK/tag")"
     expect 100
-    expect 200 body "o=caller 1 2"
+    expect 200 body "${RELAYED:-o=caller 1 2}"
     send_ack '' 3
     pause 100
     send_text retrans "$(request_text BYE 4 '[branch]' '[peer_tag_param]')" ''
@@ -50,6 +52,7 @@ send_again() { # SEQUENCE HEADER
 }
 
 add_target
+relay_media
 start_gateway
 start_callee callee -trace_msg -message_file "$WORK/callee.msg"
 (expect_caller caller 4989123) &
