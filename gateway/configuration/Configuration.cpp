@@ -66,7 +66,7 @@ std::set<std::string> READ_MODULES(ConfigurationSection const& root, Configurati
 Configuration::Route READ_ROUTE(ConfigurationSection const& section, std::set<std::string> const& interfaces)
 {
     section.allow({"from", "prefix", "to"});
-    Configuration::Route const route{section.neededText("from"), section.text("prefix", {}), section.neededText("to")};
+    Configuration::Route route{section.neededText("from"), section.text("prefix", {}), section.neededText("to")};
     if (!interfaces.contains(route.from))
         section.refuse("from", "there is no interface '" + route.from + "'");
     if (!interfaces.contains(route.to))

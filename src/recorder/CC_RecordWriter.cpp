@@ -75,16 +75,16 @@ Record& CC_RecordWriter::at(std::uint64_t position) const
 
 void CC_RecordWriter::beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
 {
-    bool const mayNote = m_writing != nullptr && m_writing->m_notes != nullptr;
-    if (m_isInBatch && !mayNote && m_changedLeg == leg && m_changedBy == m_writing && m_at <= m_lastPlace)
+    CC_FilterNotes const* const notes = m_writing != nullptr ? m_writing->m_notes : nullptr;
+    if (m_isInBatch && notes == nullptr && m_changedLeg == leg && m_changedBy == m_writing && m_at <= m_lastPlace)
         return beginAlsoChanged(propertyId);
     begin(kind, call, leg, propertyId);
     auto& change = *new (m_at) Change{};
     m_at += sizeof change;
     if (m_writing != nullptr)
         change.by = m_writing->m_by;
-    if (mayNote)
-        appendFilter(propertyId);
+    if (notes != nullptr)
+        appendFilter(*notes, propertyId);
     m_changedLeg = leg;
     m_changedBy = m_writing;
 }
@@ -97,9 +97,9 @@ inline void CC_RecordWriter::beginAlsoChanged(unsigned int propertyId)
 }
 
 /// The filter that made the value different, if one did.
-void CC_RecordWriter::appendFilter(unsigned int propertyId)
+void CC_RecordWriter::appendFilter(CC_FilterNotes const& notes, unsigned int propertyId)
 {
-    CC_FilterNotes::Note const* const note = m_writing->m_notes->find(propertyId);
+    CC_FilterNotes::Note const* const note = notes.find(propertyId);
     if (note == nullptr)
         return;
     auto& change = reinterpret_cast<Change*>(m_at)[-1];

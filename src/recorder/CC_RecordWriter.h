@@ -135,7 +135,7 @@ private:
     inline CC_RecordFormat::Writer getWriter() const;
     void startAt(std::uint64_t head, std::size_t left);
     void beginAlsoChanged(unsigned int propertyId);
-    void appendFilter(unsigned int propertyId);
+    void appendFilter(CC_FilterNotes const& notes, unsigned int propertyId);
     void makeRoom();
     void pad(std::size_t size);
     CC_RecordFormat::Record& at(std::uint64_t position) const;

@@ -41,7 +41,7 @@ MG_Rtp::ECodec::Type SipCodec::OF(std::string_view payloadType, std::string_view
 
 std::string SipCodec::ENCODING(MG_Rtp::ECodec::Type codec)
 {
-    std::string const name = Codec::NAME(codec);
+    std::string name = Codec::NAME(codec);
     if (name.find('/') != std::string::npos)
         return name;
     return name + "/" + std::to_string(RtpRoutes::CLOCK_RATE(codec)) + (codec == Codec::OPUS ? "/2" : "");
