@@ -159,6 +159,9 @@ expect_trace() {
     fail "no line of the trace matches: $1"
 }
 
+# tell_trace REGEXP: what matches first in the trace, for whoever looks on
+tell_trace() { grep -oE -m 1 -- "$1" "$WORK/gateway.out"; }
+
 # expect_no_calls SECONDS: after which no call is up any more
 expect_no_calls() {
     local i

@@ -31,6 +31,8 @@ expect_trace 'told peer Current Codec=PCMU'
 for codec in PCMA PCMU; do
     expect_trace "did  Quality-Of-Service=MOS: [34].*$codec 20ms.*Transmitted packets: (1[5-9]|2[0-9])[0-9],.*Received packets: (1[5-9]|2[0-9])[0-9],"
 done
+tell_trace 'Quality-Of-Service=.*PCMA.*'
+tell_trace 'Quality-Of-Service=.*PCMU.*'
 expect_speech alice bob 150 a,mu
 expect_speech bob alice 150 mu,a
 rm -r "$WORK/alice" "$WORK/bob"
