@@ -2,41 +2,8 @@
 # silence, and a call between two ordinary peers works in the middle of it and after it.
 . "$(dirname "$0")/../lib.bash"
 . "$HERE/plain_call.bash"
+. "$HERE/torture.bash"
 
-# A message is told by what is odd about it: torture NAME ANSWER START-LINE [HEADER]... A header takes the place of the
-# ordinary one of its name; "-Name" leaves that out; "body:TEXT" is the body. Escapes are printf's. ANSWER is a regular
-# expression over the statuses that come back ("" for silence). No route leads anywhere, so a call that is understood gets
-# 404. What RFC 4475 calls invalid may be refused in whatever way; what it calls valid must be understood, but for a
-# method with characters that the SIP stack does not take for such (intmeth): that is dropped.
-names=()
-declare -A answer_of
-torture() {
-    local name=$1 method=${3%% *} header field body=
-    names+=("$name")
-    answer_of[$name]=$2
-    local -A fields=([Via]="SIP/2.0/TRANSPORT $HOST:9;rport;branch=z9hG4bK$name" [From]="<sip:a@$HOST>;tag=$name"
-        [To]="<sip:b@$HOST>" [Call-ID]="$name" [CSeq]="1 $method" [Max-Forwards]=70 [Contact]="<sip:a@$HOST>" [Content-Length]=AUTO)
-    local order=(Via From To Call-ID CSeq Max-Forwards Contact) more=()
-    for header in "${@:4}"; do
-        field=${header%%:*}
-        case $header in
-        -*) unset "fields[${header#-}]" ;;
-        body:*) body=${header#body:} ;;
-        *) if [[ -n ${fields[$field]+x} ]]; then fields[$field]=${header#*: }; else more+=("$header"); fi ;;
-        esac
-    done
-    [[ ${fields[Content-Length]-} != AUTO ]] || fields[Content-Length]=$(printf '%b' "$body" | wc -c)
-    {
-        printf '%b\r\n' "$3"
-        for field in "${order[@]}"; do
-            [[ -z ${fields[$field]+x} ]] || printf '%b\r\n' "$field: ${fields[$field]}"
-        done
-        (($# < 4)) || for header in ${more[@]+"${more[@]}"}; do printf '%b\r\n' "$header"; done
-        [[ -z ${fields[Content-Length]+x} ]] || printf 'Content-Length: %b\r\n' "${fields[Content-Length]}"
-        printf '\r\n'
-        printf '%b' "$body"
-    } >"$WORK/$name.message"
-}
 LONG=$(printf '%300s' '' | tr ' ' l)
 SDP='v=0\r\no=a 1 1 IN IP4 192.0.2.1\r\ns=-\r\nc=IN IP4 192.0.2.1\r\nt=0 0\r\nm=audio 49217 RTP/AVP 0\r\n'
 TYPE='Content-Type: application/sdp'
@@ -98,44 +65,11 @@ torture sdp01 '100 404|404|406' 'INVITE sip:user@example.com SIP/2.0' 'Accept: t
 # 3.4
 torture inv2543 '100 404|404|400' 'INVITE sip:UserB@example.com SIP/2.0' "Via: SIP/2.0/TRANSPORT $HOST:9;rport" -Max-Forwards 'From: <sip:iamalegal2543@h>' -Contact
 
-message() { sed "s|SIP/2.0/TRANSPORT|SIP/2.0/$2|" "$WORK/$1.message"; }
-# expect_answers TRANSPORT FILE: the statuses that came for each message, provisional ones before the final one
-expect_answers() {
-    local name got
-    for name in "${names[@]}"; do
-        got=$(tr -d '\r' <"$2" | awk -v id="$name" '/^SIP\/2.0 / { status = $2 } $1 == "Call-ID:" && $2 == id { print status }' |
-            uniq | tr '\n' ' ')
-        [[ ${got% } =~ ^(${answer_of[$name]})$ ]] || fail "$name over $1: answers '${got% }' instead of '${answer_of[$name]}'"
-    done
-}
-
 write_configuration 'max-calls-per-second = 0' $'transports = ["udp", "tcp"]\nmax-connections-per-source = 200\ntcp-idle = 2' 4989
 start_gateway
-exec 3<>"/dev/udp/$HOST/$PORT_A"
-for name in "${names[@]}"; do
-    message "$name" UDP >"$WORK/datagram"
-    cat "$WORK/datagram" >&3
-done
-timeout 1 cat <&3 >"$WORK/udp.answers"
-exec 3>&-
-kill -0 $gateway_pid 2>/dev/null || fail "the gateway is gone"
-expect_answers UDP "$WORK/udp.answers"
+send_datagrams
 expect_call
-
-readers=()
-for name in "${names[@]}"; do
-    (
-        exec 3<>"/dev/tcp/$HOST/$PORT_A" || exit
-        message "$name" TCP >&3
-        timeout 1 cat <&3 >"$WORK/$name.tcp"
-    ) 2>/dev/null &
-    readers+=($!)
-done
-expect_call -t t1
-wait "${readers[@]}"
-kill -0 $gateway_pid 2>/dev/null || fail "the gateway is gone"
-cat "$WORK"/*.tcp >"$WORK/tcp.answers"
-expect_answers TCP "$WORK/tcp.answers"
+send_streams expect_call -t t1
 expect_call -t t1
 kill -TERM $gateway_pid
 status=0
