@@ -2,6 +2,7 @@
 // tells how it is used.
 #include "Gateway.h"
 #include "host/ModuleLoader.h"
+#include "host/Routing.h"
 #include "operation/Log.h"
 #include "operation/Output.h"
 
@@ -12,6 +13,7 @@
 #include <string>
 #include <unistd.h>
 #include <utility>
+#include <vector>
 
 namespace
 {
@@ -28,6 +30,8 @@ struct Arguments
     bool isCheck = false;
     unsigned int tracedCalls = 0;
     std::string logLevel;
+    std::string routed; // the number of a dry run
+    std::string from;
     std::string modules = ModuleLoader::GET_INSTALLED_FOLDER();
 };
 
@@ -42,6 +46,8 @@ void DECLARE(CLI::App& app, Arguments& arguments)
     app.add_option("-c,--config", arguments.file, "The configuration file (TOML)")->required();
     app.add_flag("--check", arguments.isCheck, "Only read the configuration file");
     app.add_option("--trace-calls", arguments.tracedCalls, "Print a ladder of each of the first N calls");
+    auto* const route = app.add_option("--route", arguments.routed, "Only tell where a call to this number leaves");
+    app.add_option("--from", arguments.from, "The interface on which that call comes in")->needs(route);
     app.add_option("--modules", arguments.modules, "The folder of the signalling modules");
     app.add_option("--log-level", arguments.logLevel, "Instead of the configuration's log-level")
         ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
@@ -62,9 +68,27 @@ int SERVE(Configuration const& configuration, Gateway::Modules modules, unsigned
     return leftOver == 0 ? ALL_RIGHT : LEFT_OVERS;
 }
 
+/// Every route that fits, the one that is taken first.
+int TELL_ROUTE(Configuration const& configuration, Arguments const& arguments)
+{
+    if (!configuration.interfaces.contains(arguments.from))
+        return COMPLAIN(("there is no interface '" + arguments.from + "'").c_str());
+    Routing const routing(configuration.routes);
+    std::vector<Routing::Match> const matches = routing.findAll(arguments.from, arguments.routed);
+    if (matches.empty())
+        std::printf("%s from %s: no route, 404 with cause 3\n", arguments.routed.c_str(), arguments.from.c_str());
+    for (Routing::Match const& match : matches)
+        std::printf("%s from %s: prefix \"%s\" to %s%s\n", arguments.routed.c_str(), arguments.from.c_str(),
+                    std::string(match.prefix).c_str(), match.to.c_str(),
+                    &match == &matches.front() ? "" : " (not taken: a longer one fits)");
+    return ALL_RIGHT;
+}
+
 int RUN(Arguments const& arguments)
 {
     Configuration const configuration = Configuration::READ(arguments.file);
+    if (!arguments.routed.empty())
+        return TELL_ROUTE(configuration, arguments);
     Gateway::Modules modules;
     for (auto const& [name, interfaces] : configuration.modules)
         modules[name] = ModuleLoader(arguments.modules).load(name, configuration);

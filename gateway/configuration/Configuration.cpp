@@ -2,7 +2,6 @@
 
 #include <fstream>
 #include <limits>
-#include <set>
 
 namespace
 {
@@ -45,22 +44,20 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
 }
 
-/// Every table that is not the gateway's own is a module's. Gives back the names of the interfaces.
-std::set<std::string> READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
+/// Every table that is not the gateway's own is a module's.
+void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
 {
-    std::set<std::string> names;
     for (std::string const& key : root.getKeys())
     {
         if (key == "gateway" || key == "media" || key == "route")
             continue;
         std::vector<ConfigurationSection>& interfaces = configuration.modules[key] = root.sections(key);
         for (ConfigurationSection const& interface : interfaces)
-            if (std::string const name = interface.neededText("name"); !names.insert(name).second)
+            if (std::string const name = interface.neededText("name"); !configuration.interfaces.insert(name).second)
                 interface.refuse("name", "'" + name + "' is taken by another interface");
     }
-    if (names.empty())
+    if (configuration.interfaces.empty())
         throw ConfigurationError(configuration.file, "interfaces", "are missing: [[sip]] for one that speaks SIP");
-    return names;
 }
 
 Configuration::Route READ_ROUTE(ConfigurationSection const& section, std::set<std::string> const& interfaces)
@@ -94,8 +91,8 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     configuration.file = file;
     READ_GATEWAY(root.section("gateway"), configuration);
     READ_MEDIA(root.section("media"), configuration);
-    std::set<std::string> const interfaces = READ_MODULES(root, configuration);
+    READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
-        configuration.routes.push_back(READ_ROUTE(route, interfaces));
+        configuration.routes.push_back(READ_ROUTE(route, configuration.interfaces));
     return configuration;
 }

@@ -4,6 +4,7 @@
 #include "media/context/MediaOptions.h"
 
 #include <map>
+#include <set>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -41,6 +42,7 @@ struct Configuration
     MediaOptions media;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
+    std::set<std::string> interfaces; ///< the names of all
     /// By the module's name, its interfaces. Each has a `name` that no other interface has.
     std::map<std::string, std::vector<ConfigurationSection>> modules;
 

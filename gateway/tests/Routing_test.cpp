@@ -16,6 +16,34 @@ TEST(Routing, TheLongestPrefixOfTheCallsOwnInterfaceWins)
     EXPECT_EQ(*routing.find("a", ""), "default");
 }
 
+TEST(Routing, AllThatFitAreToldInTheOrderInWhichTheyWouldBeTaken)
+{
+    Routing const routing(
+        {{"a", "", "default"}, {"a", "49", "germany"}, {"a", "4930", "berlin"}, {"a", "4989", "munich"}});
+    std::string text;
+    for (Routing::Match const& match : routing.findAll("a", "4989123"))
+        text += std::string(match.prefix) + "->" + match.to + " ";
+    EXPECT_EQ(text, "4989->munich 49->germany ->default ");
+}
+
+TEST(Routing, NoInterfaceGetsTheRoutesOfAnotherWhoseNameBeginsAlike)
+{
+    Routing const routing({{"a", "49", "x"}, {"a4", "9", "y"}});
+    EXPECT_EQ(*routing.find("a", "499"), "x");
+    EXPECT_EQ(*routing.find("a4", "99"), "y");
+    EXPECT_EQ(routing.find("a4", "499"), nullptr);
+}
+
+TEST(Routing, AHundredThousandPrefixesAreATable)
+{
+    std::vector<Configuration::Route> routes;
+    for (unsigned int i = 100000; i < 200000; ++i)
+        routes.push_back({"a", std::to_string(i), "to" + std::to_string(i)});
+    Routing const routing(routes);
+    EXPECT_EQ(*routing.find("a", "1234567890"), "to123456");
+    EXPECT_EQ(routing.find("a", "2234567890"), nullptr);
+}
+
 TEST(Routing, WithoutAFittingRouteThereIsNone)
 {
     Routing const routing({{"b", "49", "a"}});
