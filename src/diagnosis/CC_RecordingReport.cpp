@@ -85,6 +85,12 @@ bool IS_NAMED(unsigned int id, std::string_view name)
     return isShortName || name == NAME_OF_PROPERTY(id);
 }
 
+bool IS_CHANGE_OF(Event const& event, std::uint64_t leg, std::string_view propertyName)
+{
+    return event.record.kind == Kind::LEG_CHANGED && event.record.leg == leg &&
+           IS_NAMED(event.record.detail, propertyName);
+}
+
 char const* NAME(Kind kind)
 {
     static constexpr NamedValue<Kind> NAMES[] = {{Kind::CALL_ACQUIRED, "CALL_ACQUIRED"},
@@ -321,8 +327,7 @@ CC_RecordingReport::Lines CC_RecordingReport::getHistory(std::uint64_t leg, std:
     Lines lines;
     for (Event const& event : m_recording.getEvents())
     {
-        if (event.record.kind != Kind::LEG_CHANGED || event.record.leg != leg ||
-            !IS_NAMED(event.record.detail, propertyName))
+        if (!IS_CHANGE_OF(event, leg, propertyName))
             continue;
         std::string const writer = writerOf(event);
         lines.push_back(timeOf(event) + "  turn " + std::to_string(event.record.turn) + "  " +
@@ -331,34 +336,44 @@ CC_RecordingReport::Lines CC_RecordingReport::getHistory(std::uint64_t leg, std:
     return lines;
 }
 
+CC_RecordingReport::Lines CC_RecordingReport::getHistoryJson(std::uint64_t leg, std::string_view propertyName) const
+{
+    Lines lines;
+    for (Event const& event : m_recording.getEvents())
+        if (IS_CHANGE_OF(event, leg, propertyName))
+            lines.push_back(jsonOf(event));
+    return lines;
+}
+
+std::string CC_RecordingReport::jsonOf(Event const& event) const
+{
+    Record const& record = event.record;
+    CC_JsonLine line;
+    line.add("time", timeOf(event)).add("turn", record.turn).add("event", NAME(record.kind));
+    if (record.call != 0)
+        line.add("call", record.call);
+    if (record.leg != 0)
+        line.add("leg", record.leg).add("legName", find(record.leg)->name);
+    if (record.kind == Kind::LEG_CHANGED || record.kind == Kind::CALL_CHANGED)
+    {
+        line.add("property", NAME_OF_PROPERTY(record.detail)).add("id", record.detail);
+        if (event.before.place != Brief::NOTHING)
+            line.add("before", valueOf(event, event.before));
+        line.add("after", valueOf(event, event.after)).add("writer", NAME(record.writer));
+        if (event.by != 0)
+            line.add("by", event.by);
+        if (!event.filter.empty())
+            line.add("filter", event.filter).add("filterPlace", event.filterPlace);
+    }
+    return line.add("text", textOf(event)).get();
+}
+
 CC_RecordingReport::Lines CC_RecordingReport::getJson(std::uint64_t call) const
 {
     Lines lines;
     for (Event const& event : m_recording.getEvents())
-    {
-        Record const& record = event.record;
-        if (call != 0 && record.call != call)
-            continue;
-        CC_JsonLine line;
-        line.add("time", timeOf(event)).add("turn", record.turn).add("event", NAME(record.kind));
-        if (record.call != 0)
-            line.add("call", record.call);
-        if (record.leg != 0)
-            line.add("leg", record.leg).add("legName", find(record.leg)->name);
-        if (record.kind == Kind::LEG_CHANGED || record.kind == Kind::CALL_CHANGED)
-        {
-            line.add("property", NAME_OF_PROPERTY(record.detail)).add("id", record.detail);
-            if (event.before.place != Brief::NOTHING)
-                line.add("before", valueOf(event, event.before));
-            line.add("after", valueOf(event, event.after)).add("writer", NAME(record.writer));
-            if (event.by != 0)
-                line.add("by", event.by);
-            if (!event.filter.empty())
-                line.add("filter", event.filter).add("filterPlace", event.filterPlace);
-        }
-        line.add("text", textOf(event));
-        lines.push_back(line.get());
-    }
+        if (call == 0 || event.record.call == call)
+            lines.push_back(jsonOf(event));
     return lines;
 }
 

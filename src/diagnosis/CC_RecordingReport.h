@@ -51,6 +51,11 @@ public:
     Lines getCalls() const;
     /// One JSON object an event, `call` 0: of all calls and of none.
     Lines getJson(std::uint64_t call = 0) const;
+    /// The same of the events of which `getHistory` tells.
+    Lines getHistoryJson(std::uint64_t leg, std::string_view propertyName) const;
+    /// One JSON object a call: "call", "state" ("up" or "ended"), "hasBeginning", "age" in nanoseconds, "numbers" (one
+    /// a leg, null: unknown), "cause" (once there is one).
+    Lines getCallsJson() const;
 
     /// Adds the lines to a dump, each at that level.
     static InfoContainer& ADD(InfoContainer& info, unsigned int level, Lines const& lines);
@@ -66,6 +71,7 @@ private:
         std::array<bool, 3> isAllowed{};
     };
     class Summary;
+    using Numbers = std::map<std::uint64_t, std::string>; // of the legs
 
     void note(CC_Recording::Event const& event);
     Leg const* find(std::uint64_t leg) const;
@@ -75,6 +81,8 @@ private:
     std::string writerOf(CC_Recording::Event const& event) const;
     std::string changeOf(CC_Recording::Event const& event) const;
     std::string textOf(CC_Recording::Event const& event) const;
+    std::string jsonOf(CC_Recording::Event const& event) const;
+    std::map<std::uint64_t, Summary> summarise(Numbers& numbers) const;
     std::string timeOf(CC_Recording::Event const& event) const;
     std::vector<std::uint64_t> getCallSerials() const;
 

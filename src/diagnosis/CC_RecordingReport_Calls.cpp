@@ -2,11 +2,13 @@
 #include "diagnosis/CC_RecordingReport.h"
 
 #include "diagnosis/CC_BriefText.h"
+#include "diagnosis/CC_JsonLine.h"
 #include "platform/signalling/QCause.h"
 #include "properties/CC_PropertyId.h"
 
 #include <algorithm>
 #include <array>
+#include <cmath>
 #include <cstdio>
 
 using namespace CC_RecordFormat;
@@ -122,8 +124,6 @@ CC_RecordingReport::Lines CC_RecordingReport::getLadders() const
 class CC_RecordingReport::Summary
 {
 public:
-    using Numbers = std::map<std::uint64_t, std::string>; // of the legs
-
     /// One of the call's events; `cause`: what it gives for one. The first one tells why the call ends.
     void note(Event const& event, std::string const& cause)
     {
@@ -148,6 +148,25 @@ public:
         std::snprintf(text.data(), text.size(), "%8llu  %-20s %10.3f s  ", static_cast<unsigned long long>(call), state,
                       NANOSECONDS_BETWEEN(m_first, m_hasEnded ? m_last : now) / 1e9);
         return text.data() + PADDED(getNumbers(numbers), 36) + m_cause;
+    }
+
+    std::string getJson(std::uint64_t call, long long now, Numbers const& numbers) const
+    {
+        std::string list;
+        for (std::uint64_t const leg : m_legs)
+        {
+            auto const found = numbers.find(leg);
+            bool const isKnown = found != numbers.end() && !found->second.empty();
+            (list += list.empty() ? "[" : ",") += isKnown ? CC_JsonLine::QUOTED(found->second) : "null";
+        }
+        CC_JsonLine line;
+        line.add("call", call).add("state", m_hasEnded ? "ended" : "up");
+        line.addJson("hasBeginning", m_hasBeginning ? "true" : "false");
+        line.addJson("age", std::to_string(std::llround(NANOSECONDS_BETWEEN(m_first, m_hasEnded ? m_last : now))));
+        line.addJson("numbers", list.empty() ? "[]" : list + "]");
+        if (!m_cause.empty())
+            line.add("cause", m_cause);
+        return line.get();
     }
 
 private:
@@ -185,10 +204,9 @@ bool IS_NUMBER(Event const& event)
 }
 } // namespace
 
-CC_RecordingReport::Lines CC_RecordingReport::getCalls() const
+std::map<std::uint64_t, CC_RecordingReport::Summary> CC_RecordingReport::summarise(Numbers& numbers) const
 {
     std::map<std::uint64_t, Summary> calls;
-    Summary::Numbers numbers;
     for (Event const& event : m_recording.getEvents())
     {
         if (IS_NUMBER(event)) // told before the leg joins
@@ -196,8 +214,23 @@ CC_RecordingReport::Lines CC_RecordingReport::getCalls() const
         if (event.record.call != 0)
             calls[event.record.call].note(event, IS_CAUSE(event) ? valueOf(event, event.after) : std::string());
     }
+    return calls;
+}
+
+CC_RecordingReport::Lines CC_RecordingReport::getCalls() const
+{
+    Numbers numbers;
     Lines lines{"    call  state                       age  numbers                             cause"};
-    for (auto const& [call, summary] : calls)
+    for (auto const& [call, summary] : summarise(numbers))
         lines.push_back(summary.getLine(call, m_recording.getEvents().back().record.nanoseconds, numbers));
+    return lines;
+}
+
+CC_RecordingReport::Lines CC_RecordingReport::getCallsJson() const
+{
+    Numbers numbers;
+    Lines lines;
+    for (auto const& [call, summary] : summarise(numbers))
+        lines.push_back(summary.getJson(call, m_recording.getEvents().back().record.nanoseconds, numbers));
     return lines;
 }

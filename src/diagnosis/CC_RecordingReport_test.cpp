@@ -169,6 +169,10 @@ TEST_F(CC_RecordingReport_Test, HistoryTellsEachValueItsWriterAndTheFilter)
     EXPECT_NE(names[1].find("  Anna  by its own adapter"), std::string::npos) << names[1];
     EXPECT_NE(names[2].find("  X  by code outside any adapter"), std::string::npos) << names[2];
     EXPECT_TRUE(report().getHistory(ofAnna, "no such property").empty());
+
+    Lines const asJson = report().getHistoryJson(ofAnna, "name");
+    ASSERT_EQ(asJson.size(), 3u) << all(asJson);
+    EXPECT_NE(asJson[2].find("\"before\":\"Anna\",\"after\":\"X\""), std::string::npos) << asJson[2];
 }
 
 TEST_F(CC_RecordingReport_Test, WhoeverWritesInsideANotificationIsNamedAndNotWhomItIsToldOf)
@@ -244,6 +248,9 @@ TEST_F(CC_RecordingReport_Test, CallsAreOneLineEach)
     ASSERT_EQ(up.size(), 2u);
     EXPECT_NE(up[1].find(serial + "  up                       61.000 s  4420791234 - 4989123"), std::string::npos)
         << up[1];
+    EXPECT_EQ(all(report().getCallsJson()), "{\"call\":" + serial +
+                                                ",\"state\":\"up\",\"hasBeginning\":true,\"age\":61000000000,"
+                                                "\"numbers\":[\"4420791234\",\"4989123\"]}\n");
     bert.hangUp(QCause::USER_BUSY);
     settle();
     anna.hangUp();
@@ -251,6 +258,8 @@ TEST_F(CC_RecordingReport_Test, CallsAreOneLineEach)
     Lines const ended = report().getCalls();
     EXPECT_NE(ended[1].find("ended"), std::string::npos) << ended[1];
     EXPECT_NE(ended[1].find("User busy"), std::string::npos) << "the first cause tells why: " << ended[1];
+    EXPECT_NE(all(report().getCallsJson()).find("\"state\":\"ended\""), std::string::npos);
+    EXPECT_NE(all(report().getCallsJson()).find("\"cause\":\"User busy\"}"), std::string::npos);
 }
 
 TEST_F(CC_RecordingReport_Test, ServicesAndTransfersAreInTheLadder)

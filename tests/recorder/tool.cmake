@@ -48,6 +48,11 @@ expect_none("a restricted number" "${output}" "49891111")
 run(0 ladder ${ring} --call 1 --json)
 expect("the same" "${output}" "^{\"time\":")
 
+run(0 calls ${ring} --json)
+expect("calls as JSON" "${output}" "^{\"call\":1,\"state\":\"ended\",[^\n]*\"numbers\":\\[\"\\(withheld\\)\",null\\],\"cause\":\"User busy\"}\n")
+run(0 history ${ring} --leg 3 --property e164 --json)
+expect("a history as JSON" "${output}" "^{\"time\":[^\n]*\"after\":\"49892222\"[^\n]*}\n$")
+
 run(1 history ${ring} --leg 77 --property e164)
 run(1 ladder ${ring} --call 77)
 run(1 calls ${WORK}/no-such-file)

@@ -106,9 +106,10 @@ using Lines = CC_RecordingReport::Lines;
 bool ANSWER(CC_RecordingReport const& report, Arguments const& arguments, Lines& lines)
 {
     if (arguments.verb == "calls")
-        lines = report.getCalls();
+        lines = arguments.isJson ? report.getCallsJson() : report.getCalls();
     else if (arguments.verb == "history")
-        lines = report.getHistory(arguments.leg, arguments.property);
+        lines = arguments.isJson ? report.getHistoryJson(arguments.leg, arguments.property)
+                                 : report.getHistory(arguments.leg, arguments.property);
     else if (arguments.verb == "events" || (arguments.verb == "ladder" && arguments.isJson))
         lines = report.getJson(arguments.call);
     else if (arguments.verb == "ladder")
