@@ -10,7 +10,7 @@
 
 /// The other end of a line for tests: the stack itself, its calls driven in verbs, what it hears noted line by line. It
 /// clears what the near side clears.
-class IsdnFarSide : public IsdnLinkObserver
+class IsdnFarSide final : public IsdnLinkObserver
 {
 public:
     using Lines = std::vector<std::string>;
