@@ -124,7 +124,7 @@ TEST_F(IsdnLineTest, WhatIsNoBlockIsPassedOver)
 {
     IsdnDescriptor const from = near->openChannel(1);
     IsdnDescriptor const to = far->openChannel(1);
-    for (std::size_t const length : {1, 163, 165, 4096})
+    for (std::size_t const length : {1u, 163u, 165u, 4096u})
         ASSERT_EQ(send(from.get(), Frame(length).data(), length, 0), static_cast<ssize_t>(length));
     IsdnBlock block;
     EXPECT_FALSE(block.receive(to.get()));

@@ -14,7 +14,7 @@ namespace
 using Lines = std::vector<std::string>;
 
 /// One side of a link, which notes what it is told and gives the calls back that the far side clears.
-struct Side : IsdnLinkObserver
+struct Side final : IsdnLinkObserver
 {
     Side(IsdnLine& line, IsdnLink::Options const& options, TYEventLoop& loop, SignallingLoop& watch)
         : link(line, options, loop, watch, *this)
