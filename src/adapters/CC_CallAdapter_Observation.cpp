@@ -194,14 +194,15 @@ __attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& 
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
     CC_CallLeg const& leg = *m_ownCallLeg;
+    CC_PropertyView& view = m_ownView; // to be named when this may be gone
     Copy const copy(attempt, *this, Kept::OWN_OUTPUT, leg.getProperties(), leg.getSerial(), TOLD(leg, &changed));
     if (!copy.isWhole())
         return;
     XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
-        m_ownView.assignMarked(copy.get(), copy.settle(), 0);
+        view.assignMarked(copy.get(), copy.settle(), 0);
     if (attempt.isOver())
-        std::ignore = attempt.emptyWhenIdle(m_ownView); // as above
+        std::ignore = attempt.emptyWhenIdle(view); // as above
 }
 
 /// Tells the module. One class for the views of peer and call, so that what follows them is there once.

@@ -130,9 +130,10 @@ XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
 {
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
-    XCode const seen = m_ownView.write(property);
+    CC_PropertyView& view = m_ownView; // to be named when this may be gone
+    XCode const seen = view.write(property);
     if (!seen.isOk() || attempt.isOver())
-        return attempt.emptyWhenIdle(m_ownView);
+        return attempt.emptyWhenIdle(view);
     m_isWritingOwn = true;
     XCode const result = WRITE(*m_ownCallLeg, property);
     if (!attempt.isOver())

@@ -26,10 +26,11 @@ void LOG(pri*, char* text)
         spdlog::debug("isdn stack: {}", line);
 }
 
-/// Stacks whose links have ended. Nothing gives them back, but nobody is to take them for lost either.
+/// Stacks whose links have ended. Nothing gives them back, but nobody is to take them for lost either, not even after
+/// the process has ended its objects.
 std::vector<pri*>& LEFT_STACKS()
 {
-    static std::vector<pri*> s_stacks;
+    static auto& s_stacks = *new std::vector<pri*>;
     return s_stacks;
 }
 
