@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <vector>
 
 namespace
 {
@@ -29,6 +30,13 @@ int BEARER(std::string const& name)
     return name == "digital" ? PRI_TRANS_CAP_DIGITAL
            : name == "audio" ? PRI_TRANS_CAP_3_1K_AUDIO
                              : PRI_TRANS_CAP_SPEECH;
+}
+
+/// They cannot be given back; here nobody takes them for lost.
+std::vector<pri*>& ENDED_STACKS()
+{
+    static auto& s_stacks = *new std::vector<pri*>;
+    return s_stacks;
 }
 
 template <class Advice>
@@ -59,12 +67,10 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_hangup_fix_enable(m_stack, 1);
 }
 
-/// The stack cannot be given back; it stays in sight, so that nobody takes it for lost.
 Exchange::~Exchange()
 {
-    static auto& s_stacks = *new std::vector<pri*>;
     pri_set_userdata(m_stack, nullptr);
-    s_stacks.push_back(m_stack);
+    ENDED_STACKS().push_back(m_stack);
 }
 
 bool Exchange::isHit(unsigned int perCent) { return perCent != 0 && m_random() % 100 < perCent; }
