@@ -10,6 +10,7 @@
 #include <sys/wait.h>
 #include <tuple>
 #include <unistd.h>
+#include <utility>
 
 namespace
 {
@@ -50,11 +51,11 @@ StateDump::~StateDump()
         waitpid(m_child, nullptr, 0); // within its patience: what was asked for is told
 }
 
-void StateDump::begin(std::function<std::string()> const& collect)
+void StateDump::begin(std::function<std::string()> collect)
 {
     if (m_child > 0)
     {
-        spdlog::info("the state is being told already");
+        m_next = std::move(collect);
         return;
     }
     std::fflush(stdout); // else both would write what is in the buffer
@@ -67,6 +68,9 @@ void StateDump::begin(std::function<std::string()> const& collect)
 
 void StateDump::onChild()
 {
-    if (m_child > 0 && waitpid(m_child, nullptr, WNOHANG) != 0)
-        m_child = 0;
+    if (m_child <= 0 || waitpid(m_child, nullptr, WNOHANG) == 0)
+        return;
+    m_child = 0;
+    if (auto const next = std::exchange(m_next, nullptr))
+        begin(next);
 }
