@@ -13,26 +13,36 @@ request() {
     parts "$1" "c$RANDOM$RANDOM" "${@:3}"
     printf '\r\n'
 }
+statuses() { tr -d '\r' <"$WORK/answer.log" | awk '/^SIP\/2.0 / { printf "%s ", $2 }'; }
 # ask SECONDS COMMAND...: sends what it prints as one datagram to interface a; the answers of that time go to answer.log,
-# their statuses to the standard output, in a line.
+# their statuses to the standard output, in a line. SECONDS/NUMBER: so many answers are enough, and nothing in the 0.2 s
+# after them.
 ask() {
     exec 3<>"/dev/udp/$HOST/$PORT_A" || fail "no socket"
     "${@:2}" >"$WORK/datagram"
     cat "$WORK/datagram" >&3
-    timeout "$1" cat <&3 >"$WORK/answer.log"
+    timeout "${1%/*}" cat <&3 >"$WORK/answer.log" &
+    local reader=$! found
+    while [[ $1 == */* ]] && kill -0 $reader 2>/dev/null; do
+        read -ra found <<<"$(statuses)"
+        ((${#found[@]} >= ${1#*/})) && sleep 0.2 && kill $reader && break
+        sleep 0.02
+    done
+    wait $reader 2>/dev/null
     exec 3>&-
-    tr -d '\r' <"$WORK/answer.log" | awk '/^SIP\/2.0 / { printf "%s ", $2 }'
+    statuses
 }
-# expect_answer STATUSES [REGEXP]... -- COMMAND...: within 0.3 s, with lines that match
+# expect_answer STATUSES [REGEXP]... -- COMMAND...: those and no other, with lines that match
 expect_answer() {
-    local statuses=$1 answers lines=()
+    local expected answers lines=()
+    read -ra expected <<<"$1"
     shift
     while [[ $1 != -- ]]; do
         lines+=("$1")
         shift
     done
-    answers=$(ask 0.3 "${@:2}")
-    [[ $answers == "$statuses " || $answers == "$statuses" ]] || fail "answers '$answers' instead of '$statuses' to: ${*:2}"
+    answers=$(ask 5/${#expected[@]} "${@:2}")
+    [[ $answers == "${expected[*]} " ]] || fail "answers '$answers' instead of '${expected[*]}' to: ${*:2}"
     local line
     for line in ${lines[@]+"${lines[@]}"}; do
         tr -d '\r' <"$WORK/answer.log" | grep -qE -- "$line" || fail "no line of the answer matches: $line"
