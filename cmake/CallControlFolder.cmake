@@ -22,11 +22,15 @@ function(callcontrol_folder)
 endfunction()
 
 # callcontrol_test(name files...): an executable of GoogleTest cases under our test main, each case known to ctest; under
-# an emulator, where a program is slow to start, the executable is.
+# an emulator and with sanitizers, where a program is slow to start, the executable is.
 function(callcontrol_test name)
     add_executable(${name} ${ARGN})
     target_link_libraries(${name} PRIVATE callcontrol_settings callcontrol-testing-main GTest::gmock)
-    if(CMAKE_CROSSCOMPILING)
+    if(CMAKE_CROSSCOMPILING) # only the libraries' own code is there to be seen as it is shipped
+        target_compile_options(${name} PRIVATE -O0)
+        set_target_properties(${name} PROPERTIES UNITY_BUILD ON)
+    endif()
+    if(CMAKE_CROSSCOMPILING OR CALLCONTROL_SANITIZE)
         add_test(NAME ${name} COMMAND ${name} --gtest_brief=1)
         set_tests_properties(${name} PROPERTIES TIMEOUT 300)
     else()
