@@ -427,6 +427,7 @@ public:
             return XCode::FAILURE;
         XCode const result = m_owner->m_isRefusing ? XCode::FAILURE : XCode::OK;
         ++m_owner->m_locks;
+        ++m_owner->m_takenLocks;
         World::CALL_OUT(CallOut::REBOOT_ADD);
         return result;
     }

@@ -287,6 +287,7 @@ public:
     bool isEnabled() const { return m_isEnabled; }
 
     int m_locks = 0;
+    int m_takenLocks = 0; // those given back, too
     bool m_isRefusing = false;
 
 private:
