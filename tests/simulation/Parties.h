@@ -281,7 +281,7 @@ public:
 class RebootManagement
 {
 public:
-    RebootManagement();
+    explicit RebootManagement(World& world);
     ~RebootManagement();
     void enable(bool isEnabled);
     bool isEnabled() const { return m_isEnabled; }
@@ -292,6 +292,7 @@ public:
 
 private:
     class Interface;
+    World& m_world;
     Interface* m_interface;
     bool m_isEnabled = false;
 };
