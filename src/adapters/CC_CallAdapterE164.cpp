@@ -322,8 +322,8 @@ void CC_CallAdapterE164::redial()
     if (!m_lastDial->datapathContext)
         m_lastDial->datapathContext.set(getDatapathContext());
     drop(QCause::NORMAL_CALL_CLEARING, 0);
-    if (!self.isAlive())
-        return;
+    if (!self.isAlive() || getEndpoint() == nullptr)
+        return; // destroyed or cleaned up: nobody is to be told any more
     CC_Flags changed;
     if (m_lastDial && !m_lastDial->datapathContext && changed.set(CC_PropertyId::CONTEXT, true).isOk())
     {

@@ -102,6 +102,18 @@ TEST_F(CC_CallAdapterE164_OverlapDisruption_Test, WhoHearsOfTheDropMayCleanTheAd
     EXPECT_EQ(a.adapter->getEndpoint(), nullptr);
 }
 
+TEST_F(CC_CallAdapterE164_OverlapDisruption_Test, AnAdapterThatIsCleanedUpMeanwhileIsToldOfNoContext)
+{
+    unsigned int notified = 0;
+    a.adapter->onNotify = [&notified](CC_Flags const&) { ++notified; };
+    m_mediaContexts.setFailing(true);
+    dialEnBloc();
+    atTheDrop([this] { a.adapter->cleanup(); });
+    a.key("8");
+    EXPECT_EQ(notified, 0U);
+    EXPECT_EQ(numbers, (Lines{"49"}));
+}
+
 TEST_F(CC_CallAdapterE164_OverlapDisruption_Test, ADigitThatComesWhileTheAttemptEndsIsDialledToo)
 {
     dialEnBloc();

@@ -39,11 +39,10 @@ void RECORD_DIAL(CC_RecordWriter& recorder, CC_Call const& call, CC_CallLeg cons
                  String const& destination)
 {
     constexpr std::size_t MOST = CC_RecordFormat::LARGEST_TEXT / 2;
-    recorder.begin(Kind::DIALLING, call.getSerial(), leg.getSerial(), 0);
-    recorder.appendText(providerName.view().substr(0, MOST));
-    recorder.appendText(" ");
-    recorder.appendText(destination.view().substr(0, MOST));
-    recorder.end();
+    char* place = recorder.begin(Kind::DIALLING, call.getSerial(), leg.getSerial(), 0);
+    place = CC_RecordWriter::APPEND(place, providerName.view().substr(0, MOST));
+    *place++ = ' ';
+    recorder.end(CC_RecordWriter::APPEND(place, destination.view().substr(0, MOST)));
 }
 
 /// Copying tells nothing of what memory has refused.

@@ -5,6 +5,7 @@
 #include "recorder/CC_RecordWriter.h"
 
 #include <algorithm>
+#include <new>
 #include <utility>
 
 CC_CallAdapter::Event::Event(TYEventLoop& loop, EventPrio::Type priority, CC_CallAdapter& adapter)
@@ -17,22 +18,18 @@ XCode CC_CallAdapter::Event::setPeerPropertyChange(unsigned int id)
     return m_flags.set(id, true).isOk() && (isPending() || setIfNotPending().isOk()) ? XCode::OK : XCode::FAILURE;
 }
 
-void CC_CallAdapter::Event::record(CC_RecordWriter& recorder, CC_Flags const& flags) const
+/// Apart, so that who does not record does not pay for it.
+__attribute__((noinline)) void CC_CallAdapter::Event::record(CC_Flags const& flags) const
 {
-    recorder.begin(CC_RecordFormat::Kind::TOLD, m_adapter.getCallSerial(), m_adapter.getLegSerial(), 0);
-    auto* const listed = reinterpret_cast<unsigned int*>(recorder.getPlace());
-    unsigned int count = 0;
-    flags.forEachSet(
-        [listed, &count](unsigned int id)
-        {
-            if (count < CC_RecordFormat::MOST_LISTED_IDS)
-                listed[count] = id;
-            ++count;
-            return true;
-        });
-    recorder.goOnAt(reinterpret_cast<char*>(listed + std::min(count, CC_RecordFormat::MOST_LISTED_IDS)));
-    recorder.setDetail(count);
-    recorder.end();
+    CC_RecordWriter& recorder = CC_RecordWriter::INSTANCE();
+    using CC_RecordFormat::ToldIds;
+    unsigned int const count = flags.getCount();
+    char* place =
+        recorder.begin(CC_RecordFormat::Kind::TOLD, m_adapter.getCallSerial(), m_adapter.getLegSerial(), count);
+    unsigned int const words = std::min(count, CC_RecordFormat::MOST_TOLD);
+    for (unsigned int i = 0; i < words; ++i, place += sizeof(ToldIds))
+        new (place) ToldIds{flags.getEntry(i).wordIndex, flags.getEntry(i).bits};
+    recorder.end(place);
 }
 
 void CC_CallAdapter::Event::handle()
@@ -47,8 +44,8 @@ void CC_CallAdapter::Event::handle()
     CC_Flags const flags(std::move(m_flags)); // what changes inside the notification belongs to the next turn
     if (flags.isEmpty())
         return;
-    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
-        record(*recorder, flags);
+    if (CC_RecordWriter::ON() != nullptr)
+        record(flags);
     if (m_adapter.m_observer != nullptr)
         m_adapter.m_observer->notifyPeerPropertyChange(m_adapter, flags);
     else

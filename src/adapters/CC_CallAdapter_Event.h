@@ -8,8 +8,6 @@
 #include <memory>
 #include <new>
 
-class CC_RecordWriter;
-
 /// Collects the ids of changed peer and call properties and tells the module of them in the loop's next turn.
 class CC_CallAdapter::Event : public TYEvent
 {
@@ -35,7 +33,7 @@ protected:
 private:
     friend class CC_Inside;
 
-    void record(CC_RecordWriter& recorder, CC_Flags const& flags) const;
+    void record(CC_Flags const& flags) const;
 
     CC_CallAdapter& m_adapter;
     CC_Flags m_flags;

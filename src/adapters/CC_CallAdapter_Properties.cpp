@@ -121,7 +121,7 @@ XCode CC_CallAdapter::setOwnProperty(CC_Property const& property)
 /// Apart, so that who does not record does not pay for it.
 __attribute__((noinline)) XCode CC_CallAdapter::setOwnPropertyRecorded(CC_Property const& property)
 {
-    CC_Writing const writing(Writer::OWN, *m_ownCallLeg);
+    CC_Writing::Recorded const writing(Writer::OWN, *m_ownCallLeg);
     return setOwnPropertyPlainly(property);
 }
 

@@ -151,12 +151,8 @@ XCode CC_Call::replace(CC_Property const& property)
 /// Apart, so that who does not record does not pay for it.
 __attribute__((noinline)) XCode CC_Call::replaceRecorded(CC_Property const& property)
 {
-    unsigned int const id = property.getId();
-    CC_PropertyBrief const before(m_properties.get(id));
-    if (!m_properties.set(property).isOk())
-        return XCode::REFUSED;
-    before.recordChange(CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0, id, m_properties.get(id));
-    return XCode::OK;
+    return CC_PropertyBrief::REPLACE(m_properties, m_properties.find(property.getId()), property,
+                                     CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0);
 }
 
 /// Hands the flags over.

@@ -191,28 +191,8 @@ XCode CC_CallLeg::replace(CC_Property* stored, CC_Property const& property)
 /// Apart, so that who does not record does not pay for it.
 __attribute__((noinline)) XCode CC_CallLeg::replaceRecorded(CC_Property* stored, CC_Property const& property)
 {
-    CC_RecordWriter& recorder = *CC_RecordWriter::ON();
-    CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
-    bool const isUndisturbed = kind != nullptr && kind->isSelfContained && m_properties.isSelfContained() &&
-                               (stored == nullptr || &typeid(*stored) == &typeid(property));
-    if (!isUndisturbed)
-        return replaceOfAnyKind(property);
-    recorder.beginChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, property.getId());
-    CC_PropertyBrief::APPEND(recorder, *kind, stored, property);
-    bool const isStored = stored != nullptr ? kind->assign(*stored, property) : m_properties.appendCopy(property);
-    isStored ? recorder.end() : recorder.cancel();
-    return isStored ? XCode::OK : XCode::NO_ELEMENT;
-}
-
-/// As above, where others are called: they may change what is stored, and end the recording.
-XCode CC_CallLeg::replaceOfAnyKind(CC_Property const& property)
-{
-    unsigned int const id = property.getId();
-    CC_PropertyBrief const before(m_properties.find(id));
-    if (!m_properties.replace(m_properties.find(id), property).isOk())
-        return XCode::REFUSED;
-    before.recordChange(CC_RecordFormat::Kind::LEG_CHANGED, getCallSerial(), m_serial, id, m_properties.find(id));
-    return XCode::OK;
+    return CC_PropertyBrief::REPLACE(m_properties, stored, property, CC_RecordFormat::Kind::LEG_CHANGED,
+                                     getCallSerial(), m_serial);
 }
 
 unsigned long long CC_CallLeg::getCallSerial() const { return m_call != nullptr ? m_call->getSerial() : 0; }
@@ -388,7 +368,7 @@ void CC_CallLeg::tell(CC_Flags& flags)
 /// Apart, as above.
 __attribute__((noinline)) void CC_CallLeg::tellRecorded(CC_Flags& flags)
 {
-    CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
+    CC_Writing::Outside const byWhoeverIsTold;
     tell(flags);
 }
 

@@ -148,7 +148,6 @@ private:
     XCode replaceState(CC_Property* stored, CC_Property const& property);
     XCode replace(CC_Property* stored, CC_Property const& property);
     XCode replaceRecorded(CC_Property* stored, CC_Property const& property);
-    XCode replaceOfAnyKind(CC_Property const& property);
     void tell(CC_Flags& flags);
     void tellRecorded(CC_Flags& flags);
     unsigned long long getCallSerial() const;

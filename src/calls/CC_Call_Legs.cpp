@@ -30,9 +30,9 @@ void RECORD(Kind kind, CC_Call const& call, CC_CallLeg const& leg)
 
 void RECORD_MOVE(CC_Call const* from, CC_Call const* to, CC_CallLeg const& leg)
 {
-    auto const serialOf = [](CC_Call const* call) { return call != nullptr ? call->getSerial() : 0; };
-    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON())
-        recorder->addNumber(Kind::LEG_MOVED, serialOf(to), leg.getSerial(), 0, serialOf(from));
+    if (CC_RecordWriter* const recorder = CC_RecordWriter::ON();
+        recorder != nullptr && from != nullptr && to != nullptr)
+        recorder->addNumber(Kind::LEG_MOVED, to->getSerial(), leg.getSerial(), 0, from->getSerial());
 }
 
 template <class List, class Value>

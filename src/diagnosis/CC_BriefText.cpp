@@ -6,13 +6,16 @@
 #include <algorithm>
 #include <arpa/inet.h>
 #include <array>
+#include <cstring>
 #include <string_view>
+#include <tuple>
 #include <type_traits>
 #include <utility>
 
 namespace
 {
 using CC_RecordFormat::Brief;
+using CC_RecordFormat::BriefHead;
 
 std::string_view TEXT_OF(Brief const& brief) { return {brief.text, brief.textSize}; }
 
@@ -151,4 +154,31 @@ std::string CC_BriefText::OF(unsigned int propertyId, Brief const& brief)
     if (brief.place < PRINTERS.size())
         return PRINTERS[brief.place](propertyId, brief);
     return "(" + WITH_ELLIPSIS(DEMANGLED(std::string(TEXT_OF(brief))), brief) + ")";
+}
+
+Brief CC_BriefText::TAKE(std::string_view& octets)
+{
+    auto const take = [&octets](auto& value)
+    {
+        if (octets.size() < sizeof value)
+            return false;
+        std::memcpy(&value, octets.data(), sizeof value);
+        octets.remove_prefix(sizeof value);
+        return true;
+    };
+    Brief brief;
+    BriefHead head;
+    if (!take(head))
+        return brief;
+    brief.place = head.place;
+    brief.textLength = head.textLength;
+    if ((head.shape & BriefHead::HAS_FIRST) != 0)
+        std::ignore = take(brief.first);
+    if ((head.shape & BriefHead::HAS_SECOND) != 0)
+        std::ignore = take(brief.second);
+    auto const size = static_cast<std::size_t>(head.shape & BriefHead::TEXT_SIZE);
+    brief.textSize = static_cast<std::uint8_t>(std::min({size, std::size_t{Brief::MOST_TEXT}, octets.size()}));
+    std::memcpy(brief.text, octets.data(), brief.textSize);
+    octets.remove_prefix(std::min(CC_RecordFormat::WORDS_OF(size), octets.size()));
+    return brief;
 }

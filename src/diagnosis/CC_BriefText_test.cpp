@@ -13,10 +13,16 @@ namespace
 {
 using CC_RecordFormat::Brief;
 
-std::string RECORDED(CC_Property const& property)
+std::string RECORDED(unsigned int id, CC_Property const* property)
 {
-    return CC_BriefText::OF(property.getId(), CC_PropertyBrief(&property).get());
+    CC_PropertyBrief const recorded(property);
+    std::string_view octets = recorded.getOctets();
+    Brief const brief = CC_BriefText::TAKE(octets);
+    EXPECT_TRUE(octets.empty());
+    return CC_BriefText::OF(id, brief);
 }
+
+std::string RECORDED(CC_Property const& property) { return RECORDED(property.getId(), &property); }
 
 std::string PRINTED(CC_Property const& property)
 {
@@ -99,7 +105,7 @@ TEST(CC_BriefText, OfRecordsAndOfAModulesValuesTheClassIsTold)
     EXPECT_EQ(RECORDED(CC_PropertyCharge(CC_PropertyId::CHARGE)),
               std::string("(") + CC_PropertyCharge::TYPE_NAME + ")");
     EXPECT_EQ(RECORDED(ModulesText(CC_PropertyId::NAME, "secret")), "((anonymous namespace)::ModulesText)");
-    EXPECT_EQ(CC_BriefText::OF(CC_PropertyId::NAME, CC_PropertyBrief(nullptr).get()), "(none)");
+    EXPECT_EQ(RECORDED(CC_PropertyId::NAME, nullptr), "(none)");
 }
 
 TEST(CC_BriefText, NumbersOfNoMeaningArePrintedAllTheSame)

@@ -4,10 +4,12 @@
 // latest.
 #include "diagnosis/CC_Recording.h"
 
+#include "diagnosis/CC_BriefText.h"
 #include "diagnosis/Demangled.h"
 
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <cstdio>
 #include <cstring>
 #include <iterator>
@@ -39,19 +41,7 @@ public:
         }
         return value;
     }
-    Brief takeBrief()
-    {
-        Brief brief;
-        if (m_octets.size() < Brief::FIXED_SIZE)
-            return brief;
-        std::memcpy(static_cast<void*>(&brief), m_octets.data(), Brief::FIXED_SIZE);
-        m_octets.remove_prefix(Brief::FIXED_SIZE);
-        brief.textSize = static_cast<std::uint8_t>(
-            std::min({std::size_t{brief.textSize}, std::size_t{Brief::MOST_TEXT}, m_octets.size()}));
-        std::memcpy(brief.text, m_octets.data(), brief.textSize);
-        m_octets.remove_prefix(std::min(WORDS_OF(brief.textSize), m_octets.size()));
-        return brief;
-    }
+    Brief takeBrief() { return CC_BriefText::TAKE(m_octets); }
     std::string takeText(std::size_t size)
     {
         std::string_view const text = m_octets.substr(0, size);
@@ -89,8 +79,12 @@ void TAKE_CHANGE(CC_Recording::Event& event, Payload& payload)
 
 void TAKE_IDS(CC_Recording::Event& event, Payload& payload)
 {
-    for (unsigned int left = std::min(event.record.detail, MOST_LISTED_IDS); left > 0; --left)
-        event.ids.push_back(payload.take<std::uint32_t>());
+    for (unsigned int left = std::min(event.record.detail, MOST_TOLD); left > 0; --left)
+    {
+        auto const told = payload.take<ToldIds>();
+        for (std::uint32_t bits = told.bits; bits != 0; bits &= bits - 1)
+            event.ids.push_back(told.wordIndex * 32 + static_cast<std::uint32_t>(std::countr_zero(bits)));
+    }
 }
 
 void TAKE(CC_Recording::Event& event, Payload payload)

@@ -158,8 +158,7 @@ std::string IDS(Event const& event)
     std::string text;
     for (std::uint32_t const id : event.ids)
         (text += text.empty() ? "" : ", ") += NAME_OF_PROPERTY(id);
-    std::size_t const missing = event.record.detail - std::min<std::size_t>(event.record.detail, event.ids.size());
-    return missing == 0 ? text : text + " and " + std::to_string(missing) + " more";
+    return event.record.detail <= CC_RecordFormat::MOST_TOLD ? text : text + " and more";
 }
 } // namespace
 

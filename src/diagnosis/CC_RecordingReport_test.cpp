@@ -175,6 +175,31 @@ TEST_F(CC_RecordingReport_Test, HistoryTellsEachValueItsWriterAndTheFilter)
     EXPECT_NE(asJson[2].find("\"before\":\"Anna\",\"after\":\"X\""), std::string::npos) << asJson[2];
 }
 
+TEST_F(CC_RecordingReport_Test, WhatTwoModulesWriteOneBehindTheOtherIsNotTakenForOnes)
+{
+    Party anna("anna");
+    Party bert("bert");
+    Party carl("carl");
+    ASSERT_EQ(anna.dial(bert), XCode::OK);
+    ASSERT_EQ(carl.adapter->accept(*anna.getCall(), CC_PropertyContainer::EMPTY()), XCode::OK);
+    settle();
+    unsigned long long const ofAnna = anna.getCall()->getCallLeg(0)->getSerial();
+    for (Party* const party : {&bert, &carl})
+    {
+        CC_PropertyContainer several;
+        ASSERT_EQ(several.set(CC_PropertyString(CC_PropertyId::NAME, party->name)), XCode::OK);
+        ASSERT_EQ(several.set(CC_PropertyString(CC_PropertyId::DISPLAY, party->name)), XCode::OK);
+        ASSERT_EQ(party->adapter->setPeerProperties(several), XCode::OK);
+    }
+    for (char const* const property : {"name", "display"})
+    {
+        Lines const values = report().getHistory(ofAnna, property);
+        ASSERT_EQ(values.size(), 2u) << all(values);
+        EXPECT_NE(values[0].find(" bert/line"), std::string::npos) << values[0];
+        EXPECT_NE(values[1].find(" carl/line"), std::string::npos) << values[1];
+    }
+}
+
 TEST_F(CC_RecordingReport_Test, WhoeverWritesInsideANotificationIsNamedAndNotWhomItIsToldOf)
 {
     Party anna("anna");

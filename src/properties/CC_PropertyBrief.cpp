@@ -2,6 +2,7 @@
 
 #include "platform/media/MG_IContext.h"
 #include "properties/CC_PropertyClasses.h"
+#include "properties/CC_PropertyContainer.h"
 #include "properties/CC_PropertyKind.h"
 #include "recorder/CC_RecordWriter.h"
 
@@ -17,189 +18,214 @@ namespace
 {
 using CC_RecordFormat::Brief;
 
-/// Both ends of so many octets, which together are all when these are no more than twice as many.
-template <std::size_t SIZE>
-void COPY_ENDS(char* to, std::string_view text)
+using CC_RecordFormat::BriefHead;
+
+template <class Property>
+constexpr auto PLACE = static_cast<std::uint8_t>(CC_PropertyClasses::PLACE_OF<Property>());
+
+// Each writes a value where `place` points to, and returns the place behind it. The same value leaves the same octets.
+
+char* PUT_NUMBER(char* place, std::uint32_t number)
 {
-    std::memcpy(to, text.data(), SIZE);
-    std::memcpy(to + text.size() - SIZE, text.data() + text.size() - SIZE, SIZE);
+    std::memcpy(place, &number, sizeof number);
+    return place + sizeof number;
 }
 
-/// Without the detour through the C library, which costs more than the octets. REQUIRES: no more than 32.
-void COPY(char* to, std::string_view text)
-{
-    static_assert(Brief::MOST_TEXT <= 32);
-    if (text.size() >= 16)
-        COPY_ENDS<16>(to, text);
-    else if (text.size() >= 8)
-        COPY_ENDS<8>(to, text);
-    else if (text.size() >= 4)
-        COPY_ENDS<4>(to, text);
-    else if (text.size() >= 2)
-        COPY_ENDS<2>(to, text);
-    else if (text.size() == 1)
-        *to = text[0];
-}
-
-void SET_TEXT(Brief& brief, std::string_view text)
+char* PUT_TEXT(char* place, std::string_view text)
 {
     constexpr std::size_t WORD = CC_RecordFormat::WORDS_OF(1);
-    constexpr std::size_t MOST_LENGTH = std::numeric_limits<std::uint16_t>::max();
-    brief.textLength = static_cast<std::uint16_t>(std::min(text.size(), MOST_LENGTH));
-    brief.textSize = static_cast<std::uint8_t>(std::min<std::size_t>(text.size(), Brief::MOST_TEXT));
-    if (std::size_t const begun = brief.textSize % WORD; begun != 0) // the same value leaves the same octets
-        std::memset(brief.text + brief.textSize - begun, 0, WORD);
-    COPY(brief.text, {text.data(), brief.textSize});
+    std::memset(place + text.size() / WORD * WORD, 0, WORD); // of which the text leaves some
+    CC_RecordWriter::APPEND(place, text);
+    return place + CC_RecordFormat::WORDS_OF(text.size());
 }
 
-void SET(Brief& brief, unsigned long long number)
+char* PUT_HEAD(char* place, std::uint8_t of, unsigned int shape, std::size_t textLength = 0)
 {
-    brief.first = static_cast<std::uint32_t>(number);
-    brief.second = static_cast<std::uint32_t>(number >> 32);
+    new (place) BriefHead{of, static_cast<std::uint8_t>(shape), static_cast<std::uint16_t>(textLength)};
+    return place + sizeof(BriefHead);
 }
+
+std::size_t KEPT_OF(std::string_view text) { return std::min<std::size_t>(text.size(), Brief::MOST_TEXT); }
+
+std::size_t LENGTH_OF(std::string_view text)
+{
+    return std::min<std::size_t>(text.size(), std::numeric_limits<std::uint16_t>::max());
+}
+
+[[gnu::always_inline]] inline char* PUT(char* place, std::uint8_t of, std::string_view text)
+{
+    std::size_t const kept = KEPT_OF(text);
+    place = PUT_HEAD(place, of, static_cast<unsigned int>(kept), LENGTH_OF(text));
+    return PUT_TEXT(place, {text.data(), kept});
+}
+
+char* PUT(char* place, std::uint8_t of, std::uint32_t first, std::uint32_t second, std::string_view text = {})
+{
+    std::size_t const kept = KEPT_OF(text);
+    auto const shape = BriefHead::HAS_FIRST | BriefHead::HAS_SECOND | static_cast<unsigned int>(kept);
+    place = PUT_NUMBER(PUT_NUMBER(PUT_HEAD(place, of, shape, LENGTH_OF(text)), first), second);
+    return PUT_TEXT(place, {text.data(), kept});
+}
+
+char* PUT(char* place, std::uint8_t of, unsigned long long number)
+{
+    auto const high = static_cast<std::uint32_t>(number >> 32);
+    if (high != 0)
+        return PUT(place, of, static_cast<std::uint32_t>(number), high);
+    return PUT_NUMBER(PUT_HEAD(place, of, BriefHead::HAS_FIRST), static_cast<std::uint32_t>(number));
+}
+
+char* PUT_NOTHING(char* place) { return PUT_HEAD(place, Brief::NOTHING, 0); }
 
 // Of most classes the value is a number or a text; records of charge, tariff and quality are too large for either.
 template <class Property>
-void DESCRIBE(Property const& property, Brief& brief)
+char* DESCRIBE(char* place, Property const& property)
 {
-    if constexpr (requires { SET_TEXT(brief, property.getValue()); })
-        SET_TEXT(brief, property.getValue());
+    if constexpr (requires { std::string_view(property.getValue()); })
+        return PUT(place, PLACE<Property>, std::string_view(property.getValue()));
     else if constexpr (requires { static_cast<unsigned long long>(property.getValue()); })
-        SET(brief, static_cast<unsigned long long>(property.getValue()));
+        return PUT(place, PLACE<Property>, static_cast<unsigned long long>(property.getValue()));
+    else
+        return PUT_HEAD(place, PLACE<Property>, 0);
 }
 
-void DESCRIBE(CC_PropertyCallLegState const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCallLegState const& property)
 {
-    brief.first = static_cast<std::uint32_t>(property.getState());
+    return PUT(place, PLACE<CC_PropertyCallLegState>, static_cast<std::uint32_t>(property.getState()));
 }
 
-void DESCRIBE(CC_PropertyCause const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCause const& property)
 {
-    brief.first = static_cast<std::uint32_t>(property.getCause());
-    brief.second = property.getSipCode();
-    SET_TEXT(brief, property.getText());
+    return PUT(place, PLACE<CC_PropertyCause>, static_cast<std::uint32_t>(property.getCause()), property.getSipCode(),
+               property.getText());
 }
 
-void DESCRIBE(CC_PropertyCallProgressTone const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCallProgressTone const& property)
 {
-    brief.first = static_cast<std::uint32_t>(property.getTone());
-    SET_TEXT(brief, property.getText());
+    return PUT(place, PLACE<CC_PropertyCallProgressTone>, static_cast<std::uint32_t>(property.getTone()), 0,
+               property.getText());
 }
 
-void DESCRIBE(CC_PropertyCodec const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCodec const& property)
 {
     VoipCodec const& codec = property.getValue().getCodec();
-    brief.first = static_cast<std::uint32_t>(codec.getCodec());
-    brief.second = codec.getPacketPeriod() << 2 | static_cast<std::uint32_t>(property.getValue().getMode());
+    return PUT(place, PLACE<CC_PropertyCodec>, static_cast<std::uint32_t>(codec.getCodec()),
+               codec.getPacketPeriod() << 2 | static_cast<std::uint32_t>(property.getValue().getMode()));
 }
 
 // The codecs of both directions, an octet each.
-void DESCRIBE(CC_PropertyCodecs const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCodecs const& property)
 {
     std::array<char, Brief::MOST_TEXT> codecs;
     std::size_t count = 0;
     for (VoipCodec const& codec : property.getValue().getList(VoipCodecListSet::SEND_RECEIVE))
         if (count < codecs.size())
             codecs[count++] = static_cast<char>(codec.getCodec());
-    SET_TEXT(brief, {codecs.data(), count});
+    return PUT(place, PLACE<CC_PropertyCodecs>, {codecs.data(), count});
 }
 
-void DESCRIBE(CC_PropertyCodecNegotiating const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyCodecNegotiating const& property)
 {
-    brief.first = static_cast<std::uint32_t>(property.getState());
-    brief.second = property.getNegotiatedValue();
+    return PUT(place, PLACE<CC_PropertyCodecNegotiating>, static_cast<std::uint32_t>(property.getState()),
+               property.getNegotiatedValue());
 }
 
-void DESCRIBE(CC_PropertyWaitForMessage const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyWaitForMessage const& property)
 {
-    brief.first = static_cast<std::uint32_t>(property.getState());
-    brief.second = static_cast<std::uint32_t>(property.getMessageType());
+    return PUT(place, PLACE<CC_PropertyWaitForMessage>, static_cast<std::uint32_t>(property.getState()),
+               static_cast<std::uint32_t>(property.getMessageType()));
 }
 
 // The media layer is asked, as when the value is printed.
-void DESCRIBE(CC_PropertyContextId const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyContextId const& property)
 {
     MG_IContext const* const context = property.getContext();
-    brief.first = context != nullptr ? context->getId() : 0;
-    brief.second = context != nullptr ? 1 : 0;
+    return PUT(place, PLACE<CC_PropertyContextId>, context != nullptr ? context->getId() : 0,
+               context != nullptr ? 1 : 0);
 }
 
-void DESCRIBE(CC_PropertyIpAddress const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyIpAddress const& property)
 {
     IpAddress const& address = property.getValue();
     auto const& octets = address.getOctets();
-    brief.first = address.getVersion();
-    brief.second = address.isNetType() ? address.getPrefixLength() : ~0U;
-    SET_TEXT(brief, {reinterpret_cast<char const*>(octets.data()), address.getVersion() == 4 ? 4U : octets.size()});
+    return PUT(place, PLACE<CC_PropertyIpAddress>, address.getVersion(),
+               address.isNetType() ? address.getPrefixLength() : ~0U,
+               {reinterpret_cast<char const*>(octets.data()), address.getVersion() == 4 ? 4U : octets.size()});
 }
 
-void DESCRIBE(CC_PropertyParametrizedString const& property, Brief& brief)
+char* DESCRIBE(char* place, CC_PropertyParametrizedString const& property)
 {
-    brief.first = property.getUpdateCounter();
-    SET_TEXT(brief, property.getContent().content);
+    return PUT(place, PLACE<CC_PropertyParametrizedString>, property.getUpdateCounter(), 0,
+               property.getContent().content);
 }
 
-/// Describes so many properties of one class, one behind the other; null: no property. Returns the place behind them.
-using Describe = char* (*)(char* place, CC_Property const* const* properties, std::size_t count);
+/// Describes two properties of one class, one behind the other. The first one is null: no property. The second one is
+/// null: only the first.
+using Describe = char* (*)(char* place, CC_Property const* first, CC_Property const* second);
 
 template <class Property>
-char* DESCRIBE_EACH(char* place, CC_Property const* const* properties, std::size_t count)
+char* DESCRIBE_BOTH(char* place, CC_Property const* first, CC_Property const* second)
 {
-    for (std::size_t i = 0; i < count; ++i)
-    {
-        auto& brief = *new (place) Brief;
-        if (properties[i] != nullptr)
-        {
-            brief.place = static_cast<std::uint8_t>(CC_PropertyClasses::PLACE_OF<Property>());
-            DESCRIBE(static_cast<Property const&>(*properties[i]), brief);
-        }
-        place += brief.getSize();
-    }
-    return place;
+    place = first != nullptr ? DESCRIBE(place, static_cast<Property const&>(*first)) : PUT_NOTHING(place);
+    return second != nullptr ? DESCRIBE(place, static_cast<Property const&>(*second)) : place;
 }
 
 constexpr std::array<Describe, CC_PropertyClasses::SIZE> DESCRIPTIONS = []
 {
     std::array<Describe, CC_PropertyClasses::SIZE> result{};
     std::size_t place = 0;
-    CC_PropertyClasses::FOR_EACH([&]<class Property>() { result[place++] = &DESCRIBE_EACH<Property>; });
+    CC_PropertyClasses::FOR_EACH([&]<class Property>() { result[place++] = &DESCRIBE_BOTH<Property>; });
     return result;
 }();
 } // namespace
 
-void CC_PropertyBrief::APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* before,
-                              CC_Property const& after)
-{
-    CC_Property const* const both[] = {before, &after};
-    recorder.goOnAt(DESCRIPTIONS[kind.place](recorder.getPlace(), both, 2));
-}
-
 CC_PropertyBrief::CC_PropertyBrief(CC_Property const* property)
 {
     CC_PropertyKind const* const kind = property != nullptr ? CC_PropertyKind::OF(*property) : nullptr;
+    char* const place = m_place.data();
+    char* behind = place;
     if (kind != nullptr)
-    {
-        m_size = static_cast<std::size_t>(DESCRIPTIONS[kind->place](m_place.data(), &property, 1) - m_place.data());
-        return;
-    }
-    auto& brief = *new (m_place.data()) Brief;
-    if (property != nullptr)
-    {
-        brief.place = Brief::OTHER_CLASS;
-        SET_TEXT(brief, typeid(*property).name());
-    }
-    m_size = brief.getSize();
+        behind = DESCRIPTIONS[kind->place](place, property, nullptr);
+    else if (property != nullptr)
+        behind = PUT(place, Brief::OTHER_CLASS, typeid(*property).name());
+    else
+        behind = PUT_NOTHING(place);
+    m_size = static_cast<std::size_t>(behind - place);
 }
 
-void CC_PropertyBrief::recordChange(CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg,
-                                    unsigned int propertyId, CC_Property const* after) const
+XCode CC_PropertyBrief::REPLACE(CC_PropertyContainer& in, CC_Property* stored, CC_Property const& property,
+                                CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg)
 {
-    CC_PropertyBrief const now(after);
+    CC_PropertyKind const* const known = CC_PropertyKind::OF(property);
+    bool const isUndisturbed =
+        known != nullptr && known->isSelfContained && (stored == nullptr || &typeid(*stored) == &typeid(property));
+    if (!isUndisturbed)
+        return REPLACE_OF_ANY_KIND(in, property, kind, call, leg);
+    // nobody is called, so both values go straight into the record
+    CC_RecordWriter& recorder = CC_RecordWriter::INSTANCE();
+    char* const values = recorder.beginChange(kind, call, leg, property.getId());
+    char* const behind = DESCRIPTIONS[known->place](values, stored, &property);
+    if (!(stored != nullptr ? known->assign(*stored, property) : in.appendCopy(property)))
+        return XCode::NO_ELEMENT;
+    recorder.endChange(behind);
+    return XCode::OK;
+}
+
+/// As above, where others are called: they may change what is stored, and end the recording.
+XCode CC_PropertyBrief::REPLACE_OF_ANY_KIND(CC_PropertyContainer& in, CC_Property const& property,
+                                            CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg)
+{
+    unsigned int const id = property.getId();
+    CC_PropertyBrief const before(in.find(id));
+    if (!in.replace(in.find(id), property).isOk())
+        return XCode::REFUSED;
+    CC_PropertyBrief const now(in.find(id));
     CC_RecordWriter* const recorder = CC_RecordWriter::ON();
     if (recorder == nullptr)
-        return; // whoever was called meanwhile has ended it
-    recorder->beginChange(kind, call, leg, propertyId);
-    recorder->append(m_place.data(), m_size);
-    recorder->append(now.m_place.data(), now.m_size);
-    recorder->end();
+        return XCode::OK;
+    char* place = recorder->beginChange(kind, call, leg, id);
+    for (std::string_view const octets : {before.getOctets(), now.getOctets()})
+        place = CC_RecordWriter::APPEND(place, octets);
+    recorder->endChange(place);
+    return XCode::OK;
 }

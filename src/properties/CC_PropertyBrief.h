@@ -1,43 +1,39 @@
 #pragma once
 
 #include "platform/base/Export.h"
+#include "platform/base/XCode.h"
 #include "recorder/CC_RecordFormat.h"
 
 #include <array>
 #include <cstddef>
+#include <string_view>
 
 class CC_Property;
-class CC_PropertyKind;
-class CC_RecordWriter;
+class CC_PropertyContainer;
 
 /// What a recording keeps of a property's value. It allocates nothing and calls nobody but the media layer, for a
 /// context's id; of a module's class it keeps the name alone.
 ///
-///     CC_PropertyBrief const before(stored);
-///     ...
-///     before.recordChange(Kind::LEG_CHANGED, call, leg, id, property);
+///     return CC_PropertyBrief::REPLACE(m_properties, stored, property, Kind::LEG_CHANGED, call, leg);
 class CC_EXPORT CC_PropertyBrief
 {
 public:
     /// Null: no property.
     explicit CC_PropertyBrief(CC_Property const* property);
 
-    CC_RecordFormat::Brief const& get() const
-    {
-        return *reinterpret_cast<CC_RecordFormat::Brief const*>(m_place.data());
-    }
-    std::size_t getSize() const { return m_size; }
+    /// As they stand in a recording: the same ones for the same value.
+    std::string_view getOctets() const { return {m_place.data(), m_size}; }
 
-    /// Records, if that is on, that this was the value and `after` is it now.
-    void recordChange(CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg,
-                      unsigned int propertyId, CC_Property const* after) const;
-
-    /// The values of two properties of that kind, straight into the record that is being written. Null: no property.
-    /// REQUIRES: the kind is self-contained, so that nobody is called.
-    static void APPEND(CC_RecordWriter& recorder, CC_PropertyKind const& kind, CC_Property const* before,
-                       CC_Property const& after);
+    /// As the container's `replace`, recorded as a change of that call or leg when it was done. REQUIRES: something is
+    /// recorded.
+    static XCode REPLACE(CC_PropertyContainer& in, CC_Property* stored, CC_Property const& property,
+                         CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg);
 
 private:
-    alignas(CC_RecordFormat::Brief) std::array<char, sizeof(CC_RecordFormat::Brief)> m_place;
+    static XCode REPLACE_OF_ANY_KIND(CC_PropertyContainer& in, CC_Property const& property, CC_RecordFormat::Kind kind,
+                                     unsigned long long call, unsigned long long leg);
+
+    // a text is filled up to its last word before it is written
+    alignas(CC_RecordFormat::BriefHead) std::array<char, CC_RecordFormat::LARGEST_BRIEF + 4> m_place;
     std::size_t m_size;
 };

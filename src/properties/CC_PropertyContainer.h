@@ -180,6 +180,7 @@ private:
     friend class CC_CallAdapter;
     friend class CC_CallAdapterE164;
     friend class CC_CallLeg;
+    friend class CC_PropertyBrief;
     friend class CC_PropertyFilterContainer;
     friend class CC_PropertyView;
     friend class CC_PropertyWorkingCopy;

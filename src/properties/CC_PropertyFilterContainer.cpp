@@ -132,12 +132,6 @@ private:
         Value value;
     };
 
-    static bool IS_SAME(CC_PropertyBrief const& left, CC_PropertyBrief const& right)
-    {
-        std::size_t const size = CC_RecordFormat::Brief::FIXED_SIZE + left.get().textSize;
-        return left.get().textSize == right.get().textSize && std::memcmp(&left.get(), &right.get(), size) == 0;
-    }
-
     bool hasChanged(CC_Property const& property)
     {
         for (std::size_t i = 0; i < m_count; ++i)
@@ -146,7 +140,7 @@ private:
             if (known.id != property.getId())
                 continue;
             CC_PropertyBrief const before = std::exchange(known.brief, CC_PropertyBrief(&property));
-            return !IS_SAME(before, known.brief);
+            return before.getOctets() != known.brief.getOctets();
         }
         return add(property);
     }

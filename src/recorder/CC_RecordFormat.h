@@ -19,7 +19,7 @@ namespace CC_RecordFormat
 inline constexpr char MAGIC[8] = {'c', 'c', 'r', 'e', 'c', 'o', 'r', 'd'};
 /// Of this layout and of what the numbers in it mean (Kind, Writer, CC_PropertyClasses). Adding at the end of these
 /// keeps it.
-inline constexpr std::uint32_t VERSION = 1;
+inline constexpr std::uint32_t VERSION = 2;
 /// Reads as another number on a machine of another byte order.
 inline constexpr std::uint32_t BYTE_ORDER_MARK = 0x01020304;
 /// Of records and of everything that a position points to.
@@ -57,7 +57,7 @@ enum class Kind : std::uint8_t
     LEG_NAMED, ///< [; text]
     LEG_JOINED,
     LEG_LEFT,
-    LEG_MOVED,   ///< [; the number of the call before] both calls and the leg were told; `call` may be none
+    LEG_MOVED,   ///< [; the number of the call before] of one call to another: both calls and the leg were told
     LEG_CHANGED, ///< [property id; Change] a property of the leg
     LEG_ENDED,
     DIALLING,     ///< [; text: provider and destination]
@@ -70,7 +70,7 @@ enum class Kind : std::uint8_t
     FAILED,       ///< [; text: the operation and why]
     SERVICE,      ///< [; text: class] asked by the leg's adapter
     SERVICE_TOLD, ///< [; the number of the asking leg, text: class] to the leg's module
-    TOLD,         ///< [how many ids; these, as many as there is room for] the leg's module, of peer and call
+    TOLD,         ///< [how many ToldIds; these, MOST_TOLD at most] the leg's module, of peer and call
     CLEANED_UP,   ///< [CleanUp] a call looked after itself
     PUSHED_BACK,  ///< the leg's module was asked to step back from an internal loop
     LOCK_TAKEN,
@@ -133,7 +133,6 @@ struct Brief
     static constexpr std::uint8_t NOTHING = 255;     ///< no property
     static constexpr std::uint8_t OTHER_CLASS = 254; ///< a module's class: the text is the class's name
     static constexpr unsigned int MOST_TEXT = 32;    ///< octets of a text that are kept
-    static constexpr unsigned int FIXED_SIZE = 12;   ///< of what stands before the text
 
     std::uint8_t place = NOTHING; ///< of the class in CC_PropertyClasses
     std::uint8_t textSize = 0;    ///< octets of the text that are there
@@ -141,11 +140,23 @@ struct Brief
     std::uint32_t first = 0;      ///< the value, or its low half
     std::uint32_t second = 0;     ///< what belongs to it, or its high half
     char text[MOST_TEXT];         ///< as far as `textSize` says
-
-    /// Octets in a recording: whole words.
-    std::size_t getSize() const { return FIXED_SIZE + WORDS_OF(textSize); }
 };
-static_assert(offsetof(Brief, text) == Brief::FIXED_SIZE);
+
+/// How a Brief begins in a recording. The first and the second number follow where `shape` says so, then the text, in
+/// whole words.
+struct BriefHead
+{
+    static constexpr std::uint8_t HAS_FIRST = 0x80;  ///< else it is 0
+    static constexpr std::uint8_t HAS_SECOND = 0x40; ///< the same
+    static constexpr std::uint8_t TEXT_SIZE = 0x3f;  ///< the others are the text's size
+
+    std::uint8_t place;       ///< as a Brief's
+    std::uint8_t shape;       ///< what follows
+    std::uint16_t textLength; ///< as a Brief's
+};
+static_assert(sizeof(BriefHead) == 4 && Brief::MOST_TEXT <= BriefHead::TEXT_SIZE);
+/// Octets of a Brief in a recording at most.
+inline constexpr std::size_t LARGEST_BRIEF = sizeof(BriefHead) + 2 * sizeof(std::uint32_t) + Brief::MOST_TEXT;
 
 /// What a change begins with; the name of the filter's class follows, then the old and the new value (Brief).
 struct Change
@@ -156,6 +167,14 @@ struct Change
     std::uint8_t reserved[6];    ///< 0
 };
 static_assert(sizeof(Change) == 16);
-/// Ids in a TOLD at most.
-inline constexpr unsigned int MOST_LISTED_IDS = 16;
+
+/// Ids of properties that a module was told of: a word of CC_Flags.
+struct ToldIds
+{
+    std::uint32_t wordIndex; ///< bit n of `bits` stands for the id 32 * wordIndex + n
+    std::uint32_t bits;      ///< 0 as well
+};
+static_assert(sizeof(ToldIds) == 8);
+/// Of these in a TOLD at most.
+inline constexpr unsigned int MOST_TOLD = 16;
 } // namespace CC_RecordFormat

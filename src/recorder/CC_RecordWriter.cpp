@@ -15,7 +15,9 @@
 
 using namespace CC_RecordFormat;
 
-CC_RecordWriter* CC_RecordWriter::s_on = nullptr;
+bool CC_RecordWriter::s_isOn = false;
+constinit CC_RecordWriter CC_RecordWriter::s_instance;
+constinit CC_RecordWriter::Writing const CC_RecordWriter::OUTSIDE = {0, nullptr, Writer::OUTSIDE};
 
 namespace
 {
@@ -32,12 +34,6 @@ constexpr std::size_t ROOM_AT_ONCE = 2048;
 
 } // namespace
 
-CC_RecordWriter& CC_RecordWriter::INSTANCE()
-{
-    static constinit CC_RecordWriter s_instance;
-    return s_instance;
-}
-
 void CC_RecordWriter::start(void* image, std::size_t size)
 {
     m_size = size;
@@ -53,13 +49,14 @@ void CC_RecordWriter::start(void* image, std::size_t size)
     std::copy(std::begin(MAGIC), std::end(MAGIC), m_header->magic);
     m_ring = static_cast<char*>(image) + sizeof(Header);
     startAt(0, m_capacity);
-    m_writing = nullptr;
-    s_on = this;
+    m_writing = &OUTSIDE;
+    m_isInBatch = false;
+    s_isOn = true;
 }
 
 void* CC_RecordWriter::stop()
 {
-    s_on = nullptr;
+    s_isOn = false;
     return std::exchange(m_header, nullptr);
 }
 
@@ -73,95 +70,76 @@ Record& CC_RecordWriter::at(std::uint64_t position) const
     return *reinterpret_cast<Record*>(m_ring + position % m_capacity);
 }
 
-void CC_RecordWriter::beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
-{
-    CC_FilterNotes const* const notes = m_writing != nullptr ? m_writing->m_notes : nullptr;
-    if (m_isInBatch && notes == nullptr && m_changedLeg == leg && m_changedBy == m_writing && m_at <= m_lastPlace)
-        return beginAlsoChanged(propertyId);
-    begin(kind, call, leg, propertyId);
-    auto& change = *new (m_at) Change{};
-    m_at += sizeof change;
-    if (m_writing != nullptr)
-        change.by = m_writing->m_by;
-    if (notes != nullptr)
-        appendFilter(*notes, propertyId);
-    m_changedLeg = leg;
-    m_changedBy = m_writing;
-}
-
-inline void CC_RecordWriter::beginAlsoChanged(unsigned int propertyId)
-{
-    m_record = reinterpret_cast<Record*>(m_at);
-    new (m_at) AlsoChanged{static_cast<std::uint32_t>(m_head / ALIGNMENT), 0, Kind::ALSO_CHANGED, 0, propertyId};
-    m_at += sizeof(AlsoChanged);
-}
-
 /// The filter that made the value different, if one did.
-void CC_RecordWriter::appendFilter(CC_FilterNotes const& notes, unsigned int propertyId)
+char* CC_RecordWriter::appendFilter(CC_FilterNotes const& notes, unsigned int propertyId, char* place)
 {
     CC_FilterNotes::Note const* const note = notes.find(propertyId);
     if (note == nullptr)
-        return;
-    auto& change = reinterpret_cast<Change*>(m_at)[-1];
+        return place;
+    auto& change = reinterpret_cast<Change*>(place)[-1];
     std::string_view const name = std::string_view(note->name).substr(0, LARGEST_TEXT);
     change.filterPlace = static_cast<std::uint8_t>(std::min(note->place, 255U));
     change.filterNameSize = static_cast<std::uint8_t>(name.size());
-    std::memset(m_at + WORDS_OF(name.size()) - WORDS_OF(1), 0, WORDS_OF(1)); // a name is never empty
-    std::memcpy(m_at, name.data(), name.size());
-    m_at += WORDS_OF(name.size());
+    char* const behind = place + WORDS_OF(name.size());
+    std::memset(behind - WORDS_OF(1), 0, WORDS_OF(1)); // a name is never empty
+    APPEND(place, name);
+    return behind;
 }
 
 /// Gives up the oldest records, so that there is room for a record of any size at the head. When the ring's end is too
 /// near, the head moves to its beginning. More than one record's room is made at once, or every record would come here.
 void CC_RecordWriter::makeRoom()
 {
-    auto const offset = static_cast<std::size_t>(m_head % m_capacity);
+    std::uint64_t const head = getHead();
+    auto const offset = static_cast<std::size_t>(head % m_capacity);
     std::size_t const rest = m_capacity - offset;
     std::size_t const padding = rest < LARGEST_RECORD ? rest : 0;
     std::size_t const wanted = std::min(ROOM_AT_ONCE, padding != 0 ? ROOM_AT_ONCE : rest);
-    while (m_tail < m_head && m_tail + m_capacity < m_head + padding + wanted)
+    while (m_tail < head && m_tail + m_capacity < head + padding + wanted)
         m_tail += at(m_tail).size;
-    while (m_tail < m_head && at(m_tail).kind == Kind::ALSO_CHANGED)
+    while (m_tail < head && at(m_tail).kind == Kind::ALSO_CHANGED)
         m_tail += at(m_tail).size; // what it belongs to has gone
     m_changedLeg = 0;
     PUBLISH(m_header->tail, m_tail);
     if (padding != 0)
         pad(padding);
-    startAt(m_head, static_cast<std::size_t>(std::min(m_capacity - m_head % m_capacity, m_tail + m_capacity - m_head)));
+    std::uint64_t const next = head + padding;
+    startAt(next, static_cast<std::size_t>(std::min(m_capacity - next % m_capacity, m_tail + m_capacity - next)));
 }
 
 /// `left`: octets at the head that belong to no record.
 void CC_RecordWriter::startAt(std::uint64_t head, std::size_t left)
 {
-    m_head = head;
     m_at = m_ring + head % m_capacity;
+    m_toPosition = head - reinterpret_cast<std::uintptr_t>(m_at);
     m_lastPlace = m_at + left - LARGEST_RECORD;
 }
 
 /// Fills the end of the ring.
 void CC_RecordWriter::pad(std::size_t size)
 {
-    Record& record = at(m_head); // of which maybe only the first octets are there
-    record.stamp = static_cast<std::uint32_t>(m_head / ALIGNMENT);
+    auto& record = *reinterpret_cast<Record*>(m_at); // of which maybe only the first octets are there
+    record.stamp = getStamp();
     record.size = static_cast<std::uint16_t>(size);
     record.kind = Kind::PADDING;
-    m_head += size;
-    PUBLISH(m_header->head, m_head);
+    PUBLISH(m_header->head, getHead() + size);
+}
+
+void CC_RecordWriter::add(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
+{
+    end(begin(kind, call, leg, detail));
 }
 
 void CC_RecordWriter::addText(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                               std::string_view text)
 {
-    begin(kind, call, leg, detail);
-    appendText(text.substr(0, LARGEST_TEXT));
-    end();
+    end(APPEND(begin(kind, call, leg, detail), text.substr(0, LARGEST_TEXT)));
 }
 
 void CC_RecordWriter::addNumber(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                                 unsigned long long number, std::string_view text)
 {
-    begin(kind, call, leg, detail);
-    append(&number, sizeof number);
-    appendText(text.substr(0, LARGEST_TEXT));
-    end();
+    char* const place = begin(kind, call, leg, detail);
+    std::memcpy(place, &number, sizeof number);
+    end(APPEND(place + sizeof number, text.substr(0, LARGEST_TEXT)));
 }

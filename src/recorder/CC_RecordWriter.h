@@ -1,13 +1,16 @@
 #pragma once
 
-#include "environment/CC_Moment.h"
+#include "environment/CC_Environment.h"
+#include "platform/eventloop/TYEventLoop.h"
 #include "recorder/CC_RecordFormat.h"
 
 #include <atomic>
 #include <cstdint>
 #include <cstring>
+#include <new>
 #include <span>
 #include <string_view>
+#include <utility>
 
 class CC_FilterNotes;
 class CC_Writing;
@@ -24,16 +27,12 @@ public:
     /// Null while nothing is recorded.
     static CC_RecordWriter* ON()
     {
-        if (s_on == nullptr) [[likely]]
+        if (!s_isOn) [[likely]]
             return nullptr;
-        return s_on;
+        return &s_instance;
     }
 
-    void add(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail = 0)
-    {
-        begin(kind, call, leg, detail);
-        end();
-    }
+    void add(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail = 0);
     /// What is longer than LARGEST_TEXT is cut short.
     void addText(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                  std::string_view text);
@@ -41,90 +40,97 @@ public:
     void addNumber(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail,
                    unsigned long long number, std::string_view text = {});
 
-    // A record in pieces: `begin`, then `append` up to MOST_PAYLOAD octets in all, then `end`. Nothing else is recorded
-    // in between.
+    // A record in pieces: `begin` tells the place of what follows, MOST_PAYLOAD octets at most, and `end` is told the
+    // place behind it. A record that is not ended is none. Nothing else is recorded in between.
 
-    void begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
+    char* begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
     {
-        if (m_at > m_lastPlace) [[unlikely]]
-            makeRoom();
-        CC_Moment const now = CC_Moment::NOW();
-        m_record = reinterpret_cast<CC_RecordFormat::Record*>(m_at);
-        m_record->stamp = static_cast<std::uint32_t>(m_head / CC_RecordFormat::ALIGNMENT);
-        m_record->kind = kind;
-        m_record->writer = getWriter();
-        m_record->nanoseconds = now.nanoseconds;
-        m_record->call = call;
-        m_record->leg = leg;
-        m_record->turn = static_cast<std::uint32_t>(now.turn);
-        m_record->detail = detail;
-        m_at += sizeof *m_record;
+        auto& record = *reinterpret_cast<CC_RecordFormat::Record*>(m_at);
+        record.stamp = getStamp();
+        record.kind = kind;
+        record.writer = m_writing->writer;
+        record.call = call;
+        record.leg = leg;
+        record.detail = detail;
         m_changedLeg = 0;
+        return m_at + sizeof record;
     }
     /// A change with who writes just now; the old and the new value follow. Of several of a Batch the later ones take
     /// less room.
-    void beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId);
-    void append(void const* octets, std::size_t size)
+    char* beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
     {
-        std::memcpy(m_at, octets, size);
-        m_at += size;
+        if (m_isInBatch && m_changedLeg == leg && m_changedBy == m_writing && m_writing->notes == nullptr)
+            return beginAlsoChanged(propertyId);
+        char* const place = begin(kind, call, leg, propertyId);
+        Writing const& writing = *m_writing;
+        m_changedLeg = leg;
+        m_changedBy = &writing;
+        new (place) CC_RecordFormat::Change{writing.by, 0, 0, {}};
+        char* const values = place + sizeof(CC_RecordFormat::Change);
+        return writing.notes == nullptr ? values : appendFilter(*writing.notes, propertyId, values);
     }
-    void appendText(std::string_view text)
+    void end(char* behind)
     {
-        if (!text.empty()) // one without characters may point nowhere
-            append(text.data(), text.size());
+        fill(behind);
+        setMoment(); // last: nothing has to outlive the call of a clock
+        goOn();
     }
-    /// Where the next octets come, for who writes so many there; a place for whole words as long as only such went
-    /// before.
-    char* getPlace() const { return m_at; }
-    void goOnAt(char* place) { m_at = place; }
-    void setDetail(unsigned int detail) { m_record->detail = detail; }
-    void end()
+    /// What beginChange began.
+    void endChange(char* behind)
     {
-        std::memset(m_at, 0, CC_RecordFormat::ALIGNMENT); // of which the last group keeps what it does not need
-        auto const written = static_cast<std::size_t>(m_at - reinterpret_cast<char*>(m_record));
-        std::size_t const size =
-            (written + CC_RecordFormat::ALIGNMENT - 1) / CC_RecordFormat::ALIGNMENT * CC_RecordFormat::ALIGNMENT;
-        m_record->size = static_cast<std::uint16_t>(size);
-        m_at = reinterpret_cast<char*>(m_record) + size;
-        m_head += size;
-        PUBLISH(m_header->head, m_head);
+        fill(behind);
+        if (reinterpret_cast<CC_RecordFormat::Record*>(m_at)->kind != Kind::ALSO_CHANGED)
+            setMoment();
+        goOn();
     }
-    /// In place of `end`: there is no such record.
-    void cancel() { m_at = reinterpret_cast<char*>(m_record); }
+
+    /// Where the next octets come. Short texts without the detour through the C library, which costs more than these.
+    static char* APPEND(char* place, std::string_view text)
+    {
+        if (text.size() <= 32)
+            COPY(place, text);
+        else
+            std::memcpy(place, text.data(), text.size());
+        return place + text.size();
+    }
 
     // CC_Recorder's business
     void start(void* image, std::size_t size);
     void* stop();
     std::span<std::byte const> getImage() const;
-    static CC_RecordWriter& INSTANCE();
+    static CC_RecordWriter& INSTANCE() { return s_instance; }
 
     /// While it lives, properties are written together.
     class Batch
     {
     public:
-        Batch() : m_recorder(ON())
+        Batch()
         {
-            if (m_recorder != nullptr)
-                m_recorder->m_isInBatch = true;
+            if (CC_RecordWriter* const recorder = ON())
+                recorder->beginBatch();
         }
         ~Batch()
         {
-            if (m_recorder != nullptr)
-                m_recorder->m_isInBatch = false;
+            if (CC_RecordWriter* const recorder = ON())
+                recorder->m_isInBatch = false;
         }
         Batch(Batch const&) = delete;
         Batch& operator=(Batch const&) = delete;
-
-    private:
-        CC_RecordWriter* m_recorder;
     };
 
     static constexpr std::size_t MOST_PAYLOAD =
-        sizeof(CC_RecordFormat::Change) + 2 * sizeof(CC_RecordFormat::Brief) + CC_RecordFormat::LARGEST_TEXT;
+        sizeof(CC_RecordFormat::Change) + 2 * CC_RecordFormat::LARGEST_BRIEF + CC_RecordFormat::LARGEST_TEXT;
 
 private:
     friend class CC_Writing;
+
+    struct Writing
+    {
+        unsigned long long by; // the leg's serial number
+        CC_FilterNotes* notes;
+        CC_RecordFormat::Writer writer;
+    };
+    static Writing const OUTSIDE; // code outside any adapter
 
     static constexpr std::size_t LARGEST_RECORD = sizeof(CC_RecordFormat::Record) + MOST_PAYLOAD + 8;
 
@@ -132,25 +138,79 @@ private:
     {
         std::atomic_ref(position).store(value, std::memory_order_release);
     }
-    inline CC_RecordFormat::Writer getWriter() const;
+    /// Both ends of so many octets, which together are all when these are no more than twice as many.
+    template <std::size_t SIZE>
+    static void COPY_ENDS(char* to, std::string_view text)
+    {
+        std::memcpy(to, text.data(), SIZE);
+        std::memcpy(to + text.size() - SIZE, text.data() + text.size() - SIZE, SIZE);
+    }
+    /// REQUIRES: no more than 32 octets.
+    static void COPY(char* to, std::string_view text)
+    {
+        if (text.size() >= 16)
+            COPY_ENDS<16>(to, text);
+        else if (text.size() >= 8)
+            COPY_ENDS<8>(to, text);
+        else if (text.size() >= 4)
+            COPY_ENDS<4>(to, text);
+        else if (text.size() >= 2)
+            COPY_ENDS<2>(to, text);
+        else if (text.size() == 1)
+            *to = text[0];
+    }
+
+    std::uint64_t getHead() const { return reinterpret_cast<std::uintptr_t>(m_at) + m_toPosition; }
+    std::uint32_t getStamp() const { return static_cast<std::uint32_t>(getHead() / CC_RecordFormat::ALIGNMENT); }
+    /// To whole groups.
+    void fill(char* behind)
+    {
+        std::memset(behind, 0, CC_RecordFormat::ALIGNMENT); // of which the last group keeps what it does not need
+        std::size_t const size = (static_cast<std::size_t>(behind - m_at) + CC_RecordFormat::ALIGNMENT - 1) /
+                                 CC_RecordFormat::ALIGNMENT * CC_RecordFormat::ALIGNMENT;
+        reinterpret_cast<CC_RecordFormat::Record*>(m_at)->size = static_cast<std::uint16_t>(size);
+    }
+    void goOn()
+    {
+        m_at += reinterpret_cast<CC_RecordFormat::Record*>(m_at)->size;
+        PUBLISH(m_header->head, getHead());
+        if (m_at > m_lastPlace) [[unlikely]]
+            makeRoom(); // for the next one, now that nothing of this one is needed any more
+    }
+    void setMoment()
+    {
+        TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
+        auto* const record = reinterpret_cast<CC_RecordFormat::Record*>(m_at);
+        record->turn = loop != nullptr ? static_cast<std::uint32_t>(loop->getNumberOfTurns()) : 0;
+        record->nanoseconds = loop != nullptr ? loop->getTime() : 0;
+    }
     void startAt(std::uint64_t head, std::size_t left);
-    void beginAlsoChanged(unsigned int propertyId);
-    void appendFilter(CC_FilterNotes const& notes, unsigned int propertyId);
+    void beginBatch()
+    {
+        m_isInBatch = true;
+        m_changedLeg = 0;
+    }
+    char* beginAlsoChanged(unsigned int propertyId)
+    {
+        new (m_at) CC_RecordFormat::AlsoChanged{getStamp(), 0, Kind::ALSO_CHANGED, 0, propertyId};
+        return m_at + sizeof(CC_RecordFormat::AlsoChanged);
+    }
+    static char* appendFilter(CC_FilterNotes const& notes, unsigned int propertyId, char* place);
     void makeRoom();
     void pad(std::size_t size);
     CC_RecordFormat::Record& at(std::uint64_t position) const;
 
-    static CC_RecordWriter* s_on;
+    static bool s_isOn;
+    static CC_RecordWriter s_instance;
 
+    char* m_at = nullptr;                // the record that is being written, or the next one
+    char* m_lastPlace = nullptr;         // up to here a record of any size may begin
+    std::uint64_t m_toPosition = 0;      // from an address, modulo 2^64
+    Writing const* m_writing = &OUTSIDE; // never null
     CC_RecordFormat::Header* m_header = nullptr;
-    CC_RecordFormat::Record* m_record = nullptr; // that is being written; of an AlsoChanged only the first octets
-    char* m_at = nullptr;                        // the next octet
-    char* m_lastPlace = nullptr;                 // up to here a record of any size may begin
-    std::uint64_t m_head = 0;
-    CC_Writing const* m_writing = nullptr; // null: code outside any adapter
     // of a change that another may follow: nothing has been recorded since
     unsigned long long m_changedLeg = 0; // 0: there is none
-    CC_Writing const* m_changedBy = nullptr;
+    Writing const* m_changedBy = nullptr;
     bool m_isInBatch = false;
     char* m_ring = nullptr;
     std::size_t m_capacity = 0;
@@ -164,61 +224,79 @@ private:
 class CC_Writing
 {
 public:
-    explicit CC_Writing(CC_RecordFormat::Writer writer) : m_recorder(CC_RecordWriter::ON())
+    explicit CC_Writing(CC_RecordFormat::Writer writer)
     {
-        if (m_recorder != nullptr)
+        if (CC_RecordWriter::ON() != nullptr)
             begin(writer, 0, nullptr);
     }
     /// The adapter of that leg writes.
     template <class CallLeg>
-    CC_Writing(CC_RecordFormat::Writer writer, CallLeg const& leg) : m_recorder(CC_RecordWriter::ON())
+    CC_Writing(CC_RecordFormat::Writer writer, CallLeg const& leg)
     {
-        if (m_recorder != nullptr)
+        if (CC_RecordWriter::ON() != nullptr)
             begin(writer, leg.getSerial(), nullptr);
     }
     /// The same writer as before, through filters, of which `notes` must live longer.
-    explicit CC_Writing(CC_FilterNotes& notes) : m_recorder(CC_RecordWriter::ON())
+    explicit CC_Writing(CC_FilterNotes& notes)
     {
-        if (m_recorder == nullptr)
+        if (CC_RecordWriter::ON() == nullptr)
             return;
-        CC_Writing const* const before = m_recorder->m_writing;
-        begin(before != nullptr ? before->m_writer : CC_RecordFormat::Writer::OUTSIDE,
-              before != nullptr ? before->m_by : 0, &notes);
+        CC_RecordWriter::Writing const& before = *CC_RecordWriter::s_instance.m_writing;
+        begin(before.writer, before.by, &notes);
     }
     ~CC_Writing()
     {
-        if (m_recorder != nullptr)
-            m_recorder->m_writing = m_outer; // also when recording has ended meanwhile
+        if (m_outer != nullptr)
+            CC_RecordWriter::s_instance.m_writing = m_outer; // also when recording has ended meanwhile
     }
     CC_Writing(CC_Writing const&) = delete;
     CC_Writing& operator=(CC_Writing const&) = delete;
 
     /// Where filters are to note what they do; null when nobody writes through them.
-    static CC_FilterNotes* NOTES(CC_RecordWriter const& recorder)
-    {
-        return recorder.m_writing != nullptr ? recorder.m_writing->m_notes : nullptr;
-    }
+    static CC_FilterNotes* NOTES(CC_RecordWriter const& recorder) { return recorder.m_writing->notes; }
+
+    class Recorded;
+    class Outside;
 
 private:
-    friend class CC_RecordWriter;
-
     void begin(CC_RecordFormat::Writer writer, unsigned long long by, CC_FilterNotes* notes)
     {
-        m_outer = m_recorder->m_writing;
-        m_by = by;
-        m_notes = notes;
-        m_writer = writer;
-        m_recorder->m_writing = this;
+        m_writing = {by, notes, writer};
+        m_outer = std::exchange(CC_RecordWriter::s_instance.m_writing, &m_writing);
     }
 
-    CC_RecordWriter* m_recorder; // null: nothing was recorded, and the rest is not set
-    CC_Writing const* m_outer;
-    unsigned long long m_by;
-    CC_FilterNotes* m_notes;
-    CC_RecordFormat::Writer m_writer;
+    CC_RecordWriter::Writing const* m_outer = nullptr; // null: nothing was recorded, and the rest is not set
+    CC_RecordWriter::Writing m_writing;
 };
 
-inline CC_RecordFormat::Writer CC_RecordWriter::getWriter() const
+/// The same. REQUIRES: something is recorded.
+class CC_Writing::Recorded
 {
-    return m_writing != nullptr ? m_writing->m_writer : CC_RecordFormat::Writer::OUTSIDE;
-}
+public:
+    template <class CallLeg>
+    Recorded(CC_RecordFormat::Writer writer, CallLeg const& leg)
+        : m_writing{leg.getSerial(), nullptr, writer}
+        , m_outer(std::exchange(CC_RecordWriter::s_instance.m_writing, &m_writing))
+    {
+    }
+    ~Recorded() { CC_RecordWriter::s_instance.m_writing = m_outer; }
+    Recorded(Recorded const&) = delete;
+    Recorded& operator=(Recorded const&) = delete;
+
+private:
+    CC_RecordWriter::Writing m_writing;
+    CC_RecordWriter::Writing const* m_outer;
+};
+
+/// Code outside any adapter writes. REQUIRES: something is recorded.
+class CC_Writing::Outside
+{
+public:
+    Outside() : m_outer(std::exchange(CC_RecordWriter::s_instance.m_writing, &CC_RecordWriter::OUTSIDE)) {}
+    ~Outside() { CC_RecordWriter::s_instance.m_writing = m_outer; }
+    Outside(Outside const&) = delete;
+    Outside& operator=(Outside const&) = delete;
+
+private:
+    CC_RecordWriter::Writing const* m_outer;
+};

@@ -67,8 +67,11 @@ std::string PRINT_HEARD(std::vector<unsigned long long> const& heard)
     for (unsigned long long const one : heard)
     {
         auto const who = static_cast<unsigned int>(one >> 48);
-        text += (who >= 0x100 ? " line " + std::to_string(who - 0x100) : " guest " + std::to_string(who)) + " " +
-                NAME_OF(static_cast<CallOut>(one >> 40 & 0xff)) + " (" + std::to_string(one & 0xffffffffff) + ");";
+        text += (who == World::WHO_REBOOT ? std::string(" the reboot management")
+                 : who >= 0x100           ? " line " + std::to_string(who - 0x100)
+                                          : " guest " + std::to_string(who)) +
+                " " + NAME_OF(static_cast<CallOut>(one >> 40 & 0xff)) + " (" + std::to_string(one & 0xffffffffff) +
+                ");";
     }
     return text;
 }

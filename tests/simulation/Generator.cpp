@@ -193,9 +193,11 @@ private:
     {
         auto const leg = static_cast<std::uint8_t>(m_random.below(8));
         operations.push_back({Code::NEW_LEG, {leg}});
-        operations.push_back(filled(Code::ADD_LEG));
-        operations.back().arguments[0] = leg;
+        Operation add = filled(Code::ADD_LEG);
+        add.arguments[0] = leg;
+        operations.push_back(add);
         operations.push_back({Code::SET_LEG, {leg, 0, static_cast<std::uint8_t>(m_random.below(9))}});
+        operations.push_back({Code::CLEAN_UP_CALL, {add.arguments[1], add.arguments[2], 3}});
         operations.push_back({Code::GIVE_UP_LEG, {leg}});
         operations.push_back(filled(m_random.isOneIn(2) ? Code::CLEAN_UP_CALL : Code::DROP));
         operations.push_back(filled(Code::TURN));

@@ -209,8 +209,10 @@ void Interpreter::perform(Operation const& operation)
     {
         m_world.m_hasLostContext = true;
         m_world.m_lostPools += CallControl::GET_NUMBER_OF_CALLS(String(context)) != 0 ? 1 : 0;
+        int const locks = m_world.m_reboot.m_takenLocks;
         Memory::Library const library;
         CallControl::DESTROY_CONTEXT(String(context));
+        m_world.m_lostPools += m_world.m_reboot.m_takenLocks - locks; // maybe of calls made while it ended
         break;
     }
     case Code::ADD_PROVIDER:

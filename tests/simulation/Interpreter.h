@@ -51,6 +51,7 @@ private:
     XCode transferLeg(unsigned int number, CC_CallLeg& leg, CC_Call* to);
     void newCall(Operation const& operation);
     void emptyCall(Operation const& operation);
+    void cleanUpWithoutGuests(CC_Call& call);
     void changeFilters(Operation const& operation);
     void useFilters(Operation const& operation);
     void observe(Operation const& operation, int change);

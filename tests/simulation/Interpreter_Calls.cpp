@@ -7,6 +7,8 @@
 #include "tests/simulation/Interpreter.h"
 #include "tests/simulation/Library.h"
 
+#include <array>
+
 // What the operations do to calls and to the legs that no adapter drives.
 
 namespace Simulation
@@ -127,6 +129,35 @@ XCode Interpreter::setOnCall(Operation const& operation)
     return WRITE(*call, operation[2] / 4 * 4, operation[3], operation[4], operation[5]); // a call has no State
 }
 
+/// A live leg stays in its call also when nobody but that holds it: what the guests hold is given up meanwhile.
+void Interpreter::cleanUpWithoutGuests(CC_Call& call)
+{
+    auto const isIn = [&call](CC_CallLeg const* leg)
+    {
+        for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
+            if (call.getCallLeg(i) == leg)
+                return true;
+        return false;
+    };
+    std::array<CC_CallLeg*, World::NUMBER_OF_LEGS> given{};
+    for (unsigned int i = 0; i < given.size(); ++i)
+        if (CC_CallLeg* const leg = m_world.leg(i); leg != nullptr && leg->getState() >= 0 && isIn(leg))
+        {
+            given[i] = leg;
+            leg->removeReference();
+        }
+    CC_Call::Hold const keepCall(&call);
+    call.deferred();
+    for (unsigned int i = 0; i < given.size(); ++i)
+        if (given[i] != nullptr && isIn(given[i]))
+            given[i]->addReference();
+        else if (given[i] != nullptr)
+        {
+            m_world.leg(i) = nullptr; // it has ended
+            m_world.fail("a live leg that only its call holds was taken out in the clean-up");
+        }
+}
+
 void Interpreter::emptyCall(Operation const& operation)
 {
     CC_Call* const call = m_world.call(operation[0], operation[1]);
@@ -144,6 +175,8 @@ void Interpreter::emptyCall(Operation const& operation)
         if (watch.get() != nullptr)
             watch.get()->defer(); // who empties a call asks for its clean-up
     }
+    else if (operation[2] % 4 == 3 && m_world.m_reactions.isEmpty())
+        cleanUpWithoutGuests(*call);
     else if (operation[2] % 2 != 0)
         call->deferred();
     else

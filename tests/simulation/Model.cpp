@@ -436,8 +436,11 @@ void Model::release(int index)
     Call const& call = m_calls[static_cast<std::size_t>(index)];
     if (call.context != NOBODY)
     {
-        std::erase(m_contexts[static_cast<std::size_t>(call.context)].calls, index);
+        Context& context = m_contexts[static_cast<std::size_t>(call.context)];
+        std::erase(context.calls, index);
         ++m_callsRemoved;
+        if (context.calls.empty())
+            hear(0x200, CallOut::REBOOT_RELEASE); // when the call was given back, which holds itself until then
     }
     destroyCall(index);
 }

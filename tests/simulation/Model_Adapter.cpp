@@ -524,6 +524,8 @@ int Model::acquire(unsigned int index, unsigned long long media)
     Context& context = m_contexts[index];
     if (!context.exists)
         return NOBODY;
+    if (context.calls.empty())
+        hear(0x200, CallOut::REBOOT_ADD);
     int const call = newCall(static_cast<int>(index));
     context.calls.push_back(call);
     ++m_callsAdded;

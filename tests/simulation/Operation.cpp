@@ -50,7 +50,7 @@ constexpr Row ROWS[] = {
     {"leg-service", "guest leg %0 asks service %1, text %2"},
     {"set-on-call", "call %0/%1, property %2, value %3, way %4, with others %5"},
     {"empty-call", "call %0/%1"},
-    {"clean-up-call", "call %0/%1, at once (way %2)"},
+    {"clean-up-call", "call %0/%1, at once or not, the guests holding nothing or as ever (way %2)"},
     {"create-context", "context %0"},
     {"destroy-context", "context %0"},
     {"add-provider", "module %0's to context %1"},

@@ -427,6 +427,8 @@ public:
             return XCode::FAILURE;
         XCode const result = m_owner->m_isRefusing ? XCode::FAILURE : XCode::OK;
         ++m_owner->m_locks;
+        ++m_owner->m_takenLocks;
+        m_owner->m_world.hear(World::WHO_REBOOT, CallOut::REBOOT_ADD);
         World::CALL_OUT(CallOut::REBOOT_ADD);
         return result;
     }
@@ -436,13 +438,17 @@ public:
             return XCode::FAILURE;
         XCode const result = m_owner->m_isRefusing ? XCode::FAILURE : XCode::OK;
         --m_owner->m_locks;
+        m_owner->m_world.hear(World::WHO_REBOOT, CallOut::REBOOT_RELEASE);
         World::CALL_OUT(CallOut::REBOOT_RELEASE);
         return result;
     }
     RebootManagement* m_owner;
 };
 
-RebootManagement::RebootManagement() : m_interface(new Interface(*this)) { m_interface->addReference(); }
+RebootManagement::RebootManagement(World& world) : m_world(world), m_interface(new Interface(*this))
+{
+    m_interface->addReference();
+}
 
 RebootManagement::~RebootManagement()
 {

@@ -281,16 +281,18 @@ public:
 class RebootManagement
 {
 public:
-    RebootManagement();
+    explicit RebootManagement(World& world);
     ~RebootManagement();
     void enable(bool isEnabled);
     bool isEnabled() const { return m_isEnabled; }
 
     int m_locks = 0;
+    int m_takenLocks = 0; // those given back, too
     bool m_isRefusing = false;
 
 private:
     class Interface;
+    World& m_world;
     Interface* m_interface;
     bool m_isEnabled = false;
 };

@@ -20,6 +20,7 @@ public:
     };
 
     void add(Reaction const& reaction);
+    bool isEmpty() const { return m_reactions.empty(); }
     bool isAwaited(CallOut kind) const { return (m_awaited >> static_cast<unsigned int>(kind) & 1) != 0; }
     /// Whether one was due at this call-out; it is taken out then.
     bool take(CallOut kind, Reaction& due);

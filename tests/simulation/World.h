@@ -58,6 +58,7 @@ public:
     void hearService(unsigned int line, CC_CallAdapter const* adapter, unsigned int type);
     static unsigned int WHO_GUEST(unsigned int index) { return index; }
     static unsigned int WHO_LINE(unsigned int index) { return 0x100 + index; }
+    static constexpr unsigned int WHO_REBOOT = 0x200;
 
     static char const* CONTEXT_NAME(unsigned int index);
     /// What a line says of itself: a Call-Leg-ID, which would else be an address, and others.
@@ -93,7 +94,7 @@ public:
     DrivenClock m_clock;
     DrivenLoop m_loop;
     MediaRepository m_media;
-    RebootManagement m_reboot;
+    RebootManagement m_reboot{*this};
     LogWriter m_log;
     Reactions m_reactions;
     std::vector<std::unique_ptr<Module>> m_modules;
