@@ -93,6 +93,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, *this)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
     m_loop.attach(m_callControlLoop);
@@ -100,8 +101,23 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     m_loop.watch(m_signals.get(), [this] { onSignal(); });
     for (auto const& [name, module] : m_modules)
         module->open(m_host);
+    openControl();
     if (m_media != nullptr)
         m_media->start();
+}
+
+void Gateway::openControl()
+{
+    if (m_configuration.control.path.empty())
+        return;
+    try
+    {
+        m_control = std::make_unique<ControlServer>(m_configuration.control, m_loop, m_callControlLoop, m_commands);
+    }
+    catch (std::runtime_error const& error)
+    {
+        throw ConfigurationError(m_configuration.file, "control.socket", error.what());
+    }
 }
 
 SignallingLoop& Gateway::findLoop(Modules const& modules)
@@ -131,6 +147,8 @@ void Gateway::onSignal()
             break;
         case SIGCHLD:
             m_dump.onChild();
+            if (m_control != nullptr)
+                m_control->onChild();
             break;
         case SIGHUP:
             onHangUp();
@@ -139,7 +157,7 @@ void Gateway::onSignal()
             spdlog::info("SIGUSR2 means nothing here");
             break;
         default:
-            end();
+            end(m_configuration.clearAfter);
         }
 }
 
@@ -152,7 +170,7 @@ void Gateway::onHangUp()
 }
 
 /// The first request lets the calls go on for a while, another one clears them at once.
-void Gateway::end()
+void Gateway::end(unsigned int patience)
 {
     if (m_host.isEnding)
     {
@@ -160,11 +178,12 @@ void Gateway::end()
         return;
     }
     m_host.isEnding = true;
-    spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
-                 m_configuration.clearAfter);
-    m_clearTimer.start(m_configuration.clearAfter * 1000);
+    spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(), patience);
+    m_clearTimer.start(patience * 1000);
     stopIfIdle();
 }
+
+void Gateway::shutDown(std::optional<unsigned int> seconds) { end(seconds.value_or(m_configuration.clearAfter)); }
 
 void Gateway::onClearTimer()
 {

@@ -9,11 +9,14 @@
 #include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
 #include "operation/StateDump.h"
+#include "operation/control/ControlCommands.h"
+#include "operation/control/ControlServer.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 
 /// The gateway at work: call control and the signalling modules of a configuration, on the calling thread.
@@ -21,10 +24,10 @@
 ///     Gateway::BLOCK_SIGNALS();
 ///     Gateway gateway(configuration, std::move(modules), 1);
 ///     gateway.run(); // until SIGTERM or SIGINT and the end of the calls
-class Gateway
+class Gateway : private ControlledGateway
 {
 public:
-    using Modules = std::map<std::string, std::unique_ptr<SignallingModule>>; // by name
+    using Modules = SignallingModules;
 
     /// Opens all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
     /// ConfigurationError for an interface that cannot be opened.
@@ -58,13 +61,17 @@ private:
     SignallingLoop& findLoop(Modules const& modules);
     void openModules();
     void onSignal();
-    void end();
+    void end(unsigned int patience);
     void clearCalls();
     void onClearTimer();
     void stopIfIdle();
     bool hasEndpoints() const;
     void onHangUp();
+    void openControl();
     std::string getState() const;
+
+    // --- ControlledGateway
+    void shutDown(std::optional<unsigned int> seconds) override;
 
     Configuration m_configuration;
     TYEventLoop m_callControlLoop;
@@ -80,5 +87,7 @@ private:
     FreeMemory m_freeMemory;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
-    Modules m_modules; // they end first
+    Modules m_modules;
+    ControlCommands m_commands;
+    std::unique_ptr<ControlServer> m_control; // null where it is not configured; ends first
 };

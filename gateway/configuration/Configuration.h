@@ -1,6 +1,7 @@
 #pragma once
 
 #include "configuration/ConfigurationSection.h"
+#include "configuration/ControlOptions.h"
 #include "media/context/MediaOptions.h"
 
 #include <map>
@@ -40,9 +41,11 @@ struct Configuration
     unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
     bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
     MediaOptions media;
+    ControlOptions control;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
-    std::set<std::string> interfaces; ///< the names of all
+    std::set<std::string> interfaces;            ///< the names of all
+    std::map<std::string, std::string> moduleOf; ///< by an interface's name, that of its module
     /// By the module's name, its interfaces. Each has a `name` that no other interface has.
     std::map<std::string, std::vector<ConfigurationSection>> modules;
 

@@ -7,6 +7,8 @@
 #include "platform/base/String.h"
 
 #include <functional>
+#include <set>
+#include <string>
 
 class SignallingLoop;
 
@@ -25,6 +27,16 @@ struct GatewayHost
     Counters counters{};
     unsigned int lastCallNumber = 0;        ///< in logs and traces; the next call takes the next one
     bool relaysMedia = false;               ///< through ports of ours
-    bool isEnding = false;                  ///< no new calls
+    bool isEnding = false;                  ///< no new calls, and the process ends with the last one
     std::function<void()> onEndpointGone{}; ///< to be told whenever an endpoint was destroyed; may be empty
+    bool isDraining = false;                ///< no new calls for now
+    std::set<std::string> blocked{};        ///< interfaces that an operator has taken out of service
+
+    /// Whether new calls may come in on that interface.
+    bool takesCallsFrom(std::string const& interface) const
+    {
+        return !isEnding && !isDraining && !isBlocked(interface);
+    }
+    /// Whether no new call may come in or leave there.
+    bool isBlocked(std::string const& interface) const { return blocked.contains(interface); }
 };

@@ -1,6 +1,7 @@
 #include "isdn/endpoint/IsdnEndpoint.h"
 
 #include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
 #include "isdn/element/IsdnCause.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
 #include "properties/CC_Cause.h"
@@ -167,6 +168,12 @@ void IsdnEndpoint::loseCall()
     m_call = nullptr;
     m_state = IsdnCallState::OVER;
     leaveCall(QCause::NORMAL_UNSPECIFIED);
+}
+
+bool IsdnEndpoint::isInCall(unsigned long long serial) const
+{
+    CC_Call const* const call = m_isInCall ? m_adapter.getCall() : nullptr;
+    return call != nullptr && call->getSerial() == serial;
 }
 
 void IsdnEndpoint::clear(QCause cause)

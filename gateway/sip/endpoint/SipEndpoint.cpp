@@ -1,6 +1,7 @@
 #include "sip/endpoint/SipEndpoint.h"
 
 #include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"
@@ -165,6 +166,12 @@ void SipEndpoint::onPeerReleased()
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
     endDialog(cause);
     leaveCall(cause);
+}
+
+bool SipEndpoint::isInCall(unsigned long long serial) const
+{
+    CC_Call const* const call = m_isInCall ? m_adapter.getCall() : nullptr;
+    return call != nullptr && call->getSerial() == serial;
 }
 
 void SipEndpoint::clear(SipCause const& cause)

@@ -54,6 +54,7 @@ public:
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
+    bool isInCall(unsigned long long serial) const;
     /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
 
