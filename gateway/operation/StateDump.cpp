@@ -6,6 +6,7 @@
 
 #include <sys/wait.h>
 #include <unistd.h>
+#include <utility>
 
 StateDump::~StateDump()
 {
@@ -13,11 +14,11 @@ StateDump::~StateDump()
         waitpid(m_child, nullptr, 0); // within its patience: what was asked for is told
 }
 
-void StateDump::begin(std::function<std::string()> const& collect)
+void StateDump::begin(std::function<std::string()> collect)
 {
     if (m_child > 0)
     {
-        spdlog::info("the state is being told already");
+        m_next = std::move(collect);
         return;
     }
     m_child = ProcessCopy::START(STDOUT_FILENO, collect);
@@ -27,6 +28,9 @@ void StateDump::begin(std::function<std::string()> const& collect)
 
 void StateDump::onChild()
 {
-    if (m_child > 0 && ProcessCopy::HAS_ENDED(m_child))
-        m_child = 0;
+    if (m_child <= 0 || !ProcessCopy::HAS_ENDED(m_child))
+        return;
+    m_child = 0;
+    if (auto const next = std::exchange(m_next, nullptr))
+        begin(next);
 }

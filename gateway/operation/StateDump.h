@@ -15,10 +15,12 @@ class StateDump
 {
 public:
     ~StateDump();
-    /// `collect` runs in the copy, where no other thread is. Nothing happens while one before is still at work.
-    void begin(std::function<std::string()> const& collect);
+    /// `collect` runs in the copy, where no other thread is. While one before is still at work, it waits for its end;
+    /// of several that wait the last one does.
+    void begin(std::function<std::string()> collect);
     void onChild();
 
 private:
     pid_t m_child = 0;
+    std::function<std::string()> m_next; // empty: nobody asked meanwhile
 };

@@ -62,6 +62,7 @@ start_gateway
 open_connections 10 ''
 expect_connections 4
 close_connections
+expect_connections 0
 expect_call -t t1 # those that are gone do not count
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 
