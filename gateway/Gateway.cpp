@@ -12,6 +12,7 @@
 #include "host/MediaContexts.h"
 #include "media/context/CallMedia.h"
 #include "operation/Log.h"
+#include "operation/record/CallLine.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
 
@@ -93,9 +94,11 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
-    , m_commands(m_host, m_modules, m_configuration.moduleOf, *this)
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, *this)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
+    m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
+    m_watch.watch(m_host.contextName);
     m_loop.attach(m_callControlLoop);
     m_loop.attach(m_datapathLoop);
     m_loop.watch(m_signals.get(), [this] { onSignal(); });
@@ -197,6 +200,7 @@ void Gateway::clearCalls()
 {
     m_isClearing = true;
     spdlog::info("ending: {} calls are cleared", CallControl::GET_NUMBER_OF_CALLS());
+    m_watch.noteAllCleared();
     unsigned int wait = 0;
     for (auto const& [name, module] : m_modules)
         wait = std::max(wait, module->clearCalls(QCause::TEMPORARY_FAILURE));

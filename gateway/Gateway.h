@@ -11,6 +11,7 @@
 #include "operation/StateDump.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
+#include "operation/record/CallWatch.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -82,6 +83,7 @@ private:
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
+    CallWatch m_watch; // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;

@@ -23,7 +23,7 @@ Output& LOG_OUTPUT()
 class OutputSink : public spdlog::sinks::base_sink<std::mutex>
 {
 public:
-    OutputSink() { set_pattern("%H:%M:%S.%e %l %v"); }
+    OutputSink() { set_pattern("%Y-%m-%dT%H:%M:%S.%e%z %l %v"); }
 
 private:
     void sink_it_(spdlog::details::log_msg const& message) override

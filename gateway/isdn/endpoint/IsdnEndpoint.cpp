@@ -229,11 +229,11 @@ void IsdnEndpoint::leaveCall(QCause cause)
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
     if (m_isCalling)
-        spdlog::info("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
-                     m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+        spdlog::debug("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
+                      m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
     else // who dialled knows its number
-        spdlog::info("{} (called side, timeslot {}) released: cause {} ({})", getName().view(), m_timeslot,
-                     static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+        spdlog::debug("{} (called side, timeslot {}) released: cause {} ({})", getName().view(), m_timeslot,
+                      static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
     finishIfDone();
 }
 

@@ -217,6 +217,7 @@ ControlAnswer ControlCommands::drop(ControlRequest const& request)
     auto const cause = CONTROL_NUMBER(request.arguments[1], HIGHEST_CAUSE);
     if (!serial || !cause || *cause == 0)
         return FAILED("drop wants the serial number of a call and a cause from 1 to 127");
+    m_watch.noteCleared(*serial);
     bool isThere = false;
     for (auto const& [name, module] : m_modules)
         isThere |= module->clearCall(*serial, static_cast<QCause>(*cause));

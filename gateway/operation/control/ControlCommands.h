@@ -3,6 +3,7 @@
 #include "host/GatewayHost.h"
 #include "host/SignallingModule.h"
 #include "operation/control/ControlServer.h"
+#include "operation/record/CallWatch.h"
 
 #include <map>
 #include <optional>
@@ -25,8 +26,8 @@ class ControlCommands : public ControlHandler
 public:
     /// All are the gateway's and outlive this. `interfaces`: the module of each.
     ControlCommands(GatewayHost& host, SignallingModules const& modules,
-                    std::map<std::string, std::string> const& interfaces, ControlledGateway& gateway)
-        : m_host(host), m_modules(modules), m_interfaces(interfaces), m_gateway(gateway)
+                    std::map<std::string, std::string> const& interfaces, CallWatch& watch, ControlledGateway& gateway)
+        : m_host(host), m_modules(modules), m_interfaces(interfaces), m_watch(watch), m_gateway(gateway)
     {
     }
 
@@ -58,6 +59,7 @@ private:
     GatewayHost& m_host;
     SignallingModules const& m_modules;
     std::map<std::string, std::string> const& m_interfaces;
+    CallWatch& m_watch;
     ControlledGateway& m_gateway;
     TY::Time m_start = TY::Time::NOW(TY::Time::MONOTONIC);
 };

@@ -7,6 +7,7 @@
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "operation/control/ControlNumber.h"
+#include "operation/record/CallLine.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
 #include "recorder/CC_Recorder.h"
@@ -47,11 +48,20 @@ std::string LEGS(Explained const& call)
     return text;
 }
 
-std::string LINE(Explained const& call)
+std::string NUMBERS(CallRecord const* record)
 {
-    return fmt::format("{:>8} {:<10} {:>10} {:>10}  {}", call.serial,
+    std::string text;
+    if (record != nullptr)
+        for (CallRecord::Leg const& leg : record->legs)
+            text += (text.empty() ? "" : " - ") + CallLine::NUMBER_OF(leg);
+    return text;
+}
+
+std::string LINE(Explained const& call, CallRecord const* record)
+{
+    return fmt::format("{:>8} {:<10} {:>10} {:>10}  {}; {}", call.serial,
                        CC_Call::STATE_NAME(static_cast<CC_Call::State>(call.state)), SECONDS(call.age),
-                       SECONDS(call.inState), LEGS(call));
+                       SECONDS(call.inState), LEGS(call), NUMBERS(record));
 }
 
 void ADD_LINES(std::vector<std::string>& lines, std::string_view text)
@@ -99,12 +109,12 @@ ControlAnswer ControlCommands::calls(ControlRequest const& request)
     ControlAnswer answer;
     if (!request.isJson)
         answer.lines.push_back(
-            fmt::format("{:>8} {:<10} {:>10} {:>10}  {}", "call", "state", "age/s", "in state/s", "legs"));
+            fmt::format("{:>8} {:<10} {:>10} {:>10}  {}", "call", "state", "age/s", "in state/s", "legs; numbers"));
     for (std::size_t i = 0; i < explanation.getCalls().size(); ++i)
     {
         Explained const& call = explanation.getCalls()[i];
         if (from == request.options.end() || HAS_LEG_OF(call, from->second))
-            answer.lines.push_back(request.isJson ? json[i] : LINE(call));
+            answer.lines.push_back(request.isJson ? json[i] : LINE(call, m_watch.find(call.serial)));
     }
     return answer;
 }

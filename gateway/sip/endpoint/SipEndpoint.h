@@ -241,6 +241,7 @@ private:
     SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
+    void addCallId(CC_PropertyContainer& own) const;
     void onPeerReleased();
     void finishIfDone();
     XCode writeOwn(CC_PropertyContainer const& properties);

@@ -54,7 +54,7 @@ ask 0 '^ +call state' calls
 start_callee callee
 run_caller caller 4989123 &
 background+=($!)
-until_asked '^ +1 ACTIVE +[0-9.]+ +[0-9.]+  a/1 CONNECTED, b/1 CONNECTED$' calls
+until_asked '^ +1 ACTIVE +[0-9.]+ +[0-9.]+  a/1 CONNECTED, b/1 CONNECTED; 4420 - 4989123$' calls
 ask 0 '^ +1 ACTIVE' calls --interface b
 ask 0 '^\{"call":1,' --json calls
 "$CTL" calls --interface c | grep -q ACTIVE && fail "a call on an interface that it does not touch"
