@@ -43,6 +43,16 @@ String CONTEXT_NAME(Configuration const& configuration)
 {
     return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
 }
+
+std::unique_ptr<RecordWriter> OPEN_RECORDS(Configuration const& configuration)
+try
+{
+    return configuration.records.file.empty() ? nullptr : std::make_unique<RecordWriter>(configuration.records);
+}
+catch (std::runtime_error const& error)
+{
+    throw ConfigurationError(configuration.file, "records.file", error.what());
+}
 } // namespace
 
 Gateway::Signals::Signals()
@@ -78,6 +88,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
                                         : nullptr)
     , m_loop(findLoop(modules))
     , m_recording(configuration)
+    , m_records(OPEN_RECORDS(configuration))
     , m_callControl(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
     , m_host{m_loop,
              m_callControl.getContextName(),
@@ -94,11 +105,10 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
-    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, *this)
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_records.get(), *this)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
-    m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
-    m_watch.watch(m_host.contextName);
+    watchCalls();
     m_loop.attach(m_callControlLoop);
     m_loop.attach(m_datapathLoop);
     m_loop.watch(m_signals.get(), [this] { onSignal(); });
@@ -107,6 +117,16 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     openControl();
     if (m_media != nullptr)
         m_media->start();
+}
+
+void Gateway::watchCalls()
+{
+    m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
+    if (m_records != nullptr)
+        m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
+        m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
+    m_watch.watch(m_host.contextName);
 }
 
 void Gateway::openControl()
@@ -166,6 +186,8 @@ void Gateway::onSignal()
 
 void Gateway::onHangUp()
 {
+    if (m_records != nullptr)
+        m_records->reopen();
     if (REOPEN_LOG())
         spdlog::info("SIGHUP: the log is opened again; the configuration is not, since a change of it needs a restart");
     else

@@ -12,6 +12,7 @@
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
 #include "operation/record/CallWatch.h"
+#include "operation/record/RecordWriter.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -69,6 +70,7 @@ private:
     bool hasEndpoints() const;
     void onHangUp();
     void openControl();
+    void watchCalls();
     std::string getState() const;
 
     // --- ControlledGateway
@@ -83,7 +85,8 @@ private:
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
-    CallWatch m_watch; // calls may last until call control ends
+    std::unique_ptr<RecordWriter> m_records; // null where it is not configured
+    CallWatch m_watch;                       // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;

@@ -1,5 +1,7 @@
 #include "configuration/Configuration.h"
 
+#include <algorithm>
+#include <array>
 #include <charconv>
 #include <fstream>
 #include <limits>
@@ -70,12 +72,25 @@ void READ_CONTROL(ConfigurationSection const& section, ControlOptions& control)
         section.refuse("socket", "is missing");
 }
 
+void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
+{
+    section.allow({"file", "numbers", "kept", "when-full"});
+    records.file = section.text("file", {});
+    records.isWhole = section.oneOf("numbers", "withheld", {"withheld", "whole"}) == "whole";
+    records.kept = section.number("kept", records.kept, 1, 1000000);
+    records.refusesUnrecorded = section.oneOf("when-full", "lose", {"lose", "refuse"}) == "refuse";
+    if (records.file.empty() && !section.getKeys().empty())
+        section.refuse("file", "is missing");
+}
+
+constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records"};
+
 /// Every table that is not the gateway's own is a module's.
 void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
 {
     for (std::string const& key : root.getKeys())
     {
-        if (key == "gateway" || key == "media" || key == "route" || key == "control")
+        if (std::find(OWN_TABLES.begin(), OWN_TABLES.end(), key) != OWN_TABLES.end())
             continue;
         std::vector<ConfigurationSection>& interfaces = configuration.modules[key] = root.sections(key);
         for (ConfigurationSection const& interface : interfaces)
@@ -122,6 +137,7 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     READ_GATEWAY(root.section("gateway"), configuration);
     READ_MEDIA(root.section("media"), configuration);
     READ_CONTROL(root.section("control"), configuration.control);
+    READ_RECORDS(root.section("records"), configuration.records);
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
         configuration.routes.push_back(READ_ROUTE(route, configuration.interfaces));

@@ -2,6 +2,7 @@
 
 #include "configuration/ConfigurationSection.h"
 #include "configuration/ControlOptions.h"
+#include "configuration/RecordOptions.h"
 #include "media/context/MediaOptions.h"
 
 #include <map>
@@ -42,6 +43,7 @@ struct Configuration
     bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
     MediaOptions media;
     ControlOptions control;
+    RecordOptions records;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
     std::set<std::string> interfaces;            ///< the names of all

@@ -101,6 +101,23 @@ TEST(Configuration, SaysWhereAndForWhomItListensForOperators)
                   "f: control.mode: must be an octal number from 000 to 777, as a text: \"0660\"");
 }
 
+TEST(Configuration, SaysWhereRecordsOfCallsGo)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    EXPECT_TRUE(Configuration::PARSE(interfaces, "f").records.file.empty()) << "nowhere, unless it is asked to";
+    RecordOptions const records =
+        Configuration::PARSE(
+            interfaces + "[records]\nfile = \"r\"\nnumbers = \"whole\"\nkept = 5\nwhen-full = \"refuse\"\n", "f")
+            .records;
+    EXPECT_EQ(records.file, "r");
+    EXPECT_TRUE(records.isWhole);
+    EXPECT_EQ(records.kept, 5u);
+    EXPECT_TRUE(records.refusesUnrecorded);
+    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nkept = 5\n"), "f: records.file: is missing");
+    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nfile = \"r\"\nwhen-full = \"x\"\n"),
+              "f: records.when-full: must be one of lose, refuse");
+}
+
 TEST(Configuration, EveryOtherTableIsAnInterfaceOfTheModuleOfItsName)
 {
     Configuration const configuration = Configuration::PARSE(TWO_INTERFACES, "f");

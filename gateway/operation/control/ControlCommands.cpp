@@ -208,6 +208,13 @@ ControlAnswer ControlCommands::stats(ControlRequest const& request)
     table.add("calls-made", pool.m_callsAdded);
     table.add("calls-ended", pool.m_callsRemoved);
     table.add("call-milliseconds", pool.m_callTime);
+    if (m_records != nullptr)
+    {
+        RecordWriter::Counters const records = m_records->getCounters();
+        table.add("records-written", records.written);
+        table.add("records-waiting", records.waiting);
+        table.add("records-lost", records.lost);
+    }
     return table.get();
 }
 

@@ -4,6 +4,7 @@
 #include "host/SignallingModule.h"
 #include "operation/control/ControlServer.h"
 #include "operation/record/CallWatch.h"
+#include "operation/record/RecordWriter.h"
 
 #include <map>
 #include <optional>
@@ -24,10 +25,17 @@ public:
 class ControlCommands : public ControlHandler
 {
 public:
-    /// All are the gateway's and outlive this. `interfaces`: the module of each.
+    /// All are the gateway's and outlive this. `interfaces`: the module of each. `records`: null
+    /// where none are written.
     ControlCommands(GatewayHost& host, SignallingModules const& modules,
-                    std::map<std::string, std::string> const& interfaces, CallWatch& watch, ControlledGateway& gateway)
-        : m_host(host), m_modules(modules), m_interfaces(interfaces), m_watch(watch), m_gateway(gateway)
+                    std::map<std::string, std::string> const& interfaces, CallWatch& watch, RecordWriter const* records,
+                    ControlledGateway& gateway)
+        : m_host(host)
+        , m_modules(modules)
+        , m_interfaces(interfaces)
+        , m_watch(watch)
+        , m_records(records)
+        , m_gateway(gateway)
     {
     }
 
@@ -60,6 +68,7 @@ private:
     SignallingModules const& m_modules;
     std::map<std::string, std::string> const& m_interfaces;
     CallWatch& m_watch;
+    RecordWriter const* m_records;
     ControlledGateway& m_gateway;
     TY::Time m_start = TY::Time::NOW(TY::Time::MONOTONIC);
 };
