@@ -7,6 +7,7 @@
 #include "callcontrol/provider/CC_Provider.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "configuration/ConfigurationChange.h"
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "host/MediaContexts.h"
@@ -188,10 +189,41 @@ void Gateway::onHangUp()
 {
     if (m_records != nullptr)
         m_records->reopen();
-    if (REOPEN_LOG())
-        spdlog::info("SIGHUP: the log is opened again; the configuration is not, since a change of it needs a restart");
-    else
+    if (!REOPEN_LOG())
         spdlog::error("SIGHUP: the log cannot be opened again and goes on where it was");
+    reload();
+}
+
+/// All or nothing: an operator who was refused knows that the gateway is as it was.
+std::string Gateway::reload()
+{
+    try
+    {
+        Configuration configuration = Configuration::READ(m_configuration.file);
+        if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
+            throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
+        follow(std::move(configuration));
+        spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
+        return {};
+    }
+    catch (ConfigurationError const& error)
+    {
+        spdlog::error("the configuration stays as it was: {}", error.what());
+        return error.what();
+    }
+}
+
+void Gateway::follow(Configuration configuration)
+{
+    configuration.isLogLevelFixed = m_configuration.isLogLevelFixed;
+    if (configuration.isLogLevelFixed)
+        configuration.logLevel = m_configuration.logLevel;
+    m_host.routing = Routing(configuration.routes);
+    m_host.admission.setLimits(configuration.maxCalls, configuration.maxCallsPerSecond,
+                               configuration.maxCallsPerSource);
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    SET_LOG_LEVELS(configuration.logLevel, configuration.callControlLogLevel);
+    m_configuration = std::move(configuration);
 }
 
 /// The first request lets the calls go on for a while, another one clears them at once.

@@ -71,10 +71,12 @@ private:
     void onHangUp();
     void openControl();
     void watchCalls();
+    void follow(Configuration configuration);
     std::string getState() const;
 
     // --- ControlledGateway
     void shutDown(std::optional<unsigned int> seconds) override;
+    std::string reload() override;
 
     Configuration m_configuration;
     TYEventLoop m_callControlLoop;

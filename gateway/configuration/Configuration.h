@@ -32,6 +32,7 @@ struct Configuration
     std::string file;
     std::string context;                   ///< the call-control context; empty: its default
     std::string logLevel = "info";         ///< of spdlog
+    bool isLogLevelFixed = false;          ///< the command line has said it
     std::string logFile;                   ///< empty: the standard error stream
     unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
     unsigned int maxHops = 0;              ///< that a call may take from here on; 0: no limit of our own

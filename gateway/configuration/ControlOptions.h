@@ -11,4 +11,6 @@ struct ControlOptions
     std::string group; ///< empty: that of the process
     unsigned int maxClients = 16;
     unsigned int idle = 60; ///< seconds after which a client that asks nothing is closed
+
+    friend bool operator==(ControlOptions const&, ControlOptions const&) = default;
 };

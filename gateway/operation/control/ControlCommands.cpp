@@ -94,6 +94,7 @@ ControlCommands::Command const* ControlCommands::FIND(std::string_view verb)
         Command{"unblock", "INTERFACE", "calls again", &This::unblock, 1, {}, false, true},
         Command{"drain", "", "no new calls; those that are up go on", &This::drain, 0, {}, false, true},
         Command{"resume", "", "new calls again", &This::resume, 0, {}, false, true},
+        Command{"reload", "", "follow a changed configuration", &This::reload, 0, {}, false, true},
         Command{"shutdown",
                 "[--graceful SECONDS]",
                 "end with the last call, or after that time",
@@ -259,6 +260,8 @@ ControlAnswer ControlCommands::resume(ControlRequest const&)
     m_host.isDraining = false;
     return {};
 }
+
+ControlAnswer ControlCommands::reload(ControlRequest const&) { return {{}, m_gateway.reload()}; }
 
 ControlAnswer ControlCommands::shutDown(ControlRequest const& request)
 {

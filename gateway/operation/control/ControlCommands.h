@@ -19,6 +19,8 @@ public:
     /// No new calls; those that are up may go on for that time, or the configured one. The second time it clears them
     /// at once.
     virtual void shutDown(std::optional<unsigned int> seconds) = 0;
+    /// Follows a changed configuration. Empty, or the reason why all stays as it was.
+    virtual std::string reload() = 0;
 };
 
 /// The commands of an operator's socket: docs/operation.md tells what each answers.
@@ -56,6 +58,7 @@ private:
     ControlAnswer unblock(ControlRequest const& request);
     ControlAnswer drain(ControlRequest const& request);
     ControlAnswer resume(ControlRequest const& request);
+    ControlAnswer reload(ControlRequest const& request);
     ControlAnswer shutDown(ControlRequest const& request);
     // ControlCommands_Calls.cpp
     ControlAnswer calls(ControlRequest const& request);
