@@ -102,6 +102,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
              false,
              [this] { stopIfIdle(); }}
     , m_freeMemory(m_callControlLoop)
+    , m_service(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
@@ -158,7 +159,11 @@ SignallingLoop& Gateway::findLoop(Modules const& modules)
     return *m_ownLoop;
 }
 
-void Gateway::run() { m_loop.run(); }
+void Gateway::run()
+{
+    m_service.tellReady();
+    m_loop.run();
+}
 
 void Gateway::onSignal()
 {
@@ -235,6 +240,7 @@ void Gateway::end(unsigned int patience)
         return;
     }
     m_host.isEnding = true;
+    m_service.tellStopping();
     spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(), patience);
     m_clearTimer.start(patience * 1000);
     stopIfIdle();

@@ -8,6 +8,7 @@
 #include "host/SignallingModule.h"
 #include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
+#include "operation/ServiceNotifier.h"
 #include "operation/StateDump.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
@@ -92,6 +93,7 @@ private:
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;
+    ServiceNotifier m_service;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
     Modules m_modules;
