@@ -128,7 +128,7 @@ ControlAnswer ControlCommands::answer(ControlRequest const& request, std::string
                     [&](auto const& option) { return command->options.contains(option.first); });
     if (request.arguments.size() != command->arguments || !areOptionsKnown)
         return FAILED(std::string("usage: ") + command->verb + " " + command->usage);
-    ControlAnswer const answer = (this->*command->answer)(request);
+    ControlAnswer answer = (this->*command->answer)(request);
     if (command->changesSomething)
         spdlog::info("control: {}{}{} asked for by {}: {}", request.verb, request.arguments.empty() ? "" : " ",
                      fmt::join(request.arguments, " "), user, answer.error.empty() ? "done" : answer.error);

@@ -6,7 +6,7 @@ MODULES=$3
 # refused LINE CONFIGURATION
 refused() {
     printf '%s' "$2" >"$WORK/gateway.toml"
-    "$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" --log-level debug >"$WORK/gateway.out" 2>"$WORK/gateway.err" && fail "served: $2"
+    "$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" >"$WORK/gateway.out" 2>"$WORK/gateway.err" && fail "served: $2"
     (($(wc -l <"$WORK/gateway.err") == 1)) || fail "more than one line"
     grep -qE "^callcontrol-gateway: $WORK/gateway.toml: $1$" "$WORK/gateway.err" || fail "the line does not match: $1"
 }
@@ -22,7 +22,7 @@ refused "others: needs the outermost loop, which another module has" \
     $'[[fakes]]\nname = "a"\nloop = 1\n[[others]]\nname = "b"\nloop = 1\n'
 
 printf '[gateway]\nclear-after = 0\n[[fakes]]\nname = "anna"\n[[fakes]]\nname = "bert"\n' >"$WORK/gateway.toml"
-"$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+"$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" --log-level debug >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
 gateway_pid=$!
 expect_log 'reload lock taken by Call-Control'
 kill -USR1 $gateway_pid
