@@ -7,11 +7,13 @@
 #include "callcontrol/provider/CC_Provider.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "configuration/ConfigurationChange.h"
 #include "diagnosis/CC_Explanation.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "host/MediaContexts.h"
 #include "media/context/CallMedia.h"
 #include "operation/Log.h"
+#include "operation/record/CallLine.h"
 #include "platform/eventloop/TYEvent.h"
 #include "recorder/CC_Recorder.h"
 
@@ -41,6 +43,16 @@ sigset_t HANDLED_SIGNALS()
 String CONTEXT_NAME(Configuration const& configuration)
 {
     return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
+}
+
+std::unique_ptr<RecordWriter> OPEN_RECORDS(Configuration const& configuration)
+try
+{
+    return configuration.records.file.empty() ? nullptr : std::make_unique<RecordWriter>(configuration.records);
+}
+catch (std::runtime_error const& error)
+{
+    throw ConfigurationError(configuration.file, "records.file", error.what());
 }
 } // namespace
 
@@ -77,6 +89,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
                                         : nullptr)
     , m_loop(findLoop(modules))
     , m_recording(configuration)
+    , m_records(OPEN_RECORDS(configuration))
     , m_callControl(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
     , m_host{m_loop,
              m_callControl.getContextName(),
@@ -89,19 +102,47 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
              false,
              [this] { stopIfIdle(); }}
     , m_freeMemory(m_callControlLoop)
+    , m_service(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_records.get(), *this)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
+    watchCalls();
     m_loop.attach(m_callControlLoop);
     m_loop.attach(m_datapathLoop);
     m_loop.watch(m_signals.get(), [this] { onSignal(); });
     for (auto const& [name, module] : m_modules)
         module->open(m_host);
+    openControl();
     if (m_media != nullptr)
         m_media->start();
+}
+
+void Gateway::watchCalls()
+{
+    m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
+    if (m_records != nullptr)
+        m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
+        m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
+    m_watch.watch(m_host.contextName);
+}
+
+void Gateway::openControl()
+{
+    if (m_configuration.control.path.empty())
+        return;
+    try
+    {
+        m_control = std::make_unique<ControlServer>(m_configuration.control, m_loop, m_callControlLoop, m_commands);
+    }
+    catch (std::runtime_error const& error)
+    {
+        throw ConfigurationError(m_configuration.file, "control.socket", error.what());
+    }
 }
 
 SignallingLoop& Gateway::findLoop(Modules const& modules)
@@ -118,7 +159,11 @@ SignallingLoop& Gateway::findLoop(Modules const& modules)
     return *m_ownLoop;
 }
 
-void Gateway::run() { m_loop.run(); }
+void Gateway::run()
+{
+    m_service.tellReady();
+    m_loop.run();
+}
 
 void Gateway::onSignal()
 {
@@ -131,6 +176,8 @@ void Gateway::onSignal()
             break;
         case SIGCHLD:
             m_dump.onChild();
+            if (m_control != nullptr)
+                m_control->onChild();
             break;
         case SIGHUP:
             onHangUp();
@@ -139,20 +186,53 @@ void Gateway::onSignal()
             spdlog::info("SIGUSR2 means nothing here");
             break;
         default:
-            end();
+            end(m_configuration.clearAfter);
         }
 }
 
 void Gateway::onHangUp()
 {
-    if (REOPEN_LOG())
-        spdlog::info("SIGHUP: the log is opened again; the configuration is not, since a change of it needs a restart");
-    else
+    if (m_records != nullptr)
+        m_records->reopen();
+    if (!REOPEN_LOG())
         spdlog::error("SIGHUP: the log cannot be opened again and goes on where it was");
+    reload();
+}
+
+/// All or nothing: an operator who was refused knows that the gateway is as it was.
+std::string Gateway::reload()
+{
+    try
+    {
+        Configuration configuration = Configuration::READ(m_configuration.file);
+        if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
+            throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
+        follow(std::move(configuration));
+        spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
+        return {};
+    }
+    catch (ConfigurationError const& error)
+    {
+        spdlog::error("the configuration stays as it was: {}", error.what());
+        return error.what();
+    }
+}
+
+void Gateway::follow(Configuration configuration)
+{
+    configuration.isLogLevelFixed = m_configuration.isLogLevelFixed;
+    if (configuration.isLogLevelFixed)
+        configuration.logLevel = m_configuration.logLevel;
+    m_host.routing = Routing(configuration.routes);
+    m_host.admission.setLimits(configuration.maxCalls, configuration.maxCallsPerSecond,
+                               configuration.maxCallsPerSource);
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    SET_LOG_LEVELS(configuration.logLevel, configuration.callControlLogLevel);
+    m_configuration = std::move(configuration);
 }
 
 /// The first request lets the calls go on for a while, another one clears them at once.
-void Gateway::end()
+void Gateway::end(unsigned int patience)
 {
     if (m_host.isEnding)
     {
@@ -160,11 +240,13 @@ void Gateway::end()
         return;
     }
     m_host.isEnding = true;
-    spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
-                 m_configuration.clearAfter);
-    m_clearTimer.start(m_configuration.clearAfter * 1000);
+    m_service.tellStopping();
+    spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(), patience);
+    m_clearTimer.start(patience * 1000);
     stopIfIdle();
 }
+
+void Gateway::shutDown(std::optional<unsigned int> seconds) { end(seconds.value_or(m_configuration.clearAfter)); }
 
 void Gateway::onClearTimer()
 {
@@ -178,6 +260,7 @@ void Gateway::clearCalls()
 {
     m_isClearing = true;
     spdlog::info("ending: {} calls are cleared", CallControl::GET_NUMBER_OF_CALLS());
+    m_watch.noteAllCleared();
     unsigned int wait = 0;
     for (auto const& [name, module] : m_modules)
         wait = std::max(wait, module->clearCalls(QCause::TEMPORARY_FAILURE));

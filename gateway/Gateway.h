@@ -8,12 +8,18 @@
 #include "host/SignallingModule.h"
 #include "media/context/MediaLayer.h"
 #include "operation/Recording.h"
+#include "operation/ServiceNotifier.h"
 #include "operation/StateDump.h"
+#include "operation/control/ControlCommands.h"
+#include "operation/control/ControlServer.h"
+#include "operation/record/CallWatch.h"
+#include "operation/record/RecordWriter.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 
 /// The gateway at work: call control and the signalling modules of a configuration, on the calling thread.
@@ -21,10 +27,10 @@
 ///     Gateway::BLOCK_SIGNALS();
 ///     Gateway gateway(configuration, std::move(modules), 1);
 ///     gateway.run(); // until SIGTERM or SIGINT and the end of the calls
-class Gateway
+class Gateway : private ControlledGateway
 {
 public:
-    using Modules = std::map<std::string, std::unique_ptr<SignallingModule>>; // by name
+    using Modules = SignallingModules;
 
     /// Opens all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
     /// ConfigurationError for an interface that cannot be opened.
@@ -58,13 +64,20 @@ private:
     SignallingLoop& findLoop(Modules const& modules);
     void openModules();
     void onSignal();
-    void end();
+    void end(unsigned int patience);
     void clearCalls();
     void onClearTimer();
     void stopIfIdle();
     bool hasEndpoints() const;
     void onHangUp();
+    void openControl();
+    void watchCalls();
+    void follow(Configuration configuration);
     std::string getState() const;
+
+    // --- ControlledGateway
+    void shutDown(std::optional<unsigned int> seconds) override;
+    std::string reload() override;
 
     Configuration m_configuration;
     TYEventLoop m_callControlLoop;
@@ -75,10 +88,15 @@ private:
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
+    std::unique_ptr<RecordWriter> m_records; // null where it is not configured
+    CallWatch m_watch;                       // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;
+    ServiceNotifier m_service;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
-    Modules m_modules; // they end first
+    Modules m_modules;
+    ControlCommands m_commands;
+    std::unique_ptr<ControlServer> m_control; // null where it is not configured; ends first
 };

@@ -92,7 +92,7 @@ peer = "$HOST:$((PORT + 3))"
 from = "a"
 to = "b"
 END
-"$gateway" --config "$WORK/gateway.toml" --trace-calls 1 >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+"$gateway" --config "$WORK/gateway.toml" --trace-calls 1 --log-level debug >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
 gateway_pid=$!
 pids+=($gateway_pid)
 for port in $PORT $((PORT + 2)); do

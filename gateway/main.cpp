@@ -22,8 +22,6 @@ constexpr int ALL_RIGHT = 0;
 constexpr int LEFT_OVERS = 1;   ///< or any other fault of ours
 constexpr int CANNOT_SERVE = 2; ///< the command line, the configuration or a port
 
-constexpr unsigned int CALL_CONTROL_MONITOR = 41;
-
 struct Arguments
 {
     std::string file;
@@ -86,7 +84,7 @@ int TELL_ROUTE(Configuration const& configuration, Arguments const& arguments)
 
 int RUN(Arguments const& arguments)
 {
-    Configuration const configuration = Configuration::READ(arguments.file);
+    Configuration configuration = Configuration::READ(arguments.file);
     if (!arguments.routed.empty())
         return TELL_ROUTE(configuration, arguments);
     Gateway::Modules modules;
@@ -98,13 +96,16 @@ int RUN(Arguments const& arguments)
         return ALL_RIGHT;
     }
     Gateway::BLOCK_SIGNALS();
-    if (!SET_UP_LOG(arguments.logLevel.empty() ? configuration.logLevel : arguments.logLevel, configuration.logFile))
+    configuration.isLogLevelFixed = !arguments.logLevel.empty();
+    if (configuration.isLogLevelFixed)
+        configuration.logLevel = arguments.logLevel;
+    if (!SET_UP_LOG(configuration.logLevel, configuration.logFile))
         throw ConfigurationError(arguments.file, "gateway.log-file", "the file cannot be opened");
     static Output output(STDOUT_FILENO);
     stdout = output.makeStream(); // whoever prints, for now and ever
     static MonitorWriter writer;
     RTD::REPOSITORY::SET_WRITER(&writer);
-    RTD::REPOSITORY::ENABLE(CALL_CONTROL_MONITOR, configuration.callControlLogLevel);
+    SET_LOG_LEVELS(configuration.logLevel, configuration.callControlLogLevel);
     return SERVE(configuration, std::move(modules), arguments.tracedCalls);
 }
 

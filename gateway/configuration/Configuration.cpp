@@ -1,5 +1,8 @@
 #include "configuration/Configuration.h"
 
+#include <algorithm>
+#include <array>
+#include <charconv>
 #include <fstream>
 #include <limits>
 
@@ -44,17 +47,59 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
 }
 
+/// Octal, as chmod has it.
+mode_t READ_MODE(ConfigurationSection const& section, mode_t fallback)
+{
+    std::string const text = section.text("mode", {});
+    if (text.empty())
+        return fallback;
+    unsigned int mode = 0;
+    auto const [stop, error] = std::from_chars(text.data(), text.data() + text.size(), mode, 8);
+    if (error != std::errc() || stop != text.data() + text.size() || mode > 0777)
+        section.refuse("mode", "must be an octal number from 000 to 777, as a text: \"0660\"");
+    return static_cast<mode_t>(mode);
+}
+
+void READ_CONTROL(ConfigurationSection const& section, ControlOptions& control)
+{
+    section.allow({"socket", "mode", "group", "max-clients", "idle"});
+    control.path = section.text("socket", {});
+    control.mode = READ_MODE(section, control.mode);
+    control.group = section.text("group", {});
+    control.maxClients = section.number("max-clients", control.maxClients, 1, 1000);
+    control.idle = section.number("idle", control.idle, 1, 86400);
+    if (control.path.empty() && !section.getKeys().empty())
+        section.refuse("socket", "is missing");
+}
+
+void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
+{
+    section.allow({"file", "numbers", "kept", "when-full"});
+    records.file = section.text("file", {});
+    records.isWhole = section.oneOf("numbers", "withheld", {"withheld", "whole"}) == "whole";
+    records.kept = section.number("kept", records.kept, 1, 1000000);
+    records.refusesUnrecorded = section.oneOf("when-full", "lose", {"lose", "refuse"}) == "refuse";
+    if (records.file.empty() && !section.getKeys().empty())
+        section.refuse("file", "is missing");
+}
+
+constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records"};
+
 /// Every table that is not the gateway's own is a module's.
 void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
 {
     for (std::string const& key : root.getKeys())
     {
-        if (key == "gateway" || key == "media" || key == "route")
+        if (std::find(OWN_TABLES.begin(), OWN_TABLES.end(), key) != OWN_TABLES.end())
             continue;
         std::vector<ConfigurationSection>& interfaces = configuration.modules[key] = root.sections(key);
         for (ConfigurationSection const& interface : interfaces)
-            if (std::string const name = interface.neededText("name"); !configuration.interfaces.insert(name).second)
+        {
+            std::string const name = interface.neededText("name");
+            if (!configuration.interfaces.insert(name).second)
                 interface.refuse("name", "'" + name + "' is taken by another interface");
+            configuration.moduleOf[name] = key;
+        }
     }
     if (configuration.interfaces.empty())
         throw ConfigurationError(configuration.file, "interfaces", "are missing: [[sip]] for one that speaks SIP");
@@ -91,6 +136,8 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     configuration.file = file;
     READ_GATEWAY(root.section("gateway"), configuration);
     READ_MEDIA(root.section("media"), configuration);
+    READ_CONTROL(root.section("control"), configuration.control);
+    READ_RECORDS(root.section("records"), configuration.records);
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
         configuration.routes.push_back(READ_ROUTE(route, configuration.interfaces));

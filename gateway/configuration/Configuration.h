@@ -1,6 +1,8 @@
 #pragma once
 
 #include "configuration/ConfigurationSection.h"
+#include "configuration/ControlOptions.h"
+#include "configuration/RecordOptions.h"
 #include "media/context/MediaOptions.h"
 
 #include <map>
@@ -30,6 +32,7 @@ struct Configuration
     std::string file;
     std::string context;                   ///< the call-control context; empty: its default
     std::string logLevel = "info";         ///< of spdlog
+    bool isLogLevelFixed = false;          ///< the command line has said it
     std::string logFile;                   ///< empty: the standard error stream
     unsigned int callControlLogLevel = 1;  ///< of the library's monitor, 0 to 5
     unsigned int maxHops = 0;              ///< that a call may take from here on; 0: no limit of our own
@@ -40,9 +43,12 @@ struct Configuration
     unsigned int recordingSize = 4194304;  ///< octets; 0: nothing is recorded
     bool relaysMedia = false;              ///< through ports of ours; else the peers exchange them directly
     MediaOptions media;
+    ControlOptions control;
+    RecordOptions records;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
-    std::set<std::string> interfaces; ///< the names of all
+    std::set<std::string> interfaces;            ///< the names of all
+    std::map<std::string, std::string> moduleOf; ///< by an interface's name, that of its module
     /// By the module's name, its interfaces. Each has a `name` that no other interface has.
     std::map<std::string, std::vector<ConfigurationSection>> modules;
 

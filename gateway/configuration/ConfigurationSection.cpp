@@ -63,6 +63,11 @@ void ConfigurationSection::allow(std::initializer_list<char const*> keys) const
 
 bool ConfigurationSection::has(char const* key) const { return m_table->keys.contains(key); }
 
+bool ConfigurationSection::hasSameValues(ConfigurationSection const& other) const
+{
+    return m_table->keys == other.m_table->keys;
+}
+
 std::vector<std::string> ConfigurationSection::getKeys() const
 {
     std::vector<std::string> keys;

@@ -36,6 +36,8 @@ public:
     void allow(std::initializer_list<char const*> keys) const;
 
     bool has(char const* key) const;
+    /// Whether the two have the same keys with the same values.
+    bool hasSameValues(ConfigurationSection const& other) const;
     std::vector<std::string> getKeys() const;
 
     std::string text(char const* key, std::string const& fallback) const;

@@ -3,6 +3,16 @@
 #include <algorithm>
 #include <utility>
 
+void Admission::setLimits(unsigned int maxCalls, unsigned int maxCallsPerSecond, unsigned int maxCallsPerSource)
+{
+    m_maxCalls = maxCalls;
+    m_perSource = maxCallsPerSource;
+    if (m_perSecond == 0) // nobody has counted until now
+        m_tokens = maxCallsPerSecond;
+    m_perSecond = maxCallsPerSecond;
+    m_tokens = std::min<double>(m_tokens, m_perSecond);
+}
+
 bool Admission::admit(unsigned int callsUp, InternetAddress const& source)
 {
     if (!hasRoom(callsUp))

@@ -25,6 +25,8 @@ public:
     {
     }
 
+    /// For calls that begin from now on. 0: no limit.
+    void setLimits(unsigned int maxCalls, unsigned int maxCallsPerSecond, unsigned int maxCallsPerSource);
     /// Whether the call may begin; one that may counts towards the rate. `callsUp`: without it.
     bool admit(unsigned int callsUp, InternetAddress const& source);
     /// Whether one could but for the rate and the source: for who asks and does not call.

@@ -7,6 +7,8 @@
 #include "platform/base/String.h"
 
 #include <functional>
+#include <set>
+#include <string>
 
 class SignallingLoop;
 
@@ -25,6 +27,17 @@ struct GatewayHost
     Counters counters{};
     unsigned int lastCallNumber = 0;        ///< in logs and traces; the next call takes the next one
     bool relaysMedia = false;               ///< through ports of ours
-    bool isEnding = false;                  ///< no new calls
+    bool isEnding = false;                  ///< no new calls, and the process ends with the last one
     std::function<void()> onEndpointGone{}; ///< to be told whenever an endpoint was destroyed; may be empty
+    bool isDraining = false;                ///< no new calls for now
+    std::function<bool()> mustRefuse{};     ///< no new calls as long as it says so; may be empty
+    std::set<std::string> blocked{};        ///< interfaces that an operator has taken out of service
+
+    /// Whether new calls may come in on that interface.
+    bool takesCallsFrom(std::string const& interface) const
+    {
+        return !isEnding && !isDraining && !isBlocked(interface) && (!mustRefuse || !mustRefuse());
+    }
+    /// Whether no new call may come in or leave there.
+    bool isBlocked(std::string const& interface) const { return blocked.contains(interface); }
 };

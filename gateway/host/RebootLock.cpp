@@ -5,7 +5,7 @@
 XCode RebootLock::addGracefulLock(String const& owner, String const& reason, int)
 {
     ++m_locks;
-    spdlog::info("reload lock taken by {}: {}", owner.view(), reason.view());
+    spdlog::debug("reload lock taken by {}: {}", owner.view(), reason.view());
     return XCode::OK;
 }
 
@@ -14,6 +14,6 @@ XCode RebootLock::releaseGracefulLock(String const& owner)
     if (m_locks == 0)
         return XCode::REFUSED;
     --m_locks;
-    spdlog::info("reload lock given back by {}", owner.view());
+    spdlog::debug("reload lock given back by {}", owner.view());
     return XCode::OK;
 }

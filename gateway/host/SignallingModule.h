@@ -3,6 +3,7 @@
 #include "platform/signalling/QCause.h"
 
 #include <cstddef>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -26,7 +27,7 @@ class SignallingModule
 {
 public:
     /// Changes whenever a module that was built before would not run any more.
-    static constexpr unsigned int VERSION = 1;
+    static constexpr unsigned int VERSION = 2;
 
     /// Ends what is still up without a word to the peers.
     virtual ~SignallingModule() = default;
@@ -43,7 +44,11 @@ public:
     virtual std::size_t getNumberOfEndpoints() const = 0;
     /// Lines for the gateway's dump, each with its line break.
     virtual std::string describe() const = 0;
+    /// Clears what it has in the call of that serial number with the cause; false: nothing.
+    virtual bool clearCall(unsigned long long serial, QCause cause) = 0;
 };
+
+using SignallingModules = std::map<std::string, std::unique_ptr<SignallingModule>>; ///< by name
 
 /// The entry of a module's shared object: its version, and a function that makes it of the configuration and the tables
 /// of its name, one an interface. That reads and checks them, throws ConfigurationError for what is wrong, and opens

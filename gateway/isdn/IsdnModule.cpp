@@ -16,9 +16,9 @@ std::string ROUTE(GatewayHost const& host, std::string const& from, std::string 
     return to != nullptr ? *to : std::string();
 }
 
-unsigned int BEGIN_CALL(GatewayHost& host)
+unsigned int BEGIN_CALL(GatewayHost& host, std::string const& from)
 {
-    if (host.isEnding || !host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS()))
+    if (!host.takesCallsFrom(from) || !host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS()))
     {
         ++host.counters.refused;
         return 0;
@@ -36,15 +36,16 @@ IsdnModule::IsdnModule(Configuration const&, std::vector<ConfigurationSection> c
 
 void IsdnModule::open(GatewayHost& host)
 {
-    m_environment.emplace(IsdnEnvironment{host.loop, host.contextName,
-                                          [&host](std::string const& from, std::string const& number)
-                                          { return ROUTE(host, from, number); },
-                                          [&host] { return BEGIN_CALL(host); }, host.counters, host.relaysMedia,
-                                          [&host]
-                                          {
-                                              if (host.onEndpointGone)
-                                                  host.onEndpointGone();
-                                          }});
+    m_environment.emplace(IsdnEnvironment{
+        host.loop, host.contextName,
+        [&host](std::string const& from, std::string const& number) { return ROUTE(host, from, number); },
+        [&host](std::string const& from) { return BEGIN_CALL(host, from); },
+        [&host](std::string const& interface) { return host.isBlocked(interface); }, host.counters, host.relaysMedia,
+        [&host]
+        {
+            if (host.onEndpointGone)
+                host.onEndpointGone();
+        }});
     for (IsdnConfiguration const& configuration : m_configurations)
     {
         m_ports.push_back(std::make_unique<Port>(*m_environment, configuration));
@@ -59,6 +60,14 @@ unsigned int IsdnModule::clearCalls(QCause cause)
     for (auto const& port : m_ports)
         port->interface.clearCalls(cause);
     return PATIENCE;
+}
+
+bool IsdnModule::clearCall(unsigned long long serial, QCause cause)
+{
+    bool isHere = false;
+    for (auto const& port : m_ports)
+        isHere |= port->interface.clearCall(serial, cause);
+    return isHere;
 }
 
 std::size_t IsdnModule::getNumberOfEndpoints() const

@@ -24,6 +24,7 @@ public:
     unsigned int clearCalls(QCause cause) override;
     std::size_t getNumberOfEndpoints() const override;
     std::string describe() const override;
+    bool clearCall(unsigned long long serial, QCause cause) override;
 
 private:
     struct Port

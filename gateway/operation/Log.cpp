@@ -11,6 +11,8 @@
 
 namespace
 {
+constexpr unsigned int CALL_CONTROL_MONITOR = 41;
+
 std::string s_file; // empty: the standard error stream
 
 Output& LOG_OUTPUT()
@@ -23,7 +25,7 @@ Output& LOG_OUTPUT()
 class OutputSink : public spdlog::sinks::base_sink<std::mutex>
 {
 public:
-    OutputSink() { set_pattern("%H:%M:%S.%e %l %v"); }
+    OutputSink() { set_pattern("%Y-%m-%dT%H:%M:%S.%e%z %l %v"); }
 
 private:
     void sink_it_(spdlog::details::log_msg const& message) override
@@ -49,6 +51,12 @@ bool SET_UP_LOG(std::string const& level, std::string const& file)
     logger->set_level(spdlog::level::from_str(level));
     spdlog::set_default_logger(logger);
     return s_file.empty() || REOPEN_LOG();
+}
+
+void SET_LOG_LEVELS(std::string const& level, unsigned int callControl)
+{
+    spdlog::set_level(spdlog::level::from_str(level));
+    RTD::REPOSITORY::ENABLE(CALL_CONTROL_MONITOR, callControl);
 }
 
 bool REOPEN_LOG() { return s_file.empty() || LOG_OUTPUT().open(s_file.c_str()); }

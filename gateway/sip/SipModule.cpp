@@ -46,6 +46,14 @@ unsigned int SipModule::clearCalls(QCause cause)
     return patience;
 }
 
+bool SipModule::clearCall(unsigned long long serial, QCause cause)
+{
+    bool isHere = false;
+    for (auto const& port : m_ports)
+        isHere |= port->interface.clearCall(serial, {cause, 0, {}});
+    return isHere;
+}
+
 std::size_t SipModule::getNumberOfEndpoints() const
 {
     std::size_t number = 0;

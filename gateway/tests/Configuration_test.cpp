@@ -82,6 +82,42 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.routes[0].to, "b");
 }
 
+TEST(Configuration, SaysWhereAndForWhomItListensForOperators)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    EXPECT_TRUE(Configuration::PARSE(interfaces, "f").control.path.empty()) << "nowhere, unless it is asked to";
+    Configuration const configuration = Configuration::PARSE(
+        interfaces + "[control]\nsocket = \"/run/c\"\nmode = \"0660\"\ngroup = \"g\"\nmax-clients = 3\nidle = 4\n",
+        "f");
+    EXPECT_EQ(configuration.control.path, "/run/c");
+    EXPECT_EQ(configuration.control.mode, 0660u);
+    EXPECT_EQ(configuration.control.group, "g");
+    EXPECT_EQ(configuration.control.maxClients, 3u);
+    EXPECT_EQ(configuration.control.idle, 4u);
+    EXPECT_EQ(configuration.moduleOf.at("b"), "isdn");
+    EXPECT_EQ(COMPLAINT(interfaces + "[control]\nmode = \"0660\"\n"), "f: control.socket: is missing");
+    for (char const* const mode : {"8", "1000", "rw", "6 "})
+        EXPECT_EQ(COMPLAINT(interfaces + "[control]\nsocket = \"c\"\nmode = \"" + mode + "\"\n"),
+                  "f: control.mode: must be an octal number from 000 to 777, as a text: \"0660\"");
+}
+
+TEST(Configuration, SaysWhereRecordsOfCallsGo)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    EXPECT_TRUE(Configuration::PARSE(interfaces, "f").records.file.empty()) << "nowhere, unless it is asked to";
+    RecordOptions const records =
+        Configuration::PARSE(
+            interfaces + "[records]\nfile = \"r\"\nnumbers = \"whole\"\nkept = 5\nwhen-full = \"refuse\"\n", "f")
+            .records;
+    EXPECT_EQ(records.file, "r");
+    EXPECT_TRUE(records.isWhole);
+    EXPECT_EQ(records.kept, 5u);
+    EXPECT_TRUE(records.refusesUnrecorded);
+    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nkept = 5\n"), "f: records.file: is missing");
+    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nfile = \"r\"\nwhen-full = \"x\"\n"),
+              "f: records.when-full: must be one of lose, refuse");
+}
+
 TEST(Configuration, EveryOtherTableIsAnInterfaceOfTheModuleOfItsName)
 {
     Configuration const configuration = Configuration::PARSE(TWO_INTERFACES, "f");

@@ -83,10 +83,11 @@ last-port = $((PORT + 39))
 END
 }
 
-# start_gateway [ARGUMENT]...: with the configuration written before; the first call, or as many as TRACED says, is traced.
+# start_gateway [ARGUMENT]...: with the configuration written before; the first call, or as many as TRACED says, is traced,
+# and the log is that of LOG_LEVEL.
 start_gateway() {
     [[ -f $WORK/gateway.toml ]] || write_configuration
-    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls "${TRACED:-1}" "$@" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls "${TRACED:-1}" --log-level "${LOG_LEVEL:-debug}" "$@" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
     gateway_pid=$!
     local port transport
     for port in $PORT_A $PORT_B; do

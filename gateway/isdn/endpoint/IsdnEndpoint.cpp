@@ -1,6 +1,7 @@
 #include "isdn/endpoint/IsdnEndpoint.h"
 
 #include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
 #include "isdn/element/IsdnCause.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
 #include "properties/CC_Cause.h"
@@ -169,6 +170,12 @@ void IsdnEndpoint::loseCall()
     leaveCall(QCause::NORMAL_UNSPECIFIED);
 }
 
+bool IsdnEndpoint::isInCall(unsigned long long serial) const
+{
+    CC_Call const* const call = m_isInCall ? m_adapter.getCall() : nullptr;
+    return call != nullptr && call->getSerial() == serial;
+}
+
 void IsdnEndpoint::clear(QCause cause)
 {
     endWire(cause);
@@ -222,11 +229,11 @@ void IsdnEndpoint::leaveCall(QCause cause)
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
     if (m_isCalling)
-        spdlog::info("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
-                     m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+        spdlog::debug("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
+                      m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
     else // who dialled knows its number
-        spdlog::info("{} (called side, timeslot {}) released: cause {} ({})", getName().view(), m_timeslot,
-                     static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+        spdlog::debug("{} (called side, timeslot {}) released: cause {} ({})", getName().view(), m_timeslot,
+                      static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
     finishIfDone();
 }
 

@@ -41,6 +41,7 @@ public:
     void receiveSetup(pri_event_ring& ring);
     /// What came for it.
     void onEvent(pri_event& event);
+    bool isInCall(unsigned long long serial) const;
     /// Clears the call for a reason of the gateway's own.
     void clear(QCause cause);
 

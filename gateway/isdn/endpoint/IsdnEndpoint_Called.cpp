@@ -52,7 +52,9 @@ XCode IsdnEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCo
     addCodecs(m_own);
     if (!m_own.isEmpty())
         std::ignore = m_adapter.setOwnProperties(m_own);
-    if (!m_interface.getLink().isUp())
+    if (m_interface.getEnvironment().isBlocked(m_interface.getConfiguration().name))
+        clear(QCause::TEMPORARY_FAILURE);
+    else if (!m_interface.getLink().isUp())
         clear(QCause::NETWORK_OUT_OF_ORDER);
     else if (m_timeslot = m_interface.getChannels().take(); m_timeslot == IsdnChannels::NONE)
         clear(QCause::NO_CIRCUIT_CHANNEL_AVAILABLE);

@@ -14,8 +14,10 @@ struct IsdnEnvironment
     String contextName; ///< of call control
     /// The provider that carries a call of that interface to that number; empty: none.
     std::function<std::string(std::string const& from, std::string const& number)> route;
-    /// A new call from a line: its number; 0: it is not admitted.
-    std::function<unsigned int()> beginCall;
+    /// A new call from that interface: its number; 0: it is not admitted.
+    std::function<unsigned int(std::string const& from)> beginCall;
+    /// Whether that interface is out of service.
+    std::function<bool(std::string const& interface)> isBlocked;
     Counters& counters;
     bool relaysMedia = false;               ///< there is a media layer
     std::function<void()> onEndpointGone{}; ///< told when an endpoint was destroyed; may be empty

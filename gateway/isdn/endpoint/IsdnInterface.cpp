@@ -129,7 +129,7 @@ void IsdnInterface::onLinkEvent(pri_event& event)
 
 void IsdnInterface::onRing(pri_event_ring& ring)
 {
-    unsigned int const callNumber = m_environment.beginCall();
+    unsigned int const callNumber = m_environment.beginCall(m_configuration.name);
     if (callNumber == 0)
     {
         refuseNew(ring, QCause::SWITCHING_EQUIPMENT_CONGESTION);
@@ -184,6 +184,18 @@ void IsdnInterface::clearCalls(QCause cause)
 {
     for (auto const& [endpoint, owned] : m_endpoints)
         endpoint->clear(cause);
+}
+
+bool IsdnInterface::clearCall(unsigned long long serial, QCause cause)
+{
+    bool isHere = false;
+    for (auto const& [endpoint, owned] : m_endpoints)
+        if (endpoint->isInCall(serial))
+        {
+            endpoint->clear(cause);
+            isHere = true;
+        }
+    return isHere;
 }
 
 IsdnEndpoint& IsdnInterface::makeEndpoint(unsigned int callNumber)

@@ -56,6 +56,8 @@ public:
     bool yieldChannel(unsigned int timeslot);
     /// Clears every call of this interface.
     void clearCalls(QCause cause);
+    /// Those of one call alone; false: there are none.
+    bool clearCall(unsigned long long serial, QCause cause);
     /// The endpoint is done; it is destroyed in the loop's next turn.
     void finish(IsdnEndpoint& endpoint);
 

@@ -14,4 +14,6 @@ struct MediaOptions
     unsigned int reportInterval = 5000; ///< milliseconds between two RTCP reports
     std::string country = "de";         ///< whose tones are played
     std::string tones;                  ///< where they are written (ToneTable); empty: the built-in ten countries
+
+    friend bool operator==(MediaOptions const&, MediaOptions const&) = default;
 };

@@ -1,11 +1,13 @@
 #include "sip/endpoint/SipEndpoint.h"
 
 #include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyParametrizedString.h"
 #include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyString.h"
 #include "services/CC_ServiceBlindTransfer.h"
@@ -167,6 +169,12 @@ void SipEndpoint::onPeerReleased()
     leaveCall(cause);
 }
 
+bool SipEndpoint::isInCall(unsigned long long serial) const
+{
+    CC_Call const* const call = m_isInCall ? m_adapter.getCall() : nullptr;
+    return call != nullptr && call->getSerial() == serial;
+}
+
 void SipEndpoint::clear(SipCause const& cause)
 {
     try
@@ -206,9 +214,9 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         Counters& counters = m_interface.getEnvironment().host.counters;
         ++(m_wasAnswered ? counters.cleared : counters.failed);
     }
-    spdlog::info("call {} {} ({} side) released: cause {} ({}), SIP {}{}{}{}", m_callNumber, getName().view(),
-                 m_isCalling ? "calling" : "called", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
-                 cause.sipCode, cause.text.empty() ? "" : ", \"", cause.text, cause.text.empty() ? "" : "\"");
+    spdlog::debug("call {} {} ({} side) released: cause {} ({}), SIP {}{}{}{}", m_callNumber, getName().view(),
+                  m_isCalling ? "calling" : "called", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
+                  cause.sipCode, cause.text.empty() ? "" : ", \"", cause.text, cause.text.empty() ? "" : "\"");
     finishIfDone();
 }
 
@@ -219,6 +227,7 @@ bool SipEndpoint::sayWhy(SipCause const& cause)
     {
         recordQuality();
         CC_PropertyContainer last;
+        addCallId(last);
         bool const isWritten = last.set(cause.getProperty()).isOk() && writeOwn(last).isOk();
         if (isTraced())
             trace("did  drop, State=RELEASED");
@@ -228,6 +237,18 @@ bool SipEndpoint::sayWhy(SipCause const& cause)
     {
         return false;
     }
+}
+
+/// For the call's record.
+void SipEndpoint::addCallId(CC_PropertyContainer& own) const
+{
+    SipHome const home(su_home_create());
+    sip_replaces_t const* const dialog = m_leg != nullptr ? nta_leg_make_replaces(m_leg, home.get(), 0) : nullptr;
+    if (dialog == nullptr)
+        return;
+    CC_PropertyParametrizedString id(CC_PropertyId::UNIQUE_IDENTIFIER);
+    id.setContent(0, CC_PropertyParametrizedString::ParametrizedString(String(std::string_view(dialog->rp_call_id))));
+    std::ignore = own.set(id);
 }
 
 /// While the leg is still in the call, so that the other side sees it.

@@ -54,6 +54,7 @@ public:
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
+    bool isInCall(unsigned long long serial) const;
     /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
 
@@ -240,6 +241,7 @@ private:
     SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
+    void addCallId(CC_PropertyContainer& own) const;
     void onPeerReleased();
     void finishIfDone();
     XCode writeOwn(CC_PropertyContainer const& properties);

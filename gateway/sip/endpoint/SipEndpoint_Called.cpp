@@ -78,7 +78,8 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
     m_hadPeer = true;
     if (isTraced())
         trace("did  accept as " + called.getText() + ", State=TRYING");
-    if (m_interface.isPeerBusy())
+    bool const isOutOfService = m_interface.getEnvironment().host.isBlocked(m_interface.getConfiguration().name);
+    if (isOutOfService || m_interface.isPeerBusy())
         clear({QCause::TEMPORARY_FAILURE, 503, {}});
     else if (!m_session.open())
         clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});

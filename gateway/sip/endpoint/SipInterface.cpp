@@ -167,8 +167,8 @@ int SipInterface::refuseMethod(nta_incoming_t* transaction, sip_t const* request
 /// As an INVITE would be answered: who asks wants to know whether to send calls.
 int SipInterface::answerOptions(nta_incoming_t* transaction) const
 {
-    bool const hasRoom =
-        !m_environment.host.isEnding && m_environment.host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS());
+    bool const hasRoom = m_environment.host.takesCallsFrom(m_configuration.name) &&
+                         m_environment.host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS());
     if (!hasRoom)
         nta_incoming_treply(transaction, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
                             TAG_END());
@@ -258,11 +258,12 @@ int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request)
 
 bool SipInterface::admits(InternetAddress const& source)
 {
-    if (!m_environment.host.isEnding && m_environment.host.admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
+    if (m_environment.host.takesCallsFrom(m_configuration.name) &&
+        m_environment.host.admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
         return true;
     ++m_environment.host.counters.refused;
     spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
-                  m_environment.host.isEnding ? "the gateway is ending" : "too many calls");
+                  m_environment.host.takesCallsFrom(m_configuration.name) ? "too many calls" : "none are taken now");
     return false;
 }
 
@@ -287,6 +288,18 @@ void SipInterface::clearCalls(SipCause const& cause)
 {
     for (auto const& [endpoint, owned] : m_endpoints)
         endpoint->clear(cause);
+}
+
+bool SipInterface::clearCall(unsigned long long serial, SipCause const& cause)
+{
+    bool isHere = false;
+    for (auto const& [endpoint, owned] : m_endpoints)
+        if (endpoint->isInCall(serial))
+        {
+            endpoint->clear(cause);
+            isHere = true;
+        }
+    return isHere;
 }
 
 SipEndpoint& SipInterface::makeEndpoint(unsigned int callNumber, InternetAddress const* source)

@@ -74,6 +74,8 @@ public:
     bool isPeerBusy() const;
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
+    /// Clears those of one call alone; false: there are none.
+    bool clearCall(unsigned long long serial, SipCause const& cause);
     /// The endpoint is done; it is destroyed in the loop's next turn.
     void finish(SipEndpoint& endpoint);
 

@@ -170,7 +170,7 @@ TEST_F(IsdnCallingTest, ThePreferredChannelIsTakenAnotherIfItIsNotFree)
 
 TEST_F(IsdnCallingTest, ACallThatIsNotAdmittedIsRefused)
 {
-    environment.beginCall = [] { return 0u; };
+    environment.beginCall = [](std::string const&) { return 0u; };
     open();
     side->call("4989123");
     EXPECT_TRUE(watch.runUntil([&] { return side->has("HANGUP 42") || side->has("HANGUP_REQ 42"); }));

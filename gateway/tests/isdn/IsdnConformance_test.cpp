@@ -221,9 +221,12 @@ private:
     AsideLoop m_aside{m_loop};
     unsigned int m_lastCall = 0;
     Counters m_counters;
-    IsdnEnvironment m_environment{m_loop, "SWITCH",
+    IsdnEnvironment m_environment{m_loop,
+                                  "SWITCH",
                                   [](std::string const&, std::string const&) { return std::string(PEER); },
-                                  [this] { return ++m_lastCall; }, m_counters};
+                                  [this](std::string const&) { return ++m_lastCall; },
+                                  [](std::string const&) { return false; },
+                                  m_counters};
     std::unique_ptr<IsdnSocketLine> m_near, m_far;
     std::unique_ptr<IsdnInterface> m_interface;
     std::unique_ptr<IsdnLink> m_link;

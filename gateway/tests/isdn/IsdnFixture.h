@@ -71,10 +71,13 @@ struct IsdnFixture : testing::Test, CallControlFixture
     std::string provider = "other";
     unsigned int calls = 0;
     Counters counters;
-    IsdnEnvironment environment{watch, "SWITCH",
+    IsdnEnvironment environment{watch,
+                                "SWITCH",
                                 [this](std::string const&, std::string const& number)
                                 { return number.size() >= 4 ? provider : std::string(); },
-                                [this] { return ++calls; }, counters};
+                                [this](std::string const&) { return ++calls; },
+                                [](std::string const&) { return false; },
+                                counters};
     IsdnConfiguration configuration;
     IsdnLink::Options farOptions;
     std::unique_ptr<IsdnSocketLine> near, far;

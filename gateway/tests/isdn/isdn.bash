@@ -66,7 +66,7 @@ start_exchange() {
 
 # start_isdn_gateway: with the line up
 start_isdn_gateway() {
-    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls 1 >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+    "$GATEWAY" --config "$WORK/gateway.toml" --trace-calls 1 --log-level debug >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
     gateway_pid=$!
     wait_for_port $gateway_pid "$PORT_A" udp || fail "the gateway does not listen"
     expect_log 'interface b: the link is up'

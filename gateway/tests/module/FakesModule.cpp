@@ -1,5 +1,6 @@
 // A signalling module of a third party: one line an interface. The first one calls the second one, which answers.
 #include "callcontrol/CallControl.h"
+#include "calls/CC_Call.h"
 #include "configuration/ConfigurationSection.h"
 #include "host/EpollLoop.h"
 #include "host/GatewayHost.h"
@@ -48,6 +49,17 @@ public:
         for (auto const& line : m_lines)
             number += line->getCall() != nullptr ? 1 : 0;
         return number;
+    }
+    bool clearCall(unsigned long long serial, QCause cause) override
+    {
+        bool isHere = false;
+        for (auto const& line : m_lines)
+            if (line->getCall() != nullptr && line->getCall()->getSerial() == serial)
+            {
+                line->hangUp(cause);
+                isHere = true;
+            }
+        return isHere;
     }
     std::string describe() const override
     {

@@ -13,7 +13,7 @@ refused() {
 
 refused "ghost: is not a key, and there is no module $MODULES/callcontrol-gateway-ghost.so" $'[[ghost]]\nname = "a"\n'
 refused "\.\./fakes: is neither a key nor the name of a module" $'[["../fakes"]]\nname = "a"\n'
-refused "old: $MODULES/callcontrol-gateway-old.so is a module of version 0, this gateway's are of version 1" \
+refused "old: $MODULES/callcontrol-gateway-old.so is a module of version 0, this gateway's are of version 2" \
     $'[[old]]\nname = "a"\n'
 refused "text: $MODULES/callcontrol-gateway-text.so: (file too short|invalid ELF header)" $'[[text]]\nname = "a"\n'
 refused "empty: $MODULES/callcontrol-gateway-empty.so is no module of a gateway" $'[[empty]]\nname = "a"\n'
@@ -22,7 +22,7 @@ refused "others: needs the outermost loop, which another module has" \
     $'[[fakes]]\nname = "a"\nloop = 1\n[[others]]\nname = "b"\nloop = 1\n'
 
 printf '[gateway]\nclear-after = 0\n[[fakes]]\nname = "anna"\n[[fakes]]\nname = "bert"\n' >"$WORK/gateway.toml"
-"$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
+"$GATEWAY" --config "$WORK/gateway.toml" --modules "$MODULES" --log-level debug >"$WORK/gateway.out" 2>"$WORK/gateway.err" &
 gateway_pid=$!
 expect_log 'reload lock taken by Call-Control'
 kill -USR1 $gateway_pid

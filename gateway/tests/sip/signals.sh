@@ -33,7 +33,7 @@ in_log "$WORK/gateway.log" "SIGUSR2 means nothing here"
 mv "$WORK/gateway.log" "$WORK/old.log"
 kill -HUP $gateway_pid
 kill -USR1 $gateway_pid
-in_log "$WORK/gateway.log" "SIGHUP: the log is opened again; the configuration is not"
+in_log "$WORK/gateway.log" "the configuration is read again: 2 routes"
 expect_trace "^state: 1 calls up"
 expect_trace "^counters: "
 wait "${background[0]}" || fail "the call did not go on"

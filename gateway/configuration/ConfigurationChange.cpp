@@ -1,0 +1,45 @@
+#include "configuration/ConfigurationChange.h"
+
+#include "configuration/Configuration.h"
+
+#include <algorithm>
+
+namespace
+{
+bool ARE_SAME(std::vector<ConfigurationSection> const& before, std::vector<ConfigurationSection> const& after)
+{
+    return std::equal(before.begin(), before.end(), after.begin(), after.end(),
+                      [](ConfigurationSection const& one, ConfigurationSection const& other)
+                      { return one.hasSameValues(other); });
+}
+
+/// The first module of `before` that is another in `after`, or is not there; empty: none.
+std::string FIND_MODULE(Configuration const& before, Configuration const& after)
+{
+    for (auto const& [name, interfaces] : before.modules)
+        if (auto const found = after.modules.find(name);
+            found == after.modules.end() || !ARE_SAME(interfaces, found->second))
+            return name;
+    return {};
+}
+} // namespace
+
+std::string ConfigurationChange::FIND_RESTART(Configuration const& before, Configuration const& after)
+{
+    if (before.context != after.context)
+        return "gateway.context";
+    if (before.logFile != after.logFile)
+        return "gateway.log-file";
+    if (before.recording != after.recording)
+        return "gateway.recording";
+    if (before.recordingSize != after.recordingSize)
+        return "gateway.recording-size";
+    if (before.relaysMedia != after.relaysMedia || before.media != after.media)
+        return "media";
+    if (before.control != after.control)
+        return "control";
+    if (before.records != after.records)
+        return "records";
+    std::string const changed = FIND_MODULE(before, after);
+    return changed.empty() ? FIND_MODULE(after, before) : changed;
+}
