@@ -79,6 +79,29 @@ void READ_CODECS(ConfigurationSection const& section, SipConfiguration& interfac
         section.refuse("codecs", "may have " + std::to_string(MediaFormats::MOST) + " of them");
 }
 
+/// As whom, and with what password, it calls a peer that asks.
+void READ_CREDENTIALS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.user = section.text("user", {});
+    if (section.has("passwords"))
+        try
+        {
+            interface.passwords = SipPasswords::READ(section.neededText("passwords"));
+        }
+        catch (std::invalid_argument const& error)
+        {
+            section.refuse("passwords", error.what());
+        }
+    if (interface.user.empty() && interface.passwords != nullptr)
+        section.refuse("passwords", "are nobody's: user is needed");
+    if (interface.user.empty())
+        return;
+    if (interface.passwords == nullptr)
+        section.refuse("user", "has no password: passwords is needed");
+    if (!interface.passwords->hasUser(interface.user))
+        section.refuse("user", "'" + interface.user + "' is not in the file of passwords");
+}
+
 void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
 {
     try
@@ -99,6 +122,8 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "listen",
                    "advertise",
                    "peer",
+                   "user",
+                   "passwords",
                    "transport",
                    "transports",
                    "allow",
@@ -123,6 +148,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
     READ_TRANSPORTS(section, interface);
+    READ_CREDENTIALS(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =
         section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);

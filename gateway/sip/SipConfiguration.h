@@ -3,8 +3,10 @@
 #include "configuration/AddressRange.h"
 #include "configuration/SocketAddress.h"
 #include "platform/media/MG_Rtp.h"
+#include "sip/access/SipPasswords.h"
 #include "sip/dialog/SipStream.h"
 
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -32,7 +34,9 @@ struct SipConfiguration
     unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
-    std::string mediaAddress;           ///< of this machine, where media come in; no name
+    std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
+    std::shared_ptr<SipPasswords const> passwords; ///< with a user: never null
+    std::string mediaAddress;                      ///< of this machine, where media come in; no name
     /// That are offered and taken where media are relayed, the best liked first.
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};

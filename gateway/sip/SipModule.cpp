@@ -63,6 +63,10 @@ std::string SipModule::describe() const
         text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
                             port->interface.getName().view(), guard.getCounters().strangers,
                             guard.getCounters().tooLarge, guard.getConnections().getNumberOfRefused());
+        if (SipCredentials const* const credentials = port->interface.getSender().getCredentials())
+            text += fmt::format("interface {}: {} challenges answered, {} credentials not taken\n",
+                                port->interface.getName().view(), credentials->getCounters().answered,
+                                credentials->getCounters().refused);
     }
     return text;
 }

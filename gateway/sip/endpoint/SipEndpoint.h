@@ -155,6 +155,7 @@ private:
     void refuseOffer(unsigned int status);
     bool isAwaitingAck() const;
     void sendWaitingOffer();
+    nta_leg_t* getOfferLeg() const;
     void startOffer(std::string const& description, bool isQuick);
     static int HANDLE_OFFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onOfferResponse(unsigned int status, sip_t const* response);
@@ -237,6 +238,7 @@ private:
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void endDialog(SipCause const& cause);
+    bool authenticate(nta_outgoing_t*& request, sip_t const* response, nta_leg_t* leg, nta_response_f* onResponse);
     SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
@@ -273,6 +275,7 @@ private:
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isOverTcp = false;              // the dialog: where its Contact points
+    unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;

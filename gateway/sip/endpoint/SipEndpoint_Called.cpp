@@ -122,8 +122,8 @@ bool SipEndpoint::startInvite()
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
-    m_invite.transaction = nta_outgoing_tcreate(
-        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
+    m_invite.transaction = m_interface.getSender().send(
+        m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
@@ -235,6 +235,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::takeAnswer(sip_t const* response)
 {
     m_wasAnswered = true;
+    m_challenges = 0;
     m_timer.start(std::max(m_interface.getConfiguration().t1x64, LONGEST_REPETITION));
     noteAllow(response);
     takeTimerOfAnswer(response);
@@ -276,6 +277,12 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         m_negotiation.fail();
         if (!startInvite())
             clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
+        return;
+    }
+    if (m_dialog == SipDialogState::INVITE_SENT &&
+        authenticate(m_invite.transaction, response, m_leg, HANDLE_INVITE_RESPONSE))
+    {
+        m_invite.sequence = nta_leg_get_seq(m_leg);
         return;
     }
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
@@ -348,11 +355,9 @@ bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
     noteAllow(response);
     std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
     trace("-> PRACK");
-    nta_outgoing_t* const prack = nta_outgoing_tcreate(fork.leg, nullptr, nullptr, nullptr, SIP_METHOD_PRACK, nullptr,
-                                                       SIPTAG_RACK_STR(acknowledged.c_str()), TAG_END());
-    if (prack == nullptr)
+    if (!m_interface.getSender().sendAlone(fork.leg, SIP_METHOD_PRACK, SIPTAG_RACK_STR(acknowledged.c_str()),
+                                           TAG_END()))
         return false;
-    nta_outgoing_destroy(prack); // the stack goes on by itself
     fork.sequence = sequence;
     return true;
 }
@@ -384,13 +389,10 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
         m_lateAck = nullptr;
     if (hasSession)
         m_ownSession = sessionDescription;
-    // given up at once: the stack keeps it for its time, not for as long as the call; a repeated answer gets another
-    nta_outgoing_t* const ack = nta_outgoing_tcreate(
-        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
-        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
-    if (ack != nullptr)
-        nta_outgoing_destroy(ack);
+    // the stack keeps it for its time, not for as long as the call; a repeated answer gets another
+    m_interface.getSender().acknowledge(m_leg, invitation.transaction, SIPTAG_CSEQ_STR(sequence.c_str()),
+                                        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+                                        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
 }
 
 void SipEndpoint::cancel(SipCause const& cause)

@@ -39,6 +39,13 @@ InternetAddress SOURCE_OF(nta_incoming_t* transaction)
     msg_destroy(message);
     return source;
 }
+
+std::optional<SipCredentials> CREDENTIALS_OF(SipConfiguration const& configuration)
+{
+    if (configuration.user.empty())
+        return std::nullopt;
+    return SipCredentials(configuration.name, configuration.user, configuration.passwords);
+}
 } // namespace
 
 SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& configuration)
@@ -56,6 +63,7 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
+    , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
 {
     environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);

@@ -4,6 +4,7 @@
 #include "platform/base/IpAddress.h"
 #include "platform/base/TYTime.h"
 #include "sip/SipConfiguration.h"
+#include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/stack/SipGuard.h"
@@ -57,6 +58,8 @@ public:
     sip_allow_t const* getAllow() const { return m_allow; }
     sip_supported_t const* getSupported() const { return m_supported; }
     /// @}
+    SipSender& getSender() { return m_sender; }
+    SipSender const& getSender() const { return m_sender; }
     SipGuard const& getGuard() const { return m_guard; }
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
@@ -103,6 +106,7 @@ private:
     sip_supported_t* m_supported;
     SipGuard m_guard;
     SipAgent m_agent;
+    SipSender m_sender;
 
     TYEvent* m_cleanUpEvent = nullptr;
     struct Owned

@@ -27,6 +27,21 @@ bad "gateway.max-calls: expected a whole number" 's/^call-control-log-level.*/ma
 bad "gateway.max-calls: must be from 0 to " 's/^call-control-log-level.*/max-calls = -1/'
 bad "sip\[1\].listen: 'localhost' is not an address" "s/listen = \"$HOST:$PORT_B\"/listen = \"localhost:5060\"/"
 bad "sip\[0\].peer: is missing" "/peer = \"$HOST:$PORT_CALLER\"/d"
+# what is shown to a peer that asks
+passwords() { # KEYS [MODE]
+    echo "s/name = \"b\"/name = \"b\"\n$1/"
+    printf 'alice:office:secret\n%s' "${3:-}" >"$WORK/passwords"
+    chmod "${2:-600}" "$WORK/passwords"
+}
+FILE=${WORK//\//\\\/}\\\/passwords
+bad "sip\[1\].user: has no password: passwords is needed" "$(passwords 'user = "alice"')"
+bad "sip\[1\].passwords: are nobody's: user is needed" "$(passwords "passwords = \"$FILE\"")"
+bad "sip\[1\].user: 'bob' is not in the file of passwords" "$(passwords "user = \"bob\"\npasswords = \"$FILE\"")"
+bad "sip\[1\].passwords: $WORK/passwords: everybody may read or change it" \
+    "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 644)"
+bad "sip\[1\].passwords: $WORK/passwords: line 2 is not of the form user:realm:password" \
+    "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 600 secret)"
+bad "sip\[1\].passwords: $WORK/no: cannot be read" "$(passwords "user = \"alice\"\npasswords = \"${FILE%passwords}no\"")"
 bad "sip\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
 bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
 bad "line 2: " '2s/.*/call = = 3/'
