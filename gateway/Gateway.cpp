@@ -160,6 +160,8 @@ void Gateway::end()
         return;
     }
     m_host.isEnding = true;
+    for (auto const& onEnding : m_host.onEnding)
+        onEnding();
     spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(),
                  m_configuration.clearAfter);
     m_clearTimer.start(m_configuration.clearAfter * 1000);

@@ -7,6 +7,7 @@
 #include "platform/base/String.h"
 
 #include <functional>
+#include <vector>
 
 class SignallingLoop;
 
@@ -23,8 +24,9 @@ struct GatewayHost
     Admission admission;
     CallTrace trace;
     Counters counters{};
-    unsigned int lastCallNumber = 0;        ///< in logs and traces; the next call takes the next one
-    bool relaysMedia = false;               ///< through ports of ours
-    bool isEnding = false;                  ///< no new calls
-    std::function<void()> onEndpointGone{}; ///< to be told whenever an endpoint was destroyed; may be empty
+    unsigned int lastCallNumber = 0;               ///< in logs and traces; the next call takes the next one
+    bool relaysMedia = false;                      ///< through ports of ours
+    bool isEnding = false;                         ///< no new calls
+    std::function<void()> onEndpointGone{};        ///< to be told whenever an endpoint was destroyed; may be empty
+    std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
 };

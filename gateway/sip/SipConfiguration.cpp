@@ -102,6 +102,19 @@ void READ_CREDENTIALS(ConfigurationSection const& section, SipConfiguration& int
         section.refuse("user", "'" + interface.user + "' is not in the file of passwords");
 }
 
+/// Whether, and how, it tells its peer where it is.
+void READ_REGISTRATION(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.registers = section.flag("register");
+    interface.domain = section.text("domain", interface.peer.text());
+    if (interface.domain.empty() || interface.domain.find_first_of(" <>@;?\"/") != std::string::npos)
+        section.refuse("domain", "is no name of a host");
+    interface.registerExpires = section.number("register-expires", interface.registerExpires, 1, 86400);
+    interface.registerRetry = section.number("register-retry", interface.registerRetry, 1, 1800);
+    if (interface.registers && interface.user.empty())
+        section.refuse("register", "as whom? user is needed");
+}
+
 void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
 {
     try
@@ -124,6 +137,10 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "peer",
                    "user",
                    "passwords",
+                   "register",
+                   "domain",
+                   "register-expires",
+                   "register-retry",
                    "transport",
                    "transports",
                    "allow",
@@ -149,6 +166,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_ADDRESSES(section, interface);
     READ_TRANSPORTS(section, interface);
     READ_CREDENTIALS(section, interface);
+    READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =
         section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);

@@ -30,6 +30,12 @@ void SipModule::open(GatewayHost& host)
         {
             throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].listen", error.what());
         }
+    for (auto const& port : m_ports)
+        if (SipRegistration* const registration = port->interface.getRegistration())
+        {
+            host.onEnding.emplace_back([registration] { registration->end(); });
+            registration->start();
+        }
     for (SipConfiguration const& configuration : m_configurations)
         spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
                      configuration.peer.text());
@@ -67,6 +73,8 @@ std::string SipModule::describe() const
             text += fmt::format("interface {}: {} challenges answered, {} credentials not taken\n",
                                 port->interface.getName().view(), credentials->getCounters().answered,
                                 credentials->getCounters().refused);
+        if (SipRegistration const* const registration = port->interface.getRegistration())
+            text += registration->describe();
     }
     return text;
 }

@@ -69,6 +69,9 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
     if (!configuration.conference.empty())
         m_conference = std::make_unique<SipFocus>(*this);
+    if (configuration.registers)
+        m_registration =
+            std::make_unique<SipRegistration>(m_configuration, m_agent.get(), m_sender, [this] { tellOfEnd(); });
 }
 
 SipInterface::~SipInterface()
@@ -333,6 +336,11 @@ void SipInterface::cleanUp()
         m_endpoints.erase(found);
     }
     m_finished.clear();
+    tellOfEnd();
+}
+
+void SipInterface::tellOfEnd()
+{
     if (m_environment.host.onEndpointGone)
         m_environment.host.onEndpointGone();
 }

@@ -7,6 +7,7 @@
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/registrar/SipRegistration.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
 
@@ -63,7 +64,13 @@ public:
     SipGuard const& getGuard() const { return m_guard; }
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
-    std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
+    /// A registration that is being taken back among them.
+    std::size_t getNumberOfEndpoints() const
+    {
+        return m_endpoints.size() + (m_registration != nullptr && m_registration->isEnding() ? 1 : 0);
+    }
+    /// Null where the interface does not register.
+    SipRegistration* getRegistration() const { return m_registration.get(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
@@ -92,6 +99,7 @@ private:
     SipEndpoint& makeEndpoint(unsigned int callNumber, InternetAddress const* source = nullptr);
     static void CLEAN_UP(void* interface);
     void cleanUp();
+    void tellOfEnd();
 
     SipEnvironment& m_environment;
     SipConfiguration m_configuration;
@@ -107,6 +115,7 @@ private:
     SipGuard m_guard;
     SipAgent m_agent;
     SipSender m_sender;
+    std::unique_ptr<SipRegistration> m_registration;
 
     TYEvent* m_cleanUpEvent = nullptr;
     struct Owned

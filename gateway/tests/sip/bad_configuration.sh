@@ -42,6 +42,9 @@ bad "sip\[1\].passwords: $WORK/passwords: everybody may read or change it" \
 bad "sip\[1\].passwords: $WORK/passwords: line 2 is not of the form user:realm:password" \
     "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 600 secret)"
 bad "sip\[1\].passwords: $WORK/no: cannot be read" "$(passwords "user = \"alice\"\npasswords = \"${FILE%passwords}no\"")"
+bad "sip\[1\].register: as whom\? user is needed" 's/name = "b"/name = "b"\nregister = true/'
+bad "sip\[1\].domain: is no name of a host" 's/name = "b"/name = "b"\ndomain = "me@home"/'
+bad "sip\[1\].register-expires: must be from 1 to 86400" 's/name = "b"/name = "b"\nregister-expires = 0/'
 bad "sip\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
 bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
 bad "line 2: " '2s/.*/call = = 3/'
