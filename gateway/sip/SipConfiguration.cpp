@@ -92,14 +92,39 @@ void READ_CREDENTIALS(ConfigurationSection const& section, SipConfiguration& int
         {
             section.refuse("passwords", error.what());
         }
-    if (interface.user.empty() && interface.passwords != nullptr)
-        section.refuse("passwords", "are nobody's: user is needed");
+    interface.authenticates = section.flag("authenticate");
+    if (interface.user.empty() && !interface.authenticates && interface.passwords != nullptr)
+        section.refuse("passwords", "are of no use without user or authenticate");
     if (interface.user.empty())
         return;
     if (interface.passwords == nullptr)
         section.refuse("user", "has no password: passwords is needed");
     if (!interface.passwords->hasUser(interface.user))
         section.refuse("user", "'" + interface.user + "' is not in the file of passwords");
+}
+
+/// Whether it asks who sends, and whom it knows.
+void READ_AUTHENTICATION(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.realm = section.text("realm", interface.name);
+    if (interface.realm.empty() || interface.realm.find_first_of("\"\\:") != std::string::npos)
+        section.refuse("realm", "is empty, or has a quote, a backslash or a colon");
+    if (section.has("algorithms"))
+        interface.algorithms.clear();
+    for (std::string const& name : section.texts("algorithms", {"SHA-256", "MD5"}))
+        if (std::optional<SipDigest::Algorithm> const algorithm = SipDigest::NAMED(name); !algorithm)
+            section.refuse("algorithms", "must be some of SHA-256, SHA-512-256, MD5");
+        else if (section.has("algorithms"))
+            interface.algorithms.push_back(*algorithm);
+    if (!interface.authenticates)
+        return;
+    if (interface.passwords == nullptr)
+        section.refuse("authenticate", "by what? passwords is needed");
+    if (!interface.passwords->hasRealm(interface.realm))
+        section.refuse("authenticate", "nobody of the realm '" + interface.realm + "' is in the file of passwords");
+    for (SipDigest::Algorithm const algorithm : interface.algorithms)
+        if (std::string const user = interface.passwords->findWithout(interface.realm, algorithm); !user.empty())
+            section.refuse("algorithms", "of '" + user + "' there is no hash by " + SipDigest::NAME(algorithm));
 }
 
 /// Whether, and how, it tells its peer where it is.
@@ -137,6 +162,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "peer",
                    "user",
                    "passwords",
+                   "authenticate",
+                   "realm",
+                   "algorithms",
                    "register",
                    "domain",
                    "register-expires",
@@ -166,6 +194,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_ADDRESSES(section, interface);
     READ_TRANSPORTS(section, interface);
     READ_CREDENTIALS(section, interface);
+    READ_AUTHENTICATION(section, interface);
     READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =

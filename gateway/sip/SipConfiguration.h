@@ -35,12 +35,15 @@ struct SipConfiguration
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
     std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
-    std::shared_ptr<SipPasswords const> passwords; ///< with a user: never null
-    bool registers = false;                        ///< with its peer, as that user
-    std::string domain;                            ///< of the user, with the peer
-    unsigned int registerExpires = 600;            ///< seconds that it asks for
-    unsigned int registerRetry = 30;               ///< seconds after a first failure
-    std::string mediaAddress;                      ///< of this machine, where media come in; no name
+    std::shared_ptr<SipPasswords const> passwords; ///< with a user, or where it asks: never null
+    bool authenticates = false;                    ///< asks who sends
+    std::string realm;                             ///< of those whom it asks
+    std::vector<SipDigest::Algorithm> algorithms{SipDigest::SHA_256, SipDigest::MD5}; ///< the best liked first
+    bool registers = false;                                                           ///< with its peer, as that user
+    std::string domain;                                                               ///< of the user, with the peer
+    unsigned int registerExpires = 600;                                               ///< seconds that it asks for
+    unsigned int registerRetry = 30;                                                  ///< seconds after a first failure
+    std::string mediaAddress; ///< of this machine, where media come in; no name
     /// That are offered and taken where media are relayed, the best liked first.
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};

@@ -9,6 +9,18 @@
 #include <algorithm>
 #include <stdexcept>
 
+namespace
+{
+std::string DESCRIBE(std::string_view name, SipAuthentication const& authentication)
+{
+    SipAuthentication::Counters const& counters = authentication.getCounters();
+    return fmt::format("interface {}: {} requests of known users, {} asked who, {} wrong, {} stale, {} replayed; {} "
+                       "addresses banned, {} requests of theirs ignored\n",
+                       name, counters.accepted, counters.asked, counters.wrong, counters.stale, counters.replayed,
+                       authentication.getNumberOfBanned(), counters.ignored);
+}
+} // namespace
+
 SipModule::SipModule(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)
     : m_file(configuration.file)
 {
@@ -73,6 +85,8 @@ std::string SipModule::describe() const
             text += fmt::format("interface {}: {} challenges answered, {} credentials not taken\n",
                                 port->interface.getName().view(), credentials->getCounters().answered,
                                 credentials->getCounters().refused);
+        if (SipAuthentication const* const authentication = port->interface.getAuthentication())
+            text += DESCRIBE(port->interface.getName().view(), *authentication);
         if (SipRegistration const* const registration = port->interface.getRegistration())
             text += registration->describe();
     }

@@ -7,6 +7,7 @@
 #include <new>
 #include <openssl/crypto.h>
 #include <openssl/evp.h>
+#include <openssl/hmac.h>
 #include <openssl/rand.h>
 #include <vector>
 
@@ -79,6 +80,16 @@ std::string SipDigest::RESPONSE(std::string_view secret, Question const& questio
     return HASH(question.algorithm, question.quality.empty() ? JOIN({secret, question.nonce, what})
                                                              : JOIN({secret, question.nonce, question.count,
                                                                      question.clientNonce, question.quality, what}));
+}
+
+std::string SipDigest::SEAL(std::string_view key, std::string_view text)
+{
+    std::array<unsigned char, EVP_MAX_MD_SIZE> seal = {};
+    unsigned int length = 0;
+    if (HMAC(EVP_sha256(), key.data(), static_cast<int>(key.size()),
+             reinterpret_cast<unsigned char const*>(text.data()), text.size(), seal.data(), &length) == nullptr)
+        throw std::bad_alloc();
+    return HEXADECIMAL(seal.data(), length);
 }
 
 bool SipDigest::ARE_EQUAL(std::string_view one, std::string_view other)

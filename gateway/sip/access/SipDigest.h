@@ -39,6 +39,8 @@ struct Question
 };
 std::string RESPONSE(std::string_view secret, Question const& question);
 
+/// That only who has the key can write below the text (HMAC, SHA-256).
+std::string SEAL(std::string_view key, std::string_view text);
 /// Takes as long whatever is in them.
 bool ARE_EQUAL(std::string_view one, std::string_view other);
 /// So many octets that nobody can guess, as hexadecimal digits.

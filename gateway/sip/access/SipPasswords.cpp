@@ -149,3 +149,17 @@ bool SipPasswords::hasUser(std::string_view user, std::string_view realm) const
 {
     return m_entries.contains(std::pair(std::string(user), std::string(realm)));
 }
+
+bool SipPasswords::hasRealm(std::string_view realm) const
+{
+    return std::any_of(m_entries.begin(), m_entries.end(),
+                       [&](auto const& entry) { return entry.first.second == realm; });
+}
+
+std::string SipPasswords::findWithout(std::string_view realm, SipDigest::Algorithm algorithm) const
+{
+    for (auto const& [who, entry] : m_entries)
+        if (who.second == realm && !find(who.first, realm, algorithm))
+            return who.first;
+    return {};
+}

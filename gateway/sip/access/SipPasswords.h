@@ -32,6 +32,9 @@ public:
     bool hasUser(std::string_view user) const; ///< in whatever realm
     /// The same in that realm and no other.
     bool hasUser(std::string_view user, std::string_view realm) const;
+    bool hasRealm(std::string_view realm) const;
+    /// A user of that realm whom the algorithm is of no use for; empty: there is none.
+    std::string findWithout(std::string_view realm, SipDigest::Algorithm algorithm) const;
 
 private:
     struct Entry

@@ -65,6 +65,9 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
     , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
 {
+    if (configuration.authenticates)
+        m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
+                                 configuration.passwords);
     environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
     if (!configuration.conference.empty())
@@ -139,6 +142,8 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         nta_msg_discard(m_agent.get(), message);
         return;
     }
+    if (m_authentication && !authenticate(message, sip))
+        return;
     bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && sip->sip_to->a_tag == nullptr;
     if (isNewCall && !admits(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
     {
@@ -154,6 +159,28 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         return;
     nta_incoming_treply(transaction, status, nullptr, TAG_END()); // nothing if it was answered finally
     nta_incoming_destroy(transaction);
+}
+
+/// Whether the sender is known; else the message is done with. A CANCEL cannot be asked for (RFC 3261, 22.1), and one
+/// that comes here finds nothing to cancel.
+bool SipInterface::authenticate(msg_t* message, sip_t const* sip)
+try
+{
+    if (sip->sip_request->rq_method == sip_method_cancel)
+        return true;
+    SipAuthentication::Decision const decision =
+        m_authentication->check(sip, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa));
+    if (decision.verdict == SipAuthentication::ASK)
+        nta_msg_treply(m_agent.get(), message, SIP_401_UNAUTHORIZED, SIPTAG_HEADER_STR(decision.challenge.c_str()),
+                       TAG_END());
+    else if (decision.verdict == SipAuthentication::IGNORE)
+        nta_msg_discard(m_agent.get(), message);
+    return decision.verdict == SipAuthentication::ACCEPTED;
+}
+catch (std::bad_alloc const&)
+{
+    nta_msg_discard(m_agent.get(), message);
+    return false;
 }
 
 int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)

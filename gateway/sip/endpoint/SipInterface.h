@@ -4,6 +4,7 @@
 #include "platform/base/IpAddress.h"
 #include "platform/base/TYTime.h"
 #include "sip/SipConfiguration.h"
+#include "sip/access/SipAuthentication.h"
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -61,6 +62,8 @@ public:
     /// @}
     SipSender& getSender() { return m_sender; }
     SipSender const& getSender() const { return m_sender; }
+    /// Null where the interface asks nobody.
+    SipAuthentication const* getAuthentication() const { return m_authentication ? &*m_authentication : nullptr; }
     SipGuard const& getGuard() const { return m_guard; }
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
@@ -90,6 +93,7 @@ public:
 private:
     static int HANDLE_MESSAGE(SipInterface* interface, nta_agent_t* agent, msg_t* message, sip_t* sip);
     void onMessage(msg_t* message, sip_t* sip);
+    bool authenticate(msg_t* message, sip_t const* sip);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
@@ -113,6 +117,7 @@ private:
     sip_allow_t* m_allow; // the home's
     sip_supported_t* m_supported;
     SipGuard m_guard;
+    std::optional<SipAuthentication> m_authentication;
     SipAgent m_agent;
     SipSender m_sender;
     std::unique_ptr<SipRegistration> m_registration;

@@ -35,13 +35,20 @@ passwords() { # KEYS [MODE]
 }
 FILE=${WORK//\//\\\/}\\\/passwords
 bad "sip\[1\].user: has no password: passwords is needed" "$(passwords 'user = "alice"')"
-bad "sip\[1\].passwords: are nobody's: user is needed" "$(passwords "passwords = \"$FILE\"")"
+bad "sip\[1\].passwords: are of no use without user or authenticate" "$(passwords "passwords = \"$FILE\"")"
 bad "sip\[1\].user: 'bob' is not in the file of passwords" "$(passwords "user = \"bob\"\npasswords = \"$FILE\"")"
 bad "sip\[1\].passwords: $WORK/passwords: everybody may read or change it" \
     "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 644)"
 bad "sip\[1\].passwords: $WORK/passwords: line 2 is not of the form user:realm:password" \
     "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 600 secret)"
 bad "sip\[1\].passwords: $WORK/no: cannot be read" "$(passwords "user = \"alice\"\npasswords = \"${FILE%passwords}no\"")"
+bad "sip\[1\].authenticate: by what\? passwords is needed" 's/name = "b"/name = "b"\nauthenticate = true/'
+bad "sip\[1\].authenticate: nobody of the realm 'b' is in the file of passwords" \
+    "$(passwords "authenticate = true\npasswords = \"$FILE\"")"
+bad "sip\[1\].algorithms: of 'bob' there is no hash by SHA-256" \
+    "$(passwords "authenticate = true\nrealm = \"office\"\npasswords = \"$FILE\"" 600 'bob:office:{MD5}00112233445566778899aabbccddeeff')"
+bad "sip\[1\].algorithms: must be some of SHA-256, SHA-512-256, MD5" 's/name = "b"/name = "b"\nalgorithms = ["MD4"]/'
+bad "sip\[1\].realm: is empty, or has a quote, a backslash or a colon" "s/name = \"b\"/name = \"b\"\nrealm = \"a:b\"/"
 bad "sip\[1\].register: as whom\? user is needed" 's/name = "b"/name = "b"\nregister = true/'
 bad "sip\[1\].domain: is no name of a host" 's/name = "b"/name = "b"\ndomain = "me@home"/'
 bad "sip\[1\].register-expires: must be from 1 to 86400" 's/name = "b"/name = "b"\nregister-expires = 0/'
