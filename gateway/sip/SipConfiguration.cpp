@@ -51,11 +51,13 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
         section.refuse("listen", "'" + interface.listen.host + "' cannot be told to peers: advertise is needed");
     if (interface.listen.isMulticast())
         section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
+    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
+        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
+    if (!section.has("peer") && section.flag("registrar"))
+        return;
     interface.peer = READ_REACHABLE(section, "peer");
     if (interface.peer.isVersion6() != interface.listen.isVersion6())
         section.refuse("peer", "is not of the version of the internet protocol that listen is of");
-    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
-        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
     if (interface.peer == interface.listen || interface.peer == interface.advertise)
         section.refuse("peer", "is the interface itself");
 }
@@ -127,11 +129,31 @@ void READ_AUTHENTICATION(ConfigurationSection const& section, SipConfiguration& 
             section.refuse("algorithms", "of '" + user + "' there is no hash by " + SipDigest::NAME(algorithm));
 }
 
+/// Whether users of its realm tell it where they are.
+void READ_REGISTRAR(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.isRegistrar = section.flag("registrar");
+    interface.registrations = section.text("registrations", {});
+    interface.leastRegistration = section.number("min-expires", interface.leastRegistration, 1, 86400);
+    interface.longestRegistration = section.number("max-expires", interface.longestRegistration, 1, 86400);
+    interface.maxContacts = section.number("max-contacts", interface.maxContacts, 1, 100);
+    if (interface.longestRegistration < interface.leastRegistration)
+        section.refuse("max-expires", "must not be below min-expires");
+    if (!interface.isRegistrar)
+        return;
+    if (!interface.authenticates)
+        section.refuse("registrar", "of whom? authenticate is needed");
+    if (interface.peer.port == 0 && !section.has("allow"))
+        section.refuse("allow", "is needed where there is no peer");
+}
+
 /// Whether, and how, it tells its peer where it is.
 void READ_REGISTRATION(ConfigurationSection const& section, SipConfiguration& interface)
 {
     interface.registers = section.flag("register");
-    interface.domain = section.text("domain", interface.peer.text());
+    if (interface.registers && interface.peer.port == 0)
+        section.refuse("peer", "is missing");
+    interface.domain = section.text("domain", interface.peer.port != 0 ? interface.peer.text() : interface.name);
     if (interface.domain.empty() || interface.domain.find_first_of(" <>@;?\"/") != std::string::npos)
         section.refuse("domain", "is no name of a host");
     interface.registerExpires = section.number("register-expires", interface.registerExpires, 1, 86400);
@@ -165,6 +187,11 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "authenticate",
                    "realm",
                    "algorithms",
+                   "registrar",
+                   "registrations",
+                   "min-expires",
+                   "max-expires",
+                   "max-contacts",
                    "register",
                    "domain",
                    "register-expires",
@@ -195,6 +222,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_TRANSPORTS(section, interface);
     READ_CREDENTIALS(section, interface);
     READ_AUTHENTICATION(section, interface);
+    READ_REGISTRAR(section, interface);
     READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =

@@ -3,6 +3,7 @@
 #include "configuration/Configuration.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipPropertyId.h"
+#include "sip/registrar/SipBindingStore.h"
 
 #include <spdlog/spdlog.h>
 
@@ -38,6 +39,10 @@ void SipModule::open(GatewayHost& host)
         {
             m_ports.push_back(std::make_unique<Port>(*m_environment, m_configurations[i]));
         }
+        catch (SipBindingStore::Failure const& error)
+        {
+            throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].registrations", error.what());
+        }
         catch (std::runtime_error const& error)
         {
             throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].listen", error.what());
@@ -50,7 +55,7 @@ void SipModule::open(GatewayHost& host)
         }
     for (SipConfiguration const& configuration : m_configurations)
         spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
-                     configuration.peer.text());
+                     configuration.peer.port != 0 ? configuration.peer.text() : "nobody but who registers");
 }
 
 unsigned int SipModule::clearCalls(QCause cause)
@@ -87,6 +92,8 @@ std::string SipModule::describe() const
                                 credentials->getCounters().refused);
         if (SipAuthentication const* const authentication = port->interface.getAuthentication())
             text += DESCRIBE(port->interface.getName().view(), *authentication);
+        if (SipRegistrar const* const registrar = port->interface.getRegistrar())
+            text += registrar->describe();
         if (SipRegistration const* const registration = port->interface.getRegistration())
             text += registration->describe();
     }

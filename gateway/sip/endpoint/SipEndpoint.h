@@ -124,6 +124,8 @@ private:
     // called side: SipEndpoint_Called.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
+    bool findContacts(std::string const& user);
+    bool tryNextContact(unsigned int status);
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
@@ -313,9 +315,10 @@ private:
     SipSessionTimer m_sessionTimer;
     TYTimer m_refreshTimer;
     TYTimer m_lengthTimer;
-    std::string m_ownSession; // what our peer has of us
-    bool m_isRefresh = false; // ours
-    std::string m_inviteUri;  // for an INVITE that is to be sent again
+    std::string m_ownSession;            // what our peer has of us
+    bool m_isRefresh = false;            // ours
+    std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
+    std::string m_inviteUri;             // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done

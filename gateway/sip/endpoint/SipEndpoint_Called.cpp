@@ -96,7 +96,11 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
+    if (!findContacts(called.getUser()))
+        return true;
+    std::string const uri = m_contacts.empty()
+                                ? SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp)
+                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), false);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
     m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
                             SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
@@ -106,12 +110,44 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
                       SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
                       (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
-    m_inviteUri = uri;
+    m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
     m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
     if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
         hops != nullptr && hops->getValue() != 0)
         m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
     m_isOverTcp = configuration.usesTcp;
+    return startInvite();
+}
+
+/// Where a user of the interface's realm has registered. False: he has not, or there is nobody of that name, and the
+/// call is over.
+bool SipEndpoint::findContacts(std::string const& user)
+{
+    SipRegistrar const* const registrar = m_interface.getRegistrar();
+    if (registrar == nullptr)
+        return true;
+    m_contacts = registrar->find(user);
+    bool const hasPeer = m_interface.getConfiguration().peer.port != 0;
+    if (!m_contacts.empty() || (hasPeer && !registrar->hasUser(user)))
+        return true;
+    m_dialog = SipDialogState::OVER;
+    if (registrar->hasUser(user))
+        leaveCall({QCause::SUBSCRIBER_ABSENT, 480, {}});
+    else
+        leaveCall({QCause::UNALLOCATED_NUMBER, 404, {}});
+    return false;
+}
+
+/// Another contact of the user, when one of them does not want the call or is not there (RFC 3261, 16.5: one after the
+/// other). Whether there is one; a user who has declined it has done so everywhere.
+bool SipEndpoint::tryNextContact(unsigned int status)
+{
+    if (m_contacts.size() < 2 || status >= 600 || m_dialog != SipDialogState::INVITE_SENT)
+        return false;
+    m_contacts.erase(m_contacts.begin());
+    m_inviteUri = m_contacts.front();
+    m_invite.forget();
+    m_negotiation.fail();
     return startInvite();
 }
 
@@ -285,6 +321,8 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         m_invite.sequence = nta_leg_get_seq(m_leg);
         return;
     }
+    if (tryNextContact(status))
+        return;
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));

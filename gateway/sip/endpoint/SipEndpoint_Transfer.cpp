@@ -280,7 +280,8 @@ void SipEndpoint::endTransfer(QCause cause)
 void SipEndpoint::refer(std::string const& number)
 {
     SipConfiguration const& configuration = m_interface.getConfiguration();
-    std::string const uri = SipAddress::MAKE_URI(number, configuration.peer, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI(
+        number, configuration.peer.port != 0 ? configuration.peer : configuration.getAddress(), configuration.usesTcp);
     std::string const self = SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp);
     trace("-> REFER to " + uri);
     m_isTransferring = true;

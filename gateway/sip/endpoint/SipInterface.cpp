@@ -27,6 +27,8 @@
 namespace
 {
 constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO";
+constexpr char const* ALLOW_OF_REGISTRAR =
+    "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO, REGISTER";
 constexpr char const* SUPPORTED = "100rel, replaces, timer";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 constexpr unsigned long LONGEST_PAUSE = 60; // seconds
@@ -59,7 +61,7 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_focus(m_contact + ";isfocus")
     , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
-    , m_allow(sip_allow_make(m_home.get(), ALLOW))
+    , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
@@ -68,6 +70,8 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     if (configuration.authenticates)
         m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
                                  configuration.passwords);
+    if (configuration.isRegistrar)
+        m_registrar = std::make_unique<SipRegistrar>(m_configuration);
     environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
     if (!configuration.conference.empty())
@@ -175,6 +179,7 @@ try
                        TAG_END());
     else if (decision.verdict == SipAuthentication::IGNORE)
         nta_msg_discard(m_agent.get(), message);
+    m_knownUser = decision.user;
     return decision.verdict == SipAuthentication::ACCEPTED;
 }
 catch (std::bad_alloc const&)
@@ -194,6 +199,8 @@ int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
         return refused;
     if (method == sip_method_options)
         return answerOptions(transaction);
+    if (method == sip_method_register && m_registrar != nullptr)
+        return m_registrar->receive(transaction, request, m_knownUser);
     return method == sip_method_invite ? receiveInvite(transaction, request) : 481;
 }
 

@@ -8,6 +8,7 @@
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/registrar/SipRegistrar.h"
 #include "sip/registrar/SipRegistration.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
@@ -72,6 +73,8 @@ public:
     {
         return m_endpoints.size() + (m_registration != nullptr && m_registration->isEnding() ? 1 : 0);
     }
+    /// Null where nobody can register.
+    SipRegistrar const* getRegistrar() const { return m_registrar.get(); }
     /// Null where the interface does not register.
     SipRegistration* getRegistration() const { return m_registration.get(); }
 
@@ -120,7 +123,9 @@ private:
     std::optional<SipAuthentication> m_authentication;
     SipAgent m_agent;
     SipSender m_sender;
+    std::unique_ptr<SipRegistrar> m_registrar;
     std::unique_ptr<SipRegistration> m_registration;
+    std::string m_knownUser; // of the request that is being looked at
 
     TYEvent* m_cleanUpEvent = nullptr;
     struct Owned
