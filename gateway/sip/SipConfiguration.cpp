@@ -182,6 +182,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "listen",
                    "advertise",
                    "peer",
+                   "trusted",
                    "user",
                    "passwords",
                    "authenticate",
@@ -222,6 +223,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_TRANSPORTS(section, interface);
     READ_CREDENTIALS(section, interface);
     READ_AUTHENTICATION(section, interface);
+    interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
     READ_REGISTRAR(section, interface);
     READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");

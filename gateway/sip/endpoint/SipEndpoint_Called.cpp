@@ -32,10 +32,26 @@ void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State 
     ADD(properties, CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
 }
 
-/// Who answers, if the answer says so.
-void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
+/// Whole lines. Who transfers may have withheld his number, which Referred-By would tell.
+std::string FOR_PEER(std::string_view lines, bool isTrusted)
 {
-    if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response))
+    constexpr std::string_view REFERRED_BY = "Referred-By:";
+    std::string result;
+    while (!lines.empty())
+    {
+        std::size_t const end = lines.find('\n');
+        std::string_view const line = end == std::string_view::npos ? lines : lines.substr(0, end + 1);
+        if (isTrusted || !line.starts_with(REFERRED_BY))
+            result += line;
+        lines.remove_prefix(line.size());
+    }
+    return result;
+}
+
+/// Who answers, if the answer says so.
+void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response, bool isTrusted)
+{
+    if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response, isTrusted))
         connected->addTo(properties);
     else if (std::string const name = SipIdentity::READ_NAME_OF_TO(response);
              !name.empty() && !SipPrivacy::RESTRICTS_SENDER(response))
@@ -107,9 +123,12 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
                             SIPTAG_TO_STR(to.c_str()), TAG_END());
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
-    m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
-                      SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
-                      (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
+    SipDiversion const diversion = SipDiversion::OF_PEER(m_adapter);
+    m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
+    if (configuration.isTrusted || !diversion.isRestricted())
+        m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
+    if (forTarget != nullptr)
+        m_inviteHeaders += FOR_PEER(forTarget->getValue().view(), configuration.isTrusted);
     m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
     m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
     if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
@@ -206,7 +225,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
     addFork(own, fork);
-    ADD_CONNECTED(own, response);
+    ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
@@ -293,7 +312,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     }
     CC_PropertyContainer own;
     addFork(own, fork);
-    ADD_CONNECTED(own, response);
+    ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     addSession(own, session, true);
     addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);

@@ -351,7 +351,7 @@ XCode SipEndpoint::takePlaceOf(SipEndpoint& replaced, sip_t const* request)
     CC_Call* const call = replaced.m_adapter.getCall();
     if (call == nullptr)
         return XCode::FAILURE;
-    SipParty const party = SipIdentity::READ_CALLER(request).party;
+    SipParty const party = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted).party;
     String name;
     name.format("%u", m_callNumber);
     if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())
