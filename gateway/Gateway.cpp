@@ -240,6 +240,8 @@ void Gateway::end(unsigned int patience)
         return;
     }
     m_host.isEnding = true;
+    for (auto const& onEnding : m_host.onEnding)
+        onEnding();
     m_service.tellStopping();
     spdlog::info("ending: no new calls, {} up, to be cleared in {} s", CallControl::GET_NUMBER_OF_CALLS(), patience);
     m_clearTimer.start(patience * 1000);

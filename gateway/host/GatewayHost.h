@@ -9,6 +9,7 @@
 #include <functional>
 #include <set>
 #include <string>
+#include <vector>
 
 class SignallingLoop;
 
@@ -25,13 +26,14 @@ struct GatewayHost
     Admission admission;
     CallTrace trace;
     Counters counters{};
-    unsigned int lastCallNumber = 0;        ///< in logs and traces; the next call takes the next one
-    bool relaysMedia = false;               ///< through ports of ours
-    bool isEnding = false;                  ///< no new calls, and the process ends with the last one
-    std::function<void()> onEndpointGone{}; ///< to be told whenever an endpoint was destroyed; may be empty
-    bool isDraining = false;                ///< no new calls for now
-    std::function<bool()> mustRefuse{};     ///< no new calls as long as it says so; may be empty
-    std::set<std::string> blocked{};        ///< interfaces that an operator has taken out of service
+    unsigned int lastCallNumber = 0;               ///< in logs and traces; the next call takes the next one
+    bool relaysMedia = false;                      ///< through ports of ours
+    bool isEnding = false;                         ///< no new calls, and the process ends with the last one
+    std::function<void()> onEndpointGone{};        ///< to be told whenever an endpoint was destroyed; may be empty
+    bool isDraining = false;                       ///< no new calls for now
+    std::function<bool()> mustRefuse{};            ///< no new calls as long as it says so; may be empty
+    std::set<std::string> blocked{};               ///< interfaces that an operator has taken out of service
+    std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const

@@ -51,11 +51,13 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
         section.refuse("listen", "'" + interface.listen.host + "' cannot be told to peers: advertise is needed");
     if (interface.listen.isMulticast())
         section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
+    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
+        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
+    if (!section.has("peer") && section.flag("registrar"))
+        return;
     interface.peer = READ_REACHABLE(section, "peer");
     if (interface.peer.isVersion6() != interface.listen.isVersion6())
         section.refuse("peer", "is not of the version of the internet protocol that listen is of");
-    if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
-        section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
     if (interface.peer == interface.listen || interface.peer == interface.advertise)
         section.refuse("peer", "is the interface itself");
 }
@@ -79,6 +81,87 @@ void READ_CODECS(ConfigurationSection const& section, SipConfiguration& interfac
         section.refuse("codecs", "may have " + std::to_string(MediaFormats::MOST) + " of them");
 }
 
+/// As whom, and with what password, it calls a peer that asks.
+void READ_CREDENTIALS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.user = section.text("user", {});
+    if (section.has("passwords"))
+        try
+        {
+            interface.passwords = SipPasswords::READ(section.neededText("passwords"));
+        }
+        catch (std::invalid_argument const& error)
+        {
+            section.refuse("passwords", error.what());
+        }
+    interface.authenticates = section.flag("authenticate");
+    if (interface.user.empty() && !interface.authenticates && interface.passwords != nullptr)
+        section.refuse("passwords", "are of no use without user or authenticate");
+    if (interface.user.empty())
+        return;
+    if (interface.passwords == nullptr)
+        section.refuse("user", "has no password: passwords is needed");
+    if (!interface.passwords->hasUser(interface.user))
+        section.refuse("user", "'" + interface.user + "' is not in the file of passwords");
+}
+
+/// Whether it asks who sends, and whom it knows.
+void READ_AUTHENTICATION(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.realm = section.text("realm", interface.name);
+    if (interface.realm.empty() || interface.realm.find_first_of("\"\\:") != std::string::npos)
+        section.refuse("realm", "is empty, or has a quote, a backslash or a colon");
+    if (section.has("algorithms"))
+        interface.algorithms.clear();
+    for (std::string const& name : section.texts("algorithms", {"SHA-256", "MD5"}))
+        if (std::optional<SipDigest::Algorithm> const algorithm = SipDigest::NAMED(name); !algorithm)
+            section.refuse("algorithms", "must be some of SHA-256, SHA-512-256, MD5");
+        else if (section.has("algorithms"))
+            interface.algorithms.push_back(*algorithm);
+    if (!interface.authenticates)
+        return;
+    if (interface.passwords == nullptr)
+        section.refuse("authenticate", "by what? passwords is needed");
+    if (!interface.passwords->hasRealm(interface.realm))
+        section.refuse("authenticate", "nobody of the realm '" + interface.realm + "' is in the file of passwords");
+    for (SipDigest::Algorithm const algorithm : interface.algorithms)
+        if (std::string const user = interface.passwords->findWithout(interface.realm, algorithm); !user.empty())
+            section.refuse("algorithms", "of '" + user + "' there is no hash by " + SipDigest::NAME(algorithm));
+}
+
+/// Whether users of its realm tell it where they are.
+void READ_REGISTRAR(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.isRegistrar = section.flag("registrar");
+    interface.registrations = section.text("registrations", {});
+    interface.leastRegistration = section.number("min-expires", interface.leastRegistration, 1, 86400);
+    interface.longestRegistration = section.number("max-expires", interface.longestRegistration, 1, 86400);
+    interface.maxContacts = section.number("max-contacts", interface.maxContacts, 1, 100);
+    if (interface.longestRegistration < interface.leastRegistration)
+        section.refuse("max-expires", "must not be below min-expires");
+    if (!interface.isRegistrar)
+        return;
+    if (!interface.authenticates)
+        section.refuse("registrar", "of whom? authenticate is needed");
+    if (interface.peer.port == 0 && !section.has("allow"))
+        section.refuse("allow", "is needed where there is no peer");
+}
+
+/// Whether, and how, it tells its peer where it is.
+void READ_REGISTRATION(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.registers = section.flag("register");
+    if (interface.registers && interface.peer.port == 0)
+        section.refuse("peer", "is missing");
+    interface.domain = section.text("domain", interface.peer.port != 0 ? interface.peer.text() : interface.name);
+    if (interface.domain.empty() || interface.domain.find_first_of(" <>@;?\"/") != std::string::npos)
+        section.refuse("domain", "is no name of a host");
+    interface.registerExpires = section.number("register-expires", interface.registerExpires, 1, 86400);
+    interface.registerRetry = section.number("register-retry", interface.registerRetry, 1, 1800);
+    if (interface.registers && interface.user.empty())
+        section.refuse("register", "as whom? user is needed");
+}
+
 void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
 {
     try
@@ -99,6 +182,21 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "listen",
                    "advertise",
                    "peer",
+                   "trusted",
+                   "user",
+                   "passwords",
+                   "authenticate",
+                   "realm",
+                   "algorithms",
+                   "registrar",
+                   "registrations",
+                   "min-expires",
+                   "max-expires",
+                   "max-contacts",
+                   "register",
+                   "domain",
+                   "register-expires",
+                   "register-retry",
                    "transport",
                    "transports",
                    "allow",
@@ -123,6 +221,11 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
     READ_TRANSPORTS(section, interface);
+    READ_CREDENTIALS(section, interface);
+    READ_AUTHENTICATION(section, interface);
+    interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
+    READ_REGISTRAR(section, interface);
+    READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");
     interface.maxMessageSize =
         section.number("max-message-size", interface.maxMessageSize, LEAST_MESSAGE, MOST_MESSAGE);

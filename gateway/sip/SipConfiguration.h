@@ -3,8 +3,10 @@
 #include "configuration/AddressRange.h"
 #include "configuration/SocketAddress.h"
 #include "platform/media/MG_Rtp.h"
+#include "sip/access/SipPasswords.h"
 #include "sip/dialog/SipStream.h"
 
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -16,8 +18,8 @@ struct SipConfiguration
 {
     std::string name;
     SocketAddress listen;
-    SocketAddress advertise; ///< what the peers are told instead of `listen`; port 0: nothing
-    SocketAddress peer;
+    SocketAddress advertise;  ///< what the peers are told instead of `listen`; port 0: nothing
+    SocketAddress peer;       ///< port 0: there is none, it calls registered users alone
     bool usesTcp = false;     ///< towards the peer
     bool listensOnUdp = true; ///< one of the two at least
     bool listensOnTcp = false;
@@ -32,7 +34,22 @@ struct SipConfiguration
     unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
-    std::string mediaAddress;           ///< of this machine, where media come in; no name
+    bool isTrusted = true;              ///< its peers, in the sense of RFC 3325
+    std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
+    std::shared_ptr<SipPasswords const> passwords; ///< with a user, or where it asks: never null
+    bool authenticates = false;                    ///< asks who sends
+    std::string realm;                             ///< of those whom it asks
+    std::vector<SipDigest::Algorithm> algorithms{SipDigest::SHA_256, SipDigest::MD5}; ///< the best liked first
+    bool isRegistrar = false;                                                         ///< for the users of its realm
+    std::string registrations;               ///< the file of their contacts; empty: in memory
+    unsigned int leastRegistration = 60;     ///< seconds
+    unsigned int longestRegistration = 3600; ///< seconds
+    unsigned int maxContacts = 10;           ///< of a user
+    bool registers = false;                  ///< with its peer, as that user
+    std::string domain;                      ///< of the user, with the peer
+    unsigned int registerExpires = 600;      ///< seconds that it asks for
+    unsigned int registerRetry = 30;         ///< seconds after a first failure
+    std::string mediaAddress;                ///< of this machine, where media come in; no name
     /// That are offered and taken where media are relayed, the best liked first.
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};

@@ -3,11 +3,24 @@
 #include "configuration/Configuration.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipPropertyId.h"
+#include "sip/registrar/SipBindingStore.h"
 
 #include <spdlog/spdlog.h>
 
 #include <algorithm>
 #include <stdexcept>
+
+namespace
+{
+std::string DESCRIBE(std::string_view name, SipAuthentication const& authentication)
+{
+    SipAuthentication::Counters const& counters = authentication.getCounters();
+    return fmt::format("interface {}: {} requests of known users, {} asked who, {} wrong, {} stale, {} replayed; {} "
+                       "addresses banned, {} requests of theirs ignored\n",
+                       name, counters.accepted, counters.asked, counters.wrong, counters.stale, counters.replayed,
+                       authentication.getNumberOfBanned(), counters.ignored);
+}
+} // namespace
 
 SipModule::SipModule(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)
     : m_file(configuration.file)
@@ -26,13 +39,23 @@ void SipModule::open(GatewayHost& host)
         {
             m_ports.push_back(std::make_unique<Port>(*m_environment, m_configurations[i]));
         }
+        catch (SipBindingStore::Failure const& error)
+        {
+            throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].registrations", error.what());
+        }
         catch (std::runtime_error const& error)
         {
             throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].listen", error.what());
         }
+    for (auto const& port : m_ports)
+        if (SipRegistration* const registration = port->interface.getRegistration())
+        {
+            host.onEnding.emplace_back([registration] { registration->end(); });
+            registration->start();
+        }
     for (SipConfiguration const& configuration : m_configurations)
         spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
-                     configuration.peer.text());
+                     configuration.peer.port != 0 ? configuration.peer.text() : "nobody but who registers");
 }
 
 unsigned int SipModule::clearCalls(QCause cause)
@@ -71,6 +94,16 @@ std::string SipModule::describe() const
         text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
                             port->interface.getName().view(), guard.getCounters().strangers,
                             guard.getCounters().tooLarge, guard.getConnections().getNumberOfRefused());
+        if (SipCredentials const* const credentials = port->interface.getSender().getCredentials())
+            text += fmt::format("interface {}: {} challenges answered, {} credentials not taken\n",
+                                port->interface.getName().view(), credentials->getCounters().answered,
+                                credentials->getCounters().refused);
+        if (SipAuthentication const* const authentication = port->interface.getAuthentication())
+            text += DESCRIBE(port->interface.getName().view(), *authentication);
+        if (SipRegistrar const* const registrar = port->interface.getRegistrar())
+            text += registrar->describe();
+        if (SipRegistration const* const registration = port->interface.getRegistration())
+            text += registration->describe();
     }
     return text;
 }

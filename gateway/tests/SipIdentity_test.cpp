@@ -183,6 +183,30 @@ TEST(SipIdentity, OnlyWhatTheNetworkVouchesForIsAsserted)
                   "P-Asserted-Identity: <sip:4420@192.0.2.1:5060>\r\n");
 }
 
+TEST(SipIdentity, WhoIsNotTrustedAssertsNothing)
+{
+    SipMessage const invite =
+        SipMessage::INVITE("From: <sip:1@h>;tag=a\r\nP-Asserted-Identity: <sip:+4420@h>\r\nPrivacy: id\r\n");
+    SipIdentity const caller = SipIdentity::READ_CALLER(invite.get(), false);
+    EXPECT_EQ(caller.party.number, "1");
+    EXPECT_EQ(caller.party.screening, QScreeningIndicator::USER_PROVIDED_NOT_SCREENED);
+    EXPECT_TRUE(caller.party.isRestricted()); // what it withholds is withheld all the same
+    EXPECT_EQ(caller.second.number, "");
+    SipMessage const answer = SipMessage::ANSWER("P-Asserted-Identity: <sip:+4420@h>\r\n");
+    EXPECT_TRUE(SipIdentity::READ_CONNECTED(answer.get(), true));
+    EXPECT_FALSE(SipIdentity::READ_CONNECTED(answer.get(), false));
+}
+
+TEST(SipIdentity, WhoIsNotTrustedIsToldNoRestrictedNumber)
+{
+    SipParty party = WITH_SCREENING(QScreeningIndicator::NETWORK_PROVIDED);
+    EXPECT_EQ(SipIdentity::GET_ASSERTED(party, OURS, false), "P-Asserted-Identity: <sip:4420@192.0.2.1:5060>\r\n");
+    party.presentation = QPresentationIndicator::RESTRICTED;
+    EXPECT_EQ(SipIdentity::GET_ASSERTED(party, OURS, false), "Privacy: id\r\n");
+    EXPECT_EQ(SipIdentity::GET_ASSERTED(party, OURS, true),
+              "P-Asserted-Identity: <sip:4420@192.0.2.1:5060>\r\nPrivacy: id\r\n");
+}
+
 TEST(SipIdentity, ASecondNumberThatIsRestrictedIsNotShown)
 {
     SipIdentity caller{WITH_SCREENING(QScreeningIndicator::NETWORK_PROVIDED), {}};

@@ -24,7 +24,7 @@ module_app ctrl_tcp.so
 ctrl_tcp_listen $HOST:$(($2 + 32))
 snd_path $folder
 END
-    echo "<sip:$1@$HOST:$2>;regint=0;audio_codecs=${CODECS:-PCMU};outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
+    echo "<sip:$1@$HOST:$2>;regint=${REGINT:-0};audio_codecs=${CODECS:-PCMU};outbound=\"sip:$HOST:$3\"${5:+;$5}" >"$folder/accounts"
     touch "$folder/contacts"
     baresip -f "$folder" </dev/null >"$WORK/$1.log" 2>&1 &
     background+=($!)

@@ -125,6 +125,8 @@ private:
     // called side: SipEndpoint_Called.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
+    bool findContacts(std::string const& user);
+    bool tryNextContact(unsigned int status);
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
@@ -156,6 +158,7 @@ private:
     void refuseOffer(unsigned int status);
     bool isAwaitingAck() const;
     void sendWaitingOffer();
+    nta_leg_t* getOfferLeg() const;
     void startOffer(std::string const& description, bool isQuick);
     static int HANDLE_OFFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onOfferResponse(unsigned int status, sip_t const* response);
@@ -238,6 +241,7 @@ private:
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void endDialog(SipCause const& cause);
+    bool authenticate(nta_outgoing_t*& request, sip_t const* response, nta_leg_t* leg, nta_response_f* onResponse);
     SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
@@ -275,6 +279,7 @@ private:
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isOverTcp = false;              // the dialog: where its Contact points
+    unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
@@ -312,9 +317,10 @@ private:
     SipSessionTimer m_sessionTimer;
     TYTimer m_refreshTimer;
     TYTimer m_lengthTimer;
-    std::string m_ownSession; // what our peer has of us
-    bool m_isRefresh = false; // ours
-    std::string m_inviteUri;  // for an INVITE that is to be sent again
+    std::string m_ownSession;            // what our peer has of us
+    bool m_isRefresh = false;            // ours
+    std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
+    std::string m_inviteUri;             // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done

@@ -32,10 +32,26 @@ void ADD_STATE(CC_PropertyContainer& properties, CC_PropertyCallLegState::State 
     ADD(properties, CC_PropertyCallLegState(CC_PropertyId::STATE, state)); // a later answer tells more
 }
 
-/// Who answers, if the answer says so.
-void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response)
+/// Whole lines. Who transfers may have withheld his number, which Referred-By would tell.
+std::string FOR_PEER(std::string_view lines, bool isTrusted)
 {
-    if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response))
+    constexpr std::string_view REFERRED_BY = "Referred-By:";
+    std::string result;
+    while (!lines.empty())
+    {
+        std::size_t const end = lines.find('\n');
+        std::string_view const line = end == std::string_view::npos ? lines : lines.substr(0, end + 1);
+        if (isTrusted || !line.starts_with(REFERRED_BY))
+            result += line;
+        lines.remove_prefix(line.size());
+    }
+    return result;
+}
+
+/// Who answers, if the answer says so.
+void ADD_CONNECTED(CC_PropertyContainer& properties, sip_t const* response, bool isTrusted)
+{
+    if (std::optional<SipParty> const connected = SipIdentity::READ_CONNECTED(response, isTrusted))
         connected->addTo(properties);
     else if (std::string const name = SipIdentity::READ_NAME_OF_TO(response);
              !name.empty() && !SipPrivacy::RESTRICTS_SENDER(response))
@@ -97,22 +113,61 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    std::string const uri = SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp);
+    if (!findContacts(called.getUser()))
+        return true;
+    std::string const uri = m_contacts.empty()
+                                ? SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp)
+                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), false);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
     m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
                             SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
                             SIPTAG_TO_STR(to.c_str()), TAG_END());
     if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
         return false;
-    m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress()) +
-                      SipDiversion::OF_PEER(m_adapter).getHeaders(configuration.getAddress(), uri) +
-                      (forTarget != nullptr ? std::string(forTarget->getValue().view()) : "");
-    m_inviteUri = uri;
+    SipDiversion const diversion = SipDiversion::OF_PEER(m_adapter);
+    m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
+    if (configuration.isTrusted || !diversion.isRestricted())
+        m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
+    if (forTarget != nullptr)
+        m_inviteHeaders += FOR_PEER(forTarget->getValue().view(), configuration.isTrusted);
+    m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
     m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
     if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
         hops != nullptr && hops->getValue() != 0)
         m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
     m_isOverTcp = configuration.usesTcp;
+    return startInvite();
+}
+
+/// Where a user of the interface's realm has registered. False: he has not, or there is nobody of that name, and the
+/// call is over.
+bool SipEndpoint::findContacts(std::string const& user)
+{
+    SipRegistrar const* const registrar = m_interface.getRegistrar();
+    if (registrar == nullptr)
+        return true;
+    m_contacts = registrar->find(user);
+    bool const hasPeer = m_interface.getConfiguration().peer.port != 0;
+    if (!m_contacts.empty() || (hasPeer && !registrar->hasUser(user)))
+        return true;
+    m_dialog = SipDialogState::OVER;
+    if (registrar->hasUser(user))
+        leaveCall({QCause::SUBSCRIBER_ABSENT, 480, {}});
+    else
+        leaveCall({QCause::UNALLOCATED_NUMBER, 404, {}});
+    return false;
+}
+
+/// Another contact of the user, when one of them does not want the call or is not there (RFC 3261, 16.5: one after the
+/// other). Whether there is one; a user who has declined it has done so everywhere.
+bool SipEndpoint::tryNextContact(unsigned int status)
+{
+    if (m_contacts.size() < 2 || status >= 600 || m_dialog != SipDialogState::INVITE_SENT)
+        return false;
+    m_contacts.erase(m_contacts.begin());
+    m_inviteUri = m_contacts.front();
+    m_invite.forget();
+    m_negotiation.fail();
     return startInvite();
 }
 
@@ -123,8 +178,8 @@ bool SipEndpoint::startInvite()
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
-    m_invite.transaction = nta_outgoing_tcreate(
-        m_leg, HANDLE_INVITE_RESPONSE, this, nullptr, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
+    m_invite.transaction = m_interface.getSender().send(
+        m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
@@ -171,7 +226,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     CC_PropertyContainer own;
     std::string const session = SESSION_OF(response);
     addFork(own, fork);
-    ADD_CONNECTED(own, response);
+    ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
@@ -236,6 +291,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
 void SipEndpoint::takeAnswer(sip_t const* response)
 {
     m_wasAnswered = true;
+    m_challenges = 0;
     m_timer.start(std::max(m_interface.getConfiguration().t1x64, LONGEST_REPETITION));
     noteAllow(response);
     takeTimerOfAnswer(response);
@@ -257,7 +313,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     }
     CC_PropertyContainer own;
     addFork(own, fork);
-    ADD_CONNECTED(own, response);
+    ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     addSession(own, session, true);
     addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
@@ -279,6 +335,14 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
             clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
         return;
     }
+    if (m_dialog == SipDialogState::INVITE_SENT &&
+        authenticate(m_invite.transaction, response, m_leg, HANDLE_INVITE_RESPONSE))
+    {
+        m_invite.sequence = nta_leg_get_seq(m_leg);
+        return;
+    }
+    if (tryNextContact(status))
+        return;
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
@@ -349,11 +413,9 @@ bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
     noteAllow(response);
     std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
     trace("-> PRACK");
-    nta_outgoing_t* const prack = nta_outgoing_tcreate(fork.leg, nullptr, nullptr, nullptr, SIP_METHOD_PRACK, nullptr,
-                                                       SIPTAG_RACK_STR(acknowledged.c_str()), TAG_END());
-    if (prack == nullptr)
+    if (!m_interface.getSender().sendAlone(fork.leg, SIP_METHOD_PRACK, SIPTAG_RACK_STR(acknowledged.c_str()),
+                                           TAG_END()))
         return false;
-    nta_outgoing_destroy(prack); // the stack goes on by itself
     fork.sequence = sequence;
     return true;
 }
@@ -385,13 +447,10 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
         m_lateAck = nullptr;
     if (hasSession)
         m_ownSession = sessionDescription;
-    // given up at once: the stack keeps it for its time, not for as long as the call; a repeated answer gets another
-    nta_outgoing_t* const ack = nta_outgoing_tcreate(
-        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_ACK, nullptr, SIPTAG_CSEQ_STR(sequence.c_str()),
-        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
-    if (ack != nullptr)
-        nta_outgoing_destroy(ack);
+    // the stack keeps it for its time, not for as long as the call; a repeated answer gets another
+    m_interface.getSender().acknowledge(m_leg, invitation.transaction, SIPTAG_CSEQ_STR(sequence.c_str()),
+                                        TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
+                                        TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());
 }
 
 void SipEndpoint::cancel(SipCause const& cause)

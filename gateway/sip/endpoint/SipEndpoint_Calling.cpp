@@ -27,11 +27,15 @@ constexpr unsigned int LONGEST_SILENCE = 60000; // milliseconds
 constexpr unsigned int MOST_FORKS = 32;
 
 /// What the INVITE tells of its side beyond the party that calls.
-void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession)
+void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession,
+                 bool isTrusted)
 {
     if (!second.number.empty())
         second.addAsSecondTo(own);
-    SipDiversion::READ(request).addTo(own);
+    SipDiversion diversion = SipDiversion::READ(request);
+    if (!isTrusted)
+        diversion.screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED; // whatever it says
+    diversion.addTo(own);
     ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, hasSession)); // else a new leg's: none
 }
 } // namespace
@@ -153,9 +157,9 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
-    SipIdentity const caller = SipIdentity::READ_CALLER(request);
+    SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
-    ADD_CALLING(own, caller.second, request, m_hasOffer);
+    ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
     if (m_hasOffer)
         m_session.addOffer(own, session);
     CC_PropertyContainer offer;
@@ -301,7 +305,8 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
     if (!m_wantsReliable && !(m_allowsReliable && isAnswer))
         return false;
     std::string const identity =
-        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().listen);
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
+                                  m_interface.getConfiguration().isTrusted);
     nta_reliable_t const* const reliable = nta_reliable_treply(
         m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
         SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
@@ -414,7 +419,8 @@ void SipEndpoint::answerWith(std::string const& session)
 void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string const& session)
 {
     std::string const identity =
-        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress());
+        SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
+                                  m_interface.getConfiguration().isTrusted);
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));

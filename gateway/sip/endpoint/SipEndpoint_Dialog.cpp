@@ -90,8 +90,8 @@ void SipEndpoint::sendBye(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
     trace("-> BYE, Reason: " + reason);
-    m_bye = nta_outgoing_tcreate(m_leg, HANDLE_BYE_RESPONSE, this, nullptr, SIP_METHOD_BYE, nullptr,
-                                 SIPTAG_REASON_STR(reason.c_str()), TAG_END());
+    m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
+                                         SIPTAG_REASON_STR(reason.c_str()), TAG_END());
     if (m_bye != nullptr)
         return;
     advance(SipDialogState::BYE_DONE);
@@ -104,6 +104,8 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
     if (status < 200)
         return 0;
     bool const isOurs = response == nullptr || nta_sip_is_internal(response);
+    if (endpoint->authenticate(endpoint->m_bye, response, endpoint->m_leg, HANDLE_BYE_RESPONSE))
+        return 0;
     nta_outgoing_destroy(transaction);
     endpoint->m_bye = nullptr;
     endpoint->advance(SipDialogState::BYE_DONE);
@@ -111,6 +113,24 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
         [&] { endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE"); });
     endpoint->finishIfDone();
     return 0;
+}
+
+/// Whether the request goes out once more, with the credentials that its answer has asked for.
+bool SipEndpoint::authenticate(nta_outgoing_t*& request, sip_t const* response, nta_leg_t* leg,
+                               nta_response_f* onResponse)
+try
+{
+    nta_outgoing_t* const again =
+        m_interface.getSender().sendAgain(request, response, leg, onResponse, this, m_challenges);
+    if (again == nullptr)
+        return false;
+    trace("<- " + std::to_string(response->sip_status->st_status) + ", once more with credentials");
+    request = again;
+    return true;
+}
+catch (std::bad_alloc const&)
+{
+    return false;
 }
 
 /// The Reason header's whole value, empty without one. The stack has split it at its commas.

@@ -64,15 +64,18 @@ void SipEndpoint::sendDigit()
     auto const [digit, duration] = m_digits.front();
     m_digits.pop_front();
     trace(std::string("-> INFO ") + digit);
-    m_info = nta_outgoing_tcreate(m_leg, HANDLE_INFO_RESPONSE, this, nullptr, SIP_METHOD_INFO, nullptr,
-                                  SIPTAG_CONTENT_TYPE_STR("application/dtmf-relay"),
-                                  SIPTAG_PAYLOAD_STR(SipDigits::WRITE(digit, duration).c_str()), TAG_END());
+    std::string const body = SipDigits::WRITE(digit, duration);
+    m_info = m_interface.getSender().send(m_leg, HANDLE_INFO_RESPONSE, this, SIP_METHOD_INFO, nullptr,
+                                          SIPTAG_CONTENT_TYPE_STR("application/dtmf-relay"),
+                                          SIPTAG_PAYLOAD_STR(body.c_str()), TAG_END());
 }
 
 int SipEndpoint::HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)
 {
     int const status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
     if (status < 200)
+        return 0;
+    if (endpoint->authenticate(endpoint->m_info, response, endpoint->m_leg, HANDLE_INFO_RESPONSE))
         return 0;
     nta_outgoing_destroy(std::exchange(endpoint->m_info, nullptr));
     if (status >= 300)

@@ -318,12 +318,19 @@ void SipEndpoint::sendWaitingOffer()
         startOffer(m_offer, m_isOfferQuick);
 }
 
+/// Before the call is up, that of the party that was heard of last.
+nta_leg_t* SipEndpoint::getOfferLeg() const
+{
+    bool const hasOtherLeg =
+        isAgreedEarly() && !m_isCalling && m_fork < m_forks.size() && m_forks[m_fork].leg != nullptr;
+    return hasOtherLeg ? m_forks[m_fork].leg : m_leg;
+}
+
 void SipEndpoint::startOffer(std::string const& description, bool isQuick)
 {
     bool const isEarly = isAgreedEarly();
     bool const isUpdate = (isQuick || isEarly) && m_allowsUpdate && (m_isRefresh || !description.empty());
-    bool const hasOtherLeg = isEarly && !m_isCalling && m_fork < m_forks.size() && m_forks[m_fork].leg != nullptr;
-    nta_leg_t* const leg = hasOtherLeg ? m_forks[m_fork].leg : m_leg;
+    nta_leg_t* const leg = getOfferLeg();
     bool const hasSession = !description.empty();
     trace(std::string(isUpdate ? "-> UPDATE" : "-> INVITE") + " in the dialog" +
           (hasSession ? " with a session description" : ""));
@@ -331,8 +338,8 @@ void SipEndpoint::startOffer(std::string const& description, bool isQuick)
     m_isOffering = true;
     std::string const headers = m_sessionTimer.getRequestHeaders();
     noteSession(SipOfferAnswer::SENT, isUpdate ? SipOfferAnswer::UPDATE : SipOfferAnswer::INVITE, description);
-    m_reinvite.transaction = nta_outgoing_tcreate(
-        leg, HANDLE_OFFER_RESPONSE, this, nullptr, isUpdate ? sip_method_update : sip_method_invite,
+    m_reinvite.transaction = m_interface.getSender().send(
+        leg, HANDLE_OFFER_RESPONSE, this, isUpdate ? sip_method_update : sip_method_invite,
         isUpdate ? "UPDATE" : "INVITE", nullptr, SIPTAG_CONTACT_STR(getContact()), SIPTAG_SUPPORTED_STR("timer"),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
@@ -355,6 +362,8 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
     trace("<- " + std::to_string(status) + " to the offer");
     bool const isInvite = nta_outgoing_method(m_reinvite.transaction) == sip_method_invite;
     bool const isUp = m_dialog == SipDialogState::UP || isAgreedEarly() || m_dialog == SipDialogState::ANSWERED;
+    if (status < 300)
+        m_challenges = 0;
     if (status < 300 && response != nullptr && (!m_isOffering || !isUp))
     {
         if (isInvite && m_lateAck != &m_reinvite) // repeated, or late: the call has ended meanwhile
@@ -362,6 +371,8 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
     }
     else if (!isUp || !m_isOffering)
         return;
+    else if (authenticate(m_reinvite.transaction, response, getOfferLeg(), HANDLE_OFFER_RESPONSE))
+        m_reinvite.sequence = nta_leg_get_seq(getOfferLeg());
     else if (m_isRefresh && status != 491)
         onRefreshed(status, response);
     else if (status < 300 && response != nullptr)

@@ -132,13 +132,11 @@ void SipEndpoint::notifyReferrer(unsigned int status, char const* phrase)
 {
     std::string const body = "SIP/2.0 " + std::to_string(status) + " " + phrase + "\r\n";
     trace("-> NOTIFY " + std::to_string(status));
-    nta_outgoing_t* const notify = nta_outgoing_tcreate(
-        m_leg, nullptr, nullptr, nullptr, SIP_METHOD_NOTIFY, nullptr, SIPTAG_EVENT_STR("refer"),
+    m_interface.getSender().sendAlone(
+        m_leg, SIP_METHOD_NOTIFY, SIPTAG_EVENT_STR("refer"),
         SIPTAG_SUBSCRIPTION_STATE_STR(status < 200 ? "active;expires=180" : "terminated;reason=noresource"),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_CONTENT_TYPE_STR(SIPFRAG), SIPTAG_PAYLOAD_STR(body.c_str()),
         TAG_END());
-    if (notify != nullptr)
-        nta_outgoing_destroy(notify); // the stack goes on by itself
 }
 
 /// NONE: the others have each other, and our peer hangs up, or is hung up on. Otherwise all is as it was.
@@ -282,14 +280,14 @@ void SipEndpoint::endTransfer(QCause cause)
 void SipEndpoint::refer(std::string const& number)
 {
     SipConfiguration const& configuration = m_interface.getConfiguration();
-    std::string const uri = SipAddress::MAKE_URI(number, configuration.peer, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI(
+        number, configuration.peer.port != 0 ? configuration.peer : configuration.getAddress(), configuration.usesTcp);
     std::string const self = SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp);
     trace("-> REFER to " + uri);
     m_isTransferring = true;
-    m_refer = nta_outgoing_tcreate(m_leg, HANDLE_REFER_RESPONSE, this, nullptr, SIP_METHOD_REFER, nullptr,
-                                   SIPTAG_REFER_TO_STR(("<" + uri + ">").c_str()),
-                                   SIPTAG_REFERRED_BY_STR(("<" + self + ">").c_str()), SIPTAG_CONTACT_STR(getContact()),
-                                   TAG_END());
+    m_refer = m_interface.getSender().send(
+        m_leg, HANDLE_REFER_RESPONSE, this, SIP_METHOD_REFER, nullptr, SIPTAG_REFER_TO_STR(("<" + uri + ">").c_str()),
+        SIPTAG_REFERRED_BY_STR(("<" + self + ">").c_str()), SIPTAG_CONTACT_STR(getContact()), TAG_END());
     if (m_refer == nullptr)
         endTransfer(QCause::RESOURCE_UNAVAILABLE);
 }
@@ -298,6 +296,8 @@ int SipEndpoint::HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tr
 {
     int const status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
     if (status < 200)
+        return 0;
+    if (endpoint->authenticate(endpoint->m_refer, response, endpoint->m_leg, HANDLE_REFER_RESPONSE))
         return 0;
     nta_outgoing_destroy(std::exchange(endpoint->m_refer, nullptr));
     if (status >= 300 && endpoint->m_isTransferring)
@@ -351,7 +351,7 @@ XCode SipEndpoint::takePlaceOf(SipEndpoint& replaced, sip_t const* request)
     CC_Call* const call = replaced.m_adapter.getCall();
     if (call == nullptr)
         return XCode::FAILURE;
-    SipParty const party = SipIdentity::READ_CALLER(request).party;
+    SipParty const party = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted).party;
     String name;
     name.format("%u", m_callNumber);
     if (XCode const bound = m_adapter.setup(name, *this, this); !bound.isOk())

@@ -27,6 +27,8 @@
 namespace
 {
 constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO";
+constexpr char const* ALLOW_OF_REGISTRAR =
+    "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO, REGISTER";
 constexpr char const* SUPPORTED = "100rel, replaces, timer";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 constexpr unsigned long LONGEST_PAUSE = 60; // seconds
@@ -38,6 +40,13 @@ InternetAddress SOURCE_OF(nta_incoming_t* transaction)
     InternetAddress const source = AddressRange::ADDRESS_OF(msg_addr(message)->su_sa);
     msg_destroy(message);
     return source;
+}
+
+std::optional<SipCredentials> CREDENTIALS_OF(SipConfiguration const& configuration)
+{
+    if (configuration.user.empty())
+        return std::nullopt;
+    return SipCredentials(configuration.name, configuration.user, configuration.passwords);
 }
 } // namespace
 
@@ -52,15 +61,24 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_focus(m_contact + ";isfocus")
     , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
-    , m_allow(sip_allow_make(m_home.get(), ALLOW))
+    , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
+    , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
 {
+    if (configuration.authenticates)
+        m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
+                                 configuration.passwords);
+    if (configuration.isRegistrar)
+        m_registrar = std::make_unique<SipRegistrar>(m_configuration);
     environment.interfaces.push_back(this);
     m_cleanUpEvent = new TYEvent(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW, CLEAN_UP, this);
     if (!configuration.conference.empty())
         m_conference = std::make_unique<SipFocus>(*this);
+    if (configuration.registers)
+        m_registration =
+            std::make_unique<SipRegistration>(m_configuration, m_agent.get(), m_sender, [this] { tellOfEnd(); });
 }
 
 SipInterface::~SipInterface()
@@ -128,6 +146,8 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         nta_msg_discard(m_agent.get(), message);
         return;
     }
+    if (m_authentication && !authenticate(message, sip))
+        return;
     bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && sip->sip_to->a_tag == nullptr;
     if (isNewCall && !admits(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
     {
@@ -145,6 +165,29 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
     nta_incoming_destroy(transaction);
 }
 
+/// Whether the sender is known; else the message is done with. A CANCEL cannot be asked for (RFC 3261, 22.1), and one
+/// that comes here finds nothing to cancel.
+bool SipInterface::authenticate(msg_t* message, sip_t const* sip)
+try
+{
+    if (sip->sip_request->rq_method == sip_method_cancel)
+        return true;
+    SipAuthentication::Decision const decision =
+        m_authentication->check(sip, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa));
+    if (decision.verdict == SipAuthentication::ASK)
+        nta_msg_treply(m_agent.get(), message, SIP_401_UNAUTHORIZED, SIPTAG_HEADER_STR(decision.challenge.c_str()),
+                       TAG_END());
+    else if (decision.verdict == SipAuthentication::IGNORE)
+        nta_msg_discard(m_agent.get(), message);
+    m_knownUser = decision.user;
+    return decision.verdict == SipAuthentication::ACCEPTED;
+}
+catch (std::bad_alloc const&)
+{
+    nta_msg_discard(m_agent.get(), message);
+    return false;
+}
+
 int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
     sip_method_t const method = request->sip_request->rq_method;
@@ -156,6 +199,8 @@ int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
         return refused;
     if (method == sip_method_options)
         return answerOptions(transaction);
+    if (method == sip_method_register && m_registrar != nullptr)
+        return m_registrar->receive(transaction, request, m_knownUser);
     return method == sip_method_invite ? receiveInvite(transaction, request) : 481;
 }
 
@@ -338,6 +383,11 @@ void SipInterface::cleanUp()
         m_endpoints.erase(found);
     }
     m_finished.clear();
+    tellOfEnd();
+}
+
+void SipInterface::tellOfEnd()
+{
     if (m_environment.host.onEndpointGone)
         m_environment.host.onEndpointGone();
 }

@@ -4,8 +4,12 @@
 #include "platform/base/IpAddress.h"
 #include "platform/base/TYTime.h"
 #include "sip/SipConfiguration.h"
+#include "sip/access/SipAuthentication.h"
+#include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/registrar/SipRegistrar.h"
+#include "sip/registrar/SipRegistration.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
 
@@ -57,10 +61,22 @@ public:
     sip_allow_t const* getAllow() const { return m_allow; }
     sip_supported_t const* getSupported() const { return m_supported; }
     /// @}
+    SipSender& getSender() { return m_sender; }
+    SipSender const& getSender() const { return m_sender; }
+    /// Null where the interface asks nobody.
+    SipAuthentication const* getAuthentication() const { return m_authentication ? &*m_authentication : nullptr; }
     SipGuard const& getGuard() const { return m_guard; }
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
-    std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
+    /// A registration that is being taken back among them.
+    std::size_t getNumberOfEndpoints() const
+    {
+        return m_endpoints.size() + (m_registration != nullptr && m_registration->isEnding() ? 1 : 0);
+    }
+    /// Null where nobody can register.
+    SipRegistrar const* getRegistrar() const { return m_registrar.get(); }
+    /// Null where the interface does not register.
+    SipRegistration* getRegistration() const { return m_registration.get(); }
 
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
@@ -82,6 +98,7 @@ public:
 private:
     static int HANDLE_MESSAGE(SipInterface* interface, nta_agent_t* agent, msg_t* message, sip_t* sip);
     void onMessage(msg_t* message, sip_t* sip);
+    bool authenticate(msg_t* message, sip_t const* sip);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
@@ -91,6 +108,7 @@ private:
     SipEndpoint& makeEndpoint(unsigned int callNumber, InternetAddress const* source = nullptr);
     static void CLEAN_UP(void* interface);
     void cleanUp();
+    void tellOfEnd();
 
     SipEnvironment& m_environment;
     SipConfiguration m_configuration;
@@ -104,7 +122,12 @@ private:
     sip_allow_t* m_allow; // the home's
     sip_supported_t* m_supported;
     SipGuard m_guard;
+    std::optional<SipAuthentication> m_authentication;
     SipAgent m_agent;
+    SipSender m_sender;
+    std::unique_ptr<SipRegistrar> m_registrar;
+    std::unique_ptr<SipRegistration> m_registration;
+    std::string m_knownUser; // of the request that is being looked at
 
     TYEvent* m_cleanUpEvent = nullptr;
     struct Owned

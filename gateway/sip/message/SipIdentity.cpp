@@ -13,9 +13,11 @@ QPresentationIndicator PRESENTATION_OF(SipParty const& party, sip_t const* messa
 }
 
 /// Without indicators but the screening.
-std::optional<SipParty> READ_ASSERTED(sip_t const* message)
+std::optional<SipParty> READ_ASSERTED(sip_t const* message, bool isTrusted)
 {
     std::optional<SipParty> asserted;
+    if (!isTrusted)
+        return asserted;
     for (SipNameAddr const& address : SipNameAddr::READ(message, "P-Asserted-Identity"))
     {
         SipParty party = SipParty::OF(address);
@@ -34,12 +36,12 @@ std::optional<SipParty> READ_ASSERTED(sip_t const* message)
 SipNameAddr ADDRESS_OF(sip_addr_t const& header) { return SipNameAddr::OF(header.a_display, *header.a_url, nullptr); }
 } // namespace
 
-SipIdentity SipIdentity::READ_CALLER(sip_t const* invite)
+SipIdentity SipIdentity::READ_CALLER(sip_t const* invite, bool isTrusted)
 {
     SipNameAddr const from = ADDRESS_OF(*invite->sip_from);
     SipIdentity identity;
     identity.party = SipParty::OF(from);
-    if (std::optional<SipParty> const asserted = READ_ASSERTED(invite))
+    if (std::optional<SipParty> const asserted = READ_ASSERTED(invite, isTrusted))
     {
         identity.second = identity.party;
         identity.party = *asserted;
@@ -60,9 +62,9 @@ SipParty SipIdentity::READ_CALLED(sip_t const* invite)
     return called;
 }
 
-std::optional<SipParty> SipIdentity::READ_CONNECTED(sip_t const* response)
+std::optional<SipParty> SipIdentity::READ_CONNECTED(sip_t const* response, bool isTrusted)
 {
-    std::optional<SipParty> connected = READ_ASSERTED(response);
+    std::optional<SipParty> connected = READ_ASSERTED(response, isTrusted);
     if (!connected)
         return connected;
     if (connected->name.empty())
@@ -85,10 +87,10 @@ std::string SipIdentity::getFrom(SocketAddress const& own) const
         party.name, shown.number.empty() ? UNAVAILABLE_URI : SipAddress::MAKE_URI(shown.getUser(), own, false));
 }
 
-std::string SipIdentity::GET_ASSERTED(SipParty const& party, SocketAddress const& own)
+std::string SipIdentity::GET_ASSERTED(SipParty const& party, SocketAddress const& own, bool isTrusted)
 {
     std::string lines;
-    if (party.isAsserted() && !party.number.empty())
+    if (party.isAsserted() && !party.number.empty() && (isTrusted || !party.isRestricted()))
         lines += "P-Asserted-Identity: " +
                  SipAddress::MAKE_NAME_ADDR(party.name, SipAddress::MAKE_URI(party.getUser(), own, false)) + "\r\n";
     if (party.isRestricted())

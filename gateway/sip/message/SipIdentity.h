@@ -8,8 +8,8 @@
 
 /// Who calls, who is called and who answered: SIP headers to parties, and back.
 ///
-/// The rules are those by which ISUP and SIP interwork (RFC 3398, Q.1912.5); the peers on both sides count as trusted
-/// in the sense of RFC 3325:
+/// The rules are those by which ISUP and SIP interwork (RFC 3398, Q.1912.5). A peer is trusted in the sense of RFC 3325
+/// or not: of one that is not P-Asserted-Identity counts as absent, and it gets none of a restricted number.
 ///
 /// - P-Asserted-Identity wins over From and is network-provided, of several addresses the first with an international
 ///   number. From alone is user-provided, not screened. From beside an asserted number that is another is the second
@@ -25,17 +25,17 @@ struct SipIdentity
     SipParty party;
     SipParty second; ///< no number: there is none
 
-    static SipIdentity READ_CALLER(sip_t const* invite);
+    static SipIdentity READ_CALLER(sip_t const* invite, bool isTrusted = true);
     /// The number of the Request-URI, the name of To.
     static SipParty READ_CALLED(sip_t const* invite);
     /// Who is at the other end, by P-Asserted-Identity of a response, with the name of To for want of another; nothing
     /// when nobody is asserted.
-    static std::optional<SipParty> READ_CONNECTED(sip_t const* response);
+    static std::optional<SipParty> READ_CONNECTED(sip_t const* response, bool isTrusted = true);
     /// The name of To; may be empty.
     static std::string READ_NAME_OF_TO(sip_t const* message);
 
     /// A From for the caller, as a name and an address of ours.
     std::string getFrom(SocketAddress const& own) const;
     /// The lines P-Asserted-Identity and Privacy, as far as there is something to tell, each with its line break.
-    static std::string GET_ASSERTED(SipParty const& party, SocketAddress const& own);
+    static std::string GET_ASSERTED(SipParty const& party, SocketAddress const& own, bool isTrusted = true);
 };

@@ -44,13 +44,18 @@ bool IS_ASKED() { return s_called == ALL && ConnectionGuard::GET_NUMBER_OF_CALLS
 } // namespace
 
 SipGuard::SipGuard(SipConfiguration const& configuration)
-    : m_allow(configuration.allow.empty() ? std::vector{AddressRange::PARSE(configuration.peer.host)}
-                                          : configuration.allow)
+    : m_allow(SERVED_BY(configuration))
     , m_maxMessageSize(configuration.maxMessageSize)
     , m_maxHeaderSize(configuration.maxHeaderSize)
     , m_connections(configuration.listen, m_allow, configuration.maxConnectionsPerSource)
 {
     s_guards.push_back(this);
+}
+
+std::vector<AddressRange> SipGuard::SERVED_BY(SipConfiguration const& configuration)
+{
+    return configuration.allow.empty() ? std::vector{AddressRange::PARSE(configuration.peer.host)}
+                                       : configuration.allow;
 }
 
 SipGuard::~SipGuard() { std::erase(s_guards, this); }

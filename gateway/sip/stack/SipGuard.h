@@ -46,6 +46,9 @@ public:
     /// up a connection whose waiting octets do not fit beside what it has.
     static usize_t LIMIT_OF(SipConfiguration const& configuration);
 
+    /// Who may send: what `allow` says, or else the peer.
+    static std::vector<AddressRange> SERVED_BY(SipConfiguration const& configuration);
+
     // --- what the stack calls
     /// Whether the stack may have the message; one that it may not have is the caller's to give up.
     static bool ADMIT(tport_t const* port, msg_t* message);

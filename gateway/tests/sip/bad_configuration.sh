@@ -27,6 +27,35 @@ bad "gateway.max-calls: expected a whole number" 's/^call-control-log-level.*/ma
 bad "gateway.max-calls: must be from 0 to " 's/^call-control-log-level.*/max-calls = -1/'
 bad "sip\[1\].listen: 'localhost' is not an address" "s/listen = \"$HOST:$PORT_B\"/listen = \"localhost:5060\"/"
 bad "sip\[0\].peer: is missing" "/peer = \"$HOST:$PORT_CALLER\"/d"
+# what is shown to a peer that asks
+passwords() { # KEYS [MODE]
+    echo "s/name = \"b\"/name = \"b\"\n$1/"
+    printf 'alice:office:secret\n%s' "${3:-}" >"$WORK/passwords"
+    chmod "${2:-600}" "$WORK/passwords"
+}
+FILE=${WORK//\//\\\/}\\\/passwords
+bad "sip\[1\].user: has no password: passwords is needed" "$(passwords 'user = "alice"')"
+bad "sip\[1\].passwords: are of no use without user or authenticate" "$(passwords "passwords = \"$FILE\"")"
+bad "sip\[1\].user: 'bob' is not in the file of passwords" "$(passwords "user = \"bob\"\npasswords = \"$FILE\"")"
+bad "sip\[1\].passwords: $WORK/passwords: everybody may read or change it" \
+    "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 644)"
+bad "sip\[1\].passwords: $WORK/passwords: line 2 is not of the form user:realm:password" \
+    "$(passwords "user = \"alice\"\npasswords = \"$FILE\"" 600 secret)"
+bad "sip\[1\].passwords: $WORK/no: cannot be read" "$(passwords "user = \"alice\"\npasswords = \"${FILE%passwords}no\"")"
+bad "sip\[1\].authenticate: by what\? passwords is needed" 's/name = "b"/name = "b"\nauthenticate = true/'
+bad "sip\[1\].authenticate: nobody of the realm 'b' is in the file of passwords" \
+    "$(passwords "authenticate = true\npasswords = \"$FILE\"")"
+bad "sip\[1\].algorithms: of 'bob' there is no hash by SHA-256" \
+    "$(passwords "authenticate = true\nrealm = \"office\"\npasswords = \"$FILE\"" 600 'bob:office:{MD5}00112233445566778899aabbccddeeff')"
+bad "sip\[1\].algorithms: must be some of SHA-256, SHA-512-256, MD5" 's/name = "b"/name = "b"\nalgorithms = ["MD4"]/'
+bad "sip\[1\].realm: is empty, or has a quote, a backslash or a colon" "s/name = \"b\"/name = \"b\"\nrealm = \"a:b\"/"
+bad "sip\[1\].registrar: of whom\? authenticate is needed" 's/name = "b"/name = "b"\nregistrar = true/'
+bad "sip\[1\].max-expires: must not be below min-expires" 's/name = "b"/name = "b"\nmax-expires = 59/'
+bad "sip\[1\].allow: is needed where there is no peer" \
+    "/^peer = \"$HOST:$PORT_CALLEE\"/d; $(passwords "registrar = true\nauthenticate = true\nrealm = \"office\"\npasswords = \"$FILE\"")"
+bad "sip\[1\].register: as whom\? user is needed" 's/name = "b"/name = "b"\nregister = true/'
+bad "sip\[1\].domain: is no name of a host" 's/name = "b"/name = "b"\ndomain = "me@home"/'
+bad "sip\[1\].register-expires: must be from 1 to 86400" 's/name = "b"/name = "b"\nregister-expires = 0/'
 bad "sip\[1\].name: 'a' is taken by another interface" 's/name = "b"/name = "a"/'
 bad "route\[0\].to: there is no interface 'c'" 's/to = "b"/to = "c"/'
 bad "line 2: " '2s/.*/call = = 3/'
@@ -45,4 +74,10 @@ wait $gateway_pid || fail "the first gateway: exit status $?"
 gateway_pid=0
 grep -qx "gateway: 0 calls placed, 0 answered, 0 cleared, 0 failed, 0 left over" "$WORK/first.out" || fail "the last line"
 "$GATEWAY" --config "$WORK/second.toml" --check | grep -qx "$WORK/second.toml: all right" || fail "--check"
+
+# contacts in what is no file of contacts
+write_configuration
+sed -i -e "$(passwords "registrar = true\nregistrations = \"$FILE\"\nauthenticate = true\nrealm = \"office\"\npasswords = \"$FILE\"")" \
+    "$WORK/gateway.toml"
+refused "$WORK/gateway.toml: sip\[1\].registrations: $WORK/passwords: file is not a database" --config "$WORK/gateway.toml"
 finish

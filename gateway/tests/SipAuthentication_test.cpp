@@ -1,0 +1,136 @@
+#include "sip/access/SipAuthentication.h"
+
+#include "SipMessage.h"
+#include "sip/access/SipChallenge.h"
+#include "testing/DrivenClock.h"
+
+#include <gtest/gtest.h>
+
+namespace
+{
+InternetAddress const SOURCE = {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0xff, 0xff, 192, 0, 2, 1};
+InternetAddress const ELSEWHERE = {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0xff, 0xff, 192, 0, 2, 2};
+
+class SipAuthenticationTest : public testing::Test
+{
+protected:
+    SipAuthentication::Decision check(std::string const& header, InternetAddress const& source = SOURCE)
+    {
+        SipMessage const invite = SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n" + header);
+        return authentication.check(invite.get(), source);
+    }
+    /// Its first challenge.
+    SipChallenge ask(std::string const& header = {}, InternetAddress const& source = SOURCE)
+    {
+        SipAuthentication::Decision const decision = check(header, source);
+        EXPECT_EQ(decision.verdict, SipAuthentication::ASK);
+        EXPECT_TRUE(decision.user.empty());
+        SipMessage const answer("SIP/2.0 401 Unauthorized\r\n" + decision.challenge + "\r\n");
+        return SipChallenge::READ(*answer.get()->sip_www_authenticate, false).value();
+    }
+    static std::string ANSWER(SipChallenge const& challenge, std::string const& user, std::string const& password,
+                              unsigned int count = 1)
+    {
+        std::string const secret = SipDigest::SECRET(challenge.algorithm, user, challenge.realm, password);
+        return challenge.answer({user, secret}, "INVITE", "sip:4989@host", "", count);
+    }
+
+    DrivenClock clock;
+    SipAuthentication authentication{"a",
+                                     "office",
+                                     {SipDigest::SHA_256, SipDigest::MD5},
+                                     std::make_shared<SipPasswords const>(SipPasswords::PARSE(
+                                         "alice:office:secret\nbob:*:guess\ncarol:elsewhere:secret\n", "f"))};
+};
+} // namespace
+
+TEST_F(SipAuthenticationTest, WhoKnowsThePasswordIsKnown)
+{
+    SipChallenge challenge = ask();
+    EXPECT_EQ(challenge.algorithm, SipDigest::SHA_256);
+    SipAuthentication::Decision const decision = check(ANSWER(challenge, "alice", "secret"));
+    EXPECT_EQ(decision.verdict, SipAuthentication::ACCEPTED);
+    EXPECT_EQ(decision.user, "alice");
+    EXPECT_EQ(check(ANSWER(challenge, "alice", "secret", 2)).verdict, SipAuthentication::ACCEPTED);
+    challenge.algorithm = SipDigest::MD5;
+    challenge.algorithmName = "MD5";
+    EXPECT_EQ(check(ANSWER(challenge, "alice", "secret", 3)).verdict, SipAuthentication::ACCEPTED);
+    EXPECT_EQ(authentication.getCounters().accepted, 3u);
+}
+
+TEST_F(SipAuthenticationTest, WhoDoesNotIsAskedAgainLikeEverybody)
+{
+    // but for the nonces all of them are told the same
+    SipChallenge const first = ask();
+    for (std::string const& header : {ANSWER(first, "alice", "wrong"), ANSWER(first, "nobody", "secret"),
+                                      ANSWER(first, "bob", "guess"), ANSWER(first, "carol", "secret")})
+    {
+        SipChallenge const again = ask(header);
+        EXPECT_FALSE(again.isStale);
+        EXPECT_EQ(again.algorithm, first.algorithm);
+        EXPECT_EQ(again.realm, first.realm);
+        EXPECT_EQ(again.nonce.size(), first.nonce.size());
+    }
+    EXPECT_EQ(authentication.getCounters().wrong, 4u);
+}
+
+TEST_F(SipAuthenticationTest, WhatWasSentOnceIsNotTakenTwice)
+{
+    SipChallenge const challenge = ask();
+    std::string const header = ANSWER(challenge, "alice", "secret");
+    EXPECT_EQ(check(header).verdict, SipAuthentication::ACCEPTED);
+    EXPECT_FALSE(ask(header).isStale);
+    EXPECT_EQ(authentication.getCounters().replayed, 1u);
+}
+
+TEST_F(SipAuthenticationTest, ANonceWithoutACountServesOnce)
+{
+    SipChallenge challenge = ask();
+    challenge.quality.clear();
+    std::string const header = ANSWER(challenge, "alice", "secret");
+    EXPECT_EQ(check(header).verdict, SipAuthentication::ACCEPTED);
+    EXPECT_EQ(check(header).verdict, SipAuthentication::ASK);
+}
+
+TEST_F(SipAuthenticationTest, AnExpiredNonceIsStaleForWhoKnowsThePassword)
+{
+    SipChallenge const challenge = ask();
+    clock.advance((SipNonces::LIFETIME + 1) * 1000);
+    EXPECT_TRUE(ask(ANSWER(challenge, "alice", "secret")).isStale);
+    EXPECT_FALSE(ask(ANSWER(challenge, "alice", "wrong")).isStale);
+}
+
+TEST_F(SipAuthenticationTest, ANonceThatIsNotOursIsStaleWhateverThePassword)
+{
+    SipChallenge made = ask();
+    made.nonce[0] = 'x';
+    EXPECT_TRUE(ask(ANSWER(made, "alice", "secret")).isStale);
+    EXPECT_TRUE(ask(ANSWER(made, "alice", "wrong")).isStale);
+    EXPECT_TRUE(ask(ANSWER(ask(), "alice", "secret"), ELSEWHERE).isStale);
+    EXPECT_EQ(authentication.getCounters().wrong, 0u);
+    EXPECT_EQ(authentication.getCounters().stale, 3u);
+}
+
+TEST_F(SipAuthenticationTest, OtherCredentialsAreNone)
+{
+    SipChallenge challenge = ask();
+    challenge.realm = "elsewhere";
+    for (std::string const& header :
+         {ANSWER(challenge, "alice", "secret"), std::string("Authorization: Basic YTpi\r\n"),
+          std::string("Authorization: Digest realm=\"office\", username=\"alice\", algorithm=SHA-512-256\r\n"),
+          std::string("Authorization: Digest realm=\"office\", username=\"alice\", qop=token\r\n")})
+        EXPECT_FALSE(ask(header).isStale);
+    EXPECT_EQ(authentication.getCounters().wrong, 0u);
+}
+
+TEST_F(SipAuthenticationTest, WhoGuessesIsNotAnsweredAnyMore)
+{
+    for (unsigned int i = 0; i < SipBans::PATIENCE; ++i)
+        EXPECT_FALSE(ask(ANSWER(ask(), "alice", "wrong")).isStale);
+    EXPECT_EQ(check("").verdict, SipAuthentication::IGNORE);
+    EXPECT_EQ(check("", ELSEWHERE).verdict, SipAuthentication::ASK);
+    EXPECT_EQ(authentication.getNumberOfBanned(), 1u);
+    EXPECT_EQ(authentication.getCounters().ignored, 1u);
+    clock.advance(SipBans::FIRST * 1000);
+    EXPECT_EQ(check("").verdict, SipAuthentication::ASK);
+}
