@@ -33,10 +33,12 @@ compiled_alone(records_test SecondCodec_test.cpp)
 compiled_alone(callcontrol-simulation Model_Adapter.cpp Model_Operations.cpp Values.cpp)
 compiled_alone(gateway-media rtp/RtcpPacket.cpp rtp/RtpNumbering.cpp rtp/RtpTermination.cpp srtp/SrtpSession.cpp)
 compiled_alone(gateway-sip-parts
+    access/SipNonces.cpp access/SipSender.cpp
     message/SipCodec.cpp message/SipDigits.cpp message/SipNameAddr.cpp message/SipParty.cpp message/SipQuality.cpp)
+compiled_alone(gateway-host operation/record/CallWatch.cpp)
 compiled_alone(gateway-isdn-parts endpoint/IsdnEndpoint_Calling.cpp endpoint/IsdnEndpoint_Services.cpp endpoint/IsdnInterface.cpp)
 compiled_alone(gateway_test
     SipBody_test.cpp SipConfiguration_test.cpp SipDialogState_test.cpp SipDigits_test.cpp SipDiversion_test.cpp
-    SipIdentity_test.cpp SipParty_test.cpp SipQuality_test.cpp SipReason_test.cpp SipStream_test.cpp)
+    SipIdentity_test.cpp SipNonces_test.cpp SipParty_test.cpp SipQuality_test.cpp SipReason_test.cpp SipStream_test.cpp)
 compiled_alone(media_test
     Quality_test.cpp Relay_test.cpp Rtcp_test.cpp Srtp_test.cpp TelephoneEvents_test.cpp Transcoding_test.cpp)
