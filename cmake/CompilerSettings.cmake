@@ -10,6 +10,9 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
     # sources that are compiled together are taken for headers, whose classes should not be in anonymous namespaces
     target_compile_options(callcontrol_settings INTERFACE -Wno-subobject-linkage)
 endif()
+if(CMAKE_UNITY_BUILD) # and one's names lie behind the other's
+    target_compile_options(callcontrol_settings INTERFACE -Wno-shadow)
+endif()
 if(CALLCONTROL_SANITIZE)
     target_compile_options(callcontrol_settings INTERFACE
         -fsanitize=${CALLCONTROL_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)

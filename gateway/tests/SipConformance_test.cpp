@@ -13,6 +13,7 @@
 
 #include <chrono>
 #include <netinet/in.h>
+#include <random>
 #include <stdexcept>
 #include <sys/socket.h>
 #include <tuple>
@@ -40,9 +41,9 @@ bool IS_FREE(int type, std::uint16_t port)
 /// A port of the loopback that nobody has, neither for UDP nor for TCP, nor is given by the system to somebody else.
 std::uint16_t FREE_PORT()
 {
-    constexpr unsigned int FIRST = 24000;
-    constexpr unsigned int NUMBER = 8000;
-    static unsigned int s_next = static_cast<unsigned int>(getpid()) * 16; // tests run beside each other
+    constexpr unsigned int FIRST = 26000;
+    constexpr unsigned int NUMBER = 6000;
+    static unsigned int s_next = std::random_device()(); // tests run beside each other
     for (unsigned int tries = 0; tries < NUMBER; ++tries)
         if (auto const port = static_cast<std::uint16_t>(FIRST + s_next++ % NUMBER);
             IS_FREE(SOCK_DGRAM, port) && IS_FREE(SOCK_STREAM, port))

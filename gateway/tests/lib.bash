@@ -136,7 +136,7 @@ expect_callee() {
 # expect_log REGEXP [TIMES]: so many lines of the gateway's log match.
 expect_log() {
     local i count
-    for ((i = 0; i < 60; i++)); do # a line may be on its way
+    for ((i = 0; i < 200; i++)); do # a line may be on its way
         count=$(grep -cE -- "$1" "$WORK/gateway.err")
         ((count == ${2:-1})) && return 0
         sleep 0.05
@@ -153,7 +153,7 @@ expect_causes() {
 # expect_trace REGEXP: of the first call's ladder, which is printed when the call is done.
 expect_trace() {
     local i
-    for ((i = 0; i < 60; i++)); do
+    for ((i = 0; i < 200; i++)); do
         grep -qE -- "$1" "$WORK/gateway.out" && return 0
         sleep 0.05
     done

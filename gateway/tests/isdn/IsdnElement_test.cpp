@@ -21,6 +21,32 @@ std::string TEXT_OF(CC_Property const& property)
     property.getValueString(text);
     return std::string(text.view());
 }
+std::string TEXT_OF(pri_aoc_amount const& amount)
+{
+    return std::to_string(amount.cost) + " at " + std::to_string(amount.multiplier);
+}
+std::string TEXT_OF(pri_aoc_time const& time)
+{
+    return std::to_string(time.length) + " of " + std::to_string(time.scale);
+}
+std::string TEXT_OF(pri_aoc_s_element const& element)
+{
+    auto const& rate = element.rate;
+    switch (element.rate_type)
+    {
+    case PRI_AOC_RATE_TYPE_DURATION:
+        return TEXT_OF(rate.duration.amount) + rate.duration.currency + TEXT_OF(rate.duration.time) +
+               TEXT_OF(rate.duration.granularity) + std::to_string(rate.duration.charging_type);
+    case PRI_AOC_RATE_TYPE_FLAT:
+        return TEXT_OF(rate.flat.amount) + rate.flat.currency;
+    case PRI_AOC_RATE_TYPE_VOLUME:
+        return TEXT_OF(rate.volume.amount) + rate.volume.currency + std::to_string(rate.volume.unit);
+    case PRI_AOC_RATE_TYPE_SPECIAL_CODE:
+        return std::to_string(rate.special);
+    default:
+        return {};
+    }
+}
 std::string TEXT_OF(IsdnCharge::Charge const& charge)
 {
     return TEXT_OF(CC_PropertyCharge(CC_PropertyId::CHARGE, charge));
@@ -315,7 +341,7 @@ TEST(IsdnTariffTest, EachRateComesBack)
     {
         EXPECT_EQ(back.item[i].chargeable, item[i].chargeable) << i;
         EXPECT_EQ(back.item[i].rate_type, item[i].rate_type) << i;
-        EXPECT_EQ(std::memcmp(&back.item[i].rate, &item[i].rate, sizeof item[i].rate), 0) << i;
+        EXPECT_EQ(TEXT_OF(back.item[i]), TEXT_OF(item[i])) << i;
     }
 }
 

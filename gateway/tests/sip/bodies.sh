@@ -32,6 +32,7 @@ optional() {
     expect_optional 180
     expect 200 body "callee"
     send_ack "$SDP_OF_CALLER"
+    pause 200 # else the BYE may overtake the session on its way through the gateway
     send_bye
     expect 200
 }

@@ -3,6 +3,7 @@
 . "$(dirname "$0")/../lib.bash"
 
 CALLS=120
+SIPP_TIMEOUT=60s
 SEED=${SEED:-$RANDOM}
 NEAR_A=$((PORT + 6)) FAR_A=$((PORT + 7)) NEAR_B=$((PORT + 8)) FAR_B=$((PORT + 9))
 caller() { call_up; pause 300; send_bye; expect 200; }
