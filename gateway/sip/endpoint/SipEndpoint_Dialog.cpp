@@ -118,19 +118,22 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
 /// Whether the request goes out once more, with the credentials that its answer has asked for.
 bool SipEndpoint::authenticate(nta_outgoing_t*& request, sip_t const* response, nta_leg_t* leg,
                                nta_response_f* onResponse)
-try
 {
-    nta_outgoing_t* const again =
-        m_interface.getSender().sendAgain(request, response, leg, onResponse, this, m_challenges);
-    if (again == nullptr)
+    if (response == nullptr)
         return false;
-    trace("<- " + std::to_string(response->sip_status->st_status) + ", once more with credentials");
-    request = again;
-    return true;
-}
-catch (std::bad_alloc const&)
-{
-    return false;
+    nta_outgoing_t* again = nullptr;
+    try
+    {
+        again = m_interface.getSender().sendAgain(request, response, leg, onResponse, this, m_challenges);
+        if (again == nullptr)
+            return false;
+        request = again;
+        trace("<- " + std::to_string(response->sip_status->st_status) + ", once more with credentials");
+    }
+    catch (std::bad_alloc const&) // it went out untold, or not at all
+    {
+    }
+    return again != nullptr;
 }
 
 /// The Reason header's whole value, empty without one. The stack has split it at its commas.
