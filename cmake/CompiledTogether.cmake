@@ -26,6 +26,7 @@ compiled_alone(platform_media_test VoipCodecList_test.cpp)
 compiled_alone(properties_test
     CC_PropertyCallLegState_test.cpp CC_PropertyName_test.cpp CC_PropertyTable_test.cpp CC_PropertyWaitForMessage_test.cpp
     CC_PropertyWorkingCopy_test.cpp)
+compiled_alone(callcontrol-testing-main ReplacedNew.cpp)
 compiled_alone(calls_test CC_CallLeg_test.cpp)
 compiled_alone(callcontrol_test CC_Context_Info_test.cpp)
 compiled_alone(adapters_test CC_CallAdapter_FollowingFilters_test.cpp CC_CallAdapter_Log_test.cpp)
