@@ -27,7 +27,7 @@ function(callcontrol_test name)
     add_executable(${name} ${ARGN})
     target_link_libraries(${name} PRIVATE callcontrol_settings callcontrol-testing-main GTest::gmock)
     if(CMAKE_CROSSCOMPILING) # only the libraries' own code is there to be seen as it is shipped
-        target_compile_options(${name} PRIVATE -O0)
+        target_compile_options(${name} PRIVATE -O0 -Wno-psabi)
         set_target_properties(${name} PROPERTIES UNITY_BUILD ON)
     endif()
     if(CMAKE_CROSSCOMPILING OR CALLCONTROL_SANITIZE)
