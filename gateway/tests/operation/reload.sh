@@ -1,17 +1,11 @@
 # A changed configuration is followed while a call is up: routes and limits; a fault, or what needs a restart, changes
 # nothing.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/plain_call.bash"
 CTL=$3
 export CALLCONTROL_GATEWAY_SOCKET=$WORK/control
 
 caller() { call_up; pause 1500; send_bye; expect 200; }
-callee() {
-    expect_invite
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
 lonely() { send_invite; expect 404; send_ack_of_failure; }
 refused() { send_invite; expect 503; send_ack_of_failure; }
 # change SED-EXPRESSION...; refuse REASON: a reload says it

@@ -1,15 +1,9 @@
 # Signals that a service gets in its life, while a call is up: none ends it but those that should. SIGHUP goes on with a
 # new log after the old one was moved away.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/plain_call.bash"
 
 caller() { call_up; pause 1500; send_bye; expect 200; }
-callee() {
-    expect_invite
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
 # in_log FILE REGEXP
 in_log() {
     local i
