@@ -1,5 +1,6 @@
 #include "host/Routing.h"
 
+#include <algorithm>
 #include <set>
 
 namespace
@@ -49,6 +50,13 @@ std::string const* Routing::find(std::string_view from, std::string_view number)
                 return true;
             });
     return result;
+}
+
+bool Routing::isBeginning(std::string_view from, std::string_view number) const
+{
+    std::string const key = KEY_OF(from, number);
+    return std::any_of(m_targets.begin(), m_targets.end(),
+                       [&](auto const& target) { return target.first.starts_with(key); });
 }
 
 std::vector<Routing::Match> Routing::findAll(std::string_view from, std::string_view number) const

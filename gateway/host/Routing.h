@@ -27,6 +27,8 @@ public:
 
     /// Null when no route fits.
     std::string const* find(std::string_view from, std::string_view number) const;
+    /// Whether more digits could give the number a route.
+    bool isBeginning(std::string_view from, std::string_view number) const;
     /// All that fit, the one that is taken first.
     std::vector<Match> findAll(std::string_view from, std::string_view number) const;
 

@@ -208,6 +208,8 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "overlap",
+                   "digit-timeout",
                    "detect-digits",
                    "srtp",
                    "ringback",
@@ -243,6 +245,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                                               : SipStream::SECURED;
     interface.conference = section.text("conference", {});
     interface.ringsBack = section.flag("ringback");
+    if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
+        interface.overlap = SipConfiguration::Overlap::INVITE;
+    interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);
     interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);

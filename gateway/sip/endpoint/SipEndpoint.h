@@ -92,6 +92,13 @@ private:
         bool isAgreed = false;     ///< one of them had the answer
     };
 
+    /// An INVITE with fewer digits than ours has now.
+    struct Attempt
+    {
+        Invitation invitation;
+        nta_leg_t* leg;
+    };
+
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
                    SipParty const& called);
@@ -122,9 +129,26 @@ private:
     void answerFinally(unsigned int status, std::string const& reasonHeader);
     void forgetTransaction();
 
+    // numbers that come digit by digit: SipEndpoint_Overlap.cpp
+    bool isOverlapping() const;
+    int onMoreDigits(nta_incoming_t* transaction, sip_t const* request);
+    int joinDigits(nta_incoming_t* transaction, sip_t const* request, std::string const& digits);
+    void awaitDigits();
+    void onDialledOn();
+    bool isPeerDialling() const;
+    bool beginNumber();
+    bool takeDigits(CC_ServiceUserInput const& input);
+    bool inviteAgain();
+    nta_leg_t* makeClientLeg(std::string const& from, std::string const& to);
+    bool awaitMoreDigits(unsigned int status);
+    void endNumber();
+    bool isOfAttempt(nta_outgoing_t* transaction, int status);
+    void endAttempts();
+
     // called side: SipEndpoint_Called.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
+    bool inviteNumber();
     bool findContacts(std::string const& user);
     bool tryNextContact(unsigned int status);
     bool startInvite();
@@ -322,6 +346,13 @@ private:
     std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
     std::string m_inviteUri;             // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
+    std::string m_headersForTarget;
+    SipParty m_called;                    // as far as its number has come
+    std::string m_provider;               // calling side: that was dialled
+    std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
+    std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
+    std::vector<Attempt> m_attempts;      // called side
+    bool m_isNumberOpen = false;          // called side: digits may follow
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has

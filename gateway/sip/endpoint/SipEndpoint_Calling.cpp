@@ -88,6 +88,10 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
     trace("-> 100");
     startExpiry(request);
+    m_called = called;
+    m_provider = provider;
+    if (isOverlapping())
+        awaitDigits();
     if (!dial(request, provider, called).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
     else if (!m_session.open())
@@ -156,6 +160,7 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
 {
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    m_firstOffer = isOverlapping() ? session : std::string();
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
@@ -178,7 +183,7 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
-                          true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
+                          !isOverlapping(), QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
 }
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)

@@ -28,6 +28,9 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     case sip_method_options:
         return m_interface.answerOptions(transaction);
     case sip_method_invite:
+        if (m_isCalling && isOverlapping() && request->sip_to->a_tag == nullptr) // the stack takes it for the dialog's
+            return onMoreDigits(transaction, request);
+        [[fallthrough]];
     case sip_method_update:
         return onOffer(transaction, request);
     case sip_method_info:

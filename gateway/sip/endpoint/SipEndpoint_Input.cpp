@@ -51,6 +51,8 @@ void SipEndpoint::onDigit(char digit, unsigned int milliseconds)
 /// One after the other, for INFOs may overtake each other.
 void SipEndpoint::onUserInput(CC_ServiceUserInput const& input)
 {
+    if (takeDigits(input))
+        return;
     for (char const digit : input.getInput().view())
         if (!m_session.sendDigit(digit, input.getDuration()) && m_digits.size() < MOST_WAITING)
             m_digits.emplace_back(digit, input.getDuration());
