@@ -208,6 +208,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "charges",
                    "overlap",
                    "digit-timeout",
                    "detect-digits",
@@ -245,6 +246,10 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                                               : SipStream::SECURED;
     interface.conference = section.text("conference", {});
     interface.ringsBack = section.flag("ringback");
+    std::string const charges = section.oneOf("charges", "off", {"off", "tell", "take"});
+    interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL
+                        : charges == "take" ? SipConfiguration::Charges::TAKE
+                                            : SipConfiguration::Charges::OFF;
     if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
         interface.overlap = SipConfiguration::Overlap::INVITE;
     interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);

@@ -23,6 +23,14 @@ struct SipConfiguration
         INVITE ///< each digit is another INVITE (RFC 3578)
     };
 
+    /// What calls cost: which of the two sides knows it.
+    enum class Charges
+    {
+        OFF,
+        TELL, ///< the peers are told
+        TAKE  ///< the peers tell
+    };
+
     std::string name;
     SocketAddress listen;
     SocketAddress advertise;  ///< what the peers are told instead of `listen`; port 0: nothing
@@ -62,6 +70,7 @@ struct SipConfiguration
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
     SipStream::Security security = SipStream::PLAIN; ///< SRTP towards the peer; where media are relayed
     std::string conference; ///< the number of the interface's conference; where media are relayed. Empty: none
+    Charges charges = Charges::OFF;
     Overlap overlap = Overlap::OFF;
     unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
     bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media

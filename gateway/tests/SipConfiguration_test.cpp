@@ -73,6 +73,7 @@ srtp = "required"
 ringback = true
 detect-digits = true
 overlap = "invite"
+charges = "take"
 digit-timeout = 4
 t1 = 100
 transports = ["tcp", "udp"]
@@ -104,6 +105,7 @@ answer-timeout = 30
     EXPECT_TRUE(b.detectsDigits);
     EXPECT_EQ(b.overlap, SipConfiguration::Overlap::INVITE);
     EXPECT_EQ(b.digitTimeout, 4u);
+    EXPECT_EQ(b.charges, SipConfiguration::Charges::TAKE);
     EXPECT_EQ(b.t1, 100u);
     EXPECT_EQ(b.t1x64, 3200u);
     EXPECT_EQ(b.answerTimeout, 30u);

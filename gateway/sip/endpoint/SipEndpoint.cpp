@@ -119,6 +119,7 @@ void SipEndpoint::followCall(CC_Flags const& flags)
 {
     traceFlags(flags);
     m_session.followCall();
+    followCharge(flags);
     if (isPeerReleased())
     {
         if (!m_isTransferring) // else our peer is to have the target

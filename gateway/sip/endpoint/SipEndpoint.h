@@ -236,8 +236,17 @@ private:
     // SipEndpoint_Input.cpp
     int onInfo(nta_incoming_t* transaction, sip_t const* request);
     void onUserInput(CC_ServiceUserInput const& input);
+    void sendInfo();
     void sendDigit();
     static int HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+
+    // SipEndpoint_Charge.cpp
+    bool takeCharge(sip_t const* request);
+    int onChargeInfo(nta_incoming_t* transaction, sip_t const* request);
+    bool tellsCharges() const;
+    void followCharge(CC_Flags const& flags);
+    std::string getFinalCharge() const;
+    void sendCharge();
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
@@ -360,6 +369,7 @@ private:
     bool m_isReplacing = false;    // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
     std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
+    std::string m_charge;                               // to be told
     nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;

@@ -183,6 +183,7 @@ bool SipEndpoint::startInvite()
 {
     std::string const hops = std::to_string(m_maxForwards);
     std::string const headers = m_inviteHeaders + m_sessionTimer.getRequestHeaders();
+    bool const takesCharges = m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE;
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
@@ -190,6 +191,7 @@ bool SipEndpoint::startInvite()
         m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
+        TAG_IF(takesCharges, SIPTAG_ACCEPT_STR("application/sdp, application/vnd.etsi.aoc+xml")),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
