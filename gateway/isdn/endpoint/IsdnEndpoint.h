@@ -111,6 +111,7 @@ private:
     void readUserUser(char const* text, CC_PropertyContainer& own);
     void onNotify(int indicator);
     void onDigits(char const* digits);
+    void endNumber();
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
     void tellHold();

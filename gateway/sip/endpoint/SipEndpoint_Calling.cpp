@@ -92,7 +92,11 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
     startExpiry(request);
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    m_firstOffer = isOverlapping() ? session : std::string();
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
+    m_called = SipIdentity::READ_CALLED(request);
+    if (isOverlapping())
+        awaitDigits();
     if (!dial(request, nullptr).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
     else if (!m_session.open())
@@ -160,8 +164,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
 XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
 {
     std::string const& provider = m_routes.getProvider();
-    SipParty const called =
-        m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : SipIdentity::READ_CALLED(request);
+    SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
@@ -183,7 +186,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
-                          true, QInformationTransferCapability::SPEECH, datapathContext, &own, &offer, &call);
+                          !isOverlapping(), QInformationTransferCapability::SPEECH, datapathContext, &own, &offer,
+                          &call);
 }
 
 /// Nobody was reached, and our peer has heard nothing: with a new leg in another call, but the same media, and as if
