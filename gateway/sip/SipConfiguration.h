@@ -5,7 +5,10 @@
 #include "platform/media/MG_Rtp.h"
 #include "sip/access/SipPasswords.h"
 #include "sip/dialog/SipStream.h"
+#include "sip/message/SipWay.h"
+#include "sip/stack/SipTlsSettings.h"
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
@@ -18,11 +21,14 @@ struct SipConfiguration
 {
     std::string name;
     SocketAddress listen;
-    SocketAddress advertise;  ///< what the peers are told instead of `listen`; port 0: nothing
-    SocketAddress peer;       ///< port 0: there is none, it calls registered users alone
-    bool usesTcp = false;     ///< towards the peer
-    bool listensOnUdp = true; ///< one of the two at least
+    SocketAddress advertise;       ///< what the peers are told instead of `listen`; port 0: nothing
+    SocketAddress peer;            ///< port 0: there is none, it calls registered users alone
+    SipWay::Way way = SipWay::UDP; ///< towards the peer
+    bool listensOnUdp = true;      ///< one of the three at least
     bool listensOnTcp = false;
+    bool listensOnTls = false;
+    std::uint16_t tlsPort = 5061;        ///< at the address of `listen`
+    SipTlsSettings tls;                  ///< of use where it listens on that
     std::vector<AddressRange> allow;     ///< who is served; empty: the peer's address alone
     unsigned int maxMessageSize = 65535; ///< octets
     unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
@@ -61,6 +67,11 @@ struct SipConfiguration
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
+    /// The same for what goes that way.
+    SocketAddress getAddress(SipWay::Way way) const
+    {
+        return SipWay::IS_SECURED(way) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
+    }
 
     /// Checked and with defaults filled in. `relaysMedia`: of use is only a media address that peers can reach. Throws
     /// ConfigurationError.

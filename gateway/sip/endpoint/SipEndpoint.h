@@ -14,6 +14,7 @@
 #include "sip/message/SipCause.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
+#include "sip/message/SipWay.h"
 
 #include <deque>
 #include <memory>
@@ -126,6 +127,7 @@ private:
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
     bool findContacts(std::string const& user);
+    bool findWay(CC_PropertyContainer const& offerProperties);
     bool tryNextContact(unsigned int status);
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
@@ -278,7 +280,7 @@ private:
     TYTimer m_timer; // calling side: a dial failed, the INVITE expires; called side: its answer or its end is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
-    bool m_isOverTcp = false;              // the dialog: where its Contact points
+    SipWay::Way m_way = SipWay::UDP;       // the dialog: where its Contact points
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;

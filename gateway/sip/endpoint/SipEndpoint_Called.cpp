@@ -113,11 +113,11 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    if (!findContacts(called.getUser()))
+    if (!findContacts(called.getUser()) || !findWay(offerProperties))
         return true;
     std::string const uri = m_contacts.empty()
-                                ? SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp)
-                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), false);
+                                ? SipAddress::MAKE_URI(called.getUser(), configuration.peer, m_way)
+                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), SipWay::UDP);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
     m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
                             SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
@@ -135,8 +135,24 @@ bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const&
     if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
         hops != nullptr && hops->getValue() != 0)
         m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
-    m_isOverTcp = configuration.usesTcp;
     return startInvite();
+}
+
+/// False: the caller asks for TLS on every hop (RFC 5630, 5.3), which this one has not, nor have registered contacts;
+/// the call is over.
+bool SipEndpoint::findWay(CC_PropertyContainer const& offerProperties)
+{
+    m_way = m_interface.getConfiguration().way;
+    if (offerProperties.get(SipPropertyId::SECURED) == nullptr)
+        return true;
+    if (SipWay::IS_SECURED(m_way) && m_contacts.empty())
+    {
+        m_way = SipWay::SIPS;
+        return true;
+    }
+    m_dialog = SipDialogState::OVER;
+    leaveCall({QCause::BEARER_CAPABILITY_NOT_PRESENTLY_AVAILABLE, 480, {}});
+    return false;
 }
 
 /// Where a user of the interface's realm has registered. False: he has not, or there is nobody of that name, and the

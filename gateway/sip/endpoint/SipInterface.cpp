@@ -56,17 +56,20 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_configuration(configuration)
     , m_name(configuration.name.c_str())
     , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
-    , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
-    , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
-    , m_focus(m_contact + ";isfocus")
-    , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
+    , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, m_tls.get(), HANDLE_MESSAGE, this))
     , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
 {
+    for (SipWay::Way const way : {SipWay::UDP, SipWay::TCP, SipWay::TLS, SipWay::SIPS})
+    {
+        std::string const uri = SipAddress::MAKE_URI("gateway", configuration.getAddress(way), way);
+        m_contacts[way] = SipAddress::MAKE_NAME_ADDR({}, uri);
+        m_focuses[way] = m_contacts[way] + ";isfocus";
+    }
     if (configuration.authenticates)
         m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
                                  configuration.passwords);

@@ -49,6 +49,9 @@ SipGuard::SipGuard(SipConfiguration const& configuration)
     , m_maxHeaderSize(configuration.maxHeaderSize)
     , m_connections(configuration.listen, m_allow, configuration.maxConnectionsPerSource)
 {
+    if (configuration.listensOnTls)
+        m_secured.emplace(SocketAddress{configuration.listen.host, configuration.tlsPort}, m_allow,
+                          configuration.maxConnectionsPerSource);
     s_guards.push_back(this);
 }
 

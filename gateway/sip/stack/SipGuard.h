@@ -5,6 +5,7 @@
 #include "sip/stack/Sofia.h"
 
 #include <cstddef>
+#include <optional>
 #include <vector>
 
 class SipStack;
@@ -36,7 +37,11 @@ public:
     /// Guards the agent's ports from now on.
     void watch(nta_agent_t* agent);
     Counters const& getCounters() const { return m_counters; }
-    ConnectionGuard const& getConnections() const { return m_connections; }
+    /// On all transports.
+    unsigned long long getNumberOfRefused() const
+    {
+        return m_connections.getNumberOfRefused() + (m_secured ? m_secured->getNumberOfRefused() : 0);
+    }
 
     /// Two messages go over a connection of the process with itself, on a free port of the `host`: throws
     /// std::runtime_error unless the stack then called every function that it should. Once per process.
@@ -60,6 +65,7 @@ private:
     std::size_t m_maxMessageSize;
     std::size_t m_maxHeaderSize;
     ConnectionGuard m_connections;
+    std::optional<ConnectionGuard> m_secured; // those of TLS
     std::vector<tport_t const*> m_ports;
     Counters m_counters;
 };
