@@ -122,13 +122,41 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
         section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
     if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
         section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
-    if (!section.has("peer") && section.flag("registrar"))
-        return;
-    interface.peer = READ_REACHABLE(section, "peer");
-    if (interface.peer.isVersion6() != interface.listen.isVersion6())
-        section.refuse("peer", "is not of the version of the internet protocol that listen is of");
-    if (interface.peer == interface.listen || interface.peer == interface.advertise)
-        section.refuse("peer", "is the interface itself");
+}
+
+SocketAddress READ_PEER(ConfigurationSection const& section, char const* key, SipConfiguration const& interface)
+{
+    SocketAddress const peer = READ_REACHABLE(section, key);
+    if (peer.isVersion6() != interface.listen.isVersion6())
+        section.refuse(key, "is not of the version of the internet protocol that listen is of");
+    if (peer == interface.listen || peer == interface.advertise)
+        section.refuse(key, "is the interface itself");
+    return peer;
+}
+
+/// One as `peer`, or several as tables.
+void READ_PEERS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    for (ConfigurationSection const& table : section.sections("peers"))
+    {
+        table.allow({"address", "priority", "weight"});
+        SipPeer const peer{READ_PEER(table, "address", interface), table.number("priority", 0, 0, 65535),
+                           table.number("weight", 1, 0, 65535)};
+        for (SipPeer const& other : interface.peers)
+            if (other.address == peer.address)
+                table.refuse("address", "is that of another peer");
+        interface.peers.push_back(peer);
+    }
+    if (!interface.peers.empty() && section.has("peer"))
+        section.refuse("peer", "is of no use with peers");
+    if (!interface.peers.empty())
+        interface.peer = interface.peers.front().address;
+    else if (section.has("peer") || !section.flag("registrar"))
+        interface.peer = READ_PEER(section, "peer", interface);
+    interface.probe = section.number("probe", interface.probe, 0, 3600);
+    interface.probeUp = section.number("probe-up", interface.probeUp, 1, 100);
+    interface.probeDown = section.number("probe-down", interface.probeDown, 1, 100);
+    interface.failoverAfter = section.number("failover-after", interface.failoverAfter, 0, 640000);
 }
 
 /// By the names that session descriptions have for them.
@@ -251,6 +279,11 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "listen",
                    "advertise",
                    "peer",
+                   "peers",
+                   "probe",
+                   "probe-up",
+                   "probe-down",
+                   "failover-after",
                    "trusted",
                    "user",
                    "passwords",
@@ -297,6 +330,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     SipConfiguration interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
+    READ_PEERS(section, interface);
     READ_TRANSPORTS(section, interface);
     READ_TLS(section, interface);
     READ_CREDENTIALS(section, interface);

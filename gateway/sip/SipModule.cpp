@@ -56,6 +56,12 @@ void SipModule::open(GatewayHost& host)
     for (auto const& port : m_ports)
         if (SipTls* const tls = port->interface.getTls())
             host.onReload.emplace_back([tls] { tls->reload(); });
+    for (auto const& port : m_ports)
+    {
+        SipPeers& peers = port->interface.getPeers();
+        host.onEnding.emplace_back([&peers] { peers.endProbing(); });
+        peers.startProbing();
+    }
     for (SipConfiguration const& configuration : m_configurations)
         if (host.relaysMedia && configuration.security == SipStream::SECURED && !SipWay::IS_SECURED(configuration.way))
             spdlog::warn("interface {}: srtp is required, but its keys go to the peer in the clear: transport is not "
@@ -102,6 +108,7 @@ std::string SipModule::describe() const
         text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
                             port->interface.getName().view(), guard.getCounters().strangers,
                             guard.getCounters().tooLarge, guard.getNumberOfRefused());
+        text += port->interface.getPeers().describe();
         if (SipTls const* const tls = port->interface.getTls())
             text += fmt::format("interface {}: {} connections of TLS, {} refused\n", port->interface.getName().view(),
                                 tls->getCounters().established, tls->getCounters().refused);

@@ -5,6 +5,7 @@
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/CallTrace.h"
 #include "platform/eventloop/TYTimer.h"
+#include "sip/access/SipPeers.h"
 #include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDialogState.h"
 #include "sip/dialog/SipDirectSession.h"
@@ -128,7 +129,12 @@ private:
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
     bool findContacts(std::string const& user);
     bool findWay(CC_PropertyContainer const& offerProperties);
+    bool findPeer();
+    bool tryAnother(unsigned int status, sip_t const* response);
     bool tryNextContact(unsigned int status);
+    bool tryNextPeer();
+    void noteHeard();
+    SocketAddress const& getPeerAddress() const;
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
@@ -137,6 +143,7 @@ private:
     void addTone(CC_PropertyContainer& own, bool isRinging);
     void addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding);
     void onRejected(unsigned int status, sip_t const* response);
+    void onCalledTimer();
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
     Fork* findFork(sip_t const* response);
@@ -322,7 +329,10 @@ private:
     std::string m_ownSession;            // what our peer has of us
     bool m_isRefresh = false;            // ours
     std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
-    std::string m_inviteUri;             // for an INVITE that is to be sent again
+    SipPeers::Order m_peers; // without contacts: whom the call is offered to, the one that is being tried first
+    String m_calledUser;
+    bool m_isUnheard = false; // that one has said nothing yet
+    std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done

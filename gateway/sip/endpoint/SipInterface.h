@@ -2,9 +2,9 @@
 
 #include "callcontrol/provider/CC_Provider.h"
 #include "platform/base/IpAddress.h"
-#include "platform/base/TYTime.h"
 #include "sip/SipConfiguration.h"
 #include "sip/access/SipAuthentication.h"
+#include "sip/access/SipPeers.h"
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -89,11 +89,11 @@ public:
     int answerOptions(nta_incoming_t* transaction) const;
     /// The endpoint with that dialog, on whatever interface; null when there is none that can be replaced.
     SipEndpoint* findReplaced(sip_replaces_t const* replaces) const;
-    /// The peer answered with 503 and Retry-After: until these seconds are over, 60 at most, no call goes to it, and
-    /// those that would get 503. The caller is not told the time: it would send us no call at all, also none for other
-    /// peers.
-    void leavePeerAlone(unsigned long seconds);
-    bool isPeerBusy() const;
+    /// A peer that answers with 503 and Retry-After is left alone for that time, and calls that nobody else takes get
+    /// 503. The caller is not told the time: it would send us no call at all, also none for other peers. @{
+    SipPeers& getPeers() { return m_peers; }
+    SipPeers const& getPeers() const { return m_peers; }
+    /// @}
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
     /// Clears those of one call alone; false: there are none.
@@ -131,6 +131,7 @@ private:
     std::unique_ptr<SipTls> m_tls; // null: none
     SipAgent m_agent;
     SipSender m_sender;
+    SipPeers m_peers;
     std::unique_ptr<SipRegistrar> m_registrar;
     std::unique_ptr<SipRegistration> m_registration;
     std::string m_knownUser; // of the request that is being looked at
@@ -144,5 +145,4 @@ private:
     std::unordered_map<SipEndpoint*, Owned> m_endpoints;
     std::vector<SipEndpoint*> m_finished;
     std::unique_ptr<SipFocus> m_conference; // null: none
-    TY::Time m_peerBusyUntil;
 };

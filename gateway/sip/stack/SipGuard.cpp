@@ -57,8 +57,12 @@ SipGuard::SipGuard(SipConfiguration const& configuration)
 
 std::vector<AddressRange> SipGuard::SERVED_BY(SipConfiguration const& configuration)
 {
-    return configuration.allow.empty() ? std::vector{AddressRange::PARSE(configuration.peer.host)}
-                                       : configuration.allow;
+    if (!configuration.allow.empty())
+        return configuration.allow;
+    std::vector<AddressRange> peers;
+    for (SipPeer const& peer : configuration.getPeers())
+        peers.push_back(AddressRange::PARSE(peer.address.host));
+    return peers;
 }
 
 SipGuard::~SipGuard() { std::erase(s_guards, this); }

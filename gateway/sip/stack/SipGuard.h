@@ -51,7 +51,7 @@ public:
     /// up a connection whose waiting octets do not fit beside what it has.
     static usize_t LIMIT_OF(SipConfiguration const& configuration);
 
-    /// Who may send: what `allow` says, or else the peer.
+    /// Who may send: what `allow` says, or else the peers.
     static std::vector<AddressRange> SERVED_BY(SipConfiguration const& configuration);
 
     // --- what the stack calls
