@@ -157,7 +157,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     advance(SipDialogState::INVITE_IN);
-    m_isOverTcp = SipRules::CAME_OVER_TCP(request);
+    m_way = SipRules::WAY_OF(request);
     return true;
 }
 
@@ -173,6 +173,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     CC_PropertyContainer offer;
     ADD(offer,
         CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, SipRules::MAX_FORWARDS_AFTER(request))); // else the default
+    if (request->sip_request->rq_url->url_type == url_sips)
+        ADD(offer, CC_PropertyBoolean(SipPropertyId::SECURED, true));
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
     if (isTraced())
