@@ -117,6 +117,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     for (auto const& [name, module] : m_modules)
         module->open(m_host);
     openControl();
+    openMetrics();
     if (m_media != nullptr)
         m_media->start();
 }
@@ -142,6 +143,26 @@ void Gateway::openControl()
     catch (std::runtime_error const& error)
     {
         throw ConfigurationError(m_configuration.file, "control.socket", error.what());
+    }
+}
+
+void Gateway::openMetrics()
+{
+    if (m_configuration.metrics.listen.port == 0)
+        return;
+    m_watch.tell([this](CallRecord const& record) { m_callMetrics.note(record); });
+    m_metrics = std::make_unique<GatewayMetrics>(m_host, m_modules, m_configuration.moduleOf, m_watch, m_callMetrics,
+                                                 m_records.get(), m_callControlLoop);
+    try
+    {
+        HttpServer::Pages const pages{{"/metrics", [this] {
+                                           return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
+                                       }}};
+        m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, pages);
+    }
+    catch (std::runtime_error const& error)
+    {
+        throw ConfigurationError(m_configuration.file, "metrics.listen", error.what());
     }
 }
 

@@ -9,6 +9,7 @@
 #include <vector>
 
 class ConfigurationSection;
+class MetricText;
 class SignallingLoop;
 struct Configuration;
 struct GatewayHost;
@@ -27,7 +28,7 @@ class SignallingModule
 {
 public:
     /// Changes whenever a module that was built before would not run any more.
-    static constexpr unsigned int VERSION = 2;
+    static constexpr unsigned int VERSION = 3;
 
     /// Ends what is still up without a word to the peers.
     virtual ~SignallingModule() = default;
@@ -46,6 +47,8 @@ public:
     virtual std::string describe() const = 0;
     /// Clears what it has in the call of that serial number with the cause; false: nothing.
     virtual bool clearCall(unsigned long long serial, QCause cause) = 0;
+    /// Families of its own for the gateway's figures, under names that begin with its own. Throws std::bad_alloc.
+    virtual void addMetrics(MetricText&) const {}
 };
 
 using SignallingModules = std::map<std::string, std::unique_ptr<SignallingModule>>; ///< by name
