@@ -107,7 +107,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
-    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_records.get(), *this)
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
     watchCalls();
@@ -127,6 +127,7 @@ void Gateway::watchCalls()
     m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
     if (m_records != nullptr)
         m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    m_watch.tell([this](CallRecord const& record) { m_tracer.onCallOver(record); });
     if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
         m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
     m_watch.watch(m_host.contextName);
@@ -197,6 +198,7 @@ void Gateway::onSignal()
             break;
         case SIGCHLD:
             m_dump.onChild();
+            m_tracer.onChild();
             if (m_control != nullptr)
                 m_control->onChild();
             break;

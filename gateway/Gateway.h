@@ -93,6 +93,7 @@ private:
     StateDump m_dump;
     std::unique_ptr<RecordWriter> m_records; // null where it is not configured
     CallMetrics m_callMetrics;
+    CallTracer m_tracer;
     CallWatch m_watch; // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;

@@ -6,6 +6,8 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <string_view>
+#include <utility>
 #include <vector>
 
 class ConfigurationSection;
@@ -13,6 +15,9 @@ class MetricText;
 class SignallingLoop;
 struct Configuration;
 struct GatewayHost;
+
+/// A line of a list: names, and the text of each.
+using StateRow = std::vector<std::pair<std::string_view, std::string>>;
 
 /// A signalling module of the gateway: the interfaces of one protocol. It lies in a shared object of its own,
 /// callcontrol-gateway-NAME.so, which is loaded when the configuration has [[NAME]], and is never unloaded. Modules do
@@ -49,6 +54,11 @@ public:
     virtual bool clearCall(unsigned long long serial, QCause cause) = 0;
     /// Families of its own for the gateway's figures, under names that begin with its own. Throws std::bad_alloc.
     virtual void addMetrics(MetricText&) const {}
+    /// For operators: whom its interfaces talk to, and who is registered, here or elsewhere. All rows of a list have
+    /// the same names. In a copy of the process, so they may be many. @{
+    virtual std::vector<StateRow> getPeers() const { return {}; }
+    virtual std::vector<StateRow> getRegistrations() const { return {}; }
+    /// @}
 };
 
 using SignallingModules = std::map<std::string, std::unique_ptr<SignallingModule>>; ///< by name

@@ -98,3 +98,13 @@ void IsdnModule::addMetrics(MetricText& text) const
     for (auto const& port : m_ports)
         text.add(port->interface.getChannels().getNumberOfFree(), {{"interface", port->interface.getName().view()}});
 }
+
+std::vector<StateRow> IsdnModule::getPeers() const
+{
+    std::vector<StateRow> rows;
+    for (auto const& port : m_ports)
+        rows.push_back({{"interface", std::string(port->interface.getName().view())},
+                        {"peer", port->interface.getConfiguration().line},
+                        {"state", port->interface.getLink().isUp() ? "up" : "down"}});
+    return rows;
+}

@@ -26,6 +26,7 @@ public:
     std::string describe() const override;
     bool clearCall(unsigned long long serial, QCause cause) override;
     void addMetrics(MetricText& text) const override;
+    std::vector<StateRow> getPeers() const override;
 
 private:
     struct Port

@@ -27,6 +27,8 @@ public:
     std::string describe() const override;
     bool clearCall(unsigned long long serial, QCause cause) override;
     void addMetrics(MetricText& text) const override;
+    std::vector<StateRow> getPeers() const override;
+    std::vector<StateRow> getRegistrations() const override;
 
 private:
     struct Port

@@ -41,6 +41,8 @@ public:
         for (auto const& known : m_calls)
             visitor(known.second.record, known.second.getAge());
     }
+    /// As the leg has it now; nothing where it has no record.
+    static std::optional<CallRecord::Quality> GET_QUALITY(CC_CallLeg const& leg);
     /// Calls of which nothing could be told: memory was out.
     unsigned long long getNumberOfLost() const { return m_lost; }
 

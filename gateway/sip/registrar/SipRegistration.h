@@ -31,6 +31,7 @@ public:
     bool isEnding() const { return m_state == ENDING; }
     /// Whether the provider has our contact.
     bool isBound() const;
+    long long getSecondsLeft() const; ///< 0: it is not
     /// A line for the dump.
     std::string describe() const;
 
