@@ -81,7 +81,7 @@ std::string MAKE_BINDING(SipConfiguration const& configuration, Transport const&
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard, SipTls* tls,
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, Means const& means,
                                  nta_message_f* onMessage, SipInterface* interface)
 {
     SipGuard::PROVE(stack, configuration.listen.host);
@@ -89,7 +89,8 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
     SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1),
                                     NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
                                     NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
-                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1), TAG_END()));
+                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1),
+                                    TAG_IF(means.resolver != nullptr, SRESTAG_RESOLV_CONF(means.resolver)), TAG_END()));
     for (Transport const& transport : {Transport{"udp", SipWay::UDP, configuration.listensOnUdp},
                                        Transport{"tcp", SipWay::TCP, configuration.listensOnTcp},
                                        Transport{"tls", SipWay::SIPS, configuration.listensOnTls}})
@@ -105,9 +106,9 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
                                        TPTAG_TIMEOUT(idle),
                                        TAG_IF(transport.way == SipWay::SIPS, TPTAG_CERTIFICATE(NO_FOLDER)), TAG_END());
         };
-        if (agent == nullptr || (transport.way == SipWay::SIPS ? tls->attach(open) : open()) < 0)
+        if (agent == nullptr || (transport.way == SipWay::SIPS ? means.tls->attach(open) : open()) < 0)
             throw std::runtime_error("cannot listen on " + listen.text() + " (" + transport.name + ")");
     }
-    guard.watch(agent.get());
+    means.guard.watch(agent.get());
     return agent;
 }
