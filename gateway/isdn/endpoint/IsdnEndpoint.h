@@ -3,6 +3,7 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
+#include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnParty.h"
 #include "isdn/endpoint/IsdnCallState.h"
 #include "isdn/endpoint/IsdnChannels.h"
@@ -138,6 +139,7 @@ private:
     unsigned int m_timeslot = IsdnChannels::NONE;
     int m_channelFlags = 0;            // of the channel that the wire asked for: how it was written
     bool m_isChannelConfirmed = false; // by the far side
+    IsdnBearer m_bearer;
     IsdnParty m_called;
     bool m_isNumberComplete = false;
     bool m_isInCall = false;

@@ -1,5 +1,4 @@
 // The calling side: the SETUP was received, the peer leg says how it is answered.
-#include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
@@ -58,6 +57,7 @@ bool IsdnEndpoint::takeRequestedChannel(int channel, bool isFlexible)
 
 void IsdnEndpoint::readSetup(pri_event_ring const& ring)
 {
+    m_bearer = IsdnBearer::OF(ring.ctype);
     m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
     if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
         m_called.number = ring.keypad_digits;
@@ -65,8 +65,6 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     IsdnProgress const progress = IsdnProgress::OF(ring.progressmask);
     ADD(m_own, CC_PropertyBoolean(CC_PropertyId::ENDPOINT_IS_ISDN, progress.isIsdn));
     ADD(m_own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
-    ADD(m_own, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
-                                                        IsdnBearer::OF(ring.ctype).capability));
     addCodecs(m_own);
     readCommands(ring.subcmds, m_own);
     readUserUser(ring.useruserinfo, m_own);
@@ -115,10 +113,7 @@ void IsdnEndpoint::dial(std::string const& provider, bool isComplete)
     String name;
     name.format("%u", m_callNumber);
     XCode result = m_adapter.setup(name, *this, this);
-    QInformationTransferCapability const bearer = VALUE_OF<CC_PropertyInformationTransferCapability>(
-        m_own.get(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY), CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY);
     m_isInCall = true;
-    m_own.remove(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY); // the call's, not a party's
     if (result.isOk())
         result = m_adapter.dial({.contextName = m_interface.getEnvironment().contextName,
                                  .providerName = STRING(provider),
@@ -127,7 +122,7 @@ void IsdnEndpoint::dial(std::string const& provider, bool isComplete)
                                             .typeOfNumber = m_called.type,
                                             .numberingPlan = m_called.plan},
                                  .sendingComplete = isComplete,
-                                 .informationTransferCapability = bearer,
+                                 .informationTransferCapability = m_bearer.capability,
                                  .extraOwnProperties = &m_own});
     if (!result.isOk())
         clear(QCause::NETWORK_OUT_OF_ORDER);

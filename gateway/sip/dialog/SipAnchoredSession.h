@@ -38,6 +38,7 @@ public:
 
     // --- SipSession
     unsigned int check(std::string const& offer) override;
+    QInformationTransferCapability getCapability() const override;
     bool open() override;
     void addOffer(CC_PropertyContainer& own, std::string const& description) override;
     void addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding) override;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/quality/MediaQuality.h"
+#include "platform/signalling/QInformationTransferCapability.h"
 
 #include <new>
 #include <optional>
@@ -51,6 +52,8 @@ public:
 
     /// Whether an INVITE's offer can be served at all; 0, or the status with which it is refused.
     virtual unsigned int check(std::string const& offer) = 0;
+    /// What the call has to carry by that offer.
+    virtual QInformationTransferCapability getCapability() const { return QInformationTransferCapability::SPEECH; }
     /// Takes what it needs in the call; whether there was any.
     virtual bool open() = 0;
     /// Our peer's offer in its INVITE, or in the answer to ours.

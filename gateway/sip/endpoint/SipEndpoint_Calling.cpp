@@ -183,7 +183,7 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
-                          !isOverlapping(), QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
+                          !isOverlapping(), m_session.getCapability(), nullptr, &own, &offer, &call);
 }
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
