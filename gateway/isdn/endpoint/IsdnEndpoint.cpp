@@ -98,6 +98,8 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
     {
         tellCharge(flags); // the last one goes with the end
         QCause const cause = m_adapter.getPeer(Key::CAUSE) ? m_adapter.getPeer(Key::CAUSE)->getCause() : QCause::NONE;
+        if (tryNextRoute(cause))
+            return;
         endWire(cause);
         leaveCall(cause);
         return;

@@ -3,6 +3,7 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
+#include "host/RouteHunt.h"
 #include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnParty.h"
 #include "isdn/endpoint/IsdnCallState.h"
@@ -73,7 +74,9 @@ private:
     void readSetup(pri_event_ring const& ring);
     void collect(std::string_view digits);
     void dialIfComplete(bool isComplete);
-    void dial(std::string const& provider, bool isComplete);
+    void dial(bool isComplete);
+    void placeCall(MG_IContext* datapathContext);
+    bool tryNextRoute(QCause cause);
     void requestDigits();
     void followPeer();
     void tellProgress(LegState::State state);
@@ -141,7 +144,9 @@ private:
     bool m_isChannelConfirmed = false; // by the far side
     IsdnBearer m_bearer;
     IsdnParty m_called;
+    std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
+    RouteHunt m_routes; // calling side
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;
@@ -151,6 +156,7 @@ private:
     std::string m_digits; // called side: not sent yet
     TYTimer m_timer;      // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
+    CC_PropertyContainer m_setup; // calling side: what the SETUP said
     std::unique_ptr<LegMedia> m_media;
     unsigned int m_mediaTimeslot = IsdnChannels::NONE;
     CC_CallAdapterE164 m_adapter; // last: silenced first

@@ -57,6 +57,7 @@ void IsdnEndpoint::onTimer()
 /// No further digit comes: who waits for the whole number has it now, whoever wants more gets none.
 void IsdnEndpoint::endNumber()
 {
+    m_isNumberComplete = true;
     std::ignore = m_adapter.setOwnSupportsOverlapSending(false);
     if (getPeerState() == LegState::ADDRESS_INCOMPLETE && m_adapter.getPeerSupportsOverlapReceiving())
         clear(QCause::INVALID_NUMBER_FORMAT);
@@ -142,6 +143,7 @@ void IsdnEndpoint::onDigits(char const* digits)
             collect(keyed);
             break;
         }
+        m_called.number += keyed; // for another route
         m_timer.start(m_interface.getLink().getTimers().t302);
         if (getPeerState() == LegState::ADDRESS_INCOMPLETE && !m_adapter.getPeerSupportsOverlapReceiving())
             m_hadPeer = false; // the adapter dials anew, and the new peer is not there at once

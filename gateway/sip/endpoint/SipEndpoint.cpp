@@ -170,6 +170,8 @@ void SipEndpoint::onPeerReleased()
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
+    if (tryNextRoute(cause))
+        return;
     endDialog(cause);
     leaveCall(cause);
 }

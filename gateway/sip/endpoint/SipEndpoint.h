@@ -4,6 +4,7 @@
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/CallTrace.h"
+#include "host/RouteHunt.h"
 #include "platform/eventloop/TYTimer.h"
 #include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDialogState.h"
@@ -47,10 +48,9 @@ public:
     SipEndpoint(SipInterface& interface, unsigned int callNumber);
     ~SipEndpoint() override;
 
-    /// The calling side: takes over a new INVITE and dials the called party on the provider. 0, or the status with
-    /// which the transaction is given up at once.
-    int receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                      SipParty const& called);
+    /// The calling side: takes over a new INVITE and dials the called party on the first of the routes, on the next one
+    /// when that reaches nobody. 0, or the status with which the transaction is given up at once.
+    int receiveInvite(nta_incoming_t* transaction, sip_t const* request, RouteHunt const& routes);
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
@@ -100,11 +100,11 @@ private:
     };
 
     // calling side: SipEndpoint_Calling.cpp
-    int takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                   SipParty const& called);
+    int takeInvite(nta_incoming_t* transaction, sip_t const* request);
     int refuseSession(nta_incoming_t* transaction);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
-    XCode dial(sip_t const* request, std::string const& provider, SipParty const& called);
+    XCode dial(sip_t const* request, MG_IContext* datapathContext);
+    bool tryNextRoute(SipCause const& cause);
     void startExpiry(sip_t const* request);
     void failDialLater(QCause cause);
     void onCallingTimer();
@@ -313,6 +313,7 @@ private:
     bool m_hasOffer = false;               // the INVITE carried a session description
     bool m_isOverTcp = false;              // the dialog: where its Contact points
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
+    RouteHunt m_routes;                    // calling side
     QCause m_dialFailure = QCause::NONE;
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
@@ -357,7 +358,6 @@ private:
     std::string m_inviteHeaders;
     std::string m_headersForTarget;
     SipParty m_called;                    // as far as its number has come
-    std::string m_provider;               // calling side: that was dialled
     std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
     std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
     std::vector<Attempt> m_attempts;      // called side

@@ -44,9 +44,13 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         trace("-> 484");
         return ADDRESS_INCOMPLETE; // the number was complete, or is shorter than what there is
     }
-    std::string const* const to =
-        m_interface.getEnvironment().host.routing.find(m_interface.getConfiguration().name, number);
-    if (to == nullptr || *to != m_provider || SESSION_OF(request) != m_firstOffer || request->sip_contact == nullptr ||
+    SipConfiguration const& configuration = m_interface.getConfiguration();
+    RouteHunt const routes = m_interface.getEnvironment().host.findRoutes(
+        configuration.name, number, SipIdentity::READ_CALLER(request, configuration.isTrusted).party.getUser(),
+        m_callNumber);
+    bool const isSameRoute = !routes.isEmpty() && routes.getProvider() == m_routes.getProvider() &&
+                             !routes.isNumberShaped() && !m_routes.isNumberShaped();
+    if (!isSameRoute || SESSION_OF(request) != m_firstOffer || request->sip_contact == nullptr ||
         !SipBody::READ(request).isUnderstood())
     {
         clear({QCause::INVALID_NUMBER_FORMAT, ADDRESS_INCOMPLETE, {}});

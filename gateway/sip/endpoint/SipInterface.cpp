@@ -37,10 +37,8 @@ constexpr unsigned long LONGEST_PAUSE = 60; // seconds
 /// Where the transaction's request came from.
 InternetAddress SOURCE_OF(nta_incoming_t* transaction)
 {
-    msg_t* const message = nta_incoming_getrequest(transaction);
-    InternetAddress const source = AddressRange::ADDRESS_OF(msg_addr(message)->su_sa);
-    msg_destroy(message);
-    return source;
+    SipHeldMessage const message(nta_incoming_getrequest(transaction));
+    return AddressRange::ADDRESS_OF(msg_addr(message.get())->su_sa);
 }
 
 std::optional<SipCredentials> CREDENTIALS_OF(SipConfiguration const& configuration)
@@ -236,10 +234,12 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
-    std::string const conference = isConference ? m_conference->getName().c_str() : "";
-    std::string const* const to =
-        isConference ? &conference : m_environment.host.routing.find(m_configuration.name, number);
-    if (to == nullptr)
+    RouteHunt const routes =
+        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number)
+                     : m_environment.host.findRoutes(
+                           m_configuration.name, number,
+                           SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser(), callNumber);
+    if (routes.isEmpty())
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
     try
@@ -252,7 +252,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         ++m_environment.host.counters.failed;
         return 503;
     }
-    return endpoint->receiveInvite(transaction, request, *to, called);
+    return endpoint->receiveInvite(transaction, request, routes);
 }
 
 SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const

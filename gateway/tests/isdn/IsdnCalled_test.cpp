@@ -216,7 +216,7 @@ TEST_F(IsdnCalledTest, ACallOfTheNetworkWinsTheChannel)
     open();
     call("4989123"); // on channel 1, still on its way
     FakeModule third("third");
-    provider = "third";
+    routes.front().to = "third";
     side->call("4930", true, 1, true);
     EXPECT_TRUE(watch.runUntil([&] { return third.getCall() != nullptr; }));
     settle();
