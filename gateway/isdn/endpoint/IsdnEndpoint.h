@@ -77,6 +77,7 @@ private:
     void dial(bool isComplete);
     void placeCall(MG_IContext* datapathContext);
     bool tryNextRoute(QCause cause);
+    bool tellByTone(QCause cause);
     void requestDigits();
     void followPeer();
     void tellProgress(LegState::State state);
@@ -146,7 +147,8 @@ private:
     IsdnParty m_called;
     std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
-    RouteHunt m_routes; // calling side
+    QCause m_failure = QCause::NONE; // calling side: of which a tone tells the far side first
+    RouteHunt m_routes;              // calling side
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;

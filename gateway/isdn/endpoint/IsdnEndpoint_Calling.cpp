@@ -3,6 +3,7 @@
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_PropertyKeys.h"
 
@@ -155,6 +156,23 @@ bool IsdnEndpoint::tryNextRoute(QCause cause)
     m_hadPeer = false;
     m_adapter.drop(cause, 0);
     placeCall(media.get());
+    return true;
+}
+
+/// The far side's user hears in the channel why his call fails before it is cleared: the stack sends no DISCONNECT that
+/// leaves the channel to tones.
+bool IsdnEndpoint::tellByTone(QCause cause)
+{
+    unsigned int const seconds = m_interface.getConfiguration().failureTone;
+    MG_Tones::ECallProgressTone::Type const tone = CauseTone::OF(cause);
+    if (!m_isCalling || seconds == 0 || m_media == nullptr || !m_bearer.isSpeech() ||
+        tone == MG_Tones::ECallProgressTone::NONE || advance(IsdnCallState::PROGRESS_OUT) != IsdnCallState::GO_ON)
+        return false;
+    m_failure = cause;
+    m_media->playTone(tone);
+    if (!std::exchange(m_hasToldData, true))
+        ask([&](pri* stack) { return pri_progress(stack, m_call, getChannel(), 1); });
+    m_timer.start(seconds * 1000);
     return true;
 }
 

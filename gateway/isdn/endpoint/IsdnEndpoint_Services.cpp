@@ -30,6 +30,11 @@ std::string DIGITS_OF(std::string_view text)
 
 void IsdnEndpoint::onTimer()
 {
+    if (m_failure != QCause::NONE)
+    {
+        clear(m_failure);
+        return;
+    }
     switch (m_state)
     {
     case IsdnCallState::OVERLAP_RECEIVING: // T302

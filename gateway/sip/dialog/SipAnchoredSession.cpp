@@ -342,10 +342,19 @@ void SipAnchoredSession::followTone()
     auto const* const asked =
         CC_PropertyCallProgressTone::FROM(m_adapter.getPeerProperty(CC_PropertyId::CALL_PROGRESS_TONE));
     auto const tone = asked != nullptr ? asked->getTone() : MG_Tones::ECallProgressTone::NONE;
-    if (m_leg == nullptr || !m_isAgreed || tone == m_tone)
+    if (m_leg == nullptr || !m_isAgreed || tone == m_tone || m_isToneOurs)
         return;
     m_tone = tone;
     m_leg->playTone(tone);
+}
+
+bool SipAnchoredSession::playTone(MG_Tones::ECallProgressTone::Type tone)
+{
+    if (m_leg == nullptr || !m_isAgreed)
+        return false;
+    m_isToneOurs = true;
+    m_leg->playTone(tone);
+    return true;
 }
 
 /// Who holds may be silent.

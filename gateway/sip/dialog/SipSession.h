@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/quality/MediaQuality.h"
+#include "platform/media/MG_Tones.h"
 #include "platform/signalling/QInformationTransferCapability.h"
 
 #include <new>
@@ -97,6 +98,8 @@ public:
     virtual void followCall() = 0;
     /// Whether our peer takes digits in INFO.
     virtual void noteInfo(bool isTaken) = 0;
+    /// From now on our peer hears that tone of ours and nothing else; whether it can.
+    virtual bool playTone(MG_Tones::ECallProgressTone::Type) { return false; }
     /// The other side's digit, for our peer: whether it goes there with the media; else the dialog is to tell it.
     virtual bool sendDigit(char digit, unsigned int milliseconds) = 0;
     /// Of the media until now; nothing without any.

@@ -19,7 +19,7 @@ speaks = "file"
 file = "$WORK/bits"
 record = "$WORK/bits.calling"
 length = 1000
-after = 300
+after = 800
 END
 
 session_of_bits() { # OWNER TYPES
@@ -75,7 +75,7 @@ start_exchange <<END
 [[call]]
 to = "4420"
 bearer = "digital"
-after = 0
+after = 800
 END
 start_isdn_gateway
 expect_log 'call 1 b .calling side, timeslot 31. released: cause 88 '
