@@ -1,5 +1,7 @@
 #include "configuration/Configuration.h"
 
+#include "media/tone/ToneTable.h"
+
 #include <algorithm>
 #include <array>
 #include <charconv>
@@ -35,7 +37,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
 
 void READ_MEDIA(ConfigurationSection const& section, Configuration& configuration)
 {
-    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp"});
+    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country"});
     MediaOptions& media = configuration.media;
     configuration.relaysMedia = section.oneOf("mode", "direct", {"direct", "relay"}) == "relay";
     media.firstPort = static_cast<unsigned short>(section.number("first-port", media.firstPort, 1024, 65534));
@@ -45,6 +47,10 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.threads = section.number("threads", media.threads, 1, 64);
     media.silence = section.number("silence", 0, 0, 86400);
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
+    media.country = section.text("country", media.country);
+    std::string reason;
+    if (!ToneTable().read(ToneTable::BUILT_IN(), media.country, reason))
+        section.refuse("country", reason);
 }
 
 /// Octal, as chmod has it.

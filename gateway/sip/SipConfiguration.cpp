@@ -348,6 +348,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "detect-digits",
                    "srtp",
                    "ringback",
+                   "failure-tone",
                    "conference",
                    "transfer",
                    "media-address",
@@ -381,6 +382,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                          : srtp == "optional" ? SipStream::OPTIONAL
                                               : SipStream::SECURED;
     interface.conference = section.text("conference", {});
+    interface.failureTone = section.number("failure-tone", interface.failureTone, 0, 60);
     interface.ringsBack = section.flag("ringback");
     std::string const charges = section.oneOf("charges", "off", {"off", "tell", "take"});
     interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL

@@ -93,6 +93,7 @@ struct SipConfiguration
     Charges charges = Charges::OFF;
     Overlap overlap = Overlap::OFF;
     unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
+    unsigned int failureTone = 0;   ///< seconds for which a caller hears why his call fails; 0: he does not
     bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media
     bool detectsDigits = false;     ///< in what its peers say; where media are relayed
     bool transfersOnWire = false;   ///< a peer that is to be transferred is sent REFER; else we dial for it

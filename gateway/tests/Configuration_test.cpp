@@ -57,7 +57,7 @@ TEST(Configuration, EveryKeyIsRead)
                     "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
                     "\"/r\"\nrecording-size = 4096\n"
                     "[media]\nmode = \"relay\"\nfirst-port = 30000\nlast-port = 30999\nthreads = 2\nsilence = 30\n"
-                    "dscp = 0\n") +
+                    "dscp = 0\ncountry = \"gb\"\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -76,6 +76,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.media.threads, 2u);
     EXPECT_EQ(configuration.media.silence, 30u);
     EXPECT_EQ(configuration.media.differentiation, 0u);
+    EXPECT_EQ(configuration.media.country, "gb");
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].from, "a");
     EXPECT_EQ(configuration.routes[0].prefix, "49");
@@ -105,8 +106,7 @@ TEST(Configuration, SaysForWhomWhenAndHowARouteIsTaken)
     EXPECT_EQ(configuration.routes[1].prefix, "112");
     EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"1\"\nnumber = \"2\"\n"),
               "f: route[0].number: and prefix exclude each other");
-    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"),
-              "f: route[0].strip: must be from 0 to 2");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"), "f: route[0].strip: must be from 0 to 2");
     EXPECT_EQ(COMPLAINT(interfaces + route + "days = [\"monday\"]\n"),
               "f: route[0].days: days are mon, tue, wed, thu, fri, sat, sun");
     EXPECT_EQ(COMPLAINT(interfaces + route + "hours = \"8-18\"\n"),

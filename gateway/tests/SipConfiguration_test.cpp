@@ -75,6 +75,7 @@ detect-digits = true
 overlap = "invite"
 charges = "take"
 digit-timeout = 4
+failure-tone = 3
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -105,6 +106,7 @@ answer-timeout = 30
     EXPECT_TRUE(b.detectsDigits);
     EXPECT_EQ(b.overlap, SipConfiguration::Overlap::INVITE);
     EXPECT_EQ(b.digitTimeout, 4u);
+    EXPECT_EQ(b.failureTone, 3u);
     EXPECT_EQ(b.charges, SipConfiguration::Charges::TAKE);
     EXPECT_EQ(b.t1, 100u);
     EXPECT_EQ(b.t1x64, 3200u);

@@ -94,11 +94,13 @@ void IsdnEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& fla
 
 void IsdnEndpoint::followCall(CC_Flags const& flags)
 {
+    if (m_failure != QCause::NONE)
+        return; // the far side is hearing of it
     if (isPeerReleased())
     {
         tellCharge(flags); // the last one goes with the end
         QCause const cause = m_adapter.getPeer(Key::CAUSE) ? m_adapter.getPeer(Key::CAUSE)->getCause() : QCause::NONE;
-        if (tryNextRoute(cause))
+        if (tryNextRoute(cause) || tellByTone(cause))
             return;
         endWire(cause);
         leaveCall(cause);
@@ -220,6 +222,7 @@ void IsdnEndpoint::lookForEnd()
 /// Takes the leg out of the call.
 void IsdnEndpoint::leaveCall(QCause cause)
 {
+    m_failure = QCause::NONE;
     if (m_state != IsdnCallState::CLEARING)
         m_timer.stop();
     if (!std::exchange(m_isInCall, false))

@@ -166,11 +166,13 @@ bool SipEndpoint::isPeerReleased() const
 
 void SipEndpoint::onPeerReleased()
 {
+    if (m_failure)
+        return; // our peer is hearing of it
     SipCause const cause =
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
-    if (tryNextRoute(cause))
+    if (tryNextRoute(cause) || tellByTone(cause))
         return;
     endDialog(cause);
     leaveCall(cause);

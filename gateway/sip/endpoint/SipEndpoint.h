@@ -107,6 +107,8 @@ private:
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, MG_IContext* datapathContext);
     bool tryNextRoute(SipCause const& cause);
+    bool tellByTone(SipCause const& cause);
+    void endByTone();
     void startExpiry(sip_t const* request);
     void failDialLater(QCause cause);
     void onCallingTimer();
@@ -324,6 +326,7 @@ private:
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     RouteHunt m_routes;                    // calling side
     QCause m_dialFailure = QCause::NONE;
+    std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_asksForTone = false;    // called side

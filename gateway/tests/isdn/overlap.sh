@@ -47,7 +47,7 @@ plan() {
     start_exchange <<END_OF_PLAN
 [[number]]
 number = "4989123"
-$(for call in "$@"; do printf '[[call]]\nto = "%s"\nfrom = "4989123"\noverlap = true\nafter = 300\n' "$call"; done)
+$(for call in "$@"; do printf '[[call]]\nto = "%s"\nfrom = "4989123"\noverlap = true\nafter = 800\n' "$call"; done)
 END_OF_PLAN
 }
 
