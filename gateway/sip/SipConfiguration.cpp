@@ -74,8 +74,8 @@ void READ_TLS(ConfigurationSection const& section, SipConfiguration& interface)
     }
     bool const isAlone = !interface.listensOnUdp && !interface.listensOnTcp;
     interface.tlsPort = static_cast<std::uint16_t>(
-        section.number("tls-port", isAlone ? interface.getAddress().port : interface.tlsPort, 1, 65535));
-    if (interface.listensOnTcp && interface.tlsPort == interface.getAddress().port)
+        section.number("tls-port", isAlone ? interface.listen.port : interface.tlsPort, 1, 65535));
+    if (interface.listensOnTcp && interface.tlsPort == interface.listen.port)
         section.refuse("tls-port", "is that of TCP");
     std::string const verify = section.oneOf("tls-verify", "name", {"name", "peer", "off"});
     SipTlsSettings& tls = interface.tls;

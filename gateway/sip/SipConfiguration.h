@@ -100,7 +100,9 @@ struct SipConfiguration
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
-    /// The same for what goes that way.
+    /// Where it listens for what comes that way.
+    std::uint16_t getPort(SipWay::Way way) const { return SipWay::IS_SECURED(way) ? tlsPort : listen.port; }
+    /// The address for what goes that way.
     SocketAddress getAddress(SipWay::Way way) const
     {
         return SipWay::IS_SECURED(way) ? SocketAddress{getAddress().host, tlsPort} : getAddress();

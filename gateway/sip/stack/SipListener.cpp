@@ -72,9 +72,11 @@ struct Transport
     bool isWanted;
 };
 
+/// With the address that the peers are told, which the stack writes into Via, and the port that is really listened on.
 std::string MAKE_BINDING(SipConfiguration const& configuration, Transport const& transport)
 {
-    std::string uri = SipAddress::MAKE_URI({}, configuration.getAddress(transport.way), transport.way);
+    SocketAddress const told = {configuration.getAddress().host, configuration.getPort(transport.way)};
+    std::string uri = SipAddress::MAKE_URI({}, told, transport.way);
     if (transport.way == SipWay::UDP)
         uri += ";transport=udp"; // and no other
     return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
@@ -97,7 +99,7 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
     {
         if (!transport.isWanted)
             continue;
-        SocketAddress const listen = {configuration.listen.host, configuration.getAddress(transport.way).port};
+        SocketAddress const listen = {configuration.listen.host, configuration.getPort(transport.way)};
         CHECK_PORT(listen, transport.way == SipWay::UDP ? SOCK_DGRAM : SOCK_STREAM, transport.name);
         auto const open = [&]
         {
