@@ -12,6 +12,8 @@
 #include "operation/StateDump.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
+#include "operation/metric/GatewayMetrics.h"
+#include "operation/metric/HttpServer.h"
 #include "operation/record/CallWatch.h"
 #include "operation/record/RecordWriter.h"
 #include "platform/eventloop/TYEventLoop.h"
@@ -71,6 +73,7 @@ private:
     bool hasEndpoints() const;
     void onHangUp();
     void openControl();
+    void openMetrics();
     void watchCalls();
     void follow(Configuration configuration);
     std::string getState() const;
@@ -89,7 +92,9 @@ private:
     Recording m_recording;
     StateDump m_dump;
     std::unique_ptr<RecordWriter> m_records; // null where it is not configured
-    CallWatch m_watch;                       // calls may last until call control ends
+    CallMetrics m_callMetrics;
+    CallTracer m_tracer;
+    CallWatch m_watch; // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;
@@ -98,5 +103,9 @@ private:
     bool m_isClearing = false;
     Modules m_modules;
     ControlCommands m_commands;
-    std::unique_ptr<ControlServer> m_control; // null where it is not configured; ends first
+    std::unique_ptr<ControlServer> m_control; // null where it is not configured
+    // null where they are not configured; they end first @{
+    std::unique_ptr<GatewayMetrics> m_metrics;
+    std::unique_ptr<HttpServer> m_pages;
+    // @}
 };

@@ -89,7 +89,19 @@ void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
         section.refuse("file", "is missing");
 }
 
-constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records"};
+/// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.
+void READ_METRICS(ConfigurationSection const& section, MetricOptions& metrics)
+{
+    section.allow({"listen"});
+    if (!section.has("listen"))
+        return;
+    metrics.listen = section.address("listen");
+    if (!AddressRange::CONTAINS({AddressRange::PARSE("127.0.0.0/8"), AddressRange::PARSE("::1")},
+                                AddressRange::PARSE(metrics.listen.host).getFirst()))
+        section.refuse("listen", "must be a loopback address");
+}
+
+constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records", "metrics"};
 
 /// Every table that is not the gateway's own is a module's.
 void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
@@ -133,6 +145,7 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     READ_MEDIA(root.section("media"), configuration);
     READ_CONTROL(root.section("control"), configuration.control);
     READ_RECORDS(root.section("records"), configuration.records);
+    READ_METRICS(root.section("metrics"), configuration.metrics);
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
         configuration.routes.push_back(Route::READ(route, configuration.interfaces));

@@ -36,6 +36,7 @@ struct GatewayHost
     std::function<bool()> mustRefuse{};            ///< no new calls as long as it says so; may be empty
     std::set<std::string> blocked{};               ///< interfaces that an operator has taken out of service
     std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
+    std::vector<std::function<void()>> onReload{}; ///< those that read files of theirs again with the configuration
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const

@@ -135,6 +135,22 @@ TEST(Configuration, SaysWhereAndForWhomItListensForOperators)
                   "f: control.mode: must be an octal number from 000 to 777, as a text: \"0660\"");
 }
 
+TEST(Configuration, SaysWhereFiguresAreToBeHad)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    EXPECT_EQ(Configuration::PARSE(interfaces, "f").metrics.listen.port, 0) << "nowhere, unless it is asked to";
+    EXPECT_EQ(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"127.0.0.2:9100\"\n", "f").metrics.listen.port,
+              9100);
+    EXPECT_EQ(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\n", "f").metrics.listen.host,
+              "::1");
+    for (char const* const address : {"0.0.0.0:9100", "192.0.2.1:9100", "[::]:9100", "[2001:db8::1]:9100"})
+        EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"" + address + "\"\n"),
+                  "f: metrics.listen: must be a loopback address");
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nport = 1\n"), "f: metrics.port: is not a key");
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"127.0.0.1\"\n"),
+              "f: metrics.listen: expected an address and a port, as in \"192.0.2.1:5060\"");
+}
+
 TEST(Configuration, SaysWhereRecordsOfCallsGo)
 {
     std::string const interfaces = TWO_INTERFACES;

@@ -65,7 +65,7 @@ void SipEndpoint::ON_TIMER(void* endpoint)
             if (self.m_dialog == SipDialogState::UP)
                 self.onUpTimer();
             else
-                self.m_isCalling ? self.onCallingTimer() : self.onAnswerTimeout();
+                self.m_isCalling ? self.onCallingTimer() : self.onCalledTimer();
         });
 }
 

@@ -6,6 +6,7 @@
 #include "host/CallTrace.h"
 #include "host/RouteHunt.h"
 #include "platform/eventloop/TYTimer.h"
+#include "sip/access/SipPeers.h"
 #include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDialogState.h"
 #include "sip/dialog/SipDirectSession.h"
@@ -15,6 +16,7 @@
 #include "sip/message/SipCause.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
+#include "sip/message/SipWay.h"
 
 #include <deque>
 #include <memory>
@@ -152,7 +154,13 @@ private:
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
     bool inviteNumber();
     bool findContacts(std::string const& user);
+    bool findWay(CC_PropertyContainer const& offerProperties);
+    bool findPeer();
+    bool tryAnother(unsigned int status, sip_t const* response);
     bool tryNextContact(unsigned int status);
+    bool tryNextPeer();
+    void noteHeard();
+    SocketAddress const& getPeerAddress() const;
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);
@@ -161,6 +169,7 @@ private:
     void addTone(CC_PropertyContainer& own, bool isRinging);
     void addSession(CC_PropertyContainer& own, std::string const& session, bool isBinding);
     void onRejected(unsigned int status, sip_t const* response);
+    void onCalledTimer();
     void onAnswerTimeout();
     void confirmDialog(sip_t const* response);
     Fork* findFork(sip_t const* response);
@@ -313,7 +322,7 @@ private:
     TYTimer m_timer; // calling side: a dial failed, the INVITE expires; called side: its answer or its end is awaited
     std::optional<SipCause> m_byeAfterAck; // the call ended while the ACK was outstanding
     bool m_hasOffer = false;               // the INVITE carried a session description
-    bool m_isOverTcp = false;              // the dialog: where its Contact points
+    SipWay::Way m_way = SipWay::UDP;       // the dialog: where its Contact points
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     RouteHunt m_routes;                    // calling side
     QCause m_dialFailure = QCause::NONE;
@@ -357,7 +366,9 @@ private:
     std::string m_ownSession;            // what our peer has of us
     bool m_isRefresh = false;            // ours
     std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
-    std::string m_inviteUri;             // for an INVITE that is to be sent again
+    SipPeers::Order m_peers;  // without contacts: whom the call is offered to, the one that is being tried first
+    bool m_isUnheard = false; // that one has said nothing yet
+    std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
     std::string m_headersForTarget;
     SipParty m_called;                    // as far as its number has come

@@ -93,13 +93,11 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
     startExpiry(request);
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    m_firstOffer = isOverlapping() ? session : std::string();
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     m_called = SipIdentity::READ_CALLED(request);
     if (isOverlapping())
-    {
-        m_firstOffer = session;
         awaitDigits();
-    }
-    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     if (!dial(request, nullptr).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
     else if (!m_session.open())
@@ -162,15 +160,14 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     advance(SipDialogState::INVITE_IN);
-    m_isOverTcp = SipRules::CAME_OVER_TCP(request);
+    m_way = SipRules::WAY_OF(request);
     return true;
 }
 
 XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
 {
     std::string const& provider = m_routes.getProvider();
-    SipParty const called =
-        m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : SipIdentity::READ_CALLED(request);
+    SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
@@ -179,6 +176,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     CC_PropertyContainer offer;
     ADD(offer,
         CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, SipRules::MAX_FORWARDS_AFTER(request))); // else the default
+    if (request->sip_request->rq_url->url_type == url_sips)
+        ADD(offer, CC_PropertyBoolean(SipPropertyId::SECURED, true));
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
     if (isTraced())

@@ -161,7 +161,7 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
 
 char const* SipEndpoint::getContact() const
 {
-    return (isInConference() ? m_interface.getFocusContact(m_isOverTcp) : m_interface.getContact(m_isOverTcp)).c_str();
+    return (isInConference() ? m_interface.getFocusContact(m_way) : m_interface.getContact(m_way)).c_str();
 }
 
 bool SipEndpoint::isInConference() const

@@ -44,10 +44,7 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         trace("-> 484");
         return ADDRESS_INCOMPLETE; // the number was complete, or is shorter than what there is
     }
-    SipConfiguration const& configuration = m_interface.getConfiguration();
-    RouteHunt const routes = m_interface.getEnvironment().host.findRoutes(
-        configuration.name, number, SipIdentity::READ_CALLER(request, configuration.isTrusted).party.getUser(),
-        m_callNumber);
+    RouteHunt const routes = m_interface.findRoutes(request, number, m_callNumber);
     bool const isSameRoute = !routes.isEmpty() && routes.getProvider() == m_routes.getProvider() &&
                              !routes.isNumberShaped() && !m_routes.isNumberShaped();
     if (!isSameRoute || SESSION_OF(request) != m_firstOffer || request->sip_contact == nullptr ||
@@ -56,6 +53,7 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         clear({QCause::INVALID_NUMBER_FORMAT, ADDRESS_INCOMPLETE, {}});
         return m_interface.handleRequest(nullptr, transaction, request);
     }
+    m_routes = routes;
     return joinDigits(transaction, request, number.substr(known.size()));
 }
 

@@ -281,9 +281,12 @@ void SipEndpoint::endTransfer(QCause cause)
 void SipEndpoint::refer(std::string const& number)
 {
     SipConfiguration const& configuration = m_interface.getConfiguration();
-    std::string const uri = SipAddress::MAKE_URI(
-        number, configuration.peer.port != 0 ? configuration.peer : configuration.getAddress(), configuration.usesTcp);
-    std::string const self = SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI(number,
+                                                 !m_peers.empty()               ? getPeerAddress()
+                                                 : configuration.peer.port != 0 ? configuration.peer
+                                                                                : configuration.getAddress(m_way),
+                                                 m_way);
+    std::string const self = SipAddress::MAKE_URI("gateway", configuration.getAddress(m_way), m_way);
     trace("-> REFER to " + uri);
     m_isTransferring = true;
     m_refer = m_interface.getSender().send(

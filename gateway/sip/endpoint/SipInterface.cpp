@@ -32,7 +32,6 @@ constexpr char const* ALLOW_OF_REGISTRAR =
     "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO, REGISTER";
 constexpr char const* SUPPORTED = "100rel, replaces, timer";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
-constexpr unsigned long LONGEST_PAUSE = 60; // seconds
 
 /// Where the transaction's request came from.
 InternetAddress SOURCE_OF(nta_incoming_t* transaction)
@@ -55,17 +54,21 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_configuration(configuration)
     , m_name(configuration.name.c_str())
     , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
-    , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
-    , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
-    , m_focus(m_contact + ";isfocus")
-    , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
+    , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, m_tls.get(), HANDLE_MESSAGE, this))
     , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
+    , m_peers(m_configuration, m_agent.get(), m_sender)
 {
+    for (SipWay::Way const way : {SipWay::UDP, SipWay::TCP, SipWay::TLS, SipWay::SIPS})
+    {
+        std::string const uri = SipAddress::MAKE_URI("gateway", configuration.getAddress(way), way);
+        m_contacts[way] = SipAddress::MAKE_NAME_ADDR({}, uri);
+        m_focuses[way] = m_contacts[way] + ";isfocus";
+    }
     if (configuration.authenticates)
         m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
                                  configuration.passwords);
@@ -223,6 +226,12 @@ int SipInterface::answerOptions(nta_incoming_t* transaction) const
     return hasRoom ? 200 : 503;
 }
 
+RouteHunt SipInterface::findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const
+{
+    std::string const calling = SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser();
+    return m_environment.host.findRoutes(m_configuration.name, number, calling, callNumber);
+}
+
 int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
@@ -235,10 +244,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
     RouteHunt const routes =
-        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number)
-                     : m_environment.host.findRoutes(
-                           m_configuration.name, number,
-                           SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser(), callNumber);
+        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number) : findRoutes(request, number, callNumber);
     if (routes.isEmpty())
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
@@ -314,23 +320,6 @@ bool SipInterface::admits(InternetAddress const& source)
     spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
                   m_environment.host.takesCallsFrom(m_configuration.name) ? "too many calls" : "none are taken now");
     return false;
-}
-
-void SipInterface::leavePeerAlone(unsigned long seconds)
-{
-    unsigned long const served = std::min(seconds, LONGEST_PAUSE);
-    m_peerBusyUntil = TY::Time::NOW(TY::Time::MONOTONIC);
-    m_peerBusyUntil.seconds += static_cast<decltype(m_peerBusyUntil.seconds)>(served);
-    spdlog::info("interface {}: the peer takes no calls, none is sent for {} s", m_configuration.name, served);
-}
-
-bool SipInterface::isPeerBusy() const
-{
-    if (m_peerBusyUntil.seconds == 0)
-        return false;
-    TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
-    return now.seconds < m_peerBusyUntil.seconds ||
-           (now.seconds == m_peerBusyUntil.seconds && now.nanoseconds < m_peerBusyUntil.nanoseconds);
 }
 
 void SipInterface::clearCalls(SipCause const& cause)

@@ -26,8 +26,24 @@ std::string ADDRESS_OF_RECORD(SipConfiguration const& configuration)
 /// Where a domain is named that is not the peer's own address, the peer is on the way there.
 std::string ROUTE_TO(SipConfiguration const& configuration)
 {
-    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.way);
     return configuration.domain == configuration.peer.text() ? std::string() : "<" + uri + ";lr>";
+}
+
+/// Of the registrar.
+std::string URI_OF(SipConfiguration const& configuration)
+{
+    switch (configuration.way)
+    {
+    case SipWay::TCP:
+        return "sip:" + configuration.domain + ";transport=tcp";
+    case SipWay::TLS:
+        return "sip:" + configuration.domain + ";transport=tls";
+    case SipWay::SIPS:
+        return "sips:" + configuration.domain;
+    default:
+        return "sip:" + configuration.domain;
+    }
 }
 
 bool IS_SAME(url_t const* one, char const* other)
@@ -44,9 +60,10 @@ SipRegistration::SipRegistration(SipConfiguration const& configuration, nta_agen
     : m_configuration(configuration)
     , m_sender(sender)
     , m_onOver(std::move(onOver))
-    , m_uri("sip:" + configuration.domain + (configuration.usesTcp ? ";transport=tcp" : ""))
+    , m_uri(URI_OF(configuration))
     , m_route(ROUTE_TO(configuration))
-    , m_contact(SipAddress::MAKE_URI(configuration.user, configuration.getAddress(), configuration.usesTcp))
+    , m_contact(
+          SipAddress::MAKE_URI(configuration.user, configuration.getAddress(configuration.way), configuration.way))
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
     , m_expires(configuration.registerExpires)
 {
@@ -214,10 +231,16 @@ bool SipRegistration::isBound() const
     return m_boundUntil.seconds != 0 && TY::Time::NOW(TY::Time::MONOTONIC).seconds < m_boundUntil.seconds;
 }
 
+long long SipRegistration::getSecondsLeft() const
+{
+    return isBound() ? static_cast<long long>(m_boundUntil.seconds) -
+                           static_cast<long long>(TY::Time::NOW(TY::Time::MONOTONIC).seconds)
+                     : 0;
+}
+
 std::string SipRegistration::describe() const
 {
-    std::string const state =
-        isBound() ? fmt::format("for {} s", m_boundUntil.seconds - TY::Time::NOW(TY::Time::MONOTONIC).seconds) : "not";
+    std::string const state = isBound() ? fmt::format("for {} s", getSecondsLeft()) : "not";
     return fmt::format("interface {}: registered {} as {}, {} requests, {} failures\n", m_configuration.name, state,
                        ADDRESS_OF_RECORD(m_configuration), m_sent, m_failed);
 }
