@@ -366,7 +366,7 @@ private:
     std::string m_ownSession;            // what our peer has of us
     bool m_isRefresh = false;            // ours
     std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
-    SipPeers::Order m_peers; // without contacts: whom the call is offered to, the one that is being tried first
+    SipPeers::Order m_peers;  // without contacts: whom the call is offered to, the one that is being tried first
     bool m_isUnheard = false; // that one has said nothing yet
     std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
