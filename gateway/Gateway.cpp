@@ -234,6 +234,8 @@ std::string Gateway::reload()
         if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
             throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
         follow(std::move(configuration));
+        for (auto const& readAgain : m_host.onReload)
+            readAgain();
         spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
         return {};
     }

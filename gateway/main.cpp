@@ -9,6 +9,7 @@
 #include <CLI/CLI.hpp>
 
 #include <cstdio>
+#include <ctime>
 #include <exception>
 #include <string>
 #include <unistd.h>
@@ -30,6 +31,7 @@ struct Arguments
     std::string logLevel;
     std::string routed; // the number of a dry run
     std::string from;
+    std::string calling;
     std::string modules = ModuleLoader::GET_INSTALLED_FOLDER();
 };
 
@@ -46,6 +48,7 @@ void DECLARE(CLI::App& app, Arguments& arguments)
     app.add_option("--trace-calls", arguments.tracedCalls, "Print a ladder of each of the first N calls");
     auto* const route = app.add_option("--route", arguments.routed, "Only tell where a call to this number leaves");
     app.add_option("--from", arguments.from, "The interface on which that call comes in")->needs(route);
+    app.add_option("--calling", arguments.calling, "The number of its caller")->needs(route);
     app.add_option("--modules", arguments.modules, "The folder of the signalling modules");
     app.add_option("--log-level", arguments.logLevel, "Instead of the configuration's log-level")
         ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
@@ -66,19 +69,18 @@ int SERVE(Configuration const& configuration, Gateway::Modules modules, unsigned
     return leftOver == 0 ? ALL_RIGHT : LEFT_OVERS;
 }
 
-/// Every route that fits, the one that is taken first.
+/// Every route for the number, the one that is taken first, and why the others are not.
 int TELL_ROUTE(Configuration const& configuration, Arguments const& arguments)
 {
     if (!configuration.interfaces.contains(arguments.from))
         return COMPLAIN(("there is no interface '" + arguments.from + "'").c_str());
+    Routing::Question question{arguments.from, arguments.routed, arguments.calling};
+    question.minuteOfWeek = WeekHours::MINUTE_OF(std::time(nullptr));
     Routing const routing(configuration.routes);
-    std::vector<Routing::Match> const matches = routing.findAll(arguments.from, arguments.routed);
-    if (matches.empty())
+    for (std::string const& line : routing.explain(question))
+        std::puts(line.c_str());
+    if (routing.find(question).empty())
         std::printf("%s from %s: no route, 404 with cause 3\n", arguments.routed.c_str(), arguments.from.c_str());
-    for (Routing::Match const& match : matches)
-        std::printf("%s from %s: prefix \"%s\" to %s%s\n", arguments.routed.c_str(), arguments.from.c_str(),
-                    std::string(match.prefix).c_str(), match.to.c_str(),
-                    &match == &matches.front() ? "" : " (not taken: a longer one fits)");
     return ALL_RIGHT;
 }
 

@@ -117,17 +117,6 @@ void READ_MODULES(ConfigurationSection const& root, Configuration& configuration
     if (configuration.interfaces.empty())
         throw ConfigurationError(configuration.file, "interfaces", "are missing: [[sip]] for one that speaks SIP");
 }
-
-Configuration::Route READ_ROUTE(ConfigurationSection const& section, std::set<std::string> const& interfaces)
-{
-    section.allow({"from", "prefix", "to"});
-    Configuration::Route route{section.neededText("from"), section.text("prefix", {}), section.neededText("to")};
-    if (!interfaces.contains(route.from))
-        section.refuse("from", "there is no interface '" + route.from + "'");
-    if (!interfaces.contains(route.to))
-        section.refuse("to", "there is no interface '" + route.to + "'");
-    return route;
-}
 } // namespace
 
 Configuration Configuration::READ(std::string const& file)
@@ -154,6 +143,6 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     READ_METRICS(root.section("metrics"), configuration.metrics);
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
-        configuration.routes.push_back(READ_ROUTE(route, configuration.interfaces));
+        configuration.routes.push_back(Route::READ(route, configuration.interfaces));
     return configuration;
 }

@@ -4,6 +4,7 @@
 #include "configuration/ControlOptions.h"
 #include "configuration/MetricOptions.h"
 #include "configuration/RecordOptions.h"
+#include "configuration/Route.h"
 #include "media/context/MediaOptions.h"
 
 #include <map>
@@ -22,14 +23,6 @@
 /// README.md lists the keys.
 struct Configuration
 {
-    /// Calls that come in on `from` to a number that begins with `prefix` leave on `to`.
-    struct Route
-    {
-        std::string from;
-        std::string prefix;
-        std::string to;
-    };
-
     std::string file;
     std::string context;                   ///< the call-control context; empty: its default
     std::string logLevel = "info";         ///< of spdlog

@@ -153,6 +153,27 @@ std::vector<std::string> ConfigurationSection::texts(char const* key, std::vecto
     return result;
 }
 
+std::vector<unsigned int> ConfigurationSection::numbers(char const* key, unsigned int least, unsigned int most) const
+{
+    toml::node const* const node = m_table->keys.get(key);
+    if (node == nullptr)
+        return {};
+    std::string const expected =
+        "expected a list of whole numbers from " + std::to_string(least) + " to " + std::to_string(most);
+    toml::array const* const list = node->as_array();
+    if (list == nullptr)
+        refuse(key, expected);
+    std::vector<unsigned int> result;
+    for (toml::node const& element : *list)
+    {
+        std::int64_t const value = element.value_exact<std::int64_t>().value_or(-1);
+        if (value < least || value > most)
+            refuse(key, expected);
+        result.push_back(static_cast<unsigned int>(value));
+    }
+    return result;
+}
+
 SocketAddress ConfigurationSection::address(char const* key) const
 {
     try

@@ -47,6 +47,8 @@ public:
     std::string oneOf(char const* key, char const* fallback, std::initializer_list<char const*> allowed) const;
     /// Of a list that, where it is, has one at least.
     std::vector<std::string> texts(char const* key, std::vector<std::string> fallback) const;
+    /// Of a list of whole numbers; none where it is not.
+    std::vector<unsigned int> numbers(char const* key, unsigned int least, unsigned int most) const;
     SocketAddress address(char const* key) const; ///< needed
     std::vector<AddressRange> ranges(char const* key) const;
 

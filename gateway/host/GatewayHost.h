@@ -3,12 +3,14 @@
 #include "host/Admission.h"
 #include "host/CallTrace.h"
 #include "host/Counters.h"
-#include "host/Routing.h"
+#include "host/RouteHunt.h"
 #include "platform/base/String.h"
 
+#include <ctime>
 #include <functional>
 #include <set>
 #include <string>
+#include <string_view>
 #include <vector>
 
 class SignallingLoop;
@@ -34,11 +36,19 @@ struct GatewayHost
     std::function<bool()> mustRefuse{};            ///< no new calls as long as it says so; may be empty
     std::set<std::string> blocked{};               ///< interfaces that an operator has taken out of service
     std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
+    std::vector<std::function<void()>> onReload{}; ///< those that read files of theirs again with the configuration
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const
     {
         return !isEnding && !isDraining && !isBlocked(interface) && (!mustRefuse || !mustRefuse());
+    }
+    /// By which routes a call that comes in there leaves now.
+    RouteHunt findRoutes(std::string_view from, std::string_view number, std::string_view calling,
+                         unsigned int callNumber) const
+    {
+        unsigned int const minute = WeekHours::MINUTE_OF(std::time(nullptr));
+        return {routing.find({from, number, calling, minute, callNumber}), number};
     }
     /// Whether no new call may come in or leave there.
     bool isBlocked(std::string const& interface) const { return blocked.contains(interface); }

@@ -1,64 +1,153 @@
 #include "host/Routing.h"
 
+#include <algorithm>
 #include <set>
 
 namespace
 {
-/// No name of an interface has a line break.
+constexpr char WHOLE = '\n'; // no number has a line break, nor has the name of an interface
+
 std::string KEY_OF(std::string_view from, std::string_view prefix)
 {
     std::string key;
-    key.reserve(from.size() + 1 + prefix.size());
+    key.reserve(from.size() + prefix.size() + 2);
     return key.append(from).append(1, '\n').append(prefix);
+}
+
+bool IS_FOR_CALLER(Route const& route, Routing::Question const& question)
+{
+    return question.calling.substr(0, route.calling.size()) == route.calling;
+}
+
+bool FITS(Route const& route, Routing::Question const& question)
+{
+    return IS_FOR_CALLER(route, question) && route.hours.contains(question.minuteOfWeek);
+}
+
+unsigned int WEIGHT_OF(Routing::Choices::const_iterator first, Routing::Choices::const_iterator end)
+{
+    unsigned int weight = 0;
+    for (; first != end; ++first)
+        weight += (*first)->weight;
+    return weight;
+}
+
+/// Numbers that follow each other, or every second one, become numbers that do not.
+unsigned int SPREAD(unsigned int number) { return (number * 2654435761u) >> 12; }
+
+/// Of routes for the same, one by its weight comes first; the others stay as they are listed.
+void CHOOSE(Routing::Choices::iterator first, Routing::Choices::iterator end, unsigned int chance)
+{
+    unsigned int const weight = WEIGHT_OF(first, end);
+    if (weight == 0)
+        return; // the first one listed
+    unsigned int left = SPREAD(chance) % weight;
+    Routing::Choices::iterator chosen = first;
+    for (; left >= (*chosen)->weight; ++chosen)
+        left -= (*chosen)->weight;
+    std::rotate(first, chosen, chosen + 1);
+}
+
+std::string DESCRIBE(Route const& route, Routing::Question const& question)
+{
+    std::string text = std::string(question.number) + " from " + route.from +
+                       (route.isWhole ? ": number \"" : ": prefix \"") + route.prefix + "\" to " + route.to;
+    if (route.isShaping())
+        text += " as " + route.shape(question.number);
+    return text;
+}
+
+std::string LIST(std::vector<unsigned int> const& causes)
+{
+    std::string text;
+    for (unsigned int const cause : causes)
+        text += (text.empty() ? "" : ", ") + std::to_string(cause);
+    return text;
+}
+
+std::string WHY_NOT_FIRST(Routing::Choices const& before, bool isForSame)
+{
+    if (!before.back()->nextOn.empty())
+        return " (tried when that ends with cause " + LIST(before.back()->nextOn) + ")";
+    return isForSame ? " (not taken: another one for the same is)" : " (not taken: a longer one fits)";
 }
 } // namespace
 
-Routing::Routing(std::vector<Configuration::Route> const& routes)
+Routing::Routing(std::vector<Route> const& routes)
 {
     std::set<std::size_t, std::greater<>> lengths;
-    m_targets.reserve(routes.size());
-    for (Configuration::Route const& route : routes)
+    m_routes.reserve(routes.size());
+    for (Route const& route : routes)
     {
-        m_targets.try_emplace(KEY_OF(route.from, route.prefix), route.to);
-        lengths.insert(route.prefix.size());
+        std::string key = KEY_OF(route.from, route.prefix);
+        if (route.isWhole)
+            key += WHOLE;
+        else
+            lengths.insert(route.prefix.size());
+        m_routes[std::move(key)].push_back(std::make_shared<Route const>(route));
     }
     m_lengths.assign(lengths.begin(), lengths.end());
+    for (auto const& [key, choices] : m_routes)
+        m_keys.push_back(key);
+    std::sort(m_keys.begin(), m_keys.end());
 }
 
 template <class Take>
-void Routing::forEach(std::string_view from, std::string_view number, Take&& take) const
+void Routing::forEach(Question const& question, Take&& take) const
 {
-    std::string const whole = KEY_OF(from, number);
+    std::string const key = KEY_OF(question.from, question.number) + WHOLE;
+    if (auto const whole = m_routes.find(key); whole != m_routes.end())
+        take(whole->second);
     for (std::size_t const length : m_lengths)
     {
-        if (length > number.size())
+        if (length > question.number.size())
             continue;
-        auto const found = m_targets.find(std::string_view(whole).substr(0, from.size() + 1 + length));
-        if (found != m_targets.end() && take(number.substr(0, length), found->second))
-            return;
+        auto const found = m_routes.find(std::string_view(key).substr(0, question.from.size() + 1 + length));
+        if (found != m_routes.end())
+            take(found->second);
     }
 }
 
-std::string const* Routing::find(std::string_view from, std::string_view number) const
+Routing::Choices Routing::find(Question const& question) const
 {
-    std::string const* result = nullptr;
-    forEach(from, number,
-            [&](std::string_view, std::string const& to)
+    Choices choices;
+    forEach(question,
+            [&](Choices const& routes)
             {
-                result = &to;
-                return true;
+                std::size_t const before = choices.size();
+                for (std::shared_ptr<Route const> const& route : routes)
+                    if (FITS(*route, question))
+                        choices.push_back(route);
+                CHOOSE(choices.begin() + static_cast<std::ptrdiff_t>(before), choices.end(), question.chance);
             });
-    return result;
+    return choices;
 }
 
-std::vector<Routing::Match> Routing::findAll(std::string_view from, std::string_view number) const
+bool Routing::isBeginning(std::string_view from, std::string_view number) const
 {
-    std::vector<Match> matches;
-    forEach(from, number,
-            [&](std::string_view prefix, std::string const& to)
+    std::string const key = KEY_OF(from, number);
+    auto const next = std::lower_bound(m_keys.begin(), m_keys.end(), key);
+    return next != m_keys.end() && next->starts_with(key);
+}
+
+std::vector<std::string> Routing::explain(Question const& question) const
+{
+    std::vector<std::string> lines;
+    Choices const choices = find(question);
+    for (std::size_t i = 0; i < choices.size(); ++i)
+    {
+        Choices const before(choices.begin(), choices.begin() + static_cast<std::ptrdiff_t>(i));
+        lines.push_back(DESCRIBE(*choices[i], question) +
+                        (i == 0 ? "" : WHY_NOT_FIRST(before, choices[i]->prefix == before.back()->prefix)));
+    }
+    forEach(question,
+            [&](Choices const& routes)
             {
-                matches.push_back({prefix, to});
-                return false;
+                for (std::shared_ptr<Route const> const& route : routes)
+                    if (!FITS(*route, question))
+                        lines.push_back(DESCRIBE(*route, question) + (IS_FOR_CALLER(*route, question)
+                                                                          ? " (not taken: it is for other hours)"
+                                                                          : " (not taken: it is for other callers)"));
             });
-    return matches;
+    return lines;
 }

@@ -1,34 +1,45 @@
 #pragma once
 
-#include "configuration/Configuration.h"
+#include "configuration/Route.h"
 
 #include <functional>
+#include <memory>
 #include <string>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
 
-/// Says on which interface a call leaves: of the routes of its interface, the one with the longest prefix of the called
-/// number; among equals the first. What it costs depends on the number's length, not on how many routes there are.
-/// Immutable; any thread.
+/// Says on which interface a call leaves: of the routes of its interface that fit, one for the whole number before one
+/// for its beginning, and the longest beginning first; among those for the same by their weights. What it costs depends
+/// on the number's length, not on how many routes there are. Immutable; any thread.
 ///
-///     std::string const* const to = routing.find("a", "4989123"); // null: no route
+///     Routing::Choices const routes = routing.find({.from = "a", .number = "4989123"});
+///     if (!routes.empty())
+///         ... // leaves on routes.front()->to
 class Routing
 {
 public:
-    /// A route that fits a number.
-    struct Match
+    /// What is known of a call that is to leave.
+    struct Question
     {
-        std::string_view prefix; ///< of the number that was asked for
-        std::string const& to;   ///< the name of the outgoing interface, which lives as long as the table
+        std::string_view from;
+        std::string_view number;
+        std::string_view calling{};
+        unsigned int minuteOfWeek = 0; ///< from Monday 00:00 on
+        unsigned int chance = 0;       ///< any number: calls with other ones are spread by the routes' weights
     };
+    /// The one that is taken first, and those that may be tried after it; none: no route fits.
+    using Choices = std::vector<std::shared_ptr<Route const>>;
 
-    explicit Routing(std::vector<Configuration::Route> const& routes);
+    explicit Routing(std::vector<Route> const& routes);
+    Routing(Routing&&) = default; // never copied: m_keys are of m_routes
+    Routing& operator=(Routing&&) = default;
 
-    /// Null when no route fits.
-    std::string const* find(std::string_view from, std::string_view number) const;
-    /// All that fit, the one that is taken first.
-    std::vector<Match> findAll(std::string_view from, std::string_view number) const;
+    Choices find(Question const& question) const;
+    /// Whether more digits could give the number a route.
+    bool isBeginning(std::string_view from, std::string_view number) const;
+    /// Every route for the number, in the order in which they are looked at: a line each that says what becomes of it.
+    std::vector<std::string> explain(Question const& question) const;
 
 private:
     struct Hash : std::hash<std::string_view>
@@ -36,10 +47,11 @@ private:
         using is_transparent = void;
     };
 
-    /// Tells `take` of each route that fits, the longest prefix first, until it says that it is enough.
+    /// Tells `take` of the routes for the whole number, then of those for each beginning of it, the longest first.
     template <class Take>
-    void forEach(std::string_view from, std::string_view number, Take&& take) const;
+    void forEach(Question const& question, Take&& take) const;
 
-    std::unordered_map<std::string, std::string, Hash, std::equal_to<>> m_targets; // by KEY_OF(from, prefix)
-    std::vector<std::size_t> m_lengths;                                            // of prefixes, the longest first
+    std::unordered_map<std::string, Choices, Hash, std::equal_to<>> m_routes; // by KEY_OF
+    std::vector<std::size_t> m_lengths;                                       // of prefixes, the longest first
+    std::vector<std::string_view> m_keys;                                     // of m_routes, in their order
 };

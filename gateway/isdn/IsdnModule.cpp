@@ -11,12 +11,6 @@ namespace
 {
 constexpr unsigned int PATIENCE = 10000; // milliseconds: T305 and T308 (Q.931, 9.2) with what the line takes
 
-std::string ROUTE(GatewayHost const& host, std::string const& from, std::string const& number)
-{
-    std::string const* const to = host.routing.find(from, number);
-    return to != nullptr ? *to : std::string();
-}
-
 unsigned int BEGIN_CALL(GatewayHost& host, std::string const& from)
 {
     if (!host.takesCallsFrom(from) || !host.admission.hasRoom(CallControl::GET_NUMBER_OF_CALLS()))
@@ -39,7 +33,8 @@ void IsdnModule::open(GatewayHost& host)
 {
     m_environment.emplace(IsdnEnvironment{
         host.loop, host.contextName,
-        [&host](std::string const& from, std::string const& number) { return ROUTE(host, from, number); },
+        [&host](std::string const& from, std::string const& number, std::string const& calling, unsigned int call)
+        { return host.findRoutes(from, number, calling, call); },
         [&host](std::string const& from) { return BEGIN_CALL(host, from); },
         [&host](std::string const& interface) { return host.isBlocked(interface); }, host.counters, host.relaysMedia,
         [&host]

@@ -3,6 +3,7 @@
 #include "configuration/ConfigurationSection.h"
 #include "media/context/MediaDescription.h"
 #include "sip/message/SipCodec.h"
+#include "sip/stack/SipTls.h"
 
 #include <algorithm>
 #include <limits>
@@ -14,21 +15,89 @@ constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 constexpr unsigned int LEAST_MESSAGE = 1024;   // octets
 constexpr unsigned int MOST_MESSAGE = 1 << 20; // of a stream; a datagram ends at 65535
 
+SipWay::Way WAY_OF(std::string const& transport)
+{
+    if (transport == "sips")
+        return SipWay::SIPS;
+    if (transport == "tls")
+        return SipWay::TLS;
+    return transport == "tcp" ? SipWay::TCP : SipWay::UDP;
+}
+
 /// Without `transports` an interface listens on what it speaks to its peer.
 void READ_TRANSPORTS(ConfigurationSection const& section, SipConfiguration& interface)
 {
-    std::string const towardsPeer = section.oneOf("transport", "udp", {"udp", "tcp"});
-    interface.usesTcp = towardsPeer == "tcp";
-    interface.listensOnUdp = interface.listensOnTcp = false;
+    interface.way = WAY_OF(section.oneOf("transport", "udp", {"udp", "tcp", "tls", "sips"}));
+    bool const isSecured = SipWay::IS_SECURED(interface.way);
+    char const* const towardsPeer = isSecured ? "tls" : interface.way == SipWay::TCP ? "tcp" : "udp";
+    interface.listensOnUdp = false;
     for (std::string const& transport : section.texts("transports", {towardsPeer}))
         if (transport == "udp")
             interface.listensOnUdp = true;
         else if (transport == "tcp")
             interface.listensOnTcp = true;
+        else if (transport == "tls")
+            interface.listensOnTls = true;
         else
-            section.refuse("transports", "must be some of udp, tcp");
-    if (!(interface.usesTcp ? interface.listensOnTcp : interface.listensOnUdp))
-        section.refuse("transports", "must have '" + towardsPeer + "', which is the peer's");
+            section.refuse("transports", "must be some of udp, tcp, tls");
+    if (!(isSecured                      ? interface.listensOnTls
+          : interface.way == SipWay::TCP ? interface.listensOnTcp
+                                         : interface.listensOnUdp))
+        section.refuse("transports", std::string("must have '") + towardsPeer + "', which is the peer's");
+}
+
+SipTlsSettings::Check READ_CHECK(ConfigurationSection const& section, char const* key, char const* fallback)
+{
+    std::string const text = section.oneOf(key, fallback, {"name", "peer", "off"});
+    return text == "name" ? SipTlsSettings::NAME : text == "peer" ? SipTlsSettings::PEER : SipTlsSettings::OFF;
+}
+
+void CHECK_NAMES(ConfigurationSection const& section, std::vector<std::string> const& names)
+{
+    for (std::string const& name : names)
+        if (name.empty() || name.find_first_of(" :/*@;?") != std::string::npos ||
+            name.find_first_not_of("0123456789.") == std::string::npos)
+            section.refuse("tls-names", "'" + name + "' is no name of a host");
+}
+
+/// The port where nothing else is listened on is that of `listen`.
+void READ_TLS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    constexpr char const* KEYS[] = {"tls-port",   "tls-certificate",    "tls-key",   "tls-authorities",
+                                    "tls-verify", "tls-verify-clients", "tls-names", "tls-version"};
+    if (!interface.listensOnTls)
+    {
+        for (char const* const key : KEYS)
+            if (section.has(key))
+                section.refuse(key, "is of no use without 'tls' in transports");
+        return;
+    }
+    bool const isAlone = !interface.listensOnUdp && !interface.listensOnTcp;
+    interface.tlsPort = static_cast<std::uint16_t>(
+        section.number("tls-port", isAlone ? interface.getAddress().port : interface.tlsPort, 1, 65535));
+    if (interface.listensOnTcp && interface.tlsPort == interface.getAddress().port)
+        section.refuse("tls-port", "is that of TCP");
+    std::string const verify = section.oneOf("tls-verify", "name", {"name", "peer", "off"});
+    SipTlsSettings& tls = interface.tls;
+    tls.ofServers = READ_CHECK(section, "tls-verify", "name");
+    tls.ofClients = READ_CHECK(section, "tls-verify-clients", verify.c_str());
+    tls.certificate = section.neededText("tls-certificate");
+    tls.key = section.neededText("tls-key");
+    tls.authorities = section.text("tls-authorities", {});
+    bool const verifies = tls.ofServers != SipTlsSettings::OFF || tls.ofClients != SipTlsSettings::OFF;
+    if (verifies && tls.authorities.empty())
+        section.refuse("tls-authorities", "is needed to verify certificates");
+    tls.names = section.texts("tls-names", {});
+    CHECK_NAMES(section, tls.names);
+    tls.isLeast13 = section.oneOf("tls-version", "1.2", {"1.2", "1.3"}) == "1.3";
+    try
+    {
+        SipTls::CHECK(tls);
+    }
+    catch (SipTlsSettings::Failure const& error)
+    {
+        section.refuse(error.key, error.what());
+    }
 }
 
 /// Where others find it: no address that is everybody's, or many's.
@@ -53,13 +122,41 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
         section.refuse("listen", "'" + interface.listen.host + "' is a multicast address");
     if (interface.advertise.port != 0 && interface.advertise.isVersion6() != interface.listen.isVersion6())
         section.refuse("advertise", "is not of the version of the internet protocol that listen is of");
-    if (!section.has("peer") && section.flag("registrar"))
-        return;
-    interface.peer = READ_REACHABLE(section, "peer");
-    if (interface.peer.isVersion6() != interface.listen.isVersion6())
-        section.refuse("peer", "is not of the version of the internet protocol that listen is of");
-    if (interface.peer == interface.listen || interface.peer == interface.advertise)
-        section.refuse("peer", "is the interface itself");
+}
+
+SocketAddress READ_PEER(ConfigurationSection const& section, char const* key, SipConfiguration const& interface)
+{
+    SocketAddress const peer = READ_REACHABLE(section, key);
+    if (peer.isVersion6() != interface.listen.isVersion6())
+        section.refuse(key, "is not of the version of the internet protocol that listen is of");
+    if (peer == interface.listen || peer == interface.advertise)
+        section.refuse(key, "is the interface itself");
+    return peer;
+}
+
+/// One as `peer`, or several as tables.
+void READ_PEERS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    for (ConfigurationSection const& table : section.sections("peers"))
+    {
+        table.allow({"address", "priority", "weight"});
+        SipPeer const peer{READ_PEER(table, "address", interface), table.number("priority", 0, 0, 65535),
+                           table.number("weight", 1, 0, 65535)};
+        for (SipPeer const& other : interface.peers)
+            if (other.address == peer.address)
+                table.refuse("address", "is that of another peer");
+        interface.peers.push_back(peer);
+    }
+    if (!interface.peers.empty() && section.has("peer"))
+        section.refuse("peer", "is of no use with peers");
+    if (!interface.peers.empty())
+        interface.peer = interface.peers.front().address;
+    else if (section.has("peer") || !section.flag("registrar"))
+        interface.peer = READ_PEER(section, "peer", interface);
+    interface.probe = section.number("probe", interface.probe, 0, 3600);
+    interface.probeUp = section.number("probe-up", interface.probeUp, 1, 100);
+    interface.probeDown = section.number("probe-down", interface.probeDown, 1, 100);
+    interface.failoverAfter = section.number("failover-after", interface.failoverAfter, 0, 640000);
 }
 
 /// By the names that session descriptions have for them.
@@ -182,6 +279,11 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "listen",
                    "advertise",
                    "peer",
+                   "peers",
+                   "probe",
+                   "probe-up",
+                   "probe-down",
+                   "failover-after",
                    "trusted",
                    "user",
                    "passwords",
@@ -199,6 +301,14 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "register-retry",
                    "transport",
                    "transports",
+                   "tls-port",
+                   "tls-certificate",
+                   "tls-key",
+                   "tls-authorities",
+                   "tls-verify",
+                   "tls-verify-clients",
+                   "tls-names",
+                   "tls-version",
                    "allow",
                    "max-message-size",
                    "max-header-size",
@@ -208,6 +318,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "charges",
+                   "overlap",
+                   "digit-timeout",
                    "detect-digits",
                    "srtp",
                    "ringback",
@@ -220,7 +333,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     SipConfiguration interface;
     interface.name = section.neededText("name");
     READ_ADDRESSES(section, interface);
+    READ_PEERS(section, interface);
     READ_TRANSPORTS(section, interface);
+    READ_TLS(section, interface);
     READ_CREDENTIALS(section, interface);
     READ_AUTHENTICATION(section, interface);
     interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
@@ -243,6 +358,13 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                                               : SipStream::SECURED;
     interface.conference = section.text("conference", {});
     interface.ringsBack = section.flag("ringback");
+    std::string const charges = section.oneOf("charges", "off", {"off", "tell", "take"});
+    interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL
+                        : charges == "take" ? SipConfiguration::Charges::TAKE
+                                            : SipConfiguration::Charges::OFF;
+    if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
+        interface.overlap = SipConfiguration::Overlap::INVITE;
+    interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);
     interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);

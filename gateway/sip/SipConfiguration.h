@@ -5,24 +5,58 @@
 #include "platform/media/MG_Rtp.h"
 #include "sip/access/SipPasswords.h"
 #include "sip/dialog/SipStream.h"
+#include "sip/message/SipWay.h"
+#include "sip/stack/SipTlsSettings.h"
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
 
 class ConfigurationSection;
 
+/// One of the peers of an interface.
+struct SipPeer
+{
+    SocketAddress address;
+    unsigned int priority = 0; ///< the least is tried first
+    unsigned int weight = 1;   ///< among those of one priority
+};
+
 /// One SIP interface, [[sip]] in the configuration: where it listens, and the peer to which its calls go. A plain
 /// value; README.md lists the keys.
 struct SipConfiguration
 {
+    /// What becomes of numbers that come digit by digit.
+    enum class Overlap
+    {
+        OFF,   ///< they are collected; an INVITE has the whole number
+        INVITE ///< each digit is another INVITE (RFC 3578)
+    };
+
+    /// What calls cost: which of the two sides knows it.
+    enum class Charges
+    {
+        OFF,
+        TELL, ///< the peers are told
+        TAKE  ///< the peers tell
+    };
+
     std::string name;
     SocketAddress listen;
-    SocketAddress advertise;  ///< what the peers are told instead of `listen`; port 0: nothing
-    SocketAddress peer;       ///< port 0: there is none, it calls registered users alone
-    bool usesTcp = false;     ///< towards the peer
-    bool listensOnUdp = true; ///< one of the two at least
+    SocketAddress advertise;        ///< what the peers are told instead of `listen`; port 0: nothing
+    SocketAddress peer;             ///< port 0: there is none, it calls registered users alone; of several the first
+    std::vector<SipPeer> peers{};   ///< where there are several
+    unsigned int probe = 0;         ///< seconds between OPTIONS to each peer; 0: none
+    unsigned int probeUp = 1;       ///< answers in a row, until a peer counts as there again
+    unsigned int probeDown = 2;     ///< probes in a row without an answer, until it does not
+    unsigned int failoverAfter = 0; ///< milliseconds without an answer, until another peer is tried; 0: t1x64
+    SipWay::Way way = SipWay::UDP;  ///< towards the peer
+    bool listensOnUdp = true;       ///< one of the three at least
     bool listensOnTcp = false;
+    bool listensOnTls = false;
+    std::uint16_t tlsPort = 5061;        ///< at the address of `listen`
+    SipTlsSettings tls;                  ///< of use where it listens on that
     std::vector<AddressRange> allow;     ///< who is served; empty: the peer's address alone
     unsigned int maxMessageSize = 65535; ///< octets
     unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
@@ -54,13 +88,26 @@ struct SipConfiguration
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
     SipStream::Security security = SipStream::PLAIN; ///< SRTP towards the peer; where media are relayed
-    std::string conference;       ///< the number of the interface's conference; where media are relayed. Empty: none
-    bool ringsBack = false;       ///< a caller hears a tone of ours while the callee is alerted without media
-    bool detectsDigits = false;   ///< in what its peers say; where media are relayed
-    bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
+    std::string conference; ///< the number of the interface's conference; where media are relayed. Empty: none
+    Charges charges = Charges::OFF;
+    Overlap overlap = Overlap::OFF;
+    unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
+    bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media
+    bool detectsDigits = false;     ///< in what its peers say; where media are relayed
+    bool transfersOnWire = false;   ///< a peer that is to be transferred is sent REFER; else we dial for it
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
+    /// The same for what goes that way.
+    SocketAddress getAddress(SipWay::Way way) const
+    {
+        return SipWay::IS_SECURED(way) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
+    }
+
+    std::vector<SipPeer> getPeers() const
+    {
+        return peers.empty() && peer.port != 0 ? std::vector{SipPeer{peer}} : peers;
+    }
 
     /// Checked and with defaults filled in. `relaysMedia`: of use is only a media address that peers can reach. Throws
     /// ConfigurationError.

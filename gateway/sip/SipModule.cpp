@@ -53,6 +53,20 @@ void SipModule::open(GatewayHost& host)
             host.onEnding.emplace_back([registration] { registration->end(); });
             registration->start();
         }
+    for (auto const& port : m_ports)
+        if (SipTls* const tls = port->interface.getTls())
+            host.onReload.emplace_back([tls] { tls->reload(); });
+    for (auto const& port : m_ports)
+    {
+        SipPeers& peers = port->interface.getPeers();
+        host.onEnding.emplace_back([&peers] { peers.endProbing(); });
+        peers.startProbing();
+    }
+    for (SipConfiguration const& configuration : m_configurations)
+        if (host.relaysMedia && configuration.security == SipStream::SECURED && !SipWay::IS_SECURED(configuration.way))
+            spdlog::warn("interface {}: srtp is required, but its keys go to the peer in the clear: transport is not "
+                         "tls",
+                         configuration.name);
     for (SipConfiguration const& configuration : m_configurations)
         spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
                      configuration.peer.port != 0 ? configuration.peer.text() : "nobody but who registers");
@@ -93,7 +107,11 @@ std::string SipModule::describe() const
         SipGuard const& guard = port->interface.getGuard();
         text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
                             port->interface.getName().view(), guard.getCounters().strangers,
-                            guard.getCounters().tooLarge, guard.getConnections().getNumberOfRefused());
+                            guard.getCounters().tooLarge, guard.getNumberOfRefused());
+        text += port->interface.getPeers().describe();
+        if (SipTls const* const tls = port->interface.getTls())
+            text += fmt::format("interface {}: {} connections of TLS, {} refused\n", port->interface.getName().view(),
+                                tls->getCounters().established, tls->getCounters().refused);
         if (SipCredentials const* const credentials = port->interface.getSender().getCredentials())
             text += fmt::format("interface {}: {} challenges answered, {} credentials not taken\n",
                                 port->interface.getName().view(), credentials->getCounters().answered,

@@ -85,7 +85,7 @@ void SipModule::addGuarded(MetricText& text) const
     text.begin("sip_large_messages_total", MetricText::COUNTER, "SIP messages that were too large");
     addOfEach(text, [](SipInterface const& one) { return one.getGuard().getCounters().tooLarge; });
     text.begin("sip_connections_refused_total", MetricText::COUNTER, "Connections that were not taken");
-    addOfEach(text, [](SipInterface const& one) { return one.getGuard().getConnections().getNumberOfRefused(); });
+    addOfEach(text, [](SipInterface const& one) { return one.getGuard().getNumberOfRefused(); });
 }
 
 void SipModule::addUsers(MetricText& text) const

@@ -32,10 +32,13 @@ std::vector<StateRow> SipModule::getPeers() const
     for (auto const& port : m_ports)
     {
         SipConfiguration const& configuration = port->interface.getConfiguration();
-        bool const hasPeer = configuration.peer.port != 0;
-        rows.push_back({{"interface", configuration.name},
-                        {"peer", hasPeer ? configuration.peer.text() : "(who registers)"},
-                        {"state", port->interface.isPeerBusy() ? "busy" : "called"}});
+        SipPeers const& peers = port->interface.getPeers();
+        for (std::size_t i = 0; i < peers.getNumberOfPeers(); ++i)
+            rows.push_back({{"interface", configuration.name},
+                            {"peer", peers.getAddress(i).text()},
+                            {"state", peers.getStateName(i)}});
+        if (peers.getNumberOfPeers() == 0)
+            rows.push_back({{"interface", configuration.name}, {"peer", "(who registers)"}, {"state", "up"}});
     }
     return rows;
 }

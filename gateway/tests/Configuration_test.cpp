@@ -82,6 +82,40 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.routes[0].to, "b");
 }
 
+TEST(Configuration, SaysForWhomWhenAndHowARouteIsTaken)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    std::string const route = "[[route]]\nfrom = \"a\"\nto = \"b\"\n";
+    Configuration const configuration = Configuration::PARSE(
+        interfaces + route +
+            "prefix = \"0049\"\ncalling = \"44\"\ndays = [\"mon\", \"fri\"]\nhours = \"08:00-18:00\"\nweight = 3\n"
+            "strip = 4\nprepend = \"0\"\nnext-on = [34, 38]\n" +
+            route + "number = \"112\"\n",
+        "f");
+    ASSERT_EQ(configuration.routes.size(), 2u);
+    Route const& first = configuration.routes[0];
+    EXPECT_FALSE(first.isWhole);
+    EXPECT_EQ(first.calling, "44");
+    EXPECT_EQ(first.hours, WeekHours::PARSE({"mon", "fri"}, "08:00-18:00"));
+    EXPECT_EQ(first.weight, 3u);
+    EXPECT_EQ(first.strip, 4u);
+    EXPECT_EQ(first.prepend, "0");
+    EXPECT_EQ(first.nextOn, (std::vector<unsigned int>{34, 38}));
+    EXPECT_TRUE(configuration.routes[1].isWhole);
+    EXPECT_EQ(configuration.routes[1].prefix, "112");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"1\"\nnumber = \"2\"\n"),
+              "f: route[0].number: and prefix exclude each other");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"),
+              "f: route[0].strip: must be from 0 to 2");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "days = [\"monday\"]\n"),
+              "f: route[0].days: days are mon, tue, wed, thu, fri, sat, sun");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "hours = \"8-18\"\n"),
+              "f: route[0].hours: expected hours as \"08:00-18:00\"");
+    for (char const* const causes : {"34", "[128]", "[0]", "[\"34\"]"})
+        EXPECT_EQ(COMPLAINT(interfaces + route + "next-on = " + causes + "\n"),
+                  "f: route[0].next-on: expected a list of whole numbers from 1 to 127");
+}
+
 TEST(Configuration, SaysWhereAndForWhomItListensForOperators)
 {
     std::string const interfaces = TWO_INTERFACES;

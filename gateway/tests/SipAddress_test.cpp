@@ -25,8 +25,10 @@ TEST(SipAddress, EscapedControlCharactersAreKeptAsTheyAre)
 
 TEST(SipAddress, UrisNameUserAddressAndTransport)
 {
-    EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5060}, false), "sip:49@192.0.2.1:5060");
-    EXPECT_EQ(SipAddress::MAKE_URI("", {"2001:db8::1", 1}, true), "sip:[2001:db8::1]:1;transport=tcp");
+    EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5060}, SipWay::UDP), "sip:49@192.0.2.1:5060");
+    EXPECT_EQ(SipAddress::MAKE_URI("", {"2001:db8::1", 1}, SipWay::TCP), "sip:[2001:db8::1]:1;transport=tcp");
+    EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5061}, SipWay::TLS), "sip:49@192.0.2.1:5061;transport=tls");
+    EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5061}, SipWay::SIPS), "sips:49@192.0.2.1:5061");
 }
 
 TEST(SipAddress, DisplayNamesAreQuoted)

@@ -34,7 +34,7 @@ char const* const LEAST = "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:5060\"\np
 TEST(SipConfiguration, WhatIsLeftOutHasItsDefault)
 {
     SipConfiguration const a = READ(LEAST).at(0);
-    EXPECT_FALSE(a.usesTcp);
+    EXPECT_EQ(a.way, SipWay::UDP);
     EXPECT_TRUE(a.listensOnUdp);
     EXPECT_FALSE(a.listensOnTcp);
     EXPECT_TRUE(a.allow.empty());
@@ -72,6 +72,9 @@ media-address = "192.0.2.9"
 srtp = "required"
 ringback = true
 detect-digits = true
+overlap = "invite"
+charges = "take"
+digit-timeout = 4
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -84,7 +87,7 @@ answer-timeout = 30
 )")
                                    .at(0);
     EXPECT_EQ(b.name, "b");
-    EXPECT_TRUE(b.usesTcp);
+    EXPECT_EQ(b.way, SipWay::TCP);
     EXPECT_TRUE(b.listensOnUdp);
     EXPECT_TRUE(b.listensOnTcp);
     EXPECT_EQ(b.allow.size(), 2u);
@@ -100,6 +103,9 @@ answer-timeout = 30
     EXPECT_EQ(b.security, SipStream::SECURED);
     EXPECT_TRUE(b.ringsBack);
     EXPECT_TRUE(b.detectsDigits);
+    EXPECT_EQ(b.overlap, SipConfiguration::Overlap::INVITE);
+    EXPECT_EQ(b.digitTimeout, 4u);
+    EXPECT_EQ(b.charges, SipConfiguration::Charges::TAKE);
     EXPECT_EQ(b.t1, 100u);
     EXPECT_EQ(b.t1x64, 3200u);
     EXPECT_EQ(b.answerTimeout, 30u);
@@ -169,7 +175,7 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "transports = []", "f: sip[0].transports: expected a list of texts"},
         {whole + "transports = \"tcp\"", "f: sip[0].transports: expected a list of texts"},
         {whole + "transports = [3]", "f: sip[0].transports: expected a list of texts"},
-        {whole + "transports = [\"sctp\"]", "f: sip[0].transports: must be some of udp, tcp"},
+        {whole + "transports = [\"sctp\"]", "f: sip[0].transports: must be some of udp, tcp, tls"},
         {whole + "transports = [\"tcp\"]", "f: sip[0].transports: must have 'udp', which is the peer's"},
         {whole + "allow = [\"host\"]", "f: sip[0].allow: 'host' is not an address"},
         {whole + "allow = [\"10.0.0.1/8\"]", "f: sip[0].allow: '10.0.0.1/8' has bits beyond its prefix"},
@@ -177,6 +183,31 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "srtp = \"on\"", "f: sip[0].srtp: must be one of off, optional, required"},
         {whole + "ringback = 1", "f: sip[0].ringback: expected true or false"},
         {whole + "conference = \"77\"", "f: sip[0].conference: needs media.mode \"relay\""},
+        {whole + "[[sip.peers]]\naddress = \"192.0.2.1:5060\"", "f: sip[0].peer: is of no use with peers"},
+        {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\npriority = 1", "f: sip[0].peers[0].address: is missing"},
+        {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\naddress = \"127.0.0.1:1\"",
+         "f: sip[0].peers[0].address: is the interface itself"},
+        {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\naddress = \"127.0.0.1:2\"\n[[sip.peers]]\naddress = "
+                 "\"127.0.0.1:2\"",
+         "f: sip[0].peers[1].address: is that of another peer"},
+        {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\naddress = \"127.0.0.1:2\"\nweight = 65536",
+         "f: sip[0].peers[0].weight: must be from 0 to 65535"},
+        {whole + "peers = [\"127.0.0.1:2\"]", "f: sip[0].peers: expected tables, [[peers]]"},
+        {whole + "probe = 3601", "f: sip[0].probe: must be from 0 to 3600"},
+        {whole + "transport = \"tls\"", "f: sip[0].tls-certificate: is missing"},
+        {whole + "transport = \"tls\"\ntls-certificate = \"c\"", "f: sip[0].tls-key: is missing"},
+        {whole + "transports = [\"udp\", \"tls\"]\ntls-certificate = \"c\"\ntls-key = \"k\"",
+         "f: sip[0].tls-authorities: is needed to verify certificates"},
+        {whole + "transport = \"sips\"\ntls-certificate = \"/no/c\"\ntls-key = \"k\"\ntls-verify = \"off\"",
+         "f: sip[0].tls-certificate: /no/c: cannot be read"},
+        {whole + "transport = \"tls\"\ntls-certificate = \"c\"\ntls-key = \"k\"\ntls-verify = \"off\"\n"
+                 "tls-names = [\"192.0.2.1\"]",
+         "f: sip[0].tls-names: '192.0.2.1' is no name of a host"},
+        {whole + "transports = [\"udp\", \"tcp\", \"tls\"]\ntls-port = 5060", "f: sip[0].tls-port: is that of TCP"},
+        {whole + "transport = \"tls\"\ntransports = [\"udp\"]",
+         "f: sip[0].transports: must have 'tls', which is the peer's"},
+        {whole + "tls-key = \"k\"", "f: sip[0].tls-key: is of no use without 'tls' in transports"},
+        {whole + "transport = \"tls\"\ntls-verify = \"no\"", "f: sip[0].tls-verify: must be one of name, peer, off"},
         {whole + "tcp-idle = 0", "f: sip[0].tcp-idle: must be from 1 to 86400"},
     };
     for (Row const& row : rows)

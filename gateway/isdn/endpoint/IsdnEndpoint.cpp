@@ -68,6 +68,8 @@ void IsdnEndpoint::take(pri_event& event)
         break;
     case PRI_EVENT_INFO_RECEIVED:
         onDigits(event.ring.callednum);
+        if (event.ring.complete != 0 && m_state == IsdnCallState::OVERLAP_RECEIVING && m_isInCall)
+            endNumber();
         break;
     case PRI_EVENT_KEYPAD_DIGIT:
         onDigits(event.digit.digits);
@@ -96,6 +98,8 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
     {
         tellCharge(flags); // the last one goes with the end
         QCause const cause = m_adapter.getPeer(Key::CAUSE) ? m_adapter.getPeer(Key::CAUSE)->getCause() : QCause::NONE;
+        if (tryNextRoute(cause))
+            return;
         endWire(cause);
         leaveCall(cause);
         return;
@@ -103,6 +107,8 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
     openMedia(); // the call may be another one
     if (m_isCalling)
         followPeer();
+    else if (m_state == IsdnCallState::NULL_STATE && !m_adapter.getPeerSupportsOverlapSending())
+        onTimer(); // no digit is to be waited for any more
     tellCharge(flags);
     tellHold();
 }

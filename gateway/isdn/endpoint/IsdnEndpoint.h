@@ -3,6 +3,7 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
+#include "host/RouteHunt.h"
 #include "isdn/element/IsdnParty.h"
 #include "isdn/endpoint/IsdnCallState.h"
 #include "isdn/endpoint/IsdnChannels.h"
@@ -72,7 +73,9 @@ private:
     void readSetup(pri_event_ring const& ring);
     void collect(std::string_view digits);
     void dialIfComplete(bool isComplete);
-    void dial(std::string const& provider, bool isComplete);
+    void dial(bool isComplete);
+    void placeCall(MG_IContext* datapathContext);
+    bool tryNextRoute(QCause cause);
     void requestDigits();
     void followPeer();
     void tellProgress(LegState::State state);
@@ -108,6 +111,7 @@ private:
     void readUserUser(char const* text, CC_PropertyContainer& own);
     void onNotify(int indicator);
     void onDigits(char const* digits);
+    void endNumber();
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
     void tellHold();
@@ -138,7 +142,9 @@ private:
     int m_channelFlags = 0;            // of the channel that the wire asked for: how it was written
     bool m_isChannelConfirmed = false; // by the far side
     IsdnParty m_called;
+    std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
+    RouteHunt m_routes; // calling side
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;
@@ -148,6 +154,7 @@ private:
     std::string m_digits; // called side: not sent yet
     TYTimer m_timer;      // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
+    CC_PropertyContainer m_setup; // calling side: what the SETUP said
     std::unique_ptr<LegMedia> m_media;
     unsigned int m_mediaTimeslot = IsdnChannels::NONE;
     CC_CallAdapterE164 m_adapter; // last: silenced first

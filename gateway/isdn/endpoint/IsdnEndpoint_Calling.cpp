@@ -4,6 +4,7 @@
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "properties/CC_Cause.h"
 #include "properties/CC_PropertyKeys.h"
 
 #include <spdlog/spdlog.h>
@@ -61,15 +62,17 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
     if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
         m_called.number = ring.keypad_digits;
-    IsdnParty::OF(ring.calling).addTo(m_own);
+    IsdnParty const calling = IsdnParty::OF(ring.calling);
+    m_calling = calling.getText();
+    calling.addTo(m_setup);
     IsdnProgress const progress = IsdnProgress::OF(ring.progressmask);
-    ADD(m_own, CC_PropertyBoolean(CC_PropertyId::ENDPOINT_IS_ISDN, progress.isIsdn));
-    ADD(m_own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
-    ADD(m_own, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
-                                                        IsdnBearer::OF(ring.ctype).capability));
-    addCodecs(m_own);
-    readCommands(ring.subcmds, m_own);
-    readUserUser(ring.useruserinfo, m_own);
+    ADD(m_setup, CC_PropertyBoolean(CC_PropertyId::ENDPOINT_IS_ISDN, progress.isIsdn));
+    ADD(m_setup, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
+    ADD(m_setup, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
+                                                          IsdnBearer::OF(ring.ctype).capability));
+    addCodecs(m_setup);
+    readCommands(ring.subcmds, m_setup);
+    readUserUser(ring.useruserinfo, m_setup);
 }
 
 void IsdnEndpoint::collect(std::string_view digits)
@@ -87,11 +90,11 @@ void IsdnEndpoint::dialIfComplete(bool isComplete)
 {
     m_isNumberComplete = m_isNumberComplete || isComplete;
     bool const mayDial = m_isNumberComplete || !m_interface.getConfiguration().collects;
-    std::string const provider =
-        mayDial ? m_interface.getEnvironment().route(m_interface.getConfiguration().name, m_called.getText())
-                : std::string();
-    if (!provider.empty())
-        dial(provider, m_isNumberComplete);
+    if (mayDial)
+        m_routes = m_interface.getEnvironment().findRoutes(m_interface.getConfiguration().name, m_called.getText(),
+                                                           m_calling, m_callNumber);
+    if (!m_routes.isEmpty())
+        dial(m_isNumberComplete);
     else if (!m_isNumberComplete)
         requestDigits();
     else
@@ -109,33 +112,56 @@ void IsdnEndpoint::requestDigits()
     m_timer.start(m_interface.getLink().getTimers().t302);
 }
 
-void IsdnEndpoint::dial(std::string const& provider, bool isComplete)
+void IsdnEndpoint::dial(bool isComplete)
 {
     m_timer.stop();
+    m_isInCall = true;
+    placeCall(nullptr);
+    if (m_isInCall && isComplete && advance(IsdnCallState::PROCEEDING_OUT) == IsdnCallState::GO_ON)
+        ask([&](pri* stack) { return pri_proceeding(stack, m_call, getChannel(), 0); });
+    else if (m_isInCall && !isComplete)
+        requestDigits();
+    openMedia();
+}
+
+/// What cannot be placed is cleared.
+void IsdnEndpoint::placeCall(MG_IContext* datapathContext)
+{
     String name;
     name.format("%u", m_callNumber);
     XCode result = m_adapter.setup(name, *this, this);
+    IsdnParty const called = m_routes.isNumberShaped() ? IsdnParty::OF_TEXT(m_routes.getNumber()) : m_called;
+    CC_PropertyContainer own = m_setup;
     QInformationTransferCapability const bearer = VALUE_OF<CC_PropertyInformationTransferCapability>(
-        m_own.get(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY), CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY);
-    m_isInCall = true;
-    m_own.remove(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY); // the call's, not a party's
+        own.get(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY), CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY);
+    own.remove(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY); // the call's, not a party's
     if (result.isOk())
-        result = m_adapter.dial({.contextName = m_interface.getEnvironment().contextName,
-                                 .providerName = STRING(provider),
-                                 .destination = STRING(m_called.getText()),
-                                 .called = {.number = STRING(m_called.number),
-                                            .typeOfNumber = m_called.type,
-                                            .numberingPlan = m_called.plan},
-                                 .sendingComplete = isComplete,
-                                 .informationTransferCapability = bearer,
-                                 .extraOwnProperties = &m_own});
+        result = m_adapter.dial(
+            {.contextName = m_interface.getEnvironment().contextName,
+             .providerName = STRING(m_routes.getProvider()),
+             .destination = STRING(called.getText()),
+             .called = {.number = STRING(called.number), .typeOfNumber = called.type, .numberingPlan = called.plan},
+             .sendingComplete = m_isNumberComplete,
+             .informationTransferCapability = bearer,
+             .datapathContext = datapathContext,
+             .extraOwnProperties = &own});
     if (!result.isOk())
         clear(QCause::NETWORK_OUT_OF_ORDER);
-    else if (isComplete && advance(IsdnCallState::PROCEEDING_OUT) == IsdnCallState::GO_ON)
-        ask([&](pri* stack) { return pri_proceeding(stack, m_call, getChannel(), 0); });
-    else if (!isComplete)
-        requestDigits();
-    openMedia();
+}
+
+/// Nobody was reached, and the wire has heard nothing of it: with a new leg in another call, but the same media.
+bool IsdnEndpoint::tryNextRoute(QCause cause)
+{
+    bool const isUntold = m_state == IsdnCallState::INCOMING_PROCEEDING && !m_hasToldData;
+    if (!m_isCalling || !isUntold || !m_routes.goOn(static_cast<unsigned int>(cause)))
+        return false;
+    spdlog::debug("call {} {} goes on to {} after cause {} ({})", m_callNumber, getName().view(),
+                  m_routes.getProvider(), static_cast<int>(cause), CAUSE_SHORT_NAME(cause));
+    TYPtr<MG_IContext> const media(m_adapter.getDatapathContext());
+    m_hadPeer = false;
+    m_adapter.drop(cause, 0);
+    placeCall(media.get());
+    return true;
 }
 
 /// Brings the SETUP's answers up to where the peer leg has come.

@@ -34,8 +34,8 @@ void IsdnEndpoint::onTimer()
     case IsdnCallState::OVERLAP_RECEIVING: // T302
         if (!m_isInCall)
             dialIfComplete(true);
-        else if (getPeerState() == LegState::ADDRESS_INCOMPLETE)
-            clear(QCause::INVALID_NUMBER_FORMAT);
+        else
+            endNumber();
         break;
     case IsdnCallState::NULL_STATE: // T302: no further digit has come from the other side
         std::ignore = m_adapter.setOwn(Key::STATE, LegState::TRYING);
@@ -51,6 +51,14 @@ void IsdnEndpoint::onTimer()
     default:
         clear(m_state == IsdnCallState::CALL_DELIVERED ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING);
     }
+}
+
+/// No further digit comes: who waits for the whole number has it now, whoever wants more gets none.
+void IsdnEndpoint::endNumber()
+{
+    std::ignore = m_adapter.setOwnSupportsOverlapSending(false);
+    if (getPeerState() == LegState::ADDRESS_INCOMPLETE && m_adapter.getPeerSupportsOverlapReceiving())
+        clear(QCause::INVALID_NUMBER_FORMAT);
 }
 
 void IsdnEndpoint::readCommands(pri_subcommands const* commands, CC_PropertyContainer& own)
@@ -134,6 +142,8 @@ void IsdnEndpoint::onDigits(char const* digits)
             break;
         }
         m_timer.start(m_interface.getLink().getTimers().t302);
+        if (getPeerState() == LegState::ADDRESS_INCOMPLETE && !m_adapter.getPeerSupportsOverlapReceiving())
+            m_hadPeer = false; // the adapter dials anew, and the new peer is not there at once
         [[fallthrough]];
     case IsdnCallState::GO_ON:
         if (m_isInCall && !keyed.empty())

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "host/Counters.h"
+#include "host/RouteHunt.h"
 #include "host/SignallingLoop.h"
 #include "platform/base/String.h"
 
@@ -12,8 +13,10 @@ struct IsdnEnvironment
 {
     SignallingLoop& watch;
     String contextName; ///< of call control
-    /// The provider that carries a call of that interface to that number; empty: none.
-    std::function<std::string(std::string const& from, std::string const& number)> route;
+    /// By which routes a call of that interface leaves.
+    std::function<RouteHunt(std::string const& from, std::string const& number, std::string const& calling,
+                            unsigned int callNumber)>
+        findRoutes;
     /// A new call from that interface: its number; 0: it is not admitted.
     std::function<unsigned int(std::string const& from)> beginCall;
     /// Whether that interface is out of service.

@@ -1,24 +1,11 @@
 #include "sip/access/SipSender.h"
 
+#include "sip/stack/SipHandles.h"
+
 #include <new>
 
 namespace
 {
-/// A message of a transaction, given back at the end.
-class Held
-{
-public:
-    explicit Held(msg_t* message) : m_message(message) {}
-    ~Held() { msg_destroy(m_message); }
-    Held(Held const&) = delete;
-    Held& operator=(Held const&) = delete;
-    msg_t* get() const { return m_message; }
-    sip_t* getSip() const { return sip_object(m_message); }
-
-private:
-    msg_t* m_message;
-};
-
 void GIVE_UP(nta_outgoing_t* request)
 {
     nta_outgoing_bind(request, nullptr, nullptr);
@@ -50,8 +37,8 @@ nta_outgoing_t* SipSender::sendAgain(nta_outgoing_t* old, sip_t const* response,
 {
     if (!m_credentials || old == nullptr || response == nullptr)
         return nullptr;
-    Held const request(nta_outgoing_getrequest(old));
-    if (leg == nullptr || request.get() == nullptr || !m_credentials->take(request.getSip(), response, tries))
+    SipHeldMessage const request(nta_outgoing_getrequest(old));
+    if (leg == nullptr || request.get() == nullptr || !m_credentials->take(sip_object(request.get()), response, tries))
     {
         tries = 0;
         return nullptr;
@@ -75,8 +62,8 @@ nta_outgoing_t* SipSender::sendAgain(nta_outgoing_t* old, sip_t const* response,
 
 msg_t* SipSender::addCredentialsOf(nta_outgoing_t* invite, msg_t* message)
 {
-    Held const request(invite != nullptr ? nta_outgoing_getrequest(invite) : nullptr);
-    sip_t const* const from = request.getSip();
+    SipHeldMessage const request(invite != nullptr ? nta_outgoing_getrequest(invite) : nullptr);
+    sip_t const* const from = sip_object(request.get());
     if (from == nullptr)
         return message;
     for (msg_auth_t const* const header : {from->sip_authorization, from->sip_proxy_authorization})

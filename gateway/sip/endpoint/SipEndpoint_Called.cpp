@@ -95,7 +95,7 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
     if (isTraced())
         trace("did  accept as " + called.getText() + ", State=TRYING");
     bool const isOutOfService = m_interface.getEnvironment().host.isBlocked(m_interface.getConfiguration().name);
-    if (isOutOfService || m_interface.isPeerBusy())
+    if (isOutOfService)
         clear({QCause::TEMPORARY_FAILURE, 503, {}});
     else if (!m_session.open())
         clear({QCause::RESOURCE_UNAVAILABLE, 503, {}});
@@ -108,35 +108,59 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties)
 {
-    SipConfiguration const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
-    SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    if (!findContacts(called.getUser()))
+    if (!findContacts(called.getUser()) || !findWay(offerProperties) || !findPeer())
         return true;
+    if (forTarget != nullptr)
+        m_headersForTarget = FOR_PEER(forTarget->getValue().view(), m_interface.getConfiguration().isTrusted);
+    m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
+    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
+        hops != nullptr && hops->getValue() != 0)
+        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
+    m_called = called;
+    return beginNumber();
+}
+
+/// An INVITE for the number as far as it is known.
+bool SipEndpoint::inviteNumber()
+{
+    SipConfiguration const& configuration = m_interface.getConfiguration();
+    SipParty const& called = m_called;
+    SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
     std::string const uri = m_contacts.empty()
-                                ? SipAddress::MAKE_URI(called.getUser(), configuration.peer, configuration.usesTcp)
-                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), false);
+                                ? SipAddress::MAKE_URI(called.getUser(), getPeerAddress(), m_way)
+                                : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), SipWay::UDP);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
-    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
-                            SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
-                            SIPTAG_TO_STR(to.c_str()), TAG_END());
-    if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
+    char const* const tag = m_leg != nullptr ? nta_leg_get_tag(m_leg) : nullptr;
+    m_leg = makeClientLeg(caller.getFrom(configuration.getAddress()), to);
+    if (m_leg == nullptr || nta_leg_tag(m_leg, tag) == nullptr)
         return false;
     SipDiversion const diversion = SipDiversion::OF_PEER(m_adapter);
     m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
     if (configuration.isTrusted || !diversion.isRestricted())
         m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
-    if (forTarget != nullptr)
-        m_inviteHeaders += FOR_PEER(forTarget->getValue().view(), configuration.isTrusted);
+    m_inviteHeaders += m_headersForTarget;
     m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
-    m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
-    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
-        hops != nullptr && hops->getValue() != 0)
-        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
-    m_isOverTcp = configuration.usesTcp;
     return startInvite();
+}
+
+/// False: the caller asks for TLS on every hop (RFC 5630, 5.3), which this one has not, nor have registered contacts;
+/// the call is over.
+bool SipEndpoint::findWay(CC_PropertyContainer const& offerProperties)
+{
+    m_way = m_interface.getConfiguration().way;
+    if (offerProperties.get(SipPropertyId::SECURED) == nullptr)
+        return true;
+    if (SipWay::IS_SECURED(m_way) && m_contacts.empty())
+    {
+        m_way = SipWay::SIPS;
+        return true;
+    }
+    m_dialog = SipDialogState::OVER;
+    leaveCall({QCause::BEARER_CAPABILITY_NOT_PRESENTLY_AVAILABLE, 480, {}});
+    return false;
 }
 
 /// Where a user of the interface's realm has registered. False: he has not, or there is nobody of that name, and the
@@ -158,11 +182,56 @@ bool SipEndpoint::findContacts(std::string const& user)
     return false;
 }
 
+/// False: no peer takes calls now, and the call is over.
+bool SipEndpoint::findPeer()
+{
+    if (!m_contacts.empty())
+        return true;
+    m_peers = m_interface.getPeers().choose();
+    if (!m_peers.empty())
+    {
+        m_interface.getPeers().noteCall(m_peers.front());
+        return true;
+    }
+    m_dialog = SipDialogState::OVER;
+    leaveCall({QCause::TEMPORARY_FAILURE, 503, {}});
+    return false;
+}
+
+SocketAddress const& SipEndpoint::getPeerAddress() const { return m_interface.getPeers().getAddress(m_peers.front()); }
+
+bool SipEndpoint::tryAnother(unsigned int status, sip_t const* response)
+{
+    bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
+    if (m_dialog != SipDialogState::INVITE_SENT)
+        return false;
+    if (!m_contacts.empty())
+        return tryNextContact(status);
+    if (!isOurs && status == 503 && response->sip_retry_after != nullptr)
+        m_interface.getPeers().leaveAlone(m_peers.front(), response->sip_retry_after->af_delta);
+    return (isOurs || status == 503 || status == 408) && tryNextPeer();
+}
+
+/// Another peer, when one of them does not take the call or is not there (RFC 3263, 4.3). Whether there is one; a call
+/// that has rung, or whose caller has heard something, rings nowhere else.
+bool SipEndpoint::tryNextPeer()
+{
+    m_interface.getPeers().noteFailure(m_peers.front());
+    if (m_peers.size() < 2 || m_hasRung || m_hasEarlyMedia || !m_forks.empty())
+        return false;
+    m_peers.erase(m_peers.begin());
+    m_interface.getPeers().noteCall(m_peers.front());
+    m_inviteUri = SipAddress::MAKE_URI(m_called.getUser(), getPeerAddress(), m_way);
+    m_invite.forget();
+    m_negotiation.fail();
+    return startInvite();
+}
+
 /// Another contact of the user, when one of them does not want the call or is not there (RFC 3261, 16.5: one after the
 /// other). Whether there is one; a user who has declined it has done so everywhere.
 bool SipEndpoint::tryNextContact(unsigned int status)
 {
-    if (m_contacts.size() < 2 || status >= 600 || m_dialog != SipDialogState::INVITE_SENT)
+    if (m_contacts.size() < 2 || status >= 600)
         return false;
     m_contacts.erase(m_contacts.begin());
     m_inviteUri = m_contacts.front();
@@ -175,6 +244,7 @@ bool SipEndpoint::startInvite()
 {
     std::string const hops = std::to_string(m_maxForwards);
     std::string const headers = m_inviteHeaders + m_sessionTimer.getRequestHeaders();
+    bool const takesCharges = m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE;
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
@@ -182,6 +252,7 @@ bool SipEndpoint::startInvite()
         m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
+        TAG_IF(takesCharges, SIPTAG_ACCEPT_STR("application/sdp, application/vnd.etsi.aoc+xml")),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
@@ -189,7 +260,9 @@ bool SipEndpoint::startInvite()
         return false;
     m_invite.sequence = nta_leg_get_seq(m_leg);
     advance(SipDialogState::INVITE_OUT); // nothing happens when it is sent again
-    m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
+    SipConfiguration const& configuration = m_interface.getConfiguration();
+    m_isUnheard = m_peers.size() > 1 && configuration.failoverAfter != 0;
+    m_timer.start(m_isUnheard ? configuration.failoverAfter : configuration.answerTimeout * 1000);
     return true;
 }
 
@@ -199,6 +272,8 @@ int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* t
     endpoint->handle(
         [&]
         {
+            if (endpoint->isOfAttempt(transaction, status))
+                return;
             if (status < 200)
                 endpoint->onProvisional(static_cast<unsigned int>(status), response);
             else if (status < 300 && response != nullptr && response->sip_to != nullptr)
@@ -214,6 +289,11 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     if (m_dialog != SipDialogState::INVITE_SENT || response == nullptr)
         return;
     trace("<- " + std::to_string(status));
+    noteHeard();
+    if (status > 100)
+        endAttempts(); // its number is complete
+    else if (m_isNumberOpen)
+        return; // nothing is said of the number
     Fork* const fork = findFork(response);
     m_hasRung = m_hasRung || status == 180;
     if (fork != nullptr && status == 180)
@@ -270,6 +350,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
     switch (advance(SipDialogState::ANSWER_IN))
     {
     case SipDialogState::PROCEED:
+        endAttempts();
         confirmDialog(response);
         takeAnswer(response);
         break;
@@ -339,25 +420,50 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         authenticate(m_invite.transaction, response, m_leg, HANDLE_INVITE_RESPONSE))
     {
         m_invite.sequence = nta_leg_get_seq(m_leg);
+        noteHeard();
         return;
     }
-    if (tryNextContact(status))
+    if (awaitMoreDigits(status) || tryAnother(status, response))
         return;
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     m_invite.forget();
-    if (!isOurs && status == 503 && response->sip_retry_after != nullptr)
-        m_interface.leavePeerAlone(response->sip_retry_after->af_delta);
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else
         leaveCall(SipCause::FROM_RESPONSE(status, response->sip_status->st_phrase, REASON_OF(response)));
 }
 
+void SipEndpoint::noteHeard()
+{
+    if (std::exchange(m_isUnheard, false))
+        m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
+}
+
+/// A peer that is not there is given up for another one. Should it come back meanwhile, its first word gets a CANCEL.
+void SipEndpoint::onCalledTimer()
+{
+    if (!std::exchange(m_isUnheard, false) || m_dialog != SipDialogState::INVITE_SENT)
+    {
+        onAnswerTimeout();
+        return;
+    }
+    trace("the peer says nothing");
+    nta_outgoing_bind(m_invite.transaction, nullptr, nullptr);
+    nta_outgoing_tcancel(m_invite.transaction, nullptr, nullptr, TAG_END());
+    if (!tryNextPeer())
+        clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
+}
+
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
+    if (m_isNumberOpen && m_invite.transaction == nullptr)
+    {
+        endNumber();
+        return;
+    }
     if (advance(SipDialogState::TIMEOUT) == SipDialogState::IGNORE)
         return;
     if (m_dialog == SipDialogState::OVER)
@@ -455,6 +561,11 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
 
 void SipEndpoint::cancel(SipCause const& cause)
 {
+    if (m_invite.transaction == nullptr) // more digits are awaited
+    {
+        m_dialog = SipDialogState::OVER;
+        return;
+    }
     std::string const reason = cause.getReasonHeader(true);
     trace("-> CANCEL, Reason: " + reason);
     m_byeAfterAck = cause; // should it be answered all the same

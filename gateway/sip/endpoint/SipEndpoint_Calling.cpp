@@ -1,6 +1,7 @@
 // The calling side: the INVITE was received, the peer leg says how it is answered.
 #include "sip/endpoint/SipEndpoint.h"
 
+#include "properties/CC_Cause.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCallProgressTone.h"
@@ -12,6 +13,8 @@
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipProperty.h"
 #include "sip/message/SipPropertyId.h"
+
+#include <spdlog/spdlog.h>
 
 #include <algorithm>
 #include <cstring>
@@ -40,14 +43,14 @@ void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const*
 }
 } // namespace
 
-int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                               SipParty const& called)
+int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, RouteHunt const& routes)
 {
     m_isCalling = true;
     m_isInCall = true;
     try
     {
-        return takeInvite(transaction, request, provider, called);
+        m_routes = routes;
+        return takeInvite(transaction, request);
     }
     catch (std::bad_alloc const&)
     {
@@ -62,12 +65,11 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     }
 }
 
-int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, std::string const& provider,
-                            SipParty const& called)
+int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
 {
-    m_ladder =
-        m_interface.getEnvironment().host.trace.begin(m_callNumber, m_interface.getConfiguration().name, provider);
-    trace("<- INVITE to " + called.getUser());
+    m_ladder = m_interface.getEnvironment().host.trace.begin(m_callNumber, m_interface.getConfiguration().name,
+                                                             m_routes.getProvider());
+    trace("<- INVITE to " + SipIdentity::READ_CALLED(request).getUser());
     noteAllow(request);
     if (takeTimer(transaction, request) != 0)
     {
@@ -88,7 +90,14 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request, s
     nta_incoming_treply(transaction, SIP_100_TRYING, TAG_END());
     trace("-> 100");
     startExpiry(request);
-    if (!dial(request, provider, called).isOk())
+    std::string const session = SESSION_OF(request);
+    m_hasOffer = !session.empty();
+    m_firstOffer = isOverlapping() ? session : std::string();
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
+    m_called = SipIdentity::READ_CALLED(request);
+    if (isOverlapping())
+        awaitDigits();
+    if (!dial(request, nullptr).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
     else if (!m_session.open())
         failDialLater(QCause::RESOURCE_UNAVAILABLE);
@@ -148,23 +157,24 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     advance(SipDialogState::INVITE_IN);
-    m_isOverTcp = SipRules::CAME_OVER_TCP(request);
+    m_way = SipRules::WAY_OF(request);
     return true;
 }
 
-XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipParty const& called)
+XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
 {
-    std::string const session = SESSION_OF(request);
-    m_hasOffer = !session.empty();
-    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
+    std::string const& provider = m_routes.getProvider();
+    SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
     if (m_hasOffer)
-        m_session.addOffer(own, session);
+        m_session.addOffer(own, SESSION_OF(request));
     CC_PropertyContainer offer;
     ADD(offer,
         CC_PropertyUnsigned(SipPropertyId::MAX_FORWARDS, SipRules::MAX_FORWARDS_AFTER(request))); // else the default
+    if (request->sip_request->rq_url->url_type == url_sips)
+        ADD(offer, CC_PropertyBoolean(SipPropertyId::SECURED, true));
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
     if (isTraced())
@@ -178,7 +188,27 @@ XCode SipEndpoint::dial(sip_t const* request, std::string const& provider, SipPa
     return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
-                          true, QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call);
+                          !isOverlapping(), QInformationTransferCapability::SPEECH, datapathContext, &own, &offer,
+                          &call);
+}
+
+/// Nobody was reached, and our peer has heard nothing: with a new leg in another call, but the same media, and as if
+/// the INVITE had just come.
+bool SipEndpoint::tryNextRoute(SipCause const& cause)
+{
+    if (!m_isCalling || m_dialog != SipDialogState::INVITE_RECEIVED || m_hasRung || m_hasEarlyMedia || m_fork != 0 ||
+        m_dialFailure != QCause::NONE || !m_routes.goOn(static_cast<unsigned int>(cause.cause)))
+        return false;
+    TYPtr<MG_IContext> const media(m_adapter.getDatapathContext());
+    trace("did  drop, State=RELEASED: the next route");
+    spdlog::debug("call {} {} goes on to {} after cause {} ({})", m_callNumber, getName().view(),
+                  m_routes.getProvider(), static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause));
+    m_hadPeer = false;
+    m_adapter.drop(cause.cause, 0);
+    SipHeldMessage const request(nta_incoming_getrequest(m_transaction));
+    if (!dial(sip_object(request.get()), media.get()).isOk())
+        clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
+    return true;
 }
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)
@@ -374,8 +404,8 @@ void SipEndpoint::useFork(unsigned int fork)
 
 nta_leg_t* SipEndpoint::makeFork()
 {
-    msg_t* const message = nta_incoming_getrequest(m_transaction);
-    sip_t const* const request = sip_object(message);
+    SipHeldMessage const message(nta_incoming_getrequest(m_transaction));
+    sip_t const* const request = sip_object(message.get());
     nta_leg_t* const leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(request->sip_call_id),
                                            SIPTAG_FROM(request->sip_to), SIPTAG_TO(request->sip_from), TAG_END());
     if (leg != nullptr)
@@ -383,7 +413,6 @@ nta_leg_t* SipEndpoint::makeFork()
         nta_leg_tag(leg, nullptr);
         nta_leg_server_route(leg, request->sip_record_route, request->sip_contact);
     }
-    msg_destroy(message);
     return leg;
 }
 

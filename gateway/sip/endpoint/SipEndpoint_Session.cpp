@@ -351,7 +351,9 @@ void SipEndpoint::startOffer(std::string const& description, bool isQuick)
 
 int SipEndpoint::HANDLE_OFFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response)
 {
-    int const status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
+    int status = response != nullptr ? response->sip_status->st_status : nta_outgoing_status(transaction);
+    if (response == nullptr && status < 300)
+        status = 503; // nobody has accepted anything
     if (status >= 200)
         endpoint->handle([&] { endpoint->onOfferResponse(static_cast<unsigned int>(status), response); });
     return 0;
@@ -364,7 +366,7 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
     bool const isUp = m_dialog == SipDialogState::UP || isAgreedEarly() || m_dialog == SipDialogState::ANSWERED;
     if (status < 300)
         m_challenges = 0;
-    if (status < 300 && response != nullptr && (!m_isOffering || !isUp))
+    if (status < 300 && (!m_isOffering || !isUp))
     {
         if (isInvite && m_lateAck != &m_reinvite) // repeated, or late: the call has ended meanwhile
             acknowledge(m_reinvite, {});
@@ -375,7 +377,7 @@ void SipEndpoint::onOfferResponse(unsigned int status, sip_t const* response)
         m_reinvite.sequence = nta_leg_get_seq(getOfferLeg());
     else if (m_isRefresh && status != 491)
         onRefreshed(status, response);
-    else if (status < 300 && response != nullptr)
+    else if (status < 300)
         onOfferAccepted(response);
     else if (status == 422 && raiseTimer(response))
         startOffer(m_offer, m_isOfferQuick);
@@ -449,7 +451,7 @@ void SipEndpoint::ON_OFFER_TIMER(void* endpoint)
                 self.startOffer(self.m_offer, self.m_isOfferQuick);
             }
             else if (self.m_offerReceived == nullptr && self.m_dialog == SipDialogState::INVITE_RECEIVED)
-                self.repeatProvisional();
+                self.m_provisional == 0 ? self.onDialledOn() : self.repeatProvisional();
             else
             {
                 self.m_session.withdraw(); // the other side does not know what to say

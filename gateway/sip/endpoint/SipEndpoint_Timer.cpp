@@ -30,10 +30,8 @@ SipSessionTimer::Seen READ_TIMER(sip_t const* message)
 /// Whether the last response has come over the network: one that the stack made up has no source.
 bool IS_FROM_PEER(nta_outgoing_t* transaction)
 {
-    msg_t* const response = nta_outgoing_getresponse(transaction);
-    bool const result = response != nullptr && msg_addr(response)->su_sa.sa_family != AF_UNSPEC;
-    msg_destroy(response);
-    return result;
+    SipHeldMessage const response(nta_outgoing_getresponse(transaction));
+    return response != nullptr && msg_addr(response.get())->su_sa.sa_family != AF_UNSPEC;
 }
 } // namespace
 

@@ -206,15 +206,16 @@ void SipEndpoint::transferTo(std::string const& number)
 void SipEndpoint::dialTarget(std::string const& number)
 {
     SipEnvironment& environment = m_interface.getEnvironment();
-    std::string const* const provider = environment.host.routing.find(m_interface.getConfiguration().name, number);
-    if (provider == nullptr || environment.host.isEnding)
+    RouteHunt const routes = environment.host.findRoutes(m_interface.getConfiguration().name, number,
+                                                         SipProperty::TEXT_OF(m_adapter.getOwnE164()), m_callNumber);
+    if (routes.isEmpty() || environment.host.isEnding)
     {
         tellTransferStatus(QCause::NO_ROUTE_TO_DESTINATION);
         return;
     }
     if (m_target == nullptr)
         m_target = std::make_unique<CC_CallAdapterE164>();
-    SipParty const called = SipParty::OF_USER(number);
+    SipParty const called = SipParty::OF_USER(routes.getNumber());
     CC_PropertyContainer own; // of the leg that stands for our peer until ours joins
     if (CC_Property const* const codecs = m_adapter.getOwnProperty(CC_PropertyId::SUPPORTED_CODECS))
         ADD(own, *codecs);
@@ -227,11 +228,11 @@ void SipEndpoint::dialTarget(std::string const& number)
     name.format("%u-transfer", m_callNumber);
     m_isTransferring = true;
     m_hasTarget = false;
-    trace("did  dial " + *provider + " (" + number + ") for the transfer");
+    trace("did  dial " + routes.getProvider() + " (" + called.getUser() + ") for the transfer");
     if (m_target->setup(name, *this, this).isOk() &&
         m_target
-            ->dial(environment.host.contextName, provider->c_str(), STRING(number), m_adapter.getOwnE164(),
-                   m_adapter.getOwnTypeOfNumber(), m_adapter.getOwnNumberingPlan(),
+            ->dial(environment.host.contextName, routes.getProvider().c_str(), STRING(called.getUser()),
+                   m_adapter.getOwnE164(), m_adapter.getOwnTypeOfNumber(), m_adapter.getOwnNumberingPlan(),
                    m_adapter.getOwnPresentationIndicator(), m_adapter.getOwnScreeningIndicator(),
                    m_adapter.getOwnName(), STRING(called.number), called.type, called.plan, String(), true,
                    QInformationTransferCapability::SPEECH, nullptr, &own, &offer, &call)
@@ -280,9 +281,12 @@ void SipEndpoint::endTransfer(QCause cause)
 void SipEndpoint::refer(std::string const& number)
 {
     SipConfiguration const& configuration = m_interface.getConfiguration();
-    std::string const uri = SipAddress::MAKE_URI(
-        number, configuration.peer.port != 0 ? configuration.peer : configuration.getAddress(), configuration.usesTcp);
-    std::string const self = SipAddress::MAKE_URI("gateway", configuration.listen, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI(number,
+                                                 !m_peers.empty()               ? getPeerAddress()
+                                                 : configuration.peer.port != 0 ? configuration.peer
+                                                                                : configuration.getAddress(m_way),
+                                                 m_way);
+    std::string const self = SipAddress::MAKE_URI("gateway", configuration.getAddress(m_way), m_way);
     trace("-> REFER to " + uri);
     m_isTransferring = true;
     m_refer = m_interface.getSender().send(

@@ -169,25 +169,27 @@ void SipFocus::callIn(String const& number)
 try
 {
     SipEnvironment& environment = m_interface.getEnvironment();
-    std::string const* const provider =
-        environment.host.routing.find(m_interface.getConfiguration().name, TEXT_OF(number));
-    if (provider == nullptr || environment.host.isEnding)
+    SipConfiguration const& configuration = m_interface.getConfiguration();
+    RouteHunt const routes = environment.host.findRoutes(configuration.name, TEXT_OF(number), configuration.conference,
+                                                         environment.host.lastCallNumber + 1);
+    if (routes.isEmpty() || environment.host.isEnding)
         return tell(QCause::NO_ROUTE_TO_DESTINATION);
     if (m_called != nullptr)
         return tell(QCause::TEMPORARY_FAILURE); // one after the other
     m_called = makeLeg();
     m_hasRung = false;
-    SipParty const called = SipParty::OF_USER(TEXT_OF(number));
-    SipParty const self = SipParty::OF_USER(m_interface.getConfiguration().conference);
+    SipParty const called = SipParty::OF_USER(routes.getNumber());
+    SipParty const self = SipParty::OF_USER(configuration.conference);
     CC_PropertyContainer own;
     ADD_CODECS(own);
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, ++environment.host.lastCallNumber));
     if (m_called != nullptr &&
         m_called
-            ->dial(environment.host.contextName, provider->c_str(), number, STRING(self.number), self.type, self.plan,
-                   self.presentation, self.screening, String("Conference"), STRING(called.number), called.type,
-                   called.plan, String(), true, QInformationTransferCapability::SPEECH, nullptr, &own, nullptr, &call)
+            ->dial(environment.host.contextName, routes.getProvider().c_str(), STRING(called.getUser()),
+                   STRING(self.number), self.type, self.plan, self.presentation, self.screening, String("Conference"),
+                   STRING(called.number), called.type, called.plan, String(), true,
+                   QInformationTransferCapability::SPEECH, nullptr, &own, nullptr, &call)
             .isOk())
         return;
     m_called.reset();

@@ -4,6 +4,7 @@
 #include "calls/CC_Call.h"
 #include "media/context/MediaAddress.h"
 #include "platform/eventloop/TYEvent.h"
+#include "properties/CC_Cause.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipFocus.h"
@@ -31,15 +32,12 @@ constexpr char const* ALLOW_OF_REGISTRAR =
     "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO, REGISTER";
 constexpr char const* SUPPORTED = "100rel, replaces, timer";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
-constexpr unsigned long LONGEST_PAUSE = 60; // seconds
 
 /// Where the transaction's request came from.
 InternetAddress SOURCE_OF(nta_incoming_t* transaction)
 {
-    msg_t* const message = nta_incoming_getrequest(transaction);
-    InternetAddress const source = AddressRange::ADDRESS_OF(msg_addr(message)->su_sa);
-    msg_destroy(message);
-    return source;
+    SipHeldMessage const message(nta_incoming_getrequest(transaction));
+    return AddressRange::ADDRESS_OF(msg_addr(message.get())->su_sa);
 }
 
 std::optional<SipCredentials> CREDENTIALS_OF(SipConfiguration const& configuration)
@@ -56,17 +54,21 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_configuration(configuration)
     , m_name(configuration.name.c_str())
     , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
-    , m_contact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), false)))
-    , m_tcpContact(SipAddress::MAKE_NAME_ADDR({}, SipAddress::MAKE_URI("gateway", configuration.getAddress(), true)))
-    , m_focus(m_contact + ";isfocus")
-    , m_tcpFocus(m_tcpContact + ";isfocus")
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, HANDLE_MESSAGE, this))
+    , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, m_guard, m_tls.get(), HANDLE_MESSAGE, this))
     , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
+    , m_peers(m_configuration, m_agent.get(), m_sender)
 {
+    for (SipWay::Way const way : {SipWay::UDP, SipWay::TCP, SipWay::TLS, SipWay::SIPS})
+    {
+        std::string const uri = SipAddress::MAKE_URI("gateway", configuration.getAddress(way), way);
+        m_contacts[way] = SipAddress::MAKE_NAME_ADDR({}, uri);
+        m_focuses[way] = m_contacts[way] + ";isfocus";
+    }
     if (configuration.authenticates)
         m_authentication.emplace(configuration.name, configuration.realm, configuration.algorithms,
                                  configuration.passwords);
@@ -224,6 +226,12 @@ int SipInterface::answerOptions(nta_incoming_t* transaction) const
     return hasRoom ? 200 : 503;
 }
 
+RouteHunt SipInterface::findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const
+{
+    std::string const calling = SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser();
+    return m_environment.host.findRoutes(m_configuration.name, number, calling, callNumber);
+}
+
 int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
@@ -235,10 +243,9 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
-    std::string const conference = isConference ? m_conference->getName().c_str() : "";
-    std::string const* const to =
-        isConference ? &conference : m_environment.host.routing.find(m_configuration.name, number);
-    if (to == nullptr)
+    RouteHunt const routes =
+        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number) : findRoutes(request, number, callNumber);
+    if (routes.isEmpty())
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
     try
@@ -251,7 +258,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         ++m_environment.host.counters.failed;
         return 503;
     }
-    return endpoint->receiveInvite(transaction, request, *to, called);
+    return endpoint->receiveInvite(transaction, request, routes);
 }
 
 SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const
@@ -281,13 +288,16 @@ int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* req
 
 int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
 {
-    SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
+    bool const isBeginning = m_configuration.overlap == SipConfiguration::Overlap::INVITE &&
+                             m_environment.host.routing.isBeginning(m_configuration.name, number);
+    SipCause const cause = isBeginning ? SipCause{QCause::INVALID_NUMBER_FORMAT, 484, {}}
+                                       : SipCause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
     ++m_environment.host.counters.failed;
-    spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
-                 m_configuration.name, number);
-    nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
-                        TAG_END());
-    return 404;
+    spdlog::info("call {} {} refused: no route to '{}', cause {} ({}), SIP {}", callNumber, m_configuration.name,
+                 number, static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause), cause.sipCode);
+    nta_incoming_treply(transaction, static_cast<int>(cause.sipCode), nullptr,
+                        SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()), TAG_END());
+    return static_cast<int>(cause.sipCode);
 }
 
 /// What keeps an INVITE from being a call, whatever it asks for.
@@ -310,23 +320,6 @@ bool SipInterface::admits(InternetAddress const& source)
     spdlog::debug("interface {}: a call is refused, {}", m_configuration.name,
                   m_environment.host.takesCallsFrom(m_configuration.name) ? "too many calls" : "none are taken now");
     return false;
-}
-
-void SipInterface::leavePeerAlone(unsigned long seconds)
-{
-    unsigned long const served = std::min(seconds, LONGEST_PAUSE);
-    m_peerBusyUntil = TY::Time::NOW(TY::Time::MONOTONIC);
-    m_peerBusyUntil.seconds += static_cast<decltype(m_peerBusyUntil.seconds)>(served);
-    spdlog::info("interface {}: the peer takes no calls, none is sent for {} s", m_configuration.name, served);
-}
-
-bool SipInterface::isPeerBusy() const
-{
-    if (m_peerBusyUntil.seconds == 0)
-        return false;
-    TY::Time const now = TY::Time::NOW(TY::Time::MONOTONIC);
-    return now.seconds < m_peerBusyUntil.seconds ||
-           (now.seconds == m_peerBusyUntil.seconds && now.nanoseconds < m_peerBusyUntil.nanoseconds);
 }
 
 void SipInterface::clearCalls(SipCause const& cause)

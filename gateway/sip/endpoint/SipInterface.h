@@ -1,10 +1,11 @@
 #pragma once
 
 #include "callcontrol/provider/CC_Provider.h"
+#include "host/RouteHunt.h"
 #include "platform/base/IpAddress.h"
-#include "platform/base/TYTime.h"
 #include "sip/SipConfiguration.h"
 #include "sip/access/SipAuthentication.h"
+#include "sip/access/SipPeers.h"
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -12,7 +13,9 @@
 #include "sip/registrar/SipRegistration.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
+#include "sip/stack/SipTls.h"
 
+#include <array>
 #include <memory>
 #include <optional>
 #include <string>
@@ -24,8 +27,8 @@ class SipFocus;
 class TYEvent;
 struct SipCause;
 
-/// One SIP interface: listens on one address, on UDP, TCP or both, and sends its calls to one peer. A provider of call
-/// control under the interface's name.
+/// One SIP interface: listens on one address, on UDP, TCP, TLS or several of these, and sends its calls to one peer. A
+/// provider of call control under the interface's name.
 ///
 /// Makes one endpoint per call leg and owns it until both the SIP dialog and the leg are done. Owned by the SIP module;
 /// belongs to the thread of the stack's loop, which is also that of the call-control loop.
@@ -50,13 +53,15 @@ public:
     int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
 
     String const& getName() const { return m_name; }
+    /// By which routes a call of that INVITE to that number leaves.
+    RouteHunt findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const;
     SipConfiguration const& getConfiguration() const { return m_configuration; }
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
-    /// Where the peer reaches us, for what goes over TCP or UDP.
-    std::string const& getContact(bool isOverTcp) const { return isOverTcp ? m_tcpContact : m_contact; }
+    /// Where the peer reaches us, for what goes that way.
+    std::string const& getContact(SipWay::Way way) const { return m_contacts[way]; }
     /// The same for what belongs to a conference (RFC 4579, 4).
-    std::string const& getFocusContact(bool isOverTcp) const { return isOverTcp ? m_tcpFocus : m_focus; }
+    std::string const& getFocusContact(SipWay::Way way) const { return m_focuses[way]; }
     /// The methods that we take. @{
     sip_allow_t const* getAllow() const { return m_allow; }
     sip_supported_t const* getSupported() const { return m_supported; }
@@ -66,6 +71,10 @@ public:
     /// Null where the interface asks nobody.
     SipAuthentication const* getAuthentication() const { return m_authentication ? &*m_authentication : nullptr; }
     SipGuard const& getGuard() const { return m_guard; }
+    /// Null where the interface has no TLS. @{
+    SipTls* getTls() { return m_tls.get(); }
+    SipTls const* getTls() const { return m_tls.get(); }
+    /// @}
     /// Where media come in; of use only if the environment relays them.
     IpAddress const& getMediaAddress() const { return m_mediaAddress; }
     /// A registration that is being taken back among them.
@@ -83,11 +92,11 @@ public:
     int answerOptions(nta_incoming_t* transaction) const;
     /// The endpoint with that dialog, on whatever interface; null when there is none that can be replaced.
     SipEndpoint* findReplaced(sip_replaces_t const* replaces) const;
-    /// The peer answered with 503 and Retry-After: until these seconds are over, 60 at most, no call goes to it, and
-    /// those that would get 503. The caller is not told the time: it would send us no call at all, also none for other
-    /// peers.
-    void leavePeerAlone(unsigned long seconds);
-    bool isPeerBusy() const;
+    /// A peer that answers with 503 and Retry-After is left alone for that time, and calls that nobody else takes get
+    /// 503. The caller is not told the time: it would send us no call at all, also none for other peers. @{
+    SipPeers& getPeers() { return m_peers; }
+    SipPeers const& getPeers() const { return m_peers; }
+    /// @}
     /// Clears every call of this interface: BYE, CANCEL or a final answer with the cause.
     void clearCalls(SipCause const& cause);
     /// Clears those of one call alone; false: there are none.
@@ -114,17 +123,18 @@ private:
     SipConfiguration m_configuration;
     String m_name;
     IpAddress m_mediaAddress;
-    std::string m_contact;
-    std::string m_tcpContact;
-    std::string m_focus;
-    std::string m_tcpFocus;
+    using Contacts = std::array<std::string, SipWay::NUMBER>; // by the way
+    Contacts m_contacts;
+    Contacts m_focuses;
     SipHome m_home;
     sip_allow_t* m_allow; // the home's
     sip_supported_t* m_supported;
     SipGuard m_guard;
     std::optional<SipAuthentication> m_authentication;
+    std::unique_ptr<SipTls> m_tls; // null: none
     SipAgent m_agent;
     SipSender m_sender;
+    SipPeers m_peers;
     std::unique_ptr<SipRegistrar> m_registrar;
     std::unique_ptr<SipRegistration> m_registration;
     std::string m_knownUser; // of the request that is being looked at
@@ -138,5 +148,4 @@ private:
     std::unordered_map<SipEndpoint*, Owned> m_endpoints;
     std::vector<SipEndpoint*> m_finished;
     std::unique_ptr<SipFocus> m_conference; // null: none
-    TY::Time m_peerBusyUntil;
 };

@@ -9,13 +9,34 @@ namespace
 {
 constexpr unsigned long LARGEST_MAX_FORWARDS = 255; // RFC 3261, 20.22
 
-/// A sips URI asks for TLS on every hop, which is not there: it must not be served with less.
-bool IS_SCHEME_SERVED(url_t const& uri) { return uri.url_type == url_sip || uri.url_type == url_tel; }
+bool CAME_OVER(sip_t const* request, char const* protocol)
+{
+    return request->sip_via != nullptr && request->sip_via->v_protocol != nullptr &&
+           strcasecmp(request->sip_via->v_protocol, protocol) == 0;
+}
+
+/// A sips URI asks for TLS on every hop: it must not be served with less.
+bool IS_SCHEME_SERVED(sip_t const* request)
+{
+    auto const scheme = static_cast<url_type_e>(request->sip_request->rq_url->url_type);
+    return scheme == url_sip || scheme == url_tel || (scheme == url_sips && CAME_OVER(request, "SIP/2.0/TLS"));
+}
+
+bool IS_SIPS(url_t const& uri) { return uri.url_type == url_sips; }
+
+bool IS_SECURED_DIALOG(sip_t const* request)
+{
+    if (IS_SIPS(*request->sip_request->rq_url))
+        return true;
+    if (request->sip_record_route != nullptr)
+        return IS_SIPS(*request->sip_record_route->r_url);
+    return request->sip_contact != nullptr && IS_SIPS(*request->sip_contact->m_url);
+}
 } // namespace
 
 int SipRules::CHECK(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported)
 {
-    if (!IS_SCHEME_SERVED(*request->sip_request->rq_url))
+    if (!IS_SCHEME_SERVED(request))
         return 416;
     if (int const refused = CHECK_REQUIRED(transaction, request, supported); refused != 0)
         return refused;
@@ -53,8 +74,11 @@ unsigned int SipRules::MAX_FORWARDS_AFTER(sip_t const* request)
     return static_cast<unsigned int>(std::clamp(own, 1ul, MOST_FORWARDS + 1ul)) - 1;
 }
 
-bool SipRules::CAME_OVER_TCP(sip_t const* request)
+SipWay::Way SipRules::WAY_OF(sip_t const* request)
 {
-    return request->sip_via != nullptr && request->sip_via->v_protocol != nullptr &&
-           strcasecmp(request->sip_via->v_protocol, "SIP/2.0/TCP") == 0;
+    if (CAME_OVER(request, "SIP/2.0/TCP"))
+        return SipWay::TCP;
+    if (!CAME_OVER(request, "SIP/2.0/TLS"))
+        return SipWay::UDP;
+    return IS_SECURED_DIALOG(request) ? SipWay::SIPS : SipWay::TLS;
 }

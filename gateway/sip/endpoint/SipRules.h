@@ -1,5 +1,6 @@
 #pragma once
 
+#include "sip/message/SipWay.h"
 #include "sip/stack/Sofia.h"
 
 #include <string_view>
@@ -21,6 +22,7 @@ int CHECK_BODY(nta_incoming_t* transaction, sip_t const* request);
 
 /// What the called side is to count down from: one less than the request's own, within bounds.
 unsigned int MAX_FORWARDS_AFTER(sip_t const* request);
-/// The request came over TCP, says its Via, which the stack has held against the transport.
-bool CAME_OVER_TCP(sip_t const* request);
+/// How the request came, says its Via, which the stack has held against the transport; and whether the dialog that it
+/// begins must stay on TLS (RFC 3261, 12.1.1).
+SipWay::Way WAY_OF(sip_t const* request);
 } // namespace SipRules

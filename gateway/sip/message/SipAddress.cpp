@@ -57,14 +57,16 @@ std::string SipAddress::ESCAPE_USER(std::string_view user)
     return escaped;
 }
 
-std::string SipAddress::MAKE_URI(std::string_view user, SocketAddress const& address, bool usesTcp)
+std::string SipAddress::MAKE_URI(std::string_view user, SocketAddress const& address, SipWay::Way way)
 {
-    std::string uri = "sip:";
+    std::string uri = way == SipWay::SIPS ? "sips:" : "sip:";
     if (!user.empty())
         uri += ESCAPE_USER(user) + "@";
     uri += address.text();
-    if (usesTcp)
+    if (way == SipWay::TCP)
         uri += ";transport=tcp";
+    else if (way == SipWay::TLS)
+        uri += ";transport=tls";
     return uri;
 }
 

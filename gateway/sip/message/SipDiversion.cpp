@@ -98,7 +98,7 @@ SipDiversion READ_HISTORY(sip_t const* invite)
 
 std::string URI_OF(Redirection const& redirection, SocketAddress const& own)
 {
-    return redirection.number.empty() ? UNAVAILABLE_URI : SipAddress::MAKE_URI(redirection.number, own, false);
+    return redirection.number.empty() ? UNAVAILABLE_URI : SipAddress::MAKE_URI(redirection.number, own, SipWay::UDP);
 }
 
 /// For the URI of the address to which the call went on.

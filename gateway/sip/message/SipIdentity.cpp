@@ -84,7 +84,7 @@ std::string SipIdentity::getFrom(SocketAddress const& own) const
         return SipAddress::MAKE_NAME_ADDR(ANONYMOUS_NAME, ANONYMOUS_URI);
     SipParty const& shown = second.number.empty() || second.isRestricted() ? party : second;
     return SipAddress::MAKE_NAME_ADDR(
-        party.name, shown.number.empty() ? UNAVAILABLE_URI : SipAddress::MAKE_URI(shown.getUser(), own, false));
+        party.name, shown.number.empty() ? UNAVAILABLE_URI : SipAddress::MAKE_URI(shown.getUser(), own, SipWay::UDP));
 }
 
 std::string SipIdentity::GET_ASSERTED(SipParty const& party, SocketAddress const& own, bool isTrusted)
@@ -92,7 +92,7 @@ std::string SipIdentity::GET_ASSERTED(SipParty const& party, SocketAddress const
     std::string lines;
     if (party.isAsserted() && !party.number.empty() && (isTrusted || !party.isRestricted()))
         lines += "P-Asserted-Identity: " +
-                 SipAddress::MAKE_NAME_ADDR(party.name, SipAddress::MAKE_URI(party.getUser(), own, false)) + "\r\n";
+                 SipAddress::MAKE_NAME_ADDR(party.name, SipAddress::MAKE_URI(party.getUser(), own, SipWay::UDP)) + "\r\n";
     if (party.isRestricted())
         lines += "Privacy: id\r\n";
     return lines;

@@ -15,7 +15,7 @@ XCode SipPropertyId::DECLARE()
     };
     for (Names const& names :
          {Names{CONFERENCE, "Conference", "conference"}, Names{FORK, "Fork", "fork"},
-          Names{HEADERS_FOR_TARGET, "Headers-For-Target", "headers-for-target"},
+          Names{SECURED, "Secured", "secured"}, Names{HEADERS_FOR_TARGET, "Headers-For-Target", "headers-for-target"},
           Names{SESSION_OFFER, "Session-Offer", "session-offer"},
           Names{SESSION_ANSWER, "Session-Answer", "session-answer"}, Names{CALL_NUMBER, "Call-Number", "call-number"},
           Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}})

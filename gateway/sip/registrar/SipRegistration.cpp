@@ -26,8 +26,24 @@ std::string ADDRESS_OF_RECORD(SipConfiguration const& configuration)
 /// Where a domain is named that is not the peer's own address, the peer is on the way there.
 std::string ROUTE_TO(SipConfiguration const& configuration)
 {
-    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.usesTcp);
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.way);
     return configuration.domain == configuration.peer.text() ? std::string() : "<" + uri + ";lr>";
+}
+
+/// Of the registrar.
+std::string URI_OF(SipConfiguration const& configuration)
+{
+    switch (configuration.way)
+    {
+    case SipWay::TCP:
+        return "sip:" + configuration.domain + ";transport=tcp";
+    case SipWay::TLS:
+        return "sip:" + configuration.domain + ";transport=tls";
+    case SipWay::SIPS:
+        return "sips:" + configuration.domain;
+    default:
+        return "sip:" + configuration.domain;
+    }
 }
 
 bool IS_SAME(url_t const* one, char const* other)
@@ -44,9 +60,10 @@ SipRegistration::SipRegistration(SipConfiguration const& configuration, nta_agen
     : m_configuration(configuration)
     , m_sender(sender)
     , m_onOver(std::move(onOver))
-    , m_uri("sip:" + configuration.domain + (configuration.usesTcp ? ";transport=tcp" : ""))
+    , m_uri(URI_OF(configuration))
     , m_route(ROUTE_TO(configuration))
-    , m_contact(SipAddress::MAKE_URI(configuration.user, configuration.getAddress(), configuration.usesTcp))
+    , m_contact(
+          SipAddress::MAKE_URI(configuration.user, configuration.getAddress(configuration.way), configuration.way))
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
     , m_expires(configuration.registerExpires)
 {

@@ -49,13 +49,20 @@ SipGuard::SipGuard(SipConfiguration const& configuration)
     , m_maxHeaderSize(configuration.maxHeaderSize)
     , m_connections(configuration.listen, m_allow, configuration.maxConnectionsPerSource)
 {
+    if (configuration.listensOnTls)
+        m_secured.emplace(SocketAddress{configuration.listen.host, configuration.tlsPort}, m_allow,
+                          configuration.maxConnectionsPerSource);
     s_guards.push_back(this);
 }
 
 std::vector<AddressRange> SipGuard::SERVED_BY(SipConfiguration const& configuration)
 {
-    return configuration.allow.empty() ? std::vector{AddressRange::PARSE(configuration.peer.host)}
-                                       : configuration.allow;
+    if (!configuration.allow.empty())
+        return configuration.allow;
+    std::vector<AddressRange> peers;
+    for (SipPeer const& peer : configuration.getPeers())
+        peers.push_back(AddressRange::PARSE(peer.address.host));
+    return peers;
 }
 
 SipGuard::~SipGuard() { std::erase(s_guards, this); }

@@ -5,6 +5,7 @@
 #include "sip/stack/Sofia.h"
 
 #include <cstddef>
+#include <optional>
 #include <vector>
 
 class SipStack;
@@ -36,7 +37,11 @@ public:
     /// Guards the agent's ports from now on.
     void watch(nta_agent_t* agent);
     Counters const& getCounters() const { return m_counters; }
-    ConnectionGuard const& getConnections() const { return m_connections; }
+    /// On all transports.
+    unsigned long long getNumberOfRefused() const
+    {
+        return m_connections.getNumberOfRefused() + (m_secured ? m_secured->getNumberOfRefused() : 0);
+    }
 
     /// Two messages go over a connection of the process with itself, on a free port of the `host`: throws
     /// std::runtime_error unless the stack then called every function that it should. Once per process.
@@ -46,7 +51,7 @@ public:
     /// up a connection whose waiting octets do not fit beside what it has.
     static usize_t LIMIT_OF(SipConfiguration const& configuration);
 
-    /// Who may send: what `allow` says, or else the peer.
+    /// Who may send: what `allow` says, or else the peers.
     static std::vector<AddressRange> SERVED_BY(SipConfiguration const& configuration);
 
     // --- what the stack calls
@@ -60,6 +65,7 @@ private:
     std::size_t m_maxMessageSize;
     std::size_t m_maxHeaderSize;
     ConnectionGuard m_connections;
+    std::optional<ConnectionGuard> m_secured; // those of TLS
     std::vector<tport_t const*> m_ports;
     Counters m_counters;
 };

@@ -3,6 +3,7 @@
 #include "sip/message/SipAddress.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipStack.h"
+#include "sip/stack/SipTls.h"
 
 #include <arpa/inet.h>
 #include <bit>
@@ -19,6 +20,7 @@ namespace
 {
 constexpr unsigned int SOCKET_BUFFER = 4u << 20; // bytes; a burst of calls comes faster than one thread reads
 constexpr unsigned int UDP_MTU = 65535;          // bytes; above it the stack would change to TCP on its own
+constexpr char const* NO_FOLDER = "/dev/null";   // of certificates; the stack would take those of the user
 
 socklen_t FILL(sockaddr_storage& storage, SocketAddress const& address)
 {
@@ -63,14 +65,23 @@ namespace
 url_string_t const* const NO_PORT =
     std::bit_cast<url_string_t const*>(std::intptr_t{-1}); // null would be one on every address
 
-std::string MAKE_BINDING(SipConfiguration const& configuration, char const* transport)
+struct Transport
 {
-    std::string const uri = SipAddress::MAKE_URI({}, configuration.getAddress(), false) + ";transport=" + transport;
+    char const* name;
+    SipWay::Way way;
+    bool isWanted;
+};
+
+std::string MAKE_BINDING(SipConfiguration const& configuration, Transport const& transport)
+{
+    std::string uri = SipAddress::MAKE_URI({}, configuration.getAddress(transport.way), transport.way);
+    if (transport.way == SipWay::UDP)
+        uri += ";transport=udp"; // and no other
     return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard,
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard, SipTls* tls,
                                  nta_message_f* onMessage, SipInterface* interface)
 {
     SipGuard::PROVE(stack, configuration.listen.host);
@@ -79,17 +90,23 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
                                     NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
                                     NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
                                     NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1), TAG_END()));
-    for (char const* const transport : {"udp", "tcp"})
+    for (Transport const& transport : {Transport{"udp", SipWay::UDP, configuration.listensOnUdp},
+                                       Transport{"tcp", SipWay::TCP, configuration.listensOnTcp},
+                                       Transport{"tls", SipWay::SIPS, configuration.listensOnTls}})
     {
-        bool const isUdp = *transport == 'u';
-        if (!(isUdp ? configuration.listensOnUdp : configuration.listensOnTcp))
+        if (!transport.isWanted)
             continue;
-        CHECK_PORT(configuration.listen, isUdp ? SOCK_DGRAM : SOCK_STREAM, transport);
-        if (agent == nullptr ||
-            nta_agent_add_tport(agent.get(), URL_STRING_MAKE(MAKE_BINDING(configuration, transport).c_str()),
-                                TPTAG_UDP_RMEM(SOCKET_BUFFER), TPTAG_UDP_WMEM(SOCKET_BUFFER), TPTAG_IDLE(idle),
-                                TPTAG_TIMEOUT(idle), TAG_END()) < 0)
-            throw std::runtime_error("cannot listen on " + configuration.listen.text() + " (" + transport + ")");
+        SocketAddress const listen = {configuration.listen.host, configuration.getAddress(transport.way).port};
+        CHECK_PORT(listen, transport.way == SipWay::UDP ? SOCK_DGRAM : SOCK_STREAM, transport.name);
+        auto const open = [&]
+        {
+            return nta_agent_add_tport(agent.get(), URL_STRING_MAKE(MAKE_BINDING(configuration, transport).c_str()),
+                                       TPTAG_UDP_RMEM(SOCKET_BUFFER), TPTAG_UDP_WMEM(SOCKET_BUFFER), TPTAG_IDLE(idle),
+                                       TPTAG_TIMEOUT(idle),
+                                       TAG_IF(transport.way == SipWay::SIPS, TPTAG_CERTIFICATE(NO_FOLDER)), TAG_END());
+        };
+        if (agent == nullptr || (transport.way == SipWay::SIPS ? tls->attach(open) : open()) < 0)
+            throw std::runtime_error("cannot listen on " + listen.text() + " (" + transport.name + ")");
     }
     guard.watch(agent.get());
     return agent;

@@ -121,6 +121,18 @@ TEST_F(IsdnCalledTest, ALineThatTakesNumbersWholeWaitsForThem)
     expectNothingLeft();
 }
 
+TEST_F(IsdnCalledTest, ANumberThatIsSaidToBeWholeIsNotWaitedFor)
+{
+    configuration.isOverlapSending = false;
+    open();
+    call("4989", false);
+    EXPECT_TRUE(waitForPeer("ADDRESS-INCOMPLETE"));
+    std::ignore = other.say(CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_SENDING, false));
+    EXPECT_TRUE(waitFor("RING 4989."));
+    other.hangUp();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnCalledTest, ANumberThatLeadsNowhereIsGivenUp)
 {
     configuration.timers.t304 = 50;
@@ -204,7 +216,7 @@ TEST_F(IsdnCalledTest, ACallOfTheNetworkWinsTheChannel)
     open();
     call("4989123"); // on channel 1, still on its way
     FakeModule third("third");
-    provider = "third";
+    routes.front().to = "third";
     side->call("4930", true, 1, true);
     EXPECT_TRUE(watch.runUntil([&] { return third.getCall() != nullptr; }));
     settle();

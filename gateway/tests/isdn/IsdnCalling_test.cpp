@@ -62,6 +62,41 @@ TEST_F(IsdnCallingTest, TheCallerGivesUpInEachState)
     }
 }
 
+TEST_F(IsdnCallingTest, TheNextRouteIsTriedUponTheCausesThatTheRouteNamesWhileNobodyWasReached)
+{
+    routes.front().nextOn = {34};
+    routes.push_back({NAME, {}, "other"});
+    routes.back().prepend = "9";
+    open();
+    side->call("4989123");
+    ASSERT_TRUE(waitForOffer());
+    EXPECT_TRUE(waitFor("PROCEEDING"));
+    CC_Call const* const first = other.getCall();
+    other.hangUp(QCause::NO_CIRCUIT_CHANNEL_AVAILABLE);
+    ASSERT_TRUE(watch.runUntil([&] { return other.getCall() != nullptr && other.getCall() != first; }));
+    std::ignore = other.become(FakeModule::State::ALERTING);
+    EXPECT_TRUE(waitFor("RINGING"));
+    EXPECT_EQ(counters.failed, 0u);
+    other.hangUp(QCause::NO_CIRCUIT_CHANNEL_AVAILABLE); // somebody has heard it ring
+    EXPECT_TRUE(waitFor("HANGUP_REQ 34"));
+    side->take();
+    expectNothingLeft();
+    EXPECT_EQ(counters.failed, 1u);
+}
+
+TEST_F(IsdnCallingTest, ACauseThatTheRouteDoesNotNameEndsTheCall)
+{
+    routes.front().nextOn = {34};
+    routes.push_back({NAME, {}, "other"});
+    open();
+    side->call("4989123");
+    ASSERT_TRUE(waitForOffer());
+    other.hangUp(QCause::USER_BUSY);
+    EXPECT_TRUE(waitFor("HANGUP_REQ 17"));
+    side->take();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnCallingTest, ANumberWithoutARouteIsRefused)
 {
     open();
@@ -125,6 +160,22 @@ TEST_F(IsdnCallingTest, ANumberThatStaysIncompleteIsCleared)
     expectNothingLeft();
 }
 
+TEST_F(IsdnCallingTest, WhoWaitsForTheWholeNumberIsToldThatItIs)
+{
+    configuration.collects = false;
+    configuration.timers.t302 = 100;
+    open();
+    side->call("4989", false);
+    ASSERT_TRUE(waitForOffer());
+    std::ignore = other.say(CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_RECEIVING, false));
+    std::ignore = other.become(FakeModule::State::ADDRESS_INCOMPLETE);
+    EXPECT_TRUE(watch.runUntil([&] { return other.getPeerValue(CC_PropertyId::SUPPORTS_OVERLAP_SENDING) == "false"; }));
+    std::ignore = other.become(FakeModule::State::ALERTING);
+    EXPECT_TRUE(waitFor("RINGING"));
+    other.hangUp();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnCallingTest, ADiallerWhoStopsWithoutADigit)
 {
     configuration.timers.t302 = 100;
@@ -154,14 +205,14 @@ TEST_F(IsdnCallingTest, ThePreferredChannelIsTakenAnotherIfItIsNotFree)
     ASSERT_TRUE(waitForOffer());
     EXPECT_FALSE(interface->getChannels().isFree(20));
     FakeModule third("third");
-    provider = "third";
+    routes.front().to = "third";
     side->take();
     side->call("4989123", true, 20);
     ASSERT_TRUE(watch.runUntil([&] { return third.getCall() != nullptr; }));
     ASSERT_TRUE(waitFor("PROCEEDING"));
     EXPECT_EQ(side->getChannel(), 1);
     FakeModule fourth("fourth");
-    provider = "fourth";
+    routes.front().to = "fourth";
     side->take();
     side->call("4989123", true, 20, true);
     EXPECT_TRUE(watch.runUntil([&] { return side->has("HANGUP 44") || side->has("HANGUP_REQ 44"); }));

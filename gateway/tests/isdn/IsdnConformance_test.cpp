@@ -223,7 +223,8 @@ private:
     Counters m_counters;
     IsdnEnvironment m_environment{m_loop,
                                   "SWITCH",
-                                  [](std::string const&, std::string const&) { return std::string(PEER); },
+                                  [](std::string const&, std::string const& number, std::string const&, unsigned int)
+                                  { return RouteHunt::TO(PEER, number); },
                                   [this](std::string const&) { return ++m_lastCall; },
                                   [](std::string const&) { return false; },
                                   m_counters};

@@ -13,6 +13,7 @@
 #include <spdlog/spdlog.h>
 
 #include <memory>
+#include <vector>
 
 /// An ISDN interface between the other side of call control and a far side of the line, on one thread.
 struct IsdnFixture : testing::Test, CallControlFixture
@@ -68,16 +69,20 @@ struct IsdnFixture : testing::Test, CallControlFixture
 
     TYEventLoop& loop = *CallControl::GET_CC_EVENT_LOOP();
     IsdnTestLoop watch{loop};
-    std::string provider = "other";
+    std::vector<Route> routes{{NAME, {}, "other"}}; // to numbers of four digits and more
     unsigned int calls = 0;
     Counters counters;
-    IsdnEnvironment environment{watch,
-                                "SWITCH",
-                                [this](std::string const&, std::string const& number)
-                                { return number.size() >= 4 ? provider : std::string(); },
-                                [this](std::string const&) { return ++calls; },
-                                [](std::string const&) { return false; },
-                                counters};
+    IsdnEnvironment environment{
+        watch,
+        "SWITCH",
+        [this](std::string const&, std::string const& number, std::string const& calling, unsigned int)
+        {
+            Routing const routing(number.size() >= 4 ? routes : std::vector<Route>());
+            return RouteHunt(routing.find({NAME, number, calling}), number);
+        },
+        [this](std::string const&) { return ++calls; },
+        [](std::string const&) { return false; },
+        counters};
     IsdnConfiguration configuration;
     IsdnLink::Options farOptions;
     std::unique_ptr<IsdnSocketLine> near, far;

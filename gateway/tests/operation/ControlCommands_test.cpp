@@ -125,14 +125,14 @@ TEST_F(ControlCommandsTest, ShowTheCallsFirstThatSoundWorst)
 TEST_F(ControlCommandsTest, ListWhatModulesKnowInColumns)
 {
     EXPECT_TRUE(ask("peers").empty());
-    known->peers = {{{"interface", "a"}, {"peer", "192.0.2.1:5060"}, {"state", "called"}},
-                    {{"interface", "of a long name"}, {"peer", "x\x1b[2J"}, {"state", "busy"}}};
+    known->peers = {{{"interface", "a"}, {"peer", "192.0.2.1:5060"}, {"state", "up"}},
+                    {{"interface", "of a long name"}, {"peer", "x\x1b[2J"}, {"state", "left alone"}}};
     std::vector<std::string> const lines = ask("peers");
     ASSERT_EQ(lines.size(), 3u);
     EXPECT_EQ(lines[0], "interface       peer            state");
-    EXPECT_EQ(lines[1], "a               192.0.2.1:5060  called");
+    EXPECT_EQ(lines[1], "a               192.0.2.1:5060  up");
     EXPECT_EQ(lines[2].find('\x1b'), std::string::npos) << "what would steer a terminal";
-    EXPECT_EQ(ask("peers --json")[0], R"({"interface":"a","peer":"192.0.2.1:5060","state":"called"})");
+    EXPECT_EQ(ask("peers --json")[0], R"({"interface":"a","peer":"192.0.2.1:5060","state":"up"})");
     EXPECT_TRUE(ask("registrations").empty());
 }
 

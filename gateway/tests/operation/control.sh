@@ -91,7 +91,7 @@ complete_words "status stats" gatewayctl --json sta
 complete_words "--interface" gatewayctl calls --i
 ask 0 '^\{"interface":"b","module":"sip","blocked":false\}$' interfaces --json
 ask 0 '^up +1$' stats
-ask 0 "^a +$HOST:$PORT_CALLER +called\$" peers
+ask 0 "^a +$HOST:$PORT_CALLER +up\$" peers
 ask 0 '' registrations
 ask 0 '' trace on 4420
 ask 0 '' trace on 1

@@ -75,6 +75,25 @@ gateway_pid=0
 grep -qx "gateway: 0 calls placed, 0 answered, 0 cleared, 0 failed, 0 left over" "$WORK/first.out" || fail "the last line"
 "$GATEWAY" --config "$WORK/second.toml" --check | grep -qx "$WORK/second.toml: all right" || fail "--check"
 
+# certificates and keys that cannot be used
+. "$HERE/certificates.bash"
+make_certificate ca ca
+make_certificate gateway ca "IP:$HOST"
+make_certificate other ca
+tls() { # CERTIFICATE KEY AUTHORITIES
+    echo "s,name = \"b\",&\ntransport = \"tls\"\ntls-certificate = \"$TLS/$1\"\ntls-key = \"$TLS/$2\"\ntls-authorities = \"$TLS/$3\","
+}
+bad "sip\[1\].tls-certificate: $TLS/no.pem: cannot be read" "$(tls no.pem gateway.key ca.pem)"
+bad "sip\[1\].tls-certificate: $TLS/gateway.key: has no certificate that can be used: no start line" \
+    "$(tls gateway.key gateway.key ca.pem)"
+bad "sip\[1\].tls-key: $TLS/other.key: has no key for the certificate: key values mismatch" \
+    "$(tls gateway.pem other.key ca.pem)"
+bad "sip\[1\].tls-authorities: $TLS/ca.csr: has no certificates that can be used" "$(tls gateway.pem gateway.key ca.csr)"
+openssl ec -in "$TLS/gateway.key" -aes128 -passout pass:secret -out "$TLS/locked.key" 2>/dev/null
+bad "sip\[1\].tls-key: $TLS/locked.key: has no key for the certificate" "$(tls gateway.pem locked.key ca.pem)"
+chmod 644 "$TLS/gateway.key"
+bad "sip\[1\].tls-key: $TLS/gateway.key: everybody may read or change it" "$(tls gateway.pem gateway.key ca.pem)"
+
 # contacts in what is no file of contacts
 write_configuration
 sed -i -e "$(passwords "registrar = true\nregistrations = \"$FILE\"\nauthenticate = true\nrealm = \"office\"\npasswords = \"$FILE\"")" \
