@@ -14,6 +14,7 @@
 #include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCause.h"
+#include "sip/message/SipIdentity.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
 #include "sip/message/SipWay.h"
@@ -52,7 +53,8 @@ public:
 
     /// The calling side: takes over a new INVITE and dials the called party on the first of the routes, on the next one
     /// when that reaches nobody. 0, or the status with which the transaction is given up at once.
-    int receiveInvite(nta_incoming_t* transaction, sip_t const* request, RouteHunt const& routes);
+    int receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
+                      RouteHunt const& routes);
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
@@ -324,7 +326,8 @@ private:
     bool m_hasOffer = false;               // the INVITE carried a session description
     SipWay::Way m_way = SipWay::UDP;       // the dialog: where its Contact points
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
-    RouteHunt m_routes;                    // calling side
+    SipIdentity m_caller;                  // calling side
+    RouteHunt m_routes;
     QCause m_dialFailure = QCause::NONE;
     std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;

@@ -44,12 +44,14 @@ void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const*
 }
 } // namespace
 
-int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, RouteHunt const& routes)
+int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
+                               RouteHunt const& routes)
 {
     m_isCalling = true;
     m_isInCall = true;
     try
     {
+        m_caller = caller;
         m_routes = routes;
         return takeInvite(transaction, request);
     }
@@ -170,7 +172,7 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
 {
     std::string const& provider = m_routes.getProvider();
     SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
-    SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
+    SipIdentity const& caller = m_caller;
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
     if (m_hasOffer)

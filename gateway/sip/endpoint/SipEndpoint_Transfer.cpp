@@ -282,9 +282,9 @@ void SipEndpoint::refer(std::string const& number)
 {
     SipConfiguration const& configuration = m_interface.getConfiguration();
     std::string const uri = SipAddress::MAKE_URI(number,
-                                                 !m_peers.empty()               ? getPeerAddress()
+                                                 !m_peers.empty()          ? getPeerAddress()
                                                  : configuration.hasPeer() ? configuration.peer
-                                                                                : configuration.getAddress(m_way),
+                                                                           : configuration.getAddress(m_way),
                                                  m_way);
     std::string const self = SipAddress::MAKE_URI("gateway", configuration.getAddress(m_way), m_way);
     trace("-> REFER to " + uri);

@@ -228,25 +228,20 @@ int SipInterface::answerOptions(nta_incoming_t* transaction) const
     return hasRoom ? 200 : 503;
 }
 
-RouteHunt SipInterface::findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const
-{
-    std::string const calling = SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser();
-    return m_environment.host.findRoutes(m_configuration.name, number, calling, callNumber);
-}
-
 int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
         return refused;
     if (request->sip_replaces != nullptr)
         return receiveReplacing(transaction, request);
-    SipParty const called = SipIdentity::READ_CALLED(request);
-    std::string const number = called.getUser();
+    std::string const number = SipIdentity::READ_CALLED(request).getUser();
+    SipIdentity const caller = SipIdentity::READ_CALLER(request, m_configuration.isTrusted);
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
     RouteHunt const routes =
-        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number) : findRoutes(request, number, callNumber);
+        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number)
+                     : m_environment.host.findRoutes(m_configuration.name, number, caller.party.getUser(), callNumber);
     if (routes.isEmpty())
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
@@ -260,7 +255,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         ++m_environment.host.counters.failed;
         return 503;
     }
-    return endpoint->receiveInvite(transaction, request, routes);
+    return endpoint->receiveInvite(transaction, request, caller, routes);
 }
 
 SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const

@@ -20,7 +20,7 @@ expect_records() {
 }
 secret() { call_up 'Privacy: id' 'Diversion: <sip:4930@h>;reason=user-busy'; pause 100; send_bye; expect 200; }
 busy_caller() { send_invite; expect 100; expect 486; send_ack_of_failure; }
-busy_callee() { expect_invite; respond "180 Ringing"; respond_finally "486 Busy Here"; expect_request ACK; }
+busy_callee() { expect_invite; respond "180 Ringing"; pause 100; respond_finally "486 Busy Here"; expect_request ACK; }
 ringing_caller() { send_invite; expect 100; expect 180; expect 486; send_ack_of_failure; }
 refused() { send_invite; expect 503; send_ack_of_failure; }
 configure() {

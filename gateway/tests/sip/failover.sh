@@ -25,7 +25,7 @@ late_callee() { # its first word comes when the call is with the other one
     expect_request ACK
 }
 full_callee() { expect_invite; respond_finally "503 Service Unavailable"; expect_request ACK; }
-ringing_callee() { expect_invite; respond "180 Ringing"; respond_finally "503 Service Unavailable"; expect_request ACK; }
+ringing_callee() { expect_invite; respond "180 Ringing"; pause 100; respond_finally "503 Service Unavailable"; expect_request ACK; }
 probed() { expect_request OPTIONS; respond_in_dialog "200 OK"; }
 
 start_second() { # SCENARIO

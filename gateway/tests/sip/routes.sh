@@ -10,6 +10,7 @@ refusing_callee() {
 ringing_callee() {
     expect_invite
     respond "180 Ringing"
+    pause 100
     respond_finally "503 Service Unavailable"
     expect_request ACK
 }

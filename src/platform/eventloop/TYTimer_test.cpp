@@ -477,19 +477,20 @@ TEST_F(TYTimerTest, AHostsLoopIsWokenByTheTimer)
     timer->start(2); // the descriptor has to know of it also when it is asked for later
     int const fd = m_loop->getPollFd();
     early->start(1);
-    while (m_order != "et")
+    while (m_order.size() < 2) // whoever is held up between the two starts finds them in the other order
     {
         EXPECT_TRUE(IS_READABLE(fd, -1));
         m_loop->runTurn();
     }
     EXPECT_FALSE(IS_READABLE(fd));
+    m_order.clear();
     EXPECT_TRUE(timer->startPeriodic(1).isOk());
     for (unsigned int i = 0; i < 3; ++i)
     {
         EXPECT_TRUE(IS_READABLE(fd, -1));
         m_loop->runTurn();
     }
-    EXPECT_EQ("etttt", m_order);
+    EXPECT_EQ("ttt", m_order);
 }
 
 TEST_F(TYTimerTest, AStoppedTimerWakesAHostsLoopOnceAtMost)
