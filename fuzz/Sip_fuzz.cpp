@@ -1,10 +1,11 @@
-// Reads any octets as what a SIP peer says: the headers from which properties are made, bodies, digits and session
-// descriptions; and what goes out of it to another peer is a header line each, and a description that reads back the
-// same. The first octet says where they go.
+// Reads any octets as what a SIP peer says: the headers from which properties are made, bodies, digits, charges and
+// session descriptions; and what goes out of it to another peer is a header line each, and a description that reads
+// back the same. The first octet says where they go.
 #include "sip/dialog/SipDescription.h"
 #include "sip/dialog/SipStream.h"
 #include "sip/message/SipBody.h"
 #include "sip/message/SipCause.h"
+#include "sip/message/SipCharge.h"
 #include "sip/message/SipDigits.h"
 #include "sip/message/SipDiversion.h"
 #include "sip/message/SipIdentity.h"
@@ -110,6 +111,15 @@ void READ_BODY(std::string const& text)
     if (end != std::string::npos)
         SipBody::READ(std::string_view(text).substr(end + 1), std::string_view(text).substr(0, end), {}, {});
 }
+
+void READ_CHARGE(std::string const& text)
+{
+    std::optional<SipCharge::Charge> const charge = SipCharge::READ(text);
+    std::string const written = charge ? SipCharge::WRITE(*charge) : std::string();
+    std::optional<SipCharge::Charge> const again = charge ? SipCharge::READ(written) : std::nullopt;
+    if (charge && (!again || SipCharge::WRITE(*again) != written))
+        std::abort();
+}
 } // namespace
 
 extern "C" int LLVMFuzzerInitialize(int*, char***)
@@ -123,8 +133,8 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* octets, std::size_t si
 {
     if (size == 0)
         return -1;
-    static constexpr void (*READERS[])(std::string const&) = {READ_MESSAGE, READ_DESCRIPTION, READ_REASON, READ_INPUT,
-                                                              READ_BODY};
+    static constexpr void (*READERS[])(std::string const&) = {READ_MESSAGE, READ_DESCRIPTION, READ_REASON,
+                                                              READ_INPUT,   READ_BODY,        READ_CHARGE};
     READERS[octets[0] % std::size(READERS)](std::string(octets + 1, octets + size));
     return 0;
 }

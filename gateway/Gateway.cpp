@@ -107,7 +107,8 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },
           this)
     , m_modules(std::move(modules))
-    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_records.get(), *this)
+    , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
+    , m_page(m_host, m_modules, m_configuration.moduleOf, m_watch)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
     watchCalls();
@@ -117,6 +118,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     for (auto const& [name, module] : m_modules)
         module->open(m_host);
     openControl();
+    openMetrics();
     if (m_media != nullptr)
         m_media->start();
 }
@@ -126,6 +128,7 @@ void Gateway::watchCalls()
     m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
     if (m_records != nullptr)
         m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    m_watch.tell([this](CallRecord const& record) { m_tracer.onCallOver(record); });
     if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
         m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
     m_watch.watch(m_host.contextName);
@@ -142,6 +145,28 @@ void Gateway::openControl()
     catch (std::runtime_error const& error)
     {
         throw ConfigurationError(m_configuration.file, "control.socket", error.what());
+    }
+}
+
+void Gateway::openMetrics()
+{
+    if (m_configuration.metrics.listen.port == 0)
+        return;
+    m_watch.tell([this](CallRecord const& record) { m_callMetrics.note(record); });
+    m_metrics = std::make_unique<GatewayMetrics>(m_host, m_modules, m_configuration.moduleOf, m_watch, m_callMetrics,
+                                                 m_records.get(), m_callControlLoop);
+    try
+    {
+        HttpServer::Pages pages{{"/metrics", [this] {
+                                     return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
+                                 }}};
+        if (m_configuration.metrics.hasPage)
+            pages["/"] = [this] { return HttpAnswer{200, m_page.getText(), StatusPage::CONTENT_TYPE}; };
+        m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, pages);
+    }
+    catch (std::runtime_error const& error)
+    {
+        throw ConfigurationError(m_configuration.file, "metrics.listen", error.what());
     }
 }
 
@@ -176,6 +201,7 @@ void Gateway::onSignal()
             break;
         case SIGCHLD:
             m_dump.onChild();
+            m_tracer.onChild();
             if (m_control != nullptr)
                 m_control->onChild();
             break;

@@ -12,6 +12,9 @@
 #include "operation/StateDump.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
+#include "operation/metric/GatewayMetrics.h"
+#include "operation/metric/HttpServer.h"
+#include "operation/page/StatusPage.h"
 #include "operation/record/CallWatch.h"
 #include "operation/record/RecordWriter.h"
 #include "platform/eventloop/TYEventLoop.h"
@@ -71,6 +74,7 @@ private:
     bool hasEndpoints() const;
     void onHangUp();
     void openControl();
+    void openMetrics();
     void watchCalls();
     void follow(Configuration configuration);
     std::string getState() const;
@@ -89,7 +93,9 @@ private:
     Recording m_recording;
     StateDump m_dump;
     std::unique_ptr<RecordWriter> m_records; // null where it is not configured
-    CallWatch m_watch;                       // calls may last until call control ends
+    CallMetrics m_callMetrics;
+    CallTracer m_tracer;
+    CallWatch m_watch; // calls may last until call control ends
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;
@@ -98,5 +104,9 @@ private:
     bool m_isClearing = false;
     Modules m_modules;
     ControlCommands m_commands;
-    std::unique_ptr<ControlServer> m_control; // null where it is not configured; ends first
+    std::unique_ptr<ControlServer> m_control; // null where it is not configured
+    StatusPage m_page;
+    std::unique_ptr<GatewayMetrics>
+        m_metrics; // null where they are not configured, and so are the pages, which end first
+    std::unique_ptr<HttpServer> m_pages;
 };

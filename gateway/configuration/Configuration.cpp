@@ -1,5 +1,7 @@
 #include "configuration/Configuration.h"
 
+#include "media/tone/ToneTable.h"
+
 #include <algorithm>
 #include <array>
 #include <charconv>
@@ -35,7 +37,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
 
 void READ_MEDIA(ConfigurationSection const& section, Configuration& configuration)
 {
-    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp"});
+    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country"});
     MediaOptions& media = configuration.media;
     configuration.relaysMedia = section.oneOf("mode", "direct", {"direct", "relay"}) == "relay";
     media.firstPort = static_cast<unsigned short>(section.number("first-port", media.firstPort, 1024, 65534));
@@ -45,6 +47,10 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.threads = section.number("threads", media.threads, 1, 64);
     media.silence = section.number("silence", 0, 0, 86400);
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
+    media.country = section.text("country", media.country);
+    std::string reason;
+    if (!ToneTable().read(ToneTable::BUILT_IN(), media.country, reason))
+        section.refuse("country", reason);
 }
 
 /// Octal, as chmod has it.
@@ -83,7 +89,20 @@ void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
         section.refuse("file", "is missing");
 }
 
-constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records"};
+/// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.
+void READ_METRICS(ConfigurationSection const& section, MetricOptions& metrics)
+{
+    section.allow({"listen", "page"});
+    if (section.getKeys().empty())
+        return;
+    metrics.hasPage = section.flag("page");
+    metrics.listen = section.address("listen");
+    if (!AddressRange::CONTAINS({AddressRange::PARSE("127.0.0.0/8"), AddressRange::PARSE("::1")},
+                                AddressRange::PARSE(metrics.listen.host).getFirst()))
+        section.refuse("listen", "must be a loopback address");
+}
+
+constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records", "metrics"};
 
 /// Every table that is not the gateway's own is a module's.
 void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
@@ -127,6 +146,7 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     READ_MEDIA(root.section("media"), configuration);
     READ_CONTROL(root.section("control"), configuration.control);
     READ_RECORDS(root.section("records"), configuration.records);
+    READ_METRICS(root.section("metrics"), configuration.metrics);
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
         configuration.routes.push_back(Route::READ(route, configuration.interfaces));

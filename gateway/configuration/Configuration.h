@@ -2,6 +2,7 @@
 
 #include "configuration/ConfigurationSection.h"
 #include "configuration/ControlOptions.h"
+#include "configuration/MetricOptions.h"
 #include "configuration/RecordOptions.h"
 #include "configuration/Route.h"
 #include "media/context/MediaOptions.h"
@@ -38,6 +39,7 @@ struct Configuration
     MediaOptions media;
     ControlOptions control;
     RecordOptions records;
+    MetricOptions metrics;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
     std::set<std::string> interfaces;            ///< the names of all

@@ -40,6 +40,8 @@ std::string ConfigurationChange::FIND_RESTART(Configuration const& before, Confi
         return "control";
     if (before.records != after.records)
         return "records";
+    if (before.metrics != after.metrics)
+        return "metrics";
     std::string const changed = FIND_MODULE(before, after);
     return changed.empty() ? FIND_MODULE(after, before) : changed;
 }

@@ -87,6 +87,9 @@ Routing::Routing(std::vector<Route> const& routes)
         m_routes[std::move(key)].push_back(std::make_shared<Route const>(route));
     }
     m_lengths.assign(lengths.begin(), lengths.end());
+    for (auto const& [key, choices] : m_routes)
+        m_keys.push_back(key);
+    std::sort(m_keys.begin(), m_keys.end());
 }
 
 template <class Take>
@@ -118,6 +121,13 @@ Routing::Choices Routing::find(Question const& question) const
                 CHOOSE(choices.begin() + static_cast<std::ptrdiff_t>(before), choices.end(), question.chance);
             });
     return choices;
+}
+
+bool Routing::isBeginning(std::string_view from, std::string_view number) const
+{
+    std::string const key = KEY_OF(from, number);
+    auto const next = std::lower_bound(m_keys.begin(), m_keys.end(), key);
+    return next != m_keys.end() && next->starts_with(key);
 }
 
 std::vector<std::string> Routing::explain(Question const& question) const

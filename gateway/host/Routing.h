@@ -32,8 +32,12 @@ public:
     using Choices = std::vector<std::shared_ptr<Route const>>;
 
     explicit Routing(std::vector<Route> const& routes);
+    Routing(Routing&&) = default; // never copied: m_keys are of m_routes
+    Routing& operator=(Routing&&) = default;
 
     Choices find(Question const& question) const;
+    /// Whether more digits could give the number a route.
+    bool isBeginning(std::string_view from, std::string_view number) const;
     /// Every route for the number, in the order in which they are looked at: a line each that says what becomes of it.
     std::vector<std::string> explain(Question const& question) const;
 
@@ -49,4 +53,5 @@ private:
 
     std::unordered_map<std::string, Choices, Hash, std::equal_to<>> m_routes; // by KEY_OF
     std::vector<std::size_t> m_lengths;                                       // of prefixes, the longest first
+    std::vector<std::string_view> m_keys;                                     // of m_routes, in their order
 };

@@ -6,12 +6,18 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <string_view>
+#include <utility>
 #include <vector>
 
 class ConfigurationSection;
+class MetricText;
 class SignallingLoop;
 struct Configuration;
 struct GatewayHost;
+
+/// A line of a list: names, and the text of each.
+using StateRow = std::vector<std::pair<std::string_view, std::string>>;
 
 /// A signalling module of the gateway: the interfaces of one protocol. It lies in a shared object of its own,
 /// callcontrol-gateway-NAME.so, which is loaded when the configuration has [[NAME]], and is never unloaded. Modules do
@@ -27,7 +33,7 @@ class SignallingModule
 {
 public:
     /// Changes whenever a module that was built before would not run any more.
-    static constexpr unsigned int VERSION = 2;
+    static constexpr unsigned int VERSION = 3;
 
     /// Ends what is still up without a word to the peers.
     virtual ~SignallingModule() = default;
@@ -46,6 +52,13 @@ public:
     virtual std::string describe() const = 0;
     /// Clears what it has in the call of that serial number with the cause; false: nothing.
     virtual bool clearCall(unsigned long long serial, QCause cause) = 0;
+    /// Families of its own for the gateway's figures, under names that begin with its own. Throws std::bad_alloc.
+    virtual void addMetrics(MetricText&) const {}
+    /// For operators: whom its interfaces talk to, and who is registered, here or elsewhere. All rows of a list have
+    /// the same names. Registrations may be many: a copy of the process tells them. @{
+    virtual std::vector<StateRow> getPeers() const { return {}; }
+    virtual std::vector<StateRow> getRegistrations() const { return {}; }
+    /// @}
 };
 
 using SignallingModules = std::map<std::string, std::unique_ptr<SignallingModule>>; ///< by name

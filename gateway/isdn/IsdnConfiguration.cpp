@@ -57,7 +57,8 @@ void READ_TIMERS(ConfigurationSection const& section, IsdnTimers& timers)
 
 IsdnConfiguration IsdnConfiguration::READ(ConfigurationSection const& section)
 {
-    section.allow({"name", "line", "side", "channels", "overlap-sending", "overlap-receiving", "digits", "timers"});
+    section.allow({"name", "line", "side", "channels", "overlap-sending", "overlap-receiving", "digits", "failure-tone",
+                   "timers"});
     IsdnConfiguration line;
     line.name = section.neededText("name");
     line.line = section.neededText("line");
@@ -69,6 +70,7 @@ IsdnConfiguration IsdnConfiguration::READ(ConfigurationSection const& section)
     line.isOverlapReceiving = receiving != "off";
     line.collects = receiving == "collect";
     line.digits = section.oneOf("digits", "keypad", {"keypad", "sound"}) == "keypad" ? Digits::KEYPAD : Digits::SOUND;
+    line.failureTone = section.number("failure-tone", line.failureTone, 0, 60);
     READ_CHANNELS(section, line);
     READ_TIMERS(section.section("timers"), line.timers);
     return line;

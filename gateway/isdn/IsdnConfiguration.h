@@ -24,6 +24,7 @@ struct IsdnConfiguration
     bool isOverlapReceiving = true; ///< numbers may come in digit by digit
     bool collects = true; ///< digits are collected until T302, '#' or sending complete; else each is handed on
     Digits digits = Digits::KEYPAD;
+    unsigned int failureTone = 0;         ///< seconds for which a caller hears why his call fails; 0: he does not
     std::bitset<32> channels{0xfffefffe}; ///< B channels in service, by timeslot
     IsdnTimers timers{};
 

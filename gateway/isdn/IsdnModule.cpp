@@ -3,6 +3,7 @@
 #include "callcontrol/CallControl.h"
 #include "configuration/Configuration.h"
 #include "host/GatewayHost.h"
+#include "host/MetricText.h"
 
 #include <spdlog/spdlog.h>
 
@@ -81,4 +82,24 @@ std::string IsdnModule::describe() const
                             port->interface.getLink().isUp() ? "up" : "down",
                             port->interface.getChannels().getNumberOfFree());
     return text;
+}
+
+void IsdnModule::addMetrics(MetricText& text) const
+{
+    text.begin("isdn_link_up", MetricText::GAUGE, "1 where the D channel's link is established");
+    for (auto const& port : m_ports)
+        text.add(port->interface.getLink().isUp() ? 1 : 0, {{"interface", port->interface.getName().view()}});
+    text.begin("isdn_free_channels", MetricText::GAUGE, "B channels that carry no call");
+    for (auto const& port : m_ports)
+        text.add(port->interface.getChannels().getNumberOfFree(), {{"interface", port->interface.getName().view()}});
+}
+
+std::vector<StateRow> IsdnModule::getPeers() const
+{
+    std::vector<StateRow> rows;
+    for (auto const& port : m_ports)
+        rows.push_back({{"interface", std::string(port->interface.getName().view())},
+                        {"peer", port->interface.getConfiguration().line},
+                        {"state", port->interface.getLink().isUp() ? "up" : "down"}});
+    return rows;
 }

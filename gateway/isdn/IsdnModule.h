@@ -25,6 +25,8 @@ public:
     std::size_t getNumberOfEndpoints() const override;
     std::string describe() const override;
     bool clearCall(unsigned long long serial, QCause cause) override;
+    void addMetrics(MetricText& text) const override;
+    std::vector<StateRow> getPeers() const override;
 
 private:
     struct Port

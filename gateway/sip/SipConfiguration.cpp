@@ -342,9 +342,13 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "t1x64",
                    "answer-timeout",
                    "codecs",
+                   "charges",
+                   "overlap",
+                   "digit-timeout",
                    "detect-digits",
                    "srtp",
                    "ringback",
+                   "failure-tone",
                    "conference",
                    "transfer",
                    "media-address",
@@ -378,7 +382,15 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                          : srtp == "optional" ? SipStream::OPTIONAL
                                               : SipStream::SECURED;
     interface.conference = section.text("conference", {});
+    interface.failureTone = section.number("failure-tone", interface.failureTone, 0, 60);
     interface.ringsBack = section.flag("ringback");
+    std::string const charges = section.oneOf("charges", "off", {"off", "tell", "take"});
+    interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL
+                        : charges == "take" ? SipConfiguration::Charges::TAKE
+                                            : SipConfiguration::Charges::OFF;
+    if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
+        interface.overlap = SipConfiguration::Overlap::INVITE;
+    interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);
     interface.detectsDigits = section.flag("detect-digits");
     interface.mediaAddress = section.text("media-address", interface.listen.host);
     interface.leastExpires = section.number("min-se", interface.leastExpires, 1, 86400);

@@ -27,6 +27,21 @@ struct SipPeer
 /// value; README.md lists the keys.
 struct SipConfiguration
 {
+    /// What becomes of numbers that come digit by digit.
+    enum class Overlap
+    {
+        OFF,   ///< they are collected; an INVITE has the whole number
+        INVITE ///< each digit is another INVITE (RFC 3578)
+    };
+
+    /// What calls cost: which of the two sides knows it.
+    enum class Charges
+    {
+        OFF,
+        TELL, ///< the peers are told
+        TAKE  ///< the peers tell
+    };
+
     std::string name;
     SocketAddress listen;
     SocketAddress advertise;        ///< what the peers are told instead of `listen`; port 0: nothing
@@ -74,10 +89,14 @@ struct SipConfiguration
     std::vector<MG_Rtp::ECodec::Type> codecs{MG_Rtp::ECodec::PCMA, MG_Rtp::ECodec::PCMU, MG_Rtp::ECodec::G722,
                                              MG_Rtp::ECodec::OPUS, MG_Rtp::ECodec::G729, MG_Rtp::ECodec::GSM};
     SipStream::Security security = SipStream::PLAIN; ///< SRTP towards the peer; where media are relayed
-    std::string conference;       ///< the number of the interface's conference; where media are relayed. Empty: none
-    bool ringsBack = false;       ///< a caller hears a tone of ours while the callee is alerted without media
-    bool detectsDigits = false;   ///< in what its peers say; where media are relayed
-    bool transfersOnWire = false; ///< a peer that is to be transferred is sent REFER; else we dial for it
+    std::string conference; ///< the number of the interface's conference; where media are relayed. Empty: none
+    Charges charges = Charges::OFF;
+    Overlap overlap = Overlap::OFF;
+    unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
+    unsigned int failureTone = 0;   ///< seconds for which a caller hears why his call fails; 0: he does not
+    bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media
+    bool detectsDigits = false;     ///< in what its peers say; where media are relayed
+    bool transfersOnWire = false;   ///< a peer that is to be transferred is sent REFER; else we dial for it
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }

@@ -26,6 +26,9 @@ public:
     std::size_t getNumberOfEndpoints() const override;
     std::string describe() const override;
     bool clearCall(unsigned long long serial, QCause cause) override;
+    void addMetrics(MetricText& text) const override;
+    std::vector<StateRow> getPeers() const override;
+    std::vector<StateRow> getRegistrations() const override;
 
 private:
     struct Port
@@ -38,6 +41,11 @@ private:
         SipInterface interface;
         CallControlHost::Registration registration; // taken back before the provider ends
     };
+
+    template <class Get>
+    void addOfEach(MetricText& text, Get const& get) const;
+    void addGuarded(MetricText& text) const;
+    void addUsers(MetricText& text) const;
 
     std::string m_file; // of the configuration
     std::vector<SipConfiguration> m_configurations;

@@ -57,7 +57,7 @@ TEST(Configuration, EveryKeyIsRead)
                     "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
                     "\"/r\"\nrecording-size = 4096\n"
                     "[media]\nmode = \"relay\"\nfirst-port = 30000\nlast-port = 30999\nthreads = 2\nsilence = 30\n"
-                    "dscp = 0\n") +
+                    "dscp = 0\ncountry = \"gb\"\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -76,6 +76,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.media.threads, 2u);
     EXPECT_EQ(configuration.media.silence, 30u);
     EXPECT_EQ(configuration.media.differentiation, 0u);
+    EXPECT_EQ(configuration.media.country, "gb");
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].from, "a");
     EXPECT_EQ(configuration.routes[0].prefix, "49");
@@ -105,8 +106,7 @@ TEST(Configuration, SaysForWhomWhenAndHowARouteIsTaken)
     EXPECT_EQ(configuration.routes[1].prefix, "112");
     EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"1\"\nnumber = \"2\"\n"),
               "f: route[0].number: and prefix exclude each other");
-    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"),
-              "f: route[0].strip: must be from 0 to 2");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"), "f: route[0].strip: must be from 0 to 2");
     EXPECT_EQ(COMPLAINT(interfaces + route + "days = [\"monday\"]\n"),
               "f: route[0].days: days are mon, tue, wed, thu, fri, sat, sun");
     EXPECT_EQ(COMPLAINT(interfaces + route + "hours = \"8-18\"\n"),
@@ -133,6 +133,26 @@ TEST(Configuration, SaysWhereAndForWhomItListensForOperators)
     for (char const* const mode : {"8", "1000", "rw", "6 "})
         EXPECT_EQ(COMPLAINT(interfaces + "[control]\nsocket = \"c\"\nmode = \"" + mode + "\"\n"),
                   "f: control.mode: must be an octal number from 000 to 777, as a text: \"0660\"");
+}
+
+TEST(Configuration, SaysWhereFiguresAreToBeHad)
+{
+    std::string const interfaces = TWO_INTERFACES;
+    EXPECT_EQ(Configuration::PARSE(interfaces, "f").metrics.listen.port, 0) << "nowhere, unless it is asked to";
+    EXPECT_EQ(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"127.0.0.2:9100\"\n", "f").metrics.listen.port,
+              9100);
+    EXPECT_EQ(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\n", "f").metrics.listen.host,
+              "::1");
+    for (char const* const address : {"0.0.0.0:9100", "192.0.2.1:9100", "[::]:9100", "[2001:db8::1]:9100"})
+        EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"" + address + "\"\n"),
+                  "f: metrics.listen: must be a loopback address");
+    EXPECT_FALSE(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\n", "f").metrics.hasPage);
+    EXPECT_TRUE(
+        Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\npage = true\n", "f").metrics.hasPage);
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\npage = true\n"), "f: metrics.listen: is missing");
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nport = 1\n"), "f: metrics.port: is not a key");
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"127.0.0.1\"\n"),
+              "f: metrics.listen: expected an address and a port, as in \"192.0.2.1:5060\"");
 }
 
 TEST(Configuration, SaysWhereRecordsOfCallsGo)

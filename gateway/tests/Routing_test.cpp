@@ -147,6 +147,15 @@ TEST(Routing, NoInterfaceGetsTheRoutesOfAnotherWhoseNameBeginsAlike)
     EXPECT_EQ(FIRST(routing, "a4", "499"), "none");
 }
 
+TEST(Routing, ANumberThatMoreDigitsCouldLeadSomewhereIsABeginning)
+{
+    Routing const routing({{"a", "4989", "munich"}, {"b", "7", "x"}});
+    EXPECT_TRUE(routing.isBeginning("a", "49"));
+    EXPECT_TRUE(routing.isBeginning("a", ""));
+    EXPECT_FALSE(routing.isBeginning("a", "48"));
+    EXPECT_FALSE(routing.isBeginning("a", "7")) << "of another interface";
+}
+
 TEST(Routing, AHundredThousandPrefixesAreATable)
 {
     std::vector<Route> routes;

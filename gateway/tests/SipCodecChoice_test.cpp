@@ -60,3 +60,22 @@ TEST(SipCodecChoiceCompatible, IsTheSameOrWhatIsSpokenHere)
     EXPECT_TRUE(ARE_COMPATIBLE(E::PCMA, E::OPUS));
     EXPECT_FALSE(ARE_COMPATIBLE(E::PCMA, E::G729));
 }
+
+// What is no speech (RFC 4040) is offered to nobody unless the other side carries it, and never made of speech.
+
+TEST(SipCodecChoiceClearChannel, IsRelayedOrNothing)
+{
+    Codecs const own{E::CLEARMODE, E::PCMA};
+    EXPECT_EQ(FOR_OFFER(own, {E::CLEARMODE, {E::CLEARMODE}}), Codecs{E::CLEARMODE});
+    EXPECT_EQ(FOR_OFFER(own, {E::PCMA, {E::PCMA}}), Codecs{E::PCMA});
+    EXPECT_EQ(FOR_OFFER({E::PCMA}, {E::CLEARMODE, {E::CLEARMODE}}), Codecs{});
+    EXPECT_EQ(FOR_ANSWER({E::PCMA, E::CLEARMODE}, {E::CLEARMODE, {E::CLEARMODE}}), E::CLEARMODE);
+    EXPECT_EQ(FOR_ANSWER({E::PCMA}, {E::CLEARMODE, {E::CLEARMODE}}), E::NONE);
+}
+
+TEST(SipCodecChoiceClearChannel, IsWhatTheCallCarriesWhenItIsLikedBest)
+{
+    EXPECT_EQ(CAPABILITY_OF({E::CLEARMODE, E::PCMA}), QInformationTransferCapability::UNRESTRICTED_DIGITAL);
+    EXPECT_EQ(CAPABILITY_OF({E::PCMA, E::CLEARMODE}), QInformationTransferCapability::SPEECH);
+    EXPECT_EQ(CAPABILITY_OF({}), QInformationTransferCapability::SPEECH);
+}

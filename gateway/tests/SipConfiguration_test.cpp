@@ -72,6 +72,10 @@ media-address = "192.0.2.9"
 srtp = "required"
 ringback = true
 detect-digits = true
+overlap = "invite"
+charges = "take"
+digit-timeout = 4
+failure-tone = 3
 t1 = 100
 transports = ["tcp", "udp"]
 allow = ["192.0.2.0/24", "2001:db8::7"]
@@ -100,6 +104,10 @@ answer-timeout = 30
     EXPECT_EQ(b.security, SipStream::SECURED);
     EXPECT_TRUE(b.ringsBack);
     EXPECT_TRUE(b.detectsDigits);
+    EXPECT_EQ(b.overlap, SipConfiguration::Overlap::INVITE);
+    EXPECT_EQ(b.digitTimeout, 4u);
+    EXPECT_EQ(b.failureTone, 3u);
+    EXPECT_EQ(b.charges, SipConfiguration::Charges::TAKE);
     EXPECT_EQ(b.t1, 100u);
     EXPECT_EQ(b.t1x64, 3200u);
     EXPECT_EQ(b.answerTimeout, 30u);

@@ -3,20 +3,18 @@
 /// How a call goes on on the wire (Q.931, 5; the numbers are those of its states on the user's side, which the network
 /// side mirrors). What the table leaves out is passed over: the state stays.
 ///
-///     |                       | SETUP_ACK  | PROCEED-   | PROGRESS | ALERTING | CONNECT | digits   | DISCONNECT |
-///     released | |                       | received   | ING rec.   | received | received | receiv. | received |
-///     received   | received | | NULL 0                |            |            |          |          |         | | |
-///     OVER     | | CALL_INITIATED 1      | 2 dial on  | 3 tell     | tell     | 4 tell   | 10 tell |          | 19
-///     release | OVER     | | OVERLAP_SENDING 2     |            | 3 tell     | tell     | 4 tell   | 10 tell | | 19
-///     release | OVER     | | OUTGOING_PROCEEDING 3 |            |            | tell     | 4 tell   | 10 tell | | 19
-///     release | OVER     | | CALL_DELIVERED 4      |            |            | tell     |          | 10 tell | | 19
-///     release | OVER     | | CALL_PRESENT 6        |            |            |          |          |         | | 19
-///     release | OVER     | | OVERLAP_RECEIVING 25  |            |            |          |          |         | collect
-///     | 19 release | OVER     | | INCOMING_PROCEEDING 9 |            |            |          |          |         | |
-///     19 release | OVER     | | CALL_RECEIVED 7       |            |            |          |          |         | | 19
-///     release | OVER     | | ACTIVE 10             |            |            |          |          |         | tell |
-///     19 release | OVER     | | CLEARING 11, 19       |            |            |          |          |         | |
-///     release    | OVER     |
+///     | received              | SETUP_ACK | PROC.  | PROG. | ALERT. | CONNECT | digits  | DISCONNECT | released |
+///     | NULL 0                |           |        |       |        |         |         |            | OVER     |
+///     | CALL_INITIATED 1      | 2 dial on | 3 tell | tell  | 4 tell | 10 tell |         | 19 release | OVER     |
+///     | OVERLAP_SENDING 2     |           | 3 tell | tell  | 4 tell | 10 tell |         | 19 release | OVER     |
+///     | OUTGOING_PROCEEDING 3 |           |        | tell  | 4 tell | 10 tell |         | 19 release | OVER     |
+///     | CALL_DELIVERED 4      |           |        | tell  |        | 10 tell |         | 19 release | OVER     |
+///     | CALL_PRESENT 6        |           |        |       |        |         |         | 19 release | OVER     |
+///     | OVERLAP_RECEIVING 25  |           |        |       |        |         | collect | 19 release | OVER     |
+///     | INCOMING_PROCEEDING 9 |           |        |       |        |         |         | 19 release | OVER     |
+///     | CALL_RECEIVED 7       |           |        |       |        |         |         | 19 release | OVER     |
+///     | ACTIVE 10             |           |        |       |        |         | tell    | 19 release | OVER     |
+///     | CLEARING 11, 19       |           |        |       |        |         |         | release    | OVER     |
 ///
 ///     |                       | SETUP | SETUP_ACK | PROCEEDING | PROGRESS | ALERTING | CONNECT | clearing |
 ///     |                       | sent  | sent      | sent       | sent     | sent     | sent    | asked for |

@@ -68,6 +68,8 @@ void IsdnEndpoint::take(pri_event& event)
         break;
     case PRI_EVENT_INFO_RECEIVED:
         onDigits(event.ring.callednum);
+        if (event.ring.complete != 0 && m_state == IsdnCallState::OVERLAP_RECEIVING && m_isInCall)
+            endNumber();
         break;
     case PRI_EVENT_KEYPAD_DIGIT:
         onDigits(event.digit.digits);
@@ -92,11 +94,13 @@ void IsdnEndpoint::notifyPeerPropertyChange(CC_CallAdapter&, CC_Flags const& fla
 
 void IsdnEndpoint::followCall(CC_Flags const& flags)
 {
+    if (m_failure != QCause::NONE)
+        return; // the far side is hearing of it
     if (isPeerReleased())
     {
         tellCharge(flags); // the last one goes with the end
         QCause const cause = m_adapter.getPeer(Key::CAUSE) ? m_adapter.getPeer(Key::CAUSE)->getCause() : QCause::NONE;
-        if (tryNextRoute(cause))
+        if (tryNextRoute(cause) || tellByTone(cause))
             return;
         endWire(cause);
         leaveCall(cause);
@@ -105,6 +109,8 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
     openMedia(); // the call may be another one
     if (m_isCalling)
         followPeer();
+    else if (m_state == IsdnCallState::NULL_STATE && !m_adapter.getPeerSupportsOverlapSending())
+        onTimer(); // no digit is to be waited for any more
     tellCharge(flags);
     tellHold();
 }
@@ -216,6 +222,7 @@ void IsdnEndpoint::lookForEnd()
 /// Takes the leg out of the call.
 void IsdnEndpoint::leaveCall(QCause cause)
 {
+    m_failure = QCause::NONE;
     if (m_state != IsdnCallState::CLEARING)
         m_timer.stop();
     if (!std::exchange(m_isInCall, false))

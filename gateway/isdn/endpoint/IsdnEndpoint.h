@@ -4,6 +4,7 @@
 #include "adapters/CC_CallAdapterObserver.h"
 #include "callcontrol/provider/CC_Endpoint.h"
 #include "host/RouteHunt.h"
+#include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnParty.h"
 #include "isdn/endpoint/IsdnCallState.h"
 #include "isdn/endpoint/IsdnChannels.h"
@@ -76,6 +77,7 @@ private:
     void dial(bool isComplete);
     void placeCall(MG_IContext* datapathContext);
     bool tryNextRoute(QCause cause);
+    bool tellByTone(QCause cause);
     void requestDigits();
     void followPeer();
     void tellProgress(LegState::State state);
@@ -111,6 +113,7 @@ private:
     void readUserUser(char const* text, CC_PropertyContainer& own);
     void onNotify(int indicator);
     void onDigits(char const* digits);
+    void endNumber();
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
     void tellHold();
@@ -140,10 +143,12 @@ private:
     unsigned int m_timeslot = IsdnChannels::NONE;
     int m_channelFlags = 0;            // of the channel that the wire asked for: how it was written
     bool m_isChannelConfirmed = false; // by the far side
+    IsdnBearer m_bearer;
     IsdnParty m_called;
     std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
-    RouteHunt m_routes; // calling side
+    QCause m_failure = QCause::NONE; // calling side: of which a tone tells the far side first
+    RouteHunt m_routes;              // calling side
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;

@@ -1,5 +1,4 @@
 // The called side: the call was offered, the SETUP is sent, its answers become states of the leg.
-#include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
@@ -48,6 +47,7 @@ XCode IsdnEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCo
     m_isInCall = true;
     m_hadPeer = true;
     bool const isComplete = !m_adapter.getPeerSupportsOverlapSending();
+    m_bearer = {m_adapter.getInformationTransferCapability()};
     m_own.clear();
     addCodecs(m_own);
     if (!m_own.isEmpty())
@@ -82,13 +82,12 @@ void IsdnEndpoint::sendSetup(bool isComplete)
 bool IsdnEndpoint::startCall(pri_sr* request, bool isComplete)
 {
     m_interface.know(m_call, *this);
-    IsdnBearer const bearer{m_adapter.getInformationTransferCapability()};
     bool const isIsdn = m_adapter.getPeer(Key::ENDPOINT_IS_ISDN, false);
     std::string digits = m_called.getDigits();
     if (digits.empty() && !m_called.number.empty())
         return false; // such as a name, which no line can call
     pri_sr_set_channel(request, static_cast<int>(m_timeslot), 0, !isIsdn);
-    pri_sr_set_bearer(request, bearer.getCapability(), bearer.getLayer1());
+    pri_sr_set_bearer(request, m_bearer.getCapability(), m_bearer.getLayer1());
     pri_sr_set_called(request, digits.data(), m_called.getPlan(), isComplete);
     pri_party_id const caller = IsdnParty::OF_PEER(m_adapter).getId();
     pri_sr_set_caller_party(request, &caller);

@@ -1,9 +1,9 @@
 // The calling side: the SETUP was received, the peer leg says how it is answered.
-#include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
+#include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_PropertyKeys.h"
 
@@ -59,6 +59,7 @@ bool IsdnEndpoint::takeRequestedChannel(int channel, bool isFlexible)
 
 void IsdnEndpoint::readSetup(pri_event_ring const& ring)
 {
+    m_bearer = IsdnBearer::OF(ring.ctype);
     m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
     if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
         m_called.number = ring.keypad_digits;
@@ -68,8 +69,6 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     IsdnProgress const progress = IsdnProgress::OF(ring.progressmask);
     ADD(m_setup, CC_PropertyBoolean(CC_PropertyId::ENDPOINT_IS_ISDN, progress.isIsdn));
     ADD(m_setup, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, true)); // the channel is there from now on
-    ADD(m_setup, CC_PropertyInformationTransferCapability(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY,
-                                                          IsdnBearer::OF(ring.ctype).capability));
     addCodecs(m_setup);
     readCommands(ring.subcmds, m_setup);
     readUserUser(ring.useruserinfo, m_setup);
@@ -131,10 +130,6 @@ void IsdnEndpoint::placeCall(MG_IContext* datapathContext)
     name.format("%u", m_callNumber);
     XCode result = m_adapter.setup(name, *this, this);
     IsdnParty const called = m_routes.isNumberShaped() ? IsdnParty::OF_TEXT(m_routes.getNumber()) : m_called;
-    CC_PropertyContainer own = m_setup;
-    QInformationTransferCapability const bearer = VALUE_OF<CC_PropertyInformationTransferCapability>(
-        own.get(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY), CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY);
-    own.remove(CC_PropertyId::INFORMATION_TRANSFER_CAPABILITY); // the call's, not a party's
     if (result.isOk())
         result = m_adapter.dial(
             {.contextName = m_interface.getEnvironment().contextName,
@@ -142,9 +137,9 @@ void IsdnEndpoint::placeCall(MG_IContext* datapathContext)
              .destination = STRING(called.getText()),
              .called = {.number = STRING(called.number), .typeOfNumber = called.type, .numberingPlan = called.plan},
              .sendingComplete = m_isNumberComplete,
-             .informationTransferCapability = bearer,
+             .informationTransferCapability = m_bearer.capability,
              .datapathContext = datapathContext,
-             .extraOwnProperties = &own});
+             .extraOwnProperties = &m_setup});
     if (!result.isOk())
         clear(QCause::NETWORK_OUT_OF_ORDER);
 }
@@ -161,6 +156,23 @@ bool IsdnEndpoint::tryNextRoute(QCause cause)
     m_hadPeer = false;
     m_adapter.drop(cause, 0);
     placeCall(media.get());
+    return true;
+}
+
+/// The far side's user hears in the channel why his call fails before it is cleared: the stack sends no DISCONNECT that
+/// leaves the channel to tones.
+bool IsdnEndpoint::tellByTone(QCause cause)
+{
+    unsigned int const seconds = m_interface.getConfiguration().failureTone;
+    MG_Tones::ECallProgressTone::Type const tone = CauseTone::OF(cause);
+    if (!m_isCalling || seconds == 0 || m_media == nullptr || !m_bearer.isSpeech() ||
+        tone == MG_Tones::ECallProgressTone::NONE || advance(IsdnCallState::PROGRESS_OUT) != IsdnCallState::GO_ON)
+        return false;
+    m_failure = cause;
+    m_media->playTone(tone);
+    if (!std::exchange(m_hasToldData, true))
+        ask([&](pri* stack) { return pri_progress(stack, m_call, getChannel(), 1); });
+    m_timer.start(seconds * 1000);
     return true;
 }
 

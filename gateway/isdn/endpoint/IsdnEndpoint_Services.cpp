@@ -6,6 +6,7 @@
 #include "isdn/element/IsdnUserUser.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
 #include "media/context/CallMedia.h"
+#include "media/rtp/ChannelTermination.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyKeys.h"
 #include "services/CC_ServiceUserInput.h"
@@ -29,13 +30,18 @@ std::string DIGITS_OF(std::string_view text)
 
 void IsdnEndpoint::onTimer()
 {
+    if (m_failure != QCause::NONE)
+    {
+        clear(m_failure);
+        return;
+    }
     switch (m_state)
     {
     case IsdnCallState::OVERLAP_RECEIVING: // T302
         if (!m_isInCall)
             dialIfComplete(true);
-        else if (getPeerState() == LegState::ADDRESS_INCOMPLETE)
-            clear(QCause::INVALID_NUMBER_FORMAT);
+        else
+            endNumber();
         break;
     case IsdnCallState::NULL_STATE: // T302: no further digit has come from the other side
         std::ignore = m_adapter.setOwn(Key::STATE, LegState::TRYING);
@@ -51,6 +57,15 @@ void IsdnEndpoint::onTimer()
     default:
         clear(m_state == IsdnCallState::CALL_DELIVERED ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING);
     }
+}
+
+/// No further digit comes: who waits for the whole number has it now, whoever wants more gets none.
+void IsdnEndpoint::endNumber()
+{
+    m_isNumberComplete = true;
+    std::ignore = m_adapter.setOwnSupportsOverlapSending(false);
+    if (getPeerState() == LegState::ADDRESS_INCOMPLETE && m_adapter.getPeerSupportsOverlapReceiving())
+        clear(QCause::INVALID_NUMBER_FORMAT);
 }
 
 void IsdnEndpoint::readCommands(pri_subcommands const* commands, CC_PropertyContainer& own)
@@ -133,7 +148,10 @@ void IsdnEndpoint::onDigits(char const* digits)
             collect(keyed);
             break;
         }
+        m_called.number += keyed; // for another route
         m_timer.start(m_interface.getLink().getTimers().t302);
+        if (getPeerState() == LegState::ADDRESS_INCOMPLETE && !m_adapter.getPeerSupportsOverlapReceiving())
+            m_hadPeer = false; // the adapter dials anew, and the new peer is not there at once
         [[fallthrough]];
     case IsdnCallState::GO_ON:
         if (m_isInCall && !keyed.empty())
@@ -193,12 +211,12 @@ void IsdnEndpoint::tellCharge(CC_Flags const& flags)
 
 // --- media -----------------------------------------------------------------------------------------------------------
 
-/// A line speaks A-law (G.711) and nothing else.
+/// A line speaks A-law (G.711) and nothing else, or carries bits (RFC 4040).
 void IsdnEndpoint::addCodecs(CC_PropertyContainer& own) const
 {
     if (!m_interface.getEnvironment().relaysMedia)
         return;
-    VoipCodec const codec(MG_Rtp::ECodec::PCMA, 20);
+    VoipCodec const codec(m_bearer.isSpeech() ? MG_Rtp::ECodec::PCMA : MG_Rtp::ECodec::CLEARMODE, 20);
     VoipCodecListSet supported;
     std::ignore = supported.getList(VoipCodecListSet::SEND_RECEIVE).append(codec);
     ADD(own, CC_PropertyCodecs(CC_PropertyId::SUPPORTED_CODECS, supported));
@@ -218,7 +236,9 @@ void IsdnEndpoint::openMedia()
     {
         m_mediaTimeslot = m_timeslot;
         m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this);
-        if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
+        if (m_media != nullptr && !m_bearer.isSpeech())
+            m_media->describe(ChannelTermination::DESCRIPTION(MG_Rtp::ECodec::CLEARMODE));
+        else if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
             m_media->detectDigits(true);
     }
     else if (&m_media->getCall() != call)

@@ -5,7 +5,7 @@
 
 namespace
 {
-constexpr unsigned char A_LAW = 8;         // payload type (RFC 3551)
+constexpr unsigned char PAYLOAD_TYPE = 8;  // of A-law (RFC 3551); nobody sees that of others
 constexpr unsigned int MOST_BLOCKS = 32;   // taken with one wake
 constexpr unsigned short DISCARD_PORT = 9; // of the address that stands for the channel
 } // namespace
@@ -17,11 +17,11 @@ ChannelTermination::ChannelTermination(unsigned long long number, Descriptor&& c
 {
 }
 
-MediaDescription ChannelTermination::DESCRIPTION()
+MediaDescription ChannelTermination::DESCRIPTION(MG_Rtp::ECodec::Type codec)
 {
     MediaDescription description;
     description.rtp = MediaAddress::OF("127.0.0.1", DISCARD_PORT);
-    description.formats.add({VoipCodec(MG_Rtp::ECodec::PCMA, 20), {A_LAW, A_LAW}});
+    description.formats.add({VoipCodec(codec, 20), {PAYLOAD_TYPE, PAYLOAD_TYPE}});
     return description;
 }
 
@@ -38,7 +38,7 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
         if (static_cast<std::size_t>(length) != TIMESTAMP + BLOCK)
             continue;
         std::uint32_t const timestamp = READ_32(block);
-        RtpHeader{false, A_LAW, m_sequence++, timestamp, m_source}.write(octets.data());
+        RtpHeader{false, PAYLOAD_TYPE, m_sequence++, timestamp, m_source}.write(octets.data());
         takeRtp(std::span(octets).first(RtpHeader::LENGTH + BLOCK), from, batch, now);
         sendRelayed(batch, now);
     }

@@ -16,8 +16,8 @@ public:
 
     ChannelTermination(unsigned long long number, Descriptor&& channel, MediaOptions const& options, Seed const& seed);
 
-    /// What such a leg is to be described with: A-law, both ways.
-    static MediaDescription DESCRIPTION();
+    /// What such a leg is to be described with: A-law, both ways; or CLEARMODE, which no partner mistakes for speech.
+    static MediaDescription DESCRIPTION(MG_Rtp::ECodec::Type codec = MG_Rtp::ECodec::PCMA);
 
     void receiveRtp(DatagramBatch& batch, long long now) override;
 

@@ -2,6 +2,7 @@
 
 #include "host/GatewayHost.h"
 #include "host/SignallingModule.h"
+#include "operation/CallTracer.h"
 #include "operation/control/ControlServer.h"
 #include "operation/record/CallWatch.h"
 #include "operation/record/RecordWriter.h"
@@ -30,12 +31,13 @@ public:
     /// All are the gateway's and outlive this. `interfaces`: the module of each. `records`: null
     /// where none are written.
     ControlCommands(GatewayHost& host, SignallingModules const& modules,
-                    std::map<std::string, std::string> const& interfaces, CallWatch& watch, RecordWriter const* records,
-                    ControlledGateway& gateway)
+                    std::map<std::string, std::string> const& interfaces, CallWatch& watch, CallTracer& tracer,
+                    RecordWriter const* records, ControlledGateway& gateway)
         : m_host(host)
         , m_modules(modules)
         , m_interfaces(interfaces)
         , m_watch(watch)
+        , m_tracer(tracer)
         , m_records(records)
         , m_gateway(gateway)
     {
@@ -64,6 +66,12 @@ private:
     ControlAnswer calls(ControlRequest const& request);
     ControlAnswer call(ControlRequest const& request);
     ControlAnswer history(ControlRequest const& request);
+    // ControlCommands_Top.cpp
+    ControlAnswer top(ControlRequest const& request);
+    // ControlCommands_Trace.cpp
+    ControlAnswer peers(ControlRequest const& request);
+    ControlAnswer registrations(ControlRequest const& request);
+    ControlAnswer trace(ControlRequest const& request);
 
     char const* getPhase() const;
 
@@ -71,6 +79,7 @@ private:
     SignallingModules const& m_modules;
     std::map<std::string, std::string> const& m_interfaces;
     CallWatch& m_watch;
+    CallTracer& m_tracer;
     RecordWriter const* m_records;
     ControlledGateway& m_gateway;
     TY::Time m_start = TY::Time::NOW(TY::Time::MONOTONIC);

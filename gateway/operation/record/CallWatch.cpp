@@ -142,6 +142,8 @@ void FOLLOW_STATE(CallRecord& record, CallRecord::Leg& known, int state, double 
 }
 } // namespace
 
+std::optional<CallRecord::Quality> CallWatch::GET_QUALITY(CC_CallLeg const& leg) { return QUALITY(leg); }
+
 double CallWatch::Call::getAge() const
 {
     return static_cast<double>(NOW<std::chrono::steady_clock>() - begin) / NANOSECONDS;

@@ -34,6 +34,15 @@ public:
     /// @}
     /// Null when no such call is up.
     CallRecord const* find(unsigned long long serial) const;
+    /// Tells of each call that is up, with its age in seconds.
+    template <class Visitor>
+    void visit(Visitor const& visitor) const
+    {
+        for (auto const& known : m_calls)
+            visitor(known.second.record, known.second.getAge());
+    }
+    /// As the leg has it now; nothing where it has no record.
+    static std::optional<CallRecord::Quality> GET_QUALITY(CC_CallLeg const& leg);
     /// Calls of which nothing could be told: memory was out.
     unsigned long long getNumberOfLost() const { return m_lost; }
 

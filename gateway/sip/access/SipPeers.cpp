@@ -47,6 +47,13 @@ bool SipPeers::takesCalls(Peer const& peer) const
     return peer.isUp && (peer.busyUntil.seconds == 0 || IS_PAST(peer.busyUntil));
 }
 
+char const* SipPeers::getStateName(std::size_t peer) const
+{
+    if (takesCalls(m_peers[peer]))
+        return "up";
+    return m_peers[peer].isUp ? "left alone" : "down";
+}
+
 SipPeers::Order SipPeers::choose() const
 {
     Order order;
@@ -175,12 +182,8 @@ void SipPeers::FORGET(Peer& peer)
 std::string SipPeers::describe() const
 {
     std::string text;
-    for (Peer const& peer : m_peers)
+    for (std::size_t i = 0; i < m_peers.size(); ++i)
         text += fmt::format("interface {}: peer {} is {}, {} calls, {} not taken\n", m_configuration.name,
-                            peer.configured.address.text(),
-                            takesCalls(peer) ? "up"
-                            : peer.isUp      ? "left alone"
-                                             : "down",
-                            peer.calls, peer.failures);
+                            getAddress(i).text(), getStateName(i), m_peers[i].calls, m_peers[i].failures);
     return text;
 }

@@ -35,6 +35,8 @@ public:
 
     /// Whom a call is to be offered to, one after the other; none: nobody takes calls now.
     Order choose() const;
+    std::size_t getNumberOfPeers() const { return m_peers.size(); }
+    char const* getStateName(std::size_t peer) const; ///< "up", "left alone" or "down"
     SocketAddress const& getAddress(std::size_t peer) const { return m_peers[peer].configured.address; }
     void noteCall(std::size_t peer) { ++m_peers[peer].calls; }
     /// It did not take the call: another one may.

@@ -130,9 +130,10 @@ std::string SipAnchoredSession::makeOffer()
         if (std::find(m_frame.formats.begin(), m_frame.formats.end(), ours.formats.back()) == m_frame.formats.end())
             m_frame.formats.push_back(ours.formats.back());
     }
+    bool const isSpeech = codecs.front() != MG_Rtp::ECodec::CLEARMODE;
     bool const hasOpus = std::find(codecs.begin(), codecs.end(), MG_Rtp::ECodec::OPUS) != codecs.end();
     for (unsigned int const rate : {TELEPHONE_RATE, RtpRoutes::CLOCK_RATE(MG_Rtp::ECodec::OPUS)})
-        if (rate == TELEPHONE_RATE || hasOpus)
+        if (isSpeech && (rate == TELEPHONE_RATE || hasOpus))
         {
             ours.events.push_back({rate, m_frame.getEventsType(rate)});
             if (std::find(m_frame.events.begin(), m_frame.events.end(), ours.events.back()) == m_frame.events.end())
@@ -204,6 +205,12 @@ unsigned int SipAnchoredSession::check(std::string const& offer)
         return 0; // the INVITE has none: we offer
     m_offerOfInvite = read(offer);
     return m_offerOfInvite && !getOffered(*m_offerOfInvite).empty() ? 0 : NOT_ACCEPTABLE;
+}
+
+QInformationTransferCapability SipAnchoredSession::getCapability() const
+{
+    return m_offerOfInvite ? SipCodecChoice::CAPABILITY_OF(getOffered(*m_offerOfInvite))
+                           : QInformationTransferCapability::SPEECH;
 }
 
 void SipAnchoredSession::addOffer(CC_PropertyContainer& own, std::string const&)
@@ -335,10 +342,19 @@ void SipAnchoredSession::followTone()
     auto const* const asked =
         CC_PropertyCallProgressTone::FROM(m_adapter.getPeerProperty(CC_PropertyId::CALL_PROGRESS_TONE));
     auto const tone = asked != nullptr ? asked->getTone() : MG_Tones::ECallProgressTone::NONE;
-    if (m_leg == nullptr || !m_isAgreed || tone == m_tone)
+    if (m_leg == nullptr || !m_isAgreed || tone == m_tone || m_isToneOurs)
         return;
     m_tone = tone;
     m_leg->playTone(tone);
+}
+
+bool SipAnchoredSession::playTone(MG_Tones::ECallProgressTone::Type tone)
+{
+    if (m_leg == nullptr || !m_isAgreed)
+        return false;
+    m_isToneOurs = true;
+    m_leg->playTone(tone);
+    return true;
 }
 
 /// Who holds may be silent.

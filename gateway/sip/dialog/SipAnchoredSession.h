@@ -38,6 +38,7 @@ public:
 
     // --- SipSession
     unsigned int check(std::string const& offer) override;
+    QInformationTransferCapability getCapability() const override;
     bool open() override;
     void addOffer(CC_PropertyContainer& own, std::string const& description) override;
     void addAnswer(CC_PropertyContainer& own, std::string const& description, bool isBinding) override;
@@ -56,6 +57,7 @@ public:
     void expectOffer() override {}
     void followCall() override;
     void noteInfo(bool isTaken) override;
+    bool playTone(MG_Tones::ECallProgressTone::Type tone) override;
     bool sendDigit(char digit, unsigned int milliseconds) override;
     std::optional<MediaQuality> getQuality() const override
     {
@@ -107,6 +109,7 @@ private:
     bool m_isAgreed = false;
     bool m_isOffering = false;
     bool m_isInfoTaken = false;
+    bool m_isToneOurs = false; // that our peer hears, whatever the other side asks for
     MG_Tones::ECallProgressTone::Type m_tone = MG_Tones::ECallProgressTone::NONE; // that our peer hears
     VoipCodecAndMode m_codec;
 };

@@ -62,6 +62,13 @@ Codec SipCodecChoice::FOR_ANSWER(Codecs const& offered, Across const& across)
     return HAS_SPOKEN(across.supported) ? FIRST_SPOKEN(offered) : MG_Rtp::ECodec::NONE;
 }
 
+/// The one that the peer likes best says it (RFC 4040).
+QInformationTransferCapability SipCodecChoice::CAPABILITY_OF(Codecs const& offered)
+{
+    bool const isClear = !offered.empty() && offered.front() == MG_Rtp::ECodec::CLEARMODE;
+    return isClear ? QInformationTransferCapability::UNRESTRICTED_DIGITAL : QInformationTransferCapability::SPEECH;
+}
+
 bool SipCodecChoice::HAS_COMPATIBLE(Codecs const& codecs, Codec other)
 {
     return std::any_of(codecs.begin(), codecs.end(), [other](Codec codec) { return ARE_COMPATIBLE(codec, other); });

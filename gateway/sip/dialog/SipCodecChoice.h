@@ -1,6 +1,7 @@
 #pragma once
 
 #include "platform/media/MG_Rtp.h"
+#include "platform/signalling/QInformationTransferCapability.h"
 
 #include <vector>
 
@@ -26,6 +27,8 @@ struct Across
 Codecs FOR_OFFER(Codecs const& own, Across const& across);
 /// One of those that our peer has offered and its interface takes; NONE: nothing would be understood across.
 Codec FOR_ANSWER(Codecs const& offered, Across const& across);
+/// What the call has to carry whose peer offers these.
+QInformationTransferCapability CAPABILITY_OF(Codecs const& offered);
 /// Whether what is said in the one can be heard in the other: they are the same, or both are spoken here.
 bool ARE_COMPATIBLE(Codec one, Codec other);
 /// Whether one of them is so.

@@ -1,6 +1,8 @@
 #pragma once
 
 #include "media/quality/MediaQuality.h"
+#include "platform/media/MG_Tones.h"
+#include "platform/signalling/QInformationTransferCapability.h"
 
 #include <new>
 #include <optional>
@@ -51,6 +53,8 @@ public:
 
     /// Whether an INVITE's offer can be served at all; 0, or the status with which it is refused.
     virtual unsigned int check(std::string const& offer) = 0;
+    /// What the call has to carry by that offer.
+    virtual QInformationTransferCapability getCapability() const { return QInformationTransferCapability::SPEECH; }
     /// Takes what it needs in the call; whether there was any.
     virtual bool open() = 0;
     /// Our peer's offer in its INVITE, or in the answer to ours.
@@ -94,6 +98,8 @@ public:
     virtual void followCall() = 0;
     /// Whether our peer takes digits in INFO.
     virtual void noteInfo(bool isTaken) = 0;
+    /// From now on our peer hears that tone of ours and nothing else; whether it can.
+    virtual bool playTone(MG_Tones::ECallProgressTone::Type) { return false; }
     /// The other side's digit, for our peer: whether it goes there with the media; else the dialog is to tell it.
     virtual bool sendDigit(char digit, unsigned int milliseconds) = 0;
     /// Of the media until now; nothing without any.

@@ -86,9 +86,11 @@ SipEndpoint::~SipEndpoint()
     if (m_leg != nullptr)
         nta_leg_destroy(m_leg);
     forgetForks();
-    for (nta_leg_t* const leg : m_otherLegs)
-        if (leg != nullptr)
-            nta_leg_destroy(leg);
+    endAttempts();
+    for (std::vector<nta_leg_t*> const& legs : {m_otherLegs, m_formerLegs})
+        for (nta_leg_t* const leg : legs)
+            if (leg != nullptr)
+                nta_leg_destroy(leg);
 }
 
 String const& SipEndpoint::getName() const { return m_interface.getName(); }
@@ -117,12 +119,15 @@ void SipEndpoint::followCall(CC_Flags const& flags)
 {
     traceFlags(flags);
     m_session.followCall();
+    followCharge(flags);
     if (isPeerReleased())
     {
         if (!m_isTransferring) // else our peer is to have the target
             onPeerReleased();
         return;
     }
+    if (m_isNumberOpen && !isPeerDialling())
+        endNumber();
     if (m_dialog == SipDialogState::INVITE_RECEIVED && m_isReplacing)
         m_session.follow(false);
     else if (m_dialog == SipDialogState::INVITE_RECEIVED)
@@ -161,11 +166,13 @@ bool SipEndpoint::isPeerReleased() const
 
 void SipEndpoint::onPeerReleased()
 {
+    if (m_failure)
+        return; // our peer is hearing of it
     SipCause const cause =
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
-    if (tryNextRoute(cause))
+    if (tryNextRoute(cause) || tellByTone(cause))
         return;
     endDialog(cause);
     leaveCall(cause);
@@ -202,6 +209,7 @@ void SipEndpoint::endWithoutWords()
 /// Takes the leg out of the call, with the cause in the peer's words.
 void SipEndpoint::leaveCall(SipCause const& cause)
 {
+    endAttempts();
     if (!std::exchange(m_isInCall, false))
     {
         finishIfDone();

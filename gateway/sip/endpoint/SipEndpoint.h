@@ -94,12 +94,21 @@ private:
         bool isAgreed = false;     ///< one of them had the answer
     };
 
+    /// An INVITE with fewer digits than ours has now.
+    struct Attempt
+    {
+        Invitation invitation;
+        nta_leg_t* leg;
+    };
+
     // calling side: SipEndpoint_Calling.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request);
     int refuseSession(nta_incoming_t* transaction);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
     XCode dial(sip_t const* request, MG_IContext* datapathContext);
     bool tryNextRoute(SipCause const& cause);
+    bool tellByTone(SipCause const& cause);
+    void endByTone();
     void startExpiry(sip_t const* request);
     void failDialLater(QCause cause);
     void onCallingTimer();
@@ -124,9 +133,26 @@ private:
     void answerFinally(unsigned int status, std::string const& reasonHeader);
     void forgetTransaction();
 
+    // numbers that come digit by digit: SipEndpoint_Overlap.cpp
+    bool isOverlapping() const;
+    int onMoreDigits(nta_incoming_t* transaction, sip_t const* request);
+    int joinDigits(nta_incoming_t* transaction, sip_t const* request, std::string const& digits);
+    void awaitDigits();
+    void onDialledOn();
+    bool isPeerDialling() const;
+    bool beginNumber();
+    bool takeDigits(CC_ServiceUserInput const& input);
+    bool inviteAgain();
+    nta_leg_t* makeClientLeg(std::string const& from, std::string const& to);
+    bool awaitMoreDigits(unsigned int status);
+    void endNumber();
+    bool isOfAttempt(nta_outgoing_t* transaction, int status);
+    void endAttempts();
+
     // called side: SipEndpoint_Called.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
+    bool inviteNumber();
     bool findContacts(std::string const& user);
     bool findWay(CC_PropertyContainer const& offerProperties);
     bool findPeer();
@@ -221,8 +247,17 @@ private:
     // SipEndpoint_Input.cpp
     int onInfo(nta_incoming_t* transaction, sip_t const* request);
     void onUserInput(CC_ServiceUserInput const& input);
+    void sendInfo();
     void sendDigit();
     static int HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
+
+    // SipEndpoint_Charge.cpp
+    bool takeCharge(sip_t const* request);
+    int onChargeInfo(nta_incoming_t* transaction, sip_t const* request);
+    bool tellsCharges() const;
+    void followCharge(CC_Flags const& flags);
+    std::string getFinalCharge() const;
+    void sendCharge();
 
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
@@ -291,6 +326,7 @@ private:
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     RouteHunt m_routes;                    // calling side
     QCause m_dialFailure = QCause::NONE;
+    std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;
     bool m_hasEarlyMedia = false;
     bool m_asksForTone = false;    // called side
@@ -330,11 +366,16 @@ private:
     std::string m_ownSession;            // what our peer has of us
     bool m_isRefresh = false;            // ours
     std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
-    SipPeers::Order m_peers; // without contacts: whom the call is offered to, the one that is being tried first
-    String m_calledUser;
+    SipPeers::Order m_peers;  // without contacts: whom the call is offered to, the one that is being tried first
     bool m_isUnheard = false; // that one has said nothing yet
     std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
+    std::string m_headersForTarget;
+    SipParty m_called;                    // as far as its number has come
+    std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
+    std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
+    std::vector<Attempt> m_attempts;      // called side
+    bool m_isNumberOpen = false;          // called side: digits may follow
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has
@@ -342,6 +383,7 @@ private:
     bool m_isReplacing = false;    // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
     std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
+    std::string m_charge;                               // to be told
     nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;

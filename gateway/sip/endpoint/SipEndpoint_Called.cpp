@@ -108,34 +108,41 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
 
 bool SipEndpoint::sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties)
 {
-    SipConfiguration const& configuration = m_interface.getConfiguration();
     auto const* const maxForwards =
         dynamic_cast<CC_PropertyUnsigned const*>(offerProperties.get(SipPropertyId::MAX_FORWARDS));
     auto const* const forTarget = CC_PropertyString::FROM(offerProperties.get(SipPropertyId::HEADERS_FOR_TARGET));
-    SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    m_calledUser = STRING(called.getUser());
     if (!findContacts(called.getUser()) || !findWay(offerProperties) || !findPeer())
         return true;
+    if (forTarget != nullptr)
+        m_headersForTarget = FOR_PEER(forTarget->getValue().view(), m_interface.getConfiguration().isTrusted);
+    m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
+    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
+        hops != nullptr && hops->getValue() != 0)
+        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
+    m_called = called;
+    return beginNumber();
+}
+
+/// An INVITE for the number as far as it is known.
+bool SipEndpoint::inviteNumber()
+{
+    SipConfiguration const& configuration = m_interface.getConfiguration();
+    SipParty const& called = m_called;
+    SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
     std::string const uri = m_contacts.empty()
                                 ? SipAddress::MAKE_URI(called.getUser(), getPeerAddress(), m_way)
                                 : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), SipWay::UDP);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
-    m_leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this,
-                            SIPTAG_FROM_STR(caller.getFrom(configuration.getAddress()).c_str()),
-                            SIPTAG_TO_STR(to.c_str()), TAG_END());
-    if (m_leg == nullptr || nta_leg_tag(m_leg, nullptr) == nullptr)
+    char const* const tag = m_leg != nullptr ? nta_leg_get_tag(m_leg) : nullptr;
+    m_leg = makeClientLeg(caller.getFrom(configuration.getAddress()), to);
+    if (m_leg == nullptr || nta_leg_tag(m_leg, tag) == nullptr)
         return false;
     SipDiversion const diversion = SipDiversion::OF_PEER(m_adapter);
     m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
     if (configuration.isTrusted || !diversion.isRestricted())
         m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
-    if (forTarget != nullptr)
-        m_inviteHeaders += FOR_PEER(forTarget->getValue().view(), configuration.isTrusted);
+    m_inviteHeaders += m_headersForTarget;
     m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
-    m_maxForwards = maxForwards != nullptr ? static_cast<unsigned int>(maxForwards->getValue()) : DEFAULT_MAX_FORWARDS;
-    if (auto const* const hops = CC_PropertyUnsigned::FROM(m_adapter.getCallProperty(CC_PropertyId::HOPS));
-        hops != nullptr && hops->getValue() != 0)
-        m_maxForwards = std::min(m_maxForwards, static_cast<unsigned int>(hops->getValue()));
     return startInvite();
 }
 
@@ -214,7 +221,7 @@ bool SipEndpoint::tryNextPeer()
         return false;
     m_peers.erase(m_peers.begin());
     m_interface.getPeers().noteCall(m_peers.front());
-    m_inviteUri = SipAddress::MAKE_URI(m_calledUser.view(), getPeerAddress(), m_way);
+    m_inviteUri = SipAddress::MAKE_URI(m_called.getUser(), getPeerAddress(), m_way);
     m_invite.forget();
     m_negotiation.fail();
     return startInvite();
@@ -237,6 +244,7 @@ bool SipEndpoint::startInvite()
 {
     std::string const hops = std::to_string(m_maxForwards);
     std::string const headers = m_inviteHeaders + m_sessionTimer.getRequestHeaders();
+    bool const takesCharges = m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE;
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
@@ -244,6 +252,7 @@ bool SipEndpoint::startInvite()
         m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
+        TAG_IF(takesCharges, SIPTAG_ACCEPT_STR("application/sdp, application/vnd.etsi.aoc+xml")),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
@@ -263,6 +272,8 @@ int SipEndpoint::HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* t
     endpoint->handle(
         [&]
         {
+            if (endpoint->isOfAttempt(transaction, status))
+                return;
             if (status < 200)
                 endpoint->onProvisional(static_cast<unsigned int>(status), response);
             else if (status < 300 && response != nullptr && response->sip_to != nullptr)
@@ -279,6 +290,10 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
         return;
     trace("<- " + std::to_string(status));
     noteHeard();
+    if (status > 100)
+        endAttempts(); // its number is complete
+    else if (m_isNumberOpen)
+        return; // nothing is said of the number
     Fork* const fork = findFork(response);
     m_hasRung = m_hasRung || status == 180;
     if (fork != nullptr && status == 180)
@@ -335,6 +350,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
     switch (advance(SipDialogState::ANSWER_IN))
     {
     case SipDialogState::PROCEED:
+        endAttempts();
         confirmDialog(response);
         takeAnswer(response);
         break;
@@ -407,7 +423,7 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         noteHeard();
         return;
     }
-    if (tryAnother(status, response))
+    if (awaitMoreDigits(status) || tryAnother(status, response))
         return;
     if (advance(SipDialogState::REJECTED) == SipDialogState::IGNORE)
         return;
@@ -443,6 +459,11 @@ void SipEndpoint::onCalledTimer()
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
+    if (m_isNumberOpen && m_invite.transaction == nullptr)
+    {
+        endNumber();
+        return;
+    }
     if (advance(SipDialogState::TIMEOUT) == SipDialogState::IGNORE)
         return;
     if (m_dialog == SipDialogState::OVER)
@@ -540,6 +561,11 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
 
 void SipEndpoint::cancel(SipCause const& cause)
 {
+    if (m_invite.transaction == nullptr) // more digits are awaited
+    {
+        m_dialog = SipDialogState::OVER;
+        return;
+    }
     std::string const reason = cause.getReasonHeader(true);
     trace("-> CANCEL, Reason: " + reason);
     m_byeAfterAck = cause; // should it be answered all the same

@@ -1,6 +1,7 @@
 // The calling side: the INVITE was received, the peer leg says how it is answered.
 #include "sip/endpoint/SipEndpoint.h"
 
+#include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
@@ -92,6 +93,12 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
     startExpiry(request);
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
+    m_called = SipIdentity::READ_CALLED(request);
+    if (isOverlapping())
+    {
+        m_firstOffer = session;
+        awaitDigits();
+    }
     noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     if (!dial(request, nullptr).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
@@ -134,6 +141,8 @@ void SipEndpoint::onCallingTimer()
         clear({m_dialFailure, m_dialFailure == QCause::INCOMPATIBLE_DESTINATION ? 488u : 0u, {}});
         return;
     }
+    if (m_failure)
+        endByTone();
     if (m_dialog != SipDialogState::INVITE_RECEIVED)
         return;
     trace("the INVITE has expired");
@@ -160,8 +169,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
 XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
 {
     std::string const& provider = m_routes.getProvider();
-    SipParty const called =
-        m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : SipIdentity::READ_CALLED(request);
+    SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const caller = SipIdentity::READ_CALLER(request, m_interface.getConfiguration().isTrusted);
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
@@ -185,7 +193,7 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     return m_adapter.dial(m_interface.getEnvironment().host.contextName, provider.c_str(), STRING(called.getUser()),
                           STRING(party.number), party.type, party.plan, party.presentation, party.screening,
                           STRING(party.name), STRING(called.number), called.type, called.plan, STRING(called.name),
-                          true, QInformationTransferCapability::SPEECH, datapathContext, &own, &offer, &call);
+                          !isOverlapping(), m_session.getCapability(), datapathContext, &own, &offer, &call);
 }
 
 /// Nobody was reached, and our peer has heard nothing: with a new leg in another call, but the same media, and as if
@@ -205,6 +213,35 @@ bool SipEndpoint::tryNextRoute(SipCause const& cause)
     if (!dial(sip_object(request.get()), media.get()).isOk())
         clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
     return true;
+}
+
+/// A caller who has no tones of his own is told of the failure by ours before his INVITE is.
+bool SipEndpoint::tellByTone(SipCause const& cause)
+{
+    unsigned int const seconds = m_interface.getConfiguration().failureTone;
+    MG_Tones::ECallProgressTone::Type const tone = CauseTone::OF(cause.cause);
+    if (!m_isCalling || m_dialog != SipDialogState::INVITE_RECEIVED || seconds == 0 || !m_hasOffer ||
+        tone == MG_Tones::ECallProgressTone::NONE || !m_interface.getEnvironment().host.relaysMedia)
+        return false;
+    std::string const session = m_session.readForInvite(true);
+    if (!m_session.playTone(tone))
+        return false;
+    m_failure = cause;
+    trace("plays a tone for the cause " + std::to_string(static_cast<int>(cause.cause)));
+    if (!isAgreedEarly() && m_earlySession.empty())
+    {
+        m_earlySession = session;
+        answerProvisionally(SIP_183_SESSION_PROGRESS);
+    }
+    m_timer.start(seconds * 1000);
+    return true;
+}
+
+void SipEndpoint::endByTone()
+{
+    SipCause const cause = *m_failure;
+    endDialog(cause);
+    leaveCall(cause);
 }
 
 int SipEndpoint::HANDLE_ACK_OR_CANCEL(SipEndpoint* endpoint, nta_incoming_t*, sip_t const* request)

@@ -3,6 +3,7 @@
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
 #include "sip/message/SipBody.h"
+#include "sip/message/SipCharge.h"
 #include "sip/message/SipPropertyId.h"
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
@@ -28,6 +29,9 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     case sip_method_options:
         return m_interface.answerOptions(transaction);
     case sip_method_invite:
+        if (m_isCalling && isOverlapping() && request->sip_to->a_tag == nullptr) // the stack takes it for the dialog's
+            return onMoreDigits(transaction, request);
+        [[fallthrough]];
     case sip_method_update:
         return onOffer(transaction, request);
     case sip_method_info:
@@ -51,6 +55,7 @@ int SipEndpoint::onBye(sip_t const* request)
     if (action == SipDialogState::REFUSE)
         return 481; // there is no dialog yet
     trace("<- BYE, -> 200");
+    takeCharge(request); // it ends whatever that is
     if (action == SipDialogState::TERMINATE)
         answerFinally(487, {});
     else if (!wasUp)
@@ -89,9 +94,12 @@ void SipEndpoint::endDialog(SipCause const& cause)
 void SipEndpoint::sendBye(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
-    trace("-> BYE, Reason: " + reason);
+    std::string const charge = getFinalCharge();
+    trace("-> BYE" + std::string(charge.empty() ? "" : " with a charge") + ", Reason: " + reason);
     m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
-                                         SIPTAG_REASON_STR(reason.c_str()), TAG_END());
+                                         SIPTAG_REASON_STR(reason.c_str()),
+                                         TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipCharge::TYPE)),
+                                         TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
     if (m_bye != nullptr)
         return;
     advance(SipDialogState::BYE_DONE);

@@ -3,6 +3,7 @@
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipBody.h"
+#include "sip/message/SipCharge.h"
 #include "sip/message/SipDigits.h"
 #include "sip/message/SipProperty.h"
 
@@ -22,6 +23,8 @@ int SipEndpoint::onInfo(nta_incoming_t* transaction, sip_t const* request)
     if (request->sip_payload == nullptr || request->sip_content_type == nullptr)
         return 200; // asks whether we are here
     char const* const type = request->sip_content_type->c_type;
+    if (SipCharge::IS_TYPE(type) && m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE)
+        return onChargeInfo(transaction, request);
     if (!SipDigits::IS_TYPE(type))
     {
         nta_incoming_treply(transaction, SIP_415_UNSUPPORTED_MEDIA,
@@ -51,16 +54,26 @@ void SipEndpoint::onDigit(char digit, unsigned int milliseconds)
 /// One after the other, for INFOs may overtake each other.
 void SipEndpoint::onUserInput(CC_ServiceUserInput const& input)
 {
+    if (takeDigits(input))
+        return;
     for (char const digit : input.getInput().view())
         if (!m_session.sendDigit(digit, input.getDuration()) && m_digits.size() < MOST_WAITING)
             m_digits.emplace_back(digit, input.getDuration());
-    sendDigit();
+    sendInfo();
+}
+
+void SipEndpoint::sendInfo()
+{
+    if (m_info != nullptr || m_dialog != SipDialogState::UP)
+        return;
+    if (!m_digits.empty())
+        sendDigit();
+    else if (!m_charge.empty())
+        sendCharge();
 }
 
 void SipEndpoint::sendDigit()
 {
-    if (m_info != nullptr || m_digits.empty() || m_dialog != SipDialogState::UP)
-        return;
     auto const [digit, duration] = m_digits.front();
     m_digits.pop_front();
     trace(std::string("-> INFO ") + digit);
@@ -80,6 +93,6 @@ int SipEndpoint::HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tra
     nta_outgoing_destroy(std::exchange(endpoint->m_info, nullptr));
     if (status >= 300)
         endpoint->m_digits.clear(); // it takes none
-    endpoint->handle([&] { endpoint->sendDigit(); });
+    endpoint->handle([&] { endpoint->sendInfo(); });
     return 0;
 }

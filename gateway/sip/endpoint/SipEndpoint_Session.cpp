@@ -451,7 +451,7 @@ void SipEndpoint::ON_OFFER_TIMER(void* endpoint)
                 self.startOffer(self.m_offer, self.m_isOfferQuick);
             }
             else if (self.m_offerReceived == nullptr && self.m_dialog == SipDialogState::INVITE_RECEIVED)
-                self.repeatProvisional();
+                self.m_provisional == 0 ? self.onDialledOn() : self.repeatProvisional();
             else
             {
                 self.m_session.withdraw(); // the other side does not know what to say

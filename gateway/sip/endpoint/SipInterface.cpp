@@ -4,6 +4,7 @@
 #include "calls/CC_Call.h"
 #include "media/context/MediaAddress.h"
 #include "platform/eventloop/TYEvent.h"
+#include "properties/CC_Cause.h"
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipFocus.h"
@@ -227,6 +228,12 @@ int SipInterface::answerOptions(nta_incoming_t* transaction) const
     return hasRoom ? 200 : 503;
 }
 
+RouteHunt SipInterface::findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const
+{
+    std::string const calling = SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser();
+    return m_environment.host.findRoutes(m_configuration.name, number, calling, callNumber);
+}
+
 int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* request)
 {
     if (int const refused = checkInvite(transaction, request); refused != 0)
@@ -239,10 +246,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
     RouteHunt const routes =
-        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number)
-                     : m_environment.host.findRoutes(
-                           m_configuration.name, number,
-                           SipIdentity::READ_CALLER(request, m_configuration.isTrusted).party.getUser(), callNumber);
+        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number) : findRoutes(request, number, callNumber);
     if (routes.isEmpty())
         return refuseUnrouted(transaction, callNumber, number);
     SipEndpoint* endpoint = nullptr;
@@ -286,13 +290,16 @@ int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* req
 
 int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
 {
-    SipCause const cause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
+    bool const isBeginning = m_configuration.overlap == SipConfiguration::Overlap::INVITE &&
+                             m_environment.host.routing.isBeginning(m_configuration.name, number);
+    SipCause const cause = isBeginning ? SipCause{QCause::INVALID_NUMBER_FORMAT, 484, {}}
+                                       : SipCause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
     ++m_environment.host.counters.failed;
-    spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination), SIP 404", callNumber,
-                 m_configuration.name, number);
-    nta_incoming_treply(transaction, SIP_404_NOT_FOUND, SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()),
-                        TAG_END());
-    return 404;
+    spdlog::info("call {} {} refused: no route to '{}', cause {} ({}), SIP {}", callNumber, m_configuration.name,
+                 number, static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause), cause.sipCode);
+    nta_incoming_treply(transaction, static_cast<int>(cause.sipCode), nullptr,
+                        SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()), TAG_END());
+    return static_cast<int>(cause.sipCode);
 }
 
 /// What keeps an INVITE from being a call, whatever it asks for.

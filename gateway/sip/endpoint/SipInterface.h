@@ -1,6 +1,7 @@
 #pragma once
 
 #include "callcontrol/provider/CC_Provider.h"
+#include "host/RouteHunt.h"
 #include "platform/base/IpAddress.h"
 #include "sip/SipConfiguration.h"
 #include "sip/access/SipAuthentication.h"
@@ -53,6 +54,8 @@ public:
     int handleRequest(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) override;
 
     String const& getName() const { return m_name; }
+    /// By which routes a call of that INVITE to that number leaves.
+    RouteHunt findRoutes(sip_t const* request, std::string const& number, unsigned int callNumber) const;
     SipConfiguration const& getConfiguration() const { return m_configuration; }
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }

@@ -14,7 +14,7 @@ using Codec = MG_Rtp::ECodec;
 constexpr Codec::Type CODECS[] = {Codec::PCMU,    Codec::GSM,     Codec::G723, Codec::DVI4_8000,  Codec::DVI4_16000,
                                   Codec::LPC,     Codec::PCMA,    Codec::G722, Codec::L16_STEREO, Codec::L16_MONO,
                                   Codec::QCELP,   Codec::G728,    Codec::G729, Codec::G726_16,    Codec::G726_24,
-                                  Codec::G726_32, Codec::G726_40, Codec::ILBC, Codec::OPUS};
+                                  Codec::G726_32, Codec::G726_40, Codec::ILBC, Codec::OPUS,       Codec::CLEARMODE};
 } // namespace
 
 bool SipCodec::IS_COMPANION(std::string_view payloadType, std::string_view name)

@@ -46,6 +46,15 @@ public:
     void restore(std::string const& user, SipBinding const& binding) { m_users[user].push_back(binding); }
     /// Those that have not expired, the best liked first, of equals the one that was heard of last.
     std::vector<SipBinding> find(std::string_view user) const;
+    /// Tells of each contact that has not expired with its user.
+    template <class Visitor>
+    void visit(Visitor const& visitor) const
+    {
+        for (auto const& [user, bindings] : m_users)
+            for (SipBinding const& binding : bindings)
+                if (binding.until > NOW())
+                    visitor(user, binding);
+    }
     std::size_t getNumber() const; ///< of contacts that have not expired
 
     static long long NOW();

@@ -37,6 +37,13 @@ public:
     bool hasUser(std::string_view user) const;
     /// URIs, the one first that is to be tried first; empty for one who is not registered.
     std::vector<std::string> find(std::string_view user) const;
+    /// Tells of each contact with its user.
+    template <class Visitor>
+    void visit(Visitor const& visitor) const
+    {
+        m_bindings.visit(visitor);
+    }
+    std::size_t getNumberOfContacts() const { return m_bindings.getNumber(); }
     /// A line for the dump.
     std::string describe() const;
 

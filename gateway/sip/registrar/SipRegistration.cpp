@@ -231,10 +231,16 @@ bool SipRegistration::isBound() const
     return m_boundUntil.seconds != 0 && TY::Time::NOW(TY::Time::MONOTONIC).seconds < m_boundUntil.seconds;
 }
 
+long long SipRegistration::getSecondsLeft() const
+{
+    return isBound() ? static_cast<long long>(m_boundUntil.seconds) -
+                           static_cast<long long>(TY::Time::NOW(TY::Time::MONOTONIC).seconds)
+                     : 0;
+}
+
 std::string SipRegistration::describe() const
 {
-    std::string const state =
-        isBound() ? fmt::format("for {} s", m_boundUntil.seconds - TY::Time::NOW(TY::Time::MONOTONIC).seconds) : "not";
+    std::string const state = isBound() ? fmt::format("for {} s", getSecondsLeft()) : "not";
     return fmt::format("interface {}: registered {} as {}, {} requests, {} failures\n", m_configuration.name, state,
                        ADDRESS_OF_RECORD(m_configuration), m_sent, m_failed);
 }

@@ -29,6 +29,9 @@ public:
     void start();
     void end();
     bool isEnding() const { return m_state == ENDING; }
+    /// Whether the provider has our contact.
+    bool isBound() const;
+    long long getSecondsLeft() const; ///< 0: it is not
     /// A line for the dump.
     std::string describe() const;
 
@@ -62,7 +65,6 @@ private:
     void onTimer();
     void forgetRequest();
     void finish();
-    bool isBound() const;
     /// The stack hands back what it was given, whose type is that of most who send.
     SipEndpoint* asMagic() { return reinterpret_cast<SipEndpoint*>(this); }
 

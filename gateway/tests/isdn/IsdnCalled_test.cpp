@@ -121,6 +121,18 @@ TEST_F(IsdnCalledTest, ALineThatTakesNumbersWholeWaitsForThem)
     expectNothingLeft();
 }
 
+TEST_F(IsdnCalledTest, ANumberThatIsSaidToBeWholeIsNotWaitedFor)
+{
+    configuration.isOverlapSending = false;
+    open();
+    call("4989", false);
+    EXPECT_TRUE(waitForPeer("ADDRESS-INCOMPLETE"));
+    std::ignore = other.say(CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_SENDING, false));
+    EXPECT_TRUE(waitFor("RING 4989."));
+    other.hangUp();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnCalledTest, ANumberThatLeadsNowhereIsGivenUp)
 {
     configuration.timers.t304 = 50;

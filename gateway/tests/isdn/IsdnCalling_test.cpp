@@ -160,6 +160,22 @@ TEST_F(IsdnCallingTest, ANumberThatStaysIncompleteIsCleared)
     expectNothingLeft();
 }
 
+TEST_F(IsdnCallingTest, WhoWaitsForTheWholeNumberIsToldThatItIs)
+{
+    configuration.collects = false;
+    configuration.timers.t302 = 100;
+    open();
+    side->call("4989", false);
+    ASSERT_TRUE(waitForOffer());
+    std::ignore = other.say(CC_PropertyBoolean(CC_PropertyId::SUPPORTS_OVERLAP_RECEIVING, false));
+    std::ignore = other.become(FakeModule::State::ADDRESS_INCOMPLETE);
+    EXPECT_TRUE(watch.runUntil([&] { return other.getPeerValue(CC_PropertyId::SUPPORTS_OVERLAP_SENDING) == "false"; }));
+    std::ignore = other.become(FakeModule::State::ALERTING);
+    EXPECT_TRUE(waitFor("RINGING"));
+    other.hangUp();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnCallingTest, ADiallerWhoStopsWithoutADigit)
 {
     configuration.timers.t302 = 100;

@@ -1,4 +1,5 @@
 # The exchange calls a SIP phone, digit by digit; who calls and who redirected the call is told, and the cause comes back.
+# Of a busy one it hears so in the channel first, if the line asks for that.
 . "$(dirname "$0")/isdn.bash"
 
 write_isdn_configuration
@@ -35,4 +36,25 @@ expect_report "0 calls received, 0 answered; 1 placed, 1 answered, 1 over; 0 uni
 expect_wellformed
 expect_wire 'q931.message_type == 0x7b' q931.called_party_number.digits '#'
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+
+busy() {
+    expect_invite
+    respond_finally "486 Busy Here"
+    expect_request ACK
+}
+write_isdn_configuration 'failure-tone = 1'
+start_exchange <<END
+[[call]]
+to = "4420888"
+after = 800
+END
+PORT_B=$PORT_A PORT_CALLEE=$PORT_CALLER start_callee busy
+start_isdn_gateway
+expect_callee
+expect_log 'call 1 b \(calling side, timeslot 31\) released: cause 17 '
+stop_exchange
+expect_report "cause 17: 1"
+expect_wellformed
+expect_wire 'q931.message_type == 0x03' q931.progress_indicator.description 0x08
+stop_gateway "1 calls placed, 0 answered, 0 cleared, 1 failed"
 finish

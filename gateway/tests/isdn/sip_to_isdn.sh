@@ -3,7 +3,8 @@
 . "$(dirname "$0")/isdn.bash"
 
 write_isdn_configuration
-start_exchange <<END
+PLAN=$(
+    cat <<END
 [[number]]
 number = "4989123"
 connected = "89124"
@@ -16,10 +17,18 @@ number = "4989200"
 does = "busy"
 
 [[number]]
+number = "4989124"
+units = 25
+currency = "EUR"
+releases = 150
+
+[[number]]
 number = "4989300"
 does = "reject"
 cause = 88
 END
+)
+start_exchange <<<"$PLAN"
 start_isdn_gateway
 
 answered() {
@@ -61,4 +70,20 @@ expect_wire 'q931.message_type == 0x4d && q932.ros.local == 36' q932.ros.local 3
 expect_trace 'told peer Charge=3 units .subTotal.'
 tell_trace 'Charge=[0-9]+ units .*'
 stop_gateway "4 calls placed, 1 answered, 1 cleared, 3 failed"
+
+# the same charges where the phone is told them, in money
+charged() {
+    call_up
+    expect_request INFO Content-Type: "application/vnd.etsi.aoc.xml" body \
+        "aoc-d..charging-info.subtotal.*currency-id.EUR.*currency-amount.0.25.*/aoc-d"
+    respond_once "200 OK"
+    expect_request BYE body "aoc-e.*currency-amount.0.25./currency-amount"
+    respond_in_dialog "200 OK"
+}
+write_isdn_configuration '' 'charges = "tell"'
+start_exchange <<<"$PLAN"
+start_isdn_gateway
+RELAYED=m=audio expect_caller charged 4989124
+stop_exchange
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 finish

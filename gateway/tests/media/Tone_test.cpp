@@ -1,6 +1,7 @@
 #include "MediaFixture.h"
 #include "Sound.h"
 #include "media/codec/VoiceCodec.h"
+#include "media/tone/CauseTone.h"
 #include "media/tone/DtmfDetector.h"
 #include "media/tone/ToneTable.h"
 
@@ -252,4 +253,15 @@ TEST_F(Tones, WithoutTelephoneEventsADigitGoesOutAsSound)
     EXPECT_GT(Sound::AMPLITUDE(std::span(heard).first(800), 770, 8000), 2000);
     EXPECT_GT(Sound::AMPLITUDE(std::span(heard).first(800), 1477, 8000), 2000);
     EXPECT_LT(Sound::AMPLITUDE(std::span(heard).first(800), 1209, 8000), 300);
+}
+
+TEST(CauseTone, TellsWhyACallFails)
+{
+    using Tone = MG_Tones::ECallProgressTone;
+    EXPECT_EQ(CauseTone::OF(QCause::USER_BUSY), Tone::BUSY);
+    EXPECT_EQ(CauseTone::OF(QCause::SWITCHING_EQUIPMENT_CONGESTION), Tone::CONGESTION);
+    EXPECT_EQ(CauseTone::OF(QCause::NO_CIRCUIT_CHANNEL_AVAILABLE), Tone::CONGESTION);
+    EXPECT_EQ(CauseTone::OF(QCause::UNALLOCATED_NUMBER), Tone::SPECIAL_INFORMATION);
+    EXPECT_EQ(CauseTone::OF(QCause::NORMAL_CALL_CLEARING), Tone::NONE);
+    EXPECT_EQ(CauseTone::OF(QCause::NO_ANSWER_FROM_USER), Tone::NONE) << "he has heard it ring";
 }

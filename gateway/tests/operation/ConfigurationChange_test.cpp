@@ -50,6 +50,7 @@ TEST(ConfigurationChange, OfWhatIsOpenNeedsARestart)
     EXPECT_EQ(CHANGED("[control]", "[media]\ndscp = 1\n[control]"), "media");
     EXPECT_EQ(CHANGED("socket = \"c\"", "socket = \"d\""), "control");
     EXPECT_EQ(CHANGED("file = \"r\"", "file = \"r\"\nkept = 1"), "records");
+    EXPECT_EQ(CHANGED("[control]", "[metrics]\nlisten = \"127.0.0.1:9100\"\n[control]"), "metrics");
 }
 
 TEST(ConfigurationChange, OfInterfacesNeedsARestart)

@@ -64,18 +64,38 @@ ask 0 'State: .* -> CONNECTED' call 1
 ask 0 '^\{.*"kind":' --json call 1
 ask 0 '4420' history 1 e164
 ask 0 '^a +sip +in service$' interfaces
-# complete EXPECTED WORD...: what bash offers for the last word
+# offer WORD...: what bash offers for the last word; complete_words EXPECTED WORD...: that is it
+offer() {
+    PATH="$(dirname "$CTL"):$PATH" bash -c 'source "$1"; COMP_WORDS=("${@:2}"); COMP_CWORD=$(($# - 2)); _gatewayctl
+        echo "${COMPREPLY[*]}"' _ "$HERE/../tools/gatewayctl/completion.bash" "$@"
+}
 complete_words() {
     local offered
-    offered=$(PATH="$(dirname "$CTL"):$PATH" bash -c 'source "$1"; COMP_WORDS=("${@:2}"); COMP_CWORD=$(($# - 2)); _gatewayctl
-        echo "${COMPREPLY[*]}"' _ "$HERE/../tools/gatewayctl/completion.bash" "${@:2}")
+    offered=$(offer "${@:2}")
     [[ $offered == "$1" ]] || fail "completion of ${*:2}: $offered"
 }
 complete_words "a b" gatewayctl block ""
+complete_words "age rate quality" gatewayctl top --sort ""
+complete_words "on off" gatewayctl trace ""
+# what there is, is completed and in the manual
+verbs=0
+known=" $(offer gatewayctl "") "
+while read -r verb _; do
+    verbs=$((verbs + 1))
+    [[ $known == *" $verb "* ]] || fail "bash does not complete $verb"
+    grep -qE "^\.(B|BI|BR) \"?$verb\b|, \"? ?$verb\b" "$HERE/../tools/gatewayctl/gatewayctl.1" || fail "the manual does not know $verb"
+done < <("$CTL" help)
+((verbs > 15)) || fail "help lists $verbs commands"
+
 complete_words "status stats" gatewayctl --json sta
 complete_words "--interface" gatewayctl calls --i
 ask 0 '^\{"interface":"b","module":"sip","blocked":false\}$' interfaces --json
 ask 0 '^up +1$' stats
+ask 0 "^a +$HOST:$PORT_CALLER +up\$" peers
+ask 0 '' registrations
+ask 0 '' trace on 4420
+ask 0 '' trace on 1
+ask 1 'wants on or off' trace at 1
 ask 1 'no call 7 is up' drop 7 16
 ask 1 'from 1 to 127' drop 1 128
 ask 1 'nothing is known of a call 7' call 7
@@ -91,6 +111,10 @@ wait "${background[0]}" || fail "the caller was not cleared as asked"
 expect_causes 1 31
 expect_log "control: drop 1 31 asked for by uid [0-9]+, pid [0-9]+: done"
 ask 0 'releases|RELEASED' call 1 # the recorder knows it still
+expect_trace '^trace: call 1$'
+expect_trace 'State: .* -> RELEASED'
+ask 1 '1 is not traced' trace off 1
+ask 0 '' trace off 4420
 
 # an interface out of service refuses calls either way, and tells who asks
 ask 0 '' block a

@@ -57,3 +57,19 @@ std::optional<std::string> Connection::receive()
     m_waiting.erase(0, end + 1);
     return line;
 }
+
+bool Connection::IS_OK(std::string_view status) { return status == "ok" || status == R"({"status":"ok"})"; }
+
+Connection::Answer Connection::ask(std::string_view line)
+{
+    send(line);
+    std::optional<std::string> next = receive();
+    if (!next)
+        throw std::runtime_error("no answer");
+    Answer answer{IS_OK(*next), *next, {}};
+    for (next = receive(); next && !next->empty(); next = receive())
+        answer.lines.push_back(*next);
+    if (!next)
+        throw std::runtime_error("the answer is cut off");
+    return answer;
+}

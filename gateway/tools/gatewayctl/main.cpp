@@ -1,5 +1,7 @@
 // gatewayctl: asks a running gateway what it is doing, and has it do something.
 #include "Connection.h"
+#include "Terminal.h"
+#include "Top.h"
 
 #include <CLI/CLI.hpp>
 
@@ -45,7 +47,7 @@ int ASK(std::string const& socket, std::string const& line)
     std::optional<std::string> const status = connection.receive();
     if (!status)
         return COMPLAIN(NO_ANSWER, "no answer");
-    bool const isOk = *status == "ok" || *status == R"({"status":"ok"})";
+    bool const isOk = Connection::IS_OK(*status);
     if (!isOk)
         COMPLAIN(REFUSED, *status);
     for (std::optional<std::string> next = connection.receive(); next; next = connection.receive())
@@ -54,6 +56,20 @@ int ASK(std::string const& socket, std::string const& line)
         else
             std::puts(next->c_str());
     return COMPLAIN(NO_ANSWER, "the answer is cut off");
+}
+
+/// "top", perhaps with an order, where somebody looks on: drawn again and again.
+bool IS_LIVE(std::vector<std::string> const& words)
+{
+    return words.front() == "top" && (words.size() == 1 || (words.size() == 3 && words[1] == "--sort")) &&
+           Terminal::IS_THERE();
+}
+
+int SHOW(std::string const& socket, std::string const& order)
+{
+    Connection connection(socket);
+    std::string const refusal = Top(order).run(connection);
+    return refusal.empty() ? DONE : COMPLAIN(REFUSED, refusal);
 }
 
 int START(int argc, char** argv)
@@ -82,6 +98,8 @@ int START(int argc, char** argv)
     std::string const line = LINE_OF(words);
     if (words.empty() || words.front().starts_with("-") || line.empty())
         return COMPLAIN(MISUSED, "a command is wanted, and no word of it may have blanks; --help tells more");
+    if (IS_LIVE(words))
+        return SHOW(socket, words.size() == 3 ? words[2] : "age");
     return ASK(socket, line);
 }
 } // namespace

@@ -27,6 +27,7 @@ constexpr NamedValue<Codec::Type> s_names[] = {
     {Codec::G726_40, "G726-40"},
     {Codec::ILBC, "iLBC"},
     {Codec::OPUS, "opus"},
+    {Codec::CLEARMODE, "CLEARMODE"},
 };
 } // namespace
 

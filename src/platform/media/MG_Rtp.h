@@ -33,7 +33,8 @@ struct CC_EXPORT MG_Rtp
             G726_32 = 130,
             G726_40 = 131,
             ILBC = 132,
-            OPUS = 133
+            OPUS = 133,
+            CLEARMODE = 134 ///< 64 kbit/s of bits that are no speech (RFC 4040)
         };
 
         /// The name by which RTP knows the codec ("PCMA", "G726-32"), with clock rate and channels where the name alone

@@ -33,6 +33,7 @@ constexpr Case s_cases[] = {
     {MG_Rtp::ECodec::G726_40, 131, "G726-40"},
     {MG_Rtp::ECodec::ILBC, 132, "iLBC"},
     {MG_Rtp::ECodec::OPUS, 133, "opus"},
+    {MG_Rtp::ECodec::CLEARMODE, 134, "CLEARMODE"},
 };
 } // namespace
 
@@ -47,7 +48,7 @@ TEST(MG_Rtp, ACodecWithAFixedPayloadTypeHasItAsItsNumber)
 
 TEST(MG_Rtp, APayloadTypeOfNoCodecIsInvalid)
 {
-    for (int const number : {-2, 1, 2, 13, 19, 96, 101, 127, 134})
+    for (int const number : {-2, 1, 2, 13, 19, 96, 101, 127, 135})
         EXPECT_STREQ(ERROR::INVALID, MG_Rtp::ECodec::NAME(static_cast<MG_Rtp::ECodec::Type>(number))) << number;
 }
 
