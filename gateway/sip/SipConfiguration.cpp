@@ -135,7 +135,7 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
 
 SocketAddress READ_PEER(ConfigurationSection const& section, char const* key, SipConfiguration const& interface)
 {
-    SocketAddress const peer = section.addressOrName(key);
+    SocketAddress peer = section.addressOrName(key);
     if (peer.isName())
         return peer;
     CHECK_REACHABLE(section, key, peer);
