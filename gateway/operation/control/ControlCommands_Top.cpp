@@ -112,6 +112,7 @@ std::vector<TopRow> COLLECT(CallWatch const& watch, String const& context)
                 if (auto const quality = CallWatch::GET_QUALITY(*leg))
                     ADD_QUALITY(row->second, *quality, answered[call->getSerial()]);
     std::vector<TopRow> result;
+    result.reserve(rows.size());
     for (auto& [serial, row] : rows)
         result.push_back(std::move(row));
     return result;

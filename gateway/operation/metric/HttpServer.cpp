@@ -146,9 +146,11 @@ void HttpServer::runTurn()
     std::vector<pollfd> polled{{m_wake.get(), POLLIN, 0}, {isResting ? -1 : m_listening.get(), POLLIN, 0}};
     for (Client const& client : m_clients)
     {
-        bool const isReading = client.state == State::READING || client.state == State::CLOSING;
-        short const events = isReading ? POLLIN : client.state == State::WRITING ? POLLOUT : 0;
-        polled.push_back({client.descriptor.get(), events, 0});
+        polled.push_back({client.descriptor.get(), 0, 0});
+        if (client.state == State::READING || client.state == State::CLOSING)
+            polled.back().events = POLLIN;
+        else if (client.state == State::WRITING)
+            polled.back().events = POLLOUT;
     }
     poll(polled.data(), polled.size(), getTimeout());
     if (polled[0].revents != 0)

@@ -47,7 +47,7 @@ tables = {title.text: [[cell.text for cell in row] for row in table] for title, 
 print(tables)
 assert tables["Since the start"][1][:4] == ["2", "1", "1", "1"]
 assert tables["Interfaces"] == [["interface", "module", "state"], ["a", "sip", "in service"], ["b", "sip", "in service"]]
-assert tables["Peers"][1][2] == "called" and len(tables["Peers"]) == 3
+assert tables["Peers"][1][2] == "up" and len(tables["Peers"]) == 3
 assert tables["Calls, the oldest first"] == [["call", "state", "age/s", "parties"]]
 END
 

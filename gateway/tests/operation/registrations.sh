@@ -59,7 +59,7 @@ expect_caller phone x
 expect_line "^a +here +alice +sip:alice@$HOST:$PORT_CALLER +(600|59[0-9])\$" registrations
 expect_line "^\\{\"interface\":\"a\",\"side\":\"here\",\"user\":\"alice\",\"contact\":\"sip:alice@$HOST:$PORT_CALLER\",\"seconds\":\"[0-9]+\"\\}\$" \
     registrations --json
-expect_line "^b +$HOST:$PORT_CALLEE +called\$" peers
+expect_line "^b +$HOST:$PORT_CALLEE +up\$" peers
 kill -KILL $gateway_pid
 wait $gateway_pid 2>/dev/null
 
@@ -68,7 +68,7 @@ start_gateway
 start_callee busy
 expect_caller caller 4989123
 expect_callee
-expect_line "^b +$HOST:$PORT_CALLEE +busy\$" peers
-expect_line '^a .* called$' peers
+expect_line "^b +$HOST:$PORT_CALLEE +left alone\$" peers
+expect_line '^a .* up$' peers
 stop_gateway "1 calls placed, 0 answered, 0 cleared, 1 failed"
 finish
