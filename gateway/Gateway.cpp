@@ -108,6 +108,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
           this)
     , m_modules(std::move(modules))
     , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
+    , m_page(m_host, m_modules, m_configuration.moduleOf, m_watch)
 {
     std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
     watchCalls();
@@ -156,9 +157,11 @@ void Gateway::openMetrics()
                                                  m_records.get(), m_callControlLoop);
     try
     {
-        HttpServer::Pages const pages{{"/metrics", [this] {
-                                           return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
-                                       }}};
+        HttpServer::Pages pages{{"/metrics", [this] {
+                                     return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
+                                 }}};
+        if (m_configuration.metrics.hasPage)
+            pages["/"] = [this] { return HttpAnswer{200, m_page.getText(), StatusPage::CONTENT_TYPE}; };
         m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, pages);
     }
     catch (std::runtime_error const& error)

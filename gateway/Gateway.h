@@ -14,6 +14,7 @@
 #include "operation/control/ControlServer.h"
 #include "operation/metric/GatewayMetrics.h"
 #include "operation/metric/HttpServer.h"
+#include "operation/page/StatusPage.h"
 #include "operation/record/CallWatch.h"
 #include "operation/record/RecordWriter.h"
 #include "platform/eventloop/TYEventLoop.h"
@@ -104,8 +105,8 @@ private:
     Modules m_modules;
     ControlCommands m_commands;
     std::unique_ptr<ControlServer> m_control; // null where it is not configured
-    // null where they are not configured; they end first @{
-    std::unique_ptr<GatewayMetrics> m_metrics;
+    StatusPage m_page;
+    std::unique_ptr<GatewayMetrics>
+        m_metrics; // null where they are not configured, and so are the pages, which end first
     std::unique_ptr<HttpServer> m_pages;
-    // @}
 };

@@ -92,9 +92,10 @@ void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
 /// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.
 void READ_METRICS(ConfigurationSection const& section, MetricOptions& metrics)
 {
-    section.allow({"listen"});
-    if (!section.has("listen"))
+    section.allow({"listen", "page"});
+    if (section.getKeys().empty())
         return;
+    metrics.hasPage = section.flag("page");
     metrics.listen = section.address("listen");
     if (!AddressRange::CONTAINS({AddressRange::PARSE("127.0.0.0/8"), AddressRange::PARSE("::1")},
                                 AddressRange::PARSE(metrics.listen.host).getFirst()))

@@ -186,6 +186,18 @@ SocketAddress ConfigurationSection::address(char const* key) const
     }
 }
 
+SocketAddress ConfigurationSection::addressOrName(char const* key) const
+{
+    try
+    {
+        return SocketAddress::PARSE_NAMED(neededText(key));
+    }
+    catch (std::invalid_argument const& error)
+    {
+        refuse(key, error.what());
+    }
+}
+
 std::vector<AddressRange> ConfigurationSection::ranges(char const* key) const
 {
     std::vector<AddressRange> result;

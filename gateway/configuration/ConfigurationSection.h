@@ -50,6 +50,8 @@ public:
     /// Of a list of whole numbers; none where it is not.
     std::vector<unsigned int> numbers(char const* key, unsigned int least, unsigned int most) const;
     SocketAddress address(char const* key) const; ///< needed
+    /// The same, or a name, with a port or without.
+    SocketAddress addressOrName(char const* key) const;
     std::vector<AddressRange> ranges(char const* key) const;
 
     /// [key]; an empty one where there is none.

@@ -6,6 +6,7 @@
 struct MetricOptions
 {
     SocketAddress listen; ///< a loopback address; port 0: nowhere
+    bool hasPage = false; ///< for browsers, with numbers
 
     friend bool operator==(MetricOptions const&, MetricOptions const&) = default;
 };

@@ -30,9 +30,28 @@ bool SocketAddress::isMulticast() const
            AddressRange::PARSE("ff00::/8").contains(AddressRange::PARSE(host).getFirst());
 }
 
+bool SocketAddress::isName() const
+{
+    return !isVersion6() && host.find_first_not_of("0123456789.") != std::string::npos;
+}
+
 std::string SocketAddress::text() const
 {
-    return (isVersion6() ? "[" + host + "]" : host) + ":" + std::to_string(port);
+    return (isVersion6() ? "[" + host + "]" : host) + (port != 0 ? ":" + std::to_string(port) : std::string());
+}
+
+SocketAddress SocketAddress::PARSE_NAMED(std::string const& text)
+{
+    constexpr char const* OF_NAMES = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789-.";
+    SocketAddress result;
+    result.host = text.substr(0, text.rfind(':'));
+    bool const isName = result.isName() && result.host.find_first_not_of(OF_NAMES) == std::string::npos &&
+                        result.host.front() != '.' && result.host.front() != '-';
+    if (!isName)
+        return PARSE(text);
+    if (result.host.size() != text.size())
+        result.port = PARSE("192.0.2.1" + text.substr(result.host.size())).port;
+    return result;
 }
 
 SocketAddress SocketAddress::PARSE(std::string const& text)

@@ -55,7 +55,7 @@ public:
     /// Families of its own for the gateway's figures, under names that begin with its own. Throws std::bad_alloc.
     virtual void addMetrics(MetricText&) const {}
     /// For operators: whom its interfaces talk to, and who is registered, here or elsewhere. All rows of a list have
-    /// the same names. In a copy of the process, so they may be many. @{
+    /// the same names. Registrations may be many: a copy of the process tells them. @{
     virtual std::vector<StateRow> getPeers() const { return {}; }
     virtual std::vector<StateRow> getRegistrations() const { return {}; }
     /// @}

@@ -74,8 +74,8 @@ void READ_TLS(ConfigurationSection const& section, SipConfiguration& interface)
     }
     bool const isAlone = !interface.listensOnUdp && !interface.listensOnTcp;
     interface.tlsPort = static_cast<std::uint16_t>(
-        section.number("tls-port", isAlone ? interface.getAddress().port : interface.tlsPort, 1, 65535));
-    if (interface.listensOnTcp && interface.tlsPort == interface.getAddress().port)
+        section.number("tls-port", isAlone ? interface.listen.port : interface.tlsPort, 1, 65535));
+    if (interface.listensOnTcp && interface.tlsPort == interface.listen.port)
         section.refuse("tls-port", "is that of TCP");
     std::string const verify = section.oneOf("tls-verify", "name", {"name", "peer", "off"});
     SipTlsSettings& tls = interface.tls;
@@ -89,6 +89,10 @@ void READ_TLS(ConfigurationSection const& section, SipConfiguration& interface)
         section.refuse("tls-authorities", "is needed to verify certificates");
     tls.names = section.texts("tls-names", {});
     CHECK_NAMES(section, tls.names);
+    if (tls.names.empty())
+        for (SipPeer const& peer : interface.getPeers())
+            if (peer.address.isName())
+                tls.names.push_back(peer.address.host);
     tls.isLeast13 = section.oneOf("tls-version", "1.2", {"1.2", "1.3"}) == "1.3";
     try
     {
@@ -101,13 +105,18 @@ void READ_TLS(ConfigurationSection const& section, SipConfiguration& interface)
 }
 
 /// Where others find it: no address that is everybody's, or many's.
-SocketAddress READ_REACHABLE(ConfigurationSection const& section, char const* key)
+void CHECK_REACHABLE(ConfigurationSection const& section, char const* key, SocketAddress const& address)
 {
-    SocketAddress address = section.address(key);
     if (address.isUnspecified())
         section.refuse(key, "'" + address.host + "' is nobody's address");
     if (address.isMulticast())
         section.refuse(key, "'" + address.host + "' is a multicast address");
+}
+
+SocketAddress READ_REACHABLE(ConfigurationSection const& section, char const* key)
+{
+    SocketAddress address = section.address(key);
+    CHECK_REACHABLE(section, key, address);
     return address;
 }
 
@@ -126,12 +135,25 @@ void READ_ADDRESSES(ConfigurationSection const& section, SipConfiguration& inter
 
 SocketAddress READ_PEER(ConfigurationSection const& section, char const* key, SipConfiguration const& interface)
 {
-    SocketAddress const peer = READ_REACHABLE(section, key);
+    SocketAddress const peer = section.addressOrName(key);
+    if (peer.isName())
+        return peer;
+    CHECK_REACHABLE(section, key, peer);
     if (peer.isVersion6() != interface.listen.isVersion6())
         section.refuse(key, "is not of the version of the internet protocol that listen is of");
     if (peer == interface.listen || peer == interface.advertise)
         section.refuse(key, "is the interface itself");
     return peer;
+}
+
+/// Names are asked for when a call goes there, so who may send is not known before.
+void READ_NAMES(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    if (section.has("resolver"))
+        interface.resolver = READ_REACHABLE(section, "resolver");
+    for (SipPeer const& peer : interface.getPeers())
+        if (peer.address.isName() && !section.has("allow"))
+            section.refuse("allow", "is needed where a peer has a name");
 }
 
 /// One as `peer`, or several as tables.
@@ -153,6 +175,7 @@ void READ_PEERS(ConfigurationSection const& section, SipConfiguration& interface
         interface.peer = interface.peers.front().address;
     else if (section.has("peer") || !section.flag("registrar"))
         interface.peer = READ_PEER(section, "peer", interface);
+    READ_NAMES(section, interface);
     interface.probe = section.number("probe", interface.probe, 0, 3600);
     interface.probeUp = section.number("probe-up", interface.probeUp, 1, 100);
     interface.probeDown = section.number("probe-down", interface.probeDown, 1, 100);
@@ -240,7 +263,7 @@ void READ_REGISTRAR(ConfigurationSection const& section, SipConfiguration& inter
         return;
     if (!interface.authenticates)
         section.refuse("registrar", "of whom? authenticate is needed");
-    if (interface.peer.port == 0 && !section.has("allow"))
+    if (!interface.hasPeer() && !section.has("allow"))
         section.refuse("allow", "is needed where there is no peer");
 }
 
@@ -248,9 +271,9 @@ void READ_REGISTRAR(ConfigurationSection const& section, SipConfiguration& inter
 void READ_REGISTRATION(ConfigurationSection const& section, SipConfiguration& interface)
 {
     interface.registers = section.flag("register");
-    if (interface.registers && interface.peer.port == 0)
+    if (interface.registers && !interface.hasPeer())
         section.refuse("peer", "is missing");
-    interface.domain = section.text("domain", interface.peer.port != 0 ? interface.peer.text() : interface.name);
+    interface.domain = section.text("domain", interface.hasPeer() ? interface.peer.text() : interface.name);
     if (interface.domain.empty() || interface.domain.find_first_of(" <>@;?\"/") != std::string::npos)
         section.refuse("domain", "is no name of a host");
     interface.registerExpires = section.number("register-expires", interface.registerExpires, 1, 86400);
@@ -280,6 +303,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "advertise",
                    "peer",
                    "peers",
+                   "resolver",
                    "probe",
                    "probe-up",
                    "probe-down",

@@ -18,7 +18,7 @@ class ConfigurationSection;
 /// One of the peers of an interface.
 struct SipPeer
 {
-    SocketAddress address;
+    SocketAddress address;     ///< or a name; port 0: that of its service, as the resolver says
     unsigned int priority = 0; ///< the least is tried first
     unsigned int weight = 1;   ///< among those of one priority
 };
@@ -45,8 +45,9 @@ struct SipConfiguration
     std::string name;
     SocketAddress listen;
     SocketAddress advertise;        ///< what the peers are told instead of `listen`; port 0: nothing
-    SocketAddress peer;             ///< port 0: there is none, it calls registered users alone; of several the first
+    SocketAddress peer;             ///< without a host: none, it calls registered users alone; of several the first
     std::vector<SipPeer> peers{};   ///< where there are several
+    SocketAddress resolver{};       ///< of names; port 0: that of the system
     unsigned int probe = 0;         ///< seconds between OPTIONS to each peer; 0: none
     unsigned int probeUp = 1;       ///< answers in a row, until a peer counts as there again
     unsigned int probeDown = 2;     ///< probes in a row without an answer, until it does not
@@ -99,16 +100,16 @@ struct SipConfiguration
 
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
-    /// The same for what goes that way.
+    /// Where it listens for what comes that way.
+    std::uint16_t getPort(SipWay::Way way) const { return SipWay::IS_SECURED(way) ? tlsPort : listen.port; }
+    /// The address for what goes that way.
     SocketAddress getAddress(SipWay::Way way) const
     {
         return SipWay::IS_SECURED(way) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
     }
 
-    std::vector<SipPeer> getPeers() const
-    {
-        return peers.empty() && peer.port != 0 ? std::vector{SipPeer{peer}} : peers;
-    }
+    bool hasPeer() const { return !peer.host.empty(); }
+    std::vector<SipPeer> getPeers() const { return peers.empty() && hasPeer() ? std::vector{SipPeer{peer}} : peers; }
 
     /// Checked and with defaults filled in. `relaysMedia`: of use is only a media address that peers can reach. Throws
     /// ConfigurationError.

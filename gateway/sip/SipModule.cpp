@@ -69,7 +69,7 @@ void SipModule::open(GatewayHost& host)
                          configuration.name);
     for (SipConfiguration const& configuration : m_configurations)
         spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
-                     configuration.peer.port != 0 ? configuration.peer.text() : "nobody but who registers");
+                     configuration.hasPeer() ? configuration.peer.text() : "nobody but who registers");
 }
 
 unsigned int SipModule::clearCalls(QCause cause)

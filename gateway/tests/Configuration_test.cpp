@@ -146,6 +146,10 @@ TEST(Configuration, SaysWhereFiguresAreToBeHad)
     for (char const* const address : {"0.0.0.0:9100", "192.0.2.1:9100", "[::]:9100", "[2001:db8::1]:9100"})
         EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"" + address + "\"\n"),
                   "f: metrics.listen: must be a loopback address");
+    EXPECT_FALSE(Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\n", "f").metrics.hasPage);
+    EXPECT_TRUE(
+        Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\npage = true\n", "f").metrics.hasPage);
+    EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\npage = true\n"), "f: metrics.listen: is missing");
     EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nport = 1\n"), "f: metrics.port: is not a key");
     EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"127.0.0.1\"\n"),
               "f: metrics.listen: expected an address and a port, as in \"192.0.2.1:5060\"");

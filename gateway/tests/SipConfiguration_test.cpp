@@ -185,6 +185,13 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "srtp = \"on\"", "f: sip[0].srtp: must be one of off, optional, required"},
         {whole + "ringback = 1", "f: sip[0].ringback: expected true or false"},
         {whole + "conference = \"77\"", "f: sip[0].conference: needs media.mode \"relay\""},
+        {first + "listen = \"127.0.0.1:1\"\npeer = \"sip.example\"",
+         "f: sip[0].allow: is needed where a peer has a name"},
+        {first + "listen = \"127.0.0.1:1\"\npeer = \"sip_.example:5060\"",
+         "f: sip[0].peer: 'sip_.example' is not an address"},
+        {first + "listen = \"127.0.0.1:1\"\npeer = \"sip.example:0\"", "f: sip[0].peer: '0' is not a port"},
+        {whole + "resolver = \"192.0.2.1\"",
+         "f: sip[0].resolver: expected an address and a port, as in \"192.0.2.1:5060\""},
         {whole + "[[sip.peers]]\naddress = \"192.0.2.1:5060\"", "f: sip[0].peer: is of no use with peers"},
         {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\npriority = 1", "f: sip[0].peers[0].address: is missing"},
         {first + "listen = \"127.0.0.1:1\"\n[[sip.peers]]\naddress = \"127.0.0.1:1\"",
@@ -214,6 +221,18 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
     };
     for (Row const& row : rows)
         EXPECT_EQ(COMPLAINT(row.text), row.complaint) << row.text;
+}
+
+TEST(SipConfiguration, APeerMayHaveANameWithAPortOrWithout)
+{
+    std::string const text = "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:1\"\nallow = [\"192.0.2.0/24\"]\npeer = ";
+    SocketAddress const one = READ(text + "\"sip.example:5070\"").at(0).peer;
+    EXPECT_EQ(one.text(), "sip.example:5070");
+    EXPECT_TRUE(one.isName());
+    SipConfiguration const other = READ(text + "\"4you.example\"").at(0);
+    EXPECT_EQ(other.peer.text(), "4you.example");
+    EXPECT_EQ(other.domain, "4you.example");
+    EXPECT_FALSE(READ(LEAST).at(0).peer.isName());
 }
 
 TEST(SipConfiguration, AMediaAddressThatNobodyReachesIsRefusedWhereMediaAreRelayed)

@@ -2,11 +2,17 @@
 
 #include <algorithm>
 #include <cctype>
+#include <optional>
 #include <spdlog/fmt/fmt.h>
 
 namespace
 {
 constexpr std::string_view END_OF_LINE = "\r\n";
+
+/// No page is kept, runs anything, loads anything, or is shown inside of another.
+constexpr char const* FOR_BROWSERS =
+    "Cache-Control: no-store\r\nX-Content-Type-Options: nosniff\r\nContent-Security-Policy: "
+    "default-src 'none'; style-src 'unsafe-inline'; frame-ancestors 'none'\r\n";
 
 struct HttpStatus
 {
@@ -17,6 +23,7 @@ constexpr HttpStatus STATUSES[] = {{200, "OK"},
                                    {400, "Bad Request"},
                                    {404, "Not Found"},
                                    {405, "Method Not Allowed"},
+                                   {421, "Misdirected Request"},
                                    {431, "Request Header Fields Too Large"},
                                    {503, "Service Unavailable"},
                                    {505, "HTTP Version Not Supported"}};
@@ -43,15 +50,30 @@ bool IS_METHOD(std::string_view word)
                                         [](unsigned char c) { return std::isupper(c) != 0 || c == '-' || c == '_'; });
 }
 
-/// A field that every request of this version has: what has none is something else.
-bool HAS_HOST(std::string_view lines)
+/// The field that every request of this version has; nothing where there is none.
+std::optional<std::string_view> FIND_HOST(std::string_view lines)
 {
     constexpr std::string_view NAME = "host:";
     for (std::string_view line = TAKE(lines, END_OF_LINE); !line.empty(); line = TAKE(lines, END_OF_LINE))
-        if (std::equal(NAME.begin(), NAME.end(), line.begin(), line.begin() + std::min(line.size(), NAME.size()),
-                       [](char one, unsigned char other) { return one == std::tolower(other); }))
-            return true;
-    return false;
+    {
+        bool const isHost =
+            std::equal(NAME.begin(), NAME.end(), line.begin(), line.begin() + std::min(line.size(), NAME.size()),
+                       [](char one, unsigned char other) { return one == std::tolower(other); });
+        if (!isHost)
+            continue;
+        line.remove_prefix(NAME.size());
+        line.remove_prefix(std::min(line.find_first_not_of(" \t"), line.size()));
+        return line.substr(0, line.find_last_not_of(" \t") + 1);
+    }
+    return std::nullopt;
+}
+
+/// A browser that a stranger's page has sent here under a name of the stranger's says so: it must not read us.
+bool IS_LOOPBACK(std::string_view host)
+{
+    std::string_view const name = host.starts_with('[') ? host.substr(0, host.find(']') + 1) : TAKE(host, ":");
+    return name == "localhost" || name == "[::1]" ||
+           (name.starts_with("127.") && name.find_first_not_of("0123456789.") == std::string_view::npos);
 }
 
 unsigned int REFUSAL_OF(std::string_view method, std::string_view target, std::string_view version,
@@ -61,8 +83,11 @@ unsigned int REFUSAL_OF(std::string_view method, std::string_view target, std::s
         return 400;
     if (version != "HTTP/1.0" && version != "HTTP/1.1")
         return 505;
-    if (version == "HTTP/1.1" && !HAS_HOST(fields))
+    std::optional<std::string_view> const host = FIND_HOST(fields);
+    if (version == "HTTP/1.1" && !host)
         return 400;
+    if (host && !IS_LOOPBACK(*host))
+        return 421;
     return method == "GET" || method == "HEAD" ? 0 : 405;
 }
 } // namespace
@@ -77,9 +102,9 @@ HttpRequest HttpRequest::PARSE(std::string_view head)
 
 std::string HttpAnswer::getText(bool isHead) const
 {
-    return fmt::format("HTTP/1.1 {} {}\r\nContent-Type: {}\r\nContent-Length: {}\r\n{}Connection: close\r\n\r\n{}",
+    return fmt::format("HTTP/1.1 {} {}\r\nContent-Type: {}\r\nContent-Length: {}\r\n{}{}Connection: close\r\n\r\n{}",
                        status, REASON_OF(status), type, content.size(), status == 405 ? "Allow: GET, HEAD\r\n" : "",
-                       isHead ? std::string() : content);
+                       FOR_BROWSERS, isHead ? std::string() : content);
 }
 
 HttpAnswer HttpAnswer::REFUSING(unsigned int status) { return {status, fmt::format("{}\n", REASON_OF(status))}; }

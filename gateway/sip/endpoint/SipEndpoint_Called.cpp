@@ -171,7 +171,7 @@ bool SipEndpoint::findContacts(std::string const& user)
     if (registrar == nullptr)
         return true;
     m_contacts = registrar->find(user);
-    bool const hasPeer = m_interface.getConfiguration().peer.port != 0;
+    bool const hasPeer = m_interface.getConfiguration().hasPeer();
     if (!m_contacts.empty() || (hasPeer && !registrar->hasUser(user)))
         return true;
     m_dialog = SipDialogState::OVER;

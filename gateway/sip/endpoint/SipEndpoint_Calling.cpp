@@ -93,11 +93,13 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
     startExpiry(request);
     std::string const session = SESSION_OF(request);
     m_hasOffer = !session.empty();
-    m_firstOffer = isOverlapping() ? session : std::string();
-    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     m_called = SipIdentity::READ_CALLED(request);
     if (isOverlapping())
+    {
+        m_firstOffer = session;
         awaitDigits();
+    }
+    noteSession(SipOfferAnswer::RECEIVED, SipOfferAnswer::INVITE, session);
     if (!dial(request, nullptr).isOk())
         failDialLater(QCause::NETWORK_OUT_OF_ORDER);
     else if (!m_session.open())

@@ -45,8 +45,9 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         return ADDRESS_INCOMPLETE; // the number was complete, or is shorter than what there is
     }
     RouteHunt const routes = m_interface.findRoutes(request, number, m_callNumber);
+    std::string const digits = number.substr(known.size());
     bool const isSameRoute = !routes.isEmpty() && routes.getProvider() == m_routes.getProvider() &&
-                             !routes.isNumberShaped() && !m_routes.isNumberShaped();
+                             routes.getNumber() == m_routes.getNumber() + digits;
     if (!isSameRoute || SESSION_OF(request) != m_firstOffer || request->sip_contact == nullptr ||
         !SipBody::READ(request).isUnderstood())
     {
@@ -54,7 +55,7 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         return m_interface.handleRequest(nullptr, transaction, request);
     }
     m_routes = routes;
-    return joinDigits(transaction, request, number.substr(known.size()));
+    return joinDigits(transaction, request, digits);
 }
 
 int SipEndpoint::joinDigits(nta_incoming_t* transaction, sip_t const* request, std::string const& digits)

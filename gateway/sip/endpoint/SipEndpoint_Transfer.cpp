@@ -283,7 +283,7 @@ void SipEndpoint::refer(std::string const& number)
     SipConfiguration const& configuration = m_interface.getConfiguration();
     std::string const uri = SipAddress::MAKE_URI(number,
                                                  !m_peers.empty()               ? getPeerAddress()
-                                                 : configuration.peer.port != 0 ? configuration.peer
+                                                 : configuration.hasPeer() ? configuration.peer
                                                                                 : configuration.getAddress(m_way),
                                                  m_way);
     std::string const self = SipAddress::MAKE_URI("gateway", configuration.getAddress(m_way), m_way);

@@ -13,6 +13,7 @@
 #include "sip/registrar/SipRegistration.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
+#include "sip/stack/SipResolver.h"
 #include "sip/stack/SipTls.h"
 
 #include <array>
@@ -132,6 +133,7 @@ private:
     SipGuard m_guard;
     std::optional<SipAuthentication> m_authentication;
     std::unique_ptr<SipTls> m_tls; // null: none
+    SipResolver m_resolver;
     SipAgent m_agent;
     SipSender m_sender;
     SipPeers m_peers;

@@ -67,6 +67,8 @@ std::string SipAddress::MAKE_URI(std::string_view user, SocketAddress const& add
         uri += ";transport=tcp";
     else if (way == SipWay::TLS)
         uri += ";transport=tls";
+    else if (way == SipWay::UDP && address.isName())
+        uri += ";transport=udp"; // else the resolver would choose
     return uri;
 }
 

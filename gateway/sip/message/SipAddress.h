@@ -16,8 +16,8 @@ std::string UNESCAPE_USER(std::string_view user);
 /// The text as a user part: what the grammar of RFC 3261 does not allow there is escaped.
 std::string ESCAPE_USER(std::string_view user);
 
-/// "sip:4989123@192.0.2.1:5060", with ";transport=tcp" or ";transport=tls" where it goes that way, or "sips:..."
-/// Without a user: "sip:192.0.2.1:5060".
+/// "sip:4989123@192.0.2.1:5060", with ";transport=tcp" or ";transport=tls" where it goes that way, or "sips:..."; with
+/// a name for an address ";transport=udp" is told, too. Without a user: "sip:192.0.2.1:5060".
 std::string MAKE_URI(std::string_view user, SocketAddress const& address, SipWay::Way way);
 /// "\"Alice\" <sip:...>", or "<sip:...>" for an empty name.
 std::string MAKE_NAME_ADDR(std::string_view displayName, std::string_view uri);

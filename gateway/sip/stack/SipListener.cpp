@@ -72,16 +72,18 @@ struct Transport
     bool isWanted;
 };
 
+/// With the address that the peers are told, which the stack writes into Via, and the port that is really listened on.
 std::string MAKE_BINDING(SipConfiguration const& configuration, Transport const& transport)
 {
-    std::string uri = SipAddress::MAKE_URI({}, configuration.getAddress(transport.way), transport.way);
+    SocketAddress const told = {configuration.getAddress().host, configuration.getPort(transport.way)};
+    std::string uri = SipAddress::MAKE_URI({}, told, transport.way);
     if (transport.way == SipWay::UDP)
         uri += ";transport=udp"; // and no other
     return configuration.advertise.port == 0 ? uri : uri + ";maddr=" + configuration.listen.host;
 }
 } // namespace
 
-SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, SipGuard& guard, SipTls* tls,
+SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& configuration, Means const& means,
                                  nta_message_f* onMessage, SipInterface* interface)
 {
     SipGuard::PROVE(stack, configuration.listen.host);
@@ -89,14 +91,15 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
     SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1),
                                     NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
                                     NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
-                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1), TAG_END()));
+                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1),
+                                    TAG_IF(means.resolver != nullptr, SRESTAG_RESOLV_CONF(means.resolver)), TAG_END()));
     for (Transport const& transport : {Transport{"udp", SipWay::UDP, configuration.listensOnUdp},
                                        Transport{"tcp", SipWay::TCP, configuration.listensOnTcp},
                                        Transport{"tls", SipWay::SIPS, configuration.listensOnTls}})
     {
         if (!transport.isWanted)
             continue;
-        SocketAddress const listen = {configuration.listen.host, configuration.getAddress(transport.way).port};
+        SocketAddress const listen = {configuration.listen.host, configuration.getPort(transport.way)};
         CHECK_PORT(listen, transport.way == SipWay::UDP ? SOCK_DGRAM : SOCK_STREAM, transport.name);
         auto const open = [&]
         {
@@ -105,9 +108,9 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
                                        TPTAG_TIMEOUT(idle),
                                        TAG_IF(transport.way == SipWay::SIPS, TPTAG_CERTIFICATE(NO_FOLDER)), TAG_END());
         };
-        if (agent == nullptr || (transport.way == SipWay::SIPS ? tls->attach(open) : open()) < 0)
+        if (agent == nullptr || (transport.way == SipWay::SIPS ? means.tls->attach(open) : open()) < 0)
             throw std::runtime_error("cannot listen on " + listen.text() + " (" + transport.name + ")");
     }
-    guard.watch(agent.get());
+    means.guard.watch(agent.get());
     return agent;
 }

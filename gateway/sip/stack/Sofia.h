@@ -25,6 +25,7 @@ class SipRequestHandler;
 #include <sofia-sip/sip_protos.h>
 #include <sofia-sip/sip_status.h>
 #include <sofia-sip/sip_tag.h>
+#include <sofia-sip/sresolv.h>
 #include <sofia-sip/su_log.h>
 #include <sofia-sip/su_wait.h>
 #include <sofia-sip/tport.h>

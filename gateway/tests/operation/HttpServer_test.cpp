@@ -116,10 +116,12 @@ struct HttpServerTest : testing::Test
 TEST_F(HttpServerTest, GivesOutAPage)
 {
     open();
-    EXPECT_EQ(ask("GET /page?x=1 HTTP/1.1\r\nHost: h\r\n\r\n"),
+    EXPECT_EQ(ask("GET /page?x=1 HTTP/1.1\r\nHost: localhost:1\r\n\r\n"),
               "HTTP/1.1 200 OK\r\nContent-Type: text/plain; charset=utf-8\r\nContent-Length: 8\r\n"
+              "Cache-Control: no-store\r\nX-Content-Type-Options: nosniff\r\n"
+              "Content-Security-Policy: default-src 'none'; style-src 'unsafe-inline'; frame-ancestors 'none'\r\n"
               "Connection: close\r\n\r\nfigures\n");
-    EXPECT_TRUE(ask("HEAD /page HTTP/1.0\r\n\r\n").ends_with("Content-Length: 8\r\nConnection: close\r\n\r\n"));
+    EXPECT_TRUE(ask("HEAD /page HTTP/1.0\r\n\r\n").ends_with("Connection: close\r\n\r\n"));
 }
 
 TEST_F(HttpServerTest, MakesAPageOnceForManyWhoAskAtOnce)
@@ -222,6 +224,18 @@ TEST_F(HttpServerTest, RefusesWhatItDoesNotHave)
     for (auto const& [request, status] : cases)
         EXPECT_TRUE(ask(request).starts_with("HTTP/1.1 " + status + "\r\n")) << request << ": " << status;
     EXPECT_EQ(made, 0u);
+}
+
+TEST_F(HttpServerTest, AnswersWhoHasCalledItByALoopbackAddressAlone)
+{
+    open();
+    for (char const* const host : {"localhost", "localhost:9160", "127.0.0.1:9160", "127.1.2.3", "[::1]:9160", "[::1]"})
+        EXPECT_TRUE(ask(std::string("GET /page HTTP/1.1\r\nhOST:  ") + host + " \r\n\r\n").ends_with("figures\n"))
+            << host;
+    for (char const* const host :
+         {"", "evil.example", "127.evil.example", "127.0.0.1.evil.example:9160", "[::2]", "localhost.evil.example"})
+        EXPECT_TRUE(ask(std::string("GET /page HTTP/1.1\r\nHost: ") + host + "\r\n\r\n").starts_with("HTTP/1.1 421 "))
+            << host;
 }
 
 TEST_F(HttpServerTest, TakesARequestThatIsJustNotTooLong)

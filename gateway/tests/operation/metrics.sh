@@ -22,7 +22,7 @@ busy_caller() { send_invite; expect 100; expect 486; send_ack_of_failure; }
 busy_callee() { expect_invite; respond_finally "486 Busy Here"; expect_request ACK; }
 
 write_configuration
-printf '[metrics]\nlisten = "%s:%d"\n[records]\nfile = "%s"\n' "$HOST" $PORT_METRICS "$WORK/calls.jsonl" >>"$WORK/gateway.toml"
+printf '[metrics]\nlisten = "%s:%d"\npage = true\n[records]\nfile = "%s"\n' "$HOST" $PORT_METRICS "$WORK/calls.jsonl" >>"$WORK/gateway.toml"
 start_gateway
 expect_metric 'calls_placed_total 0'
 expect_call
@@ -37,11 +37,25 @@ expect_metric 'sip_messages_received_total\{interface="a",kind="request"\} 5'
 expect_metric 'pool_calls_removed_total 2'
 promtool check metrics <"$WORK/metrics.log" >"$WORK/promtool.log" 2>&1 || fail "Prometheus has something to say of the figures"
 
+# the page for a browser
+scrape / >"$WORK/page.log"
+python3 - "$WORK/page.log" >"$WORK/parsed.log" 2>&1 <<'END' || fail "the page is not well formed, or has not what it should"
+import sys
+import xml.etree.ElementTree as tree
+page = tree.fromstring(open(sys.argv[1]).read().removeprefix("<!DOCTYPE html>\n"))
+tables = {title.text: [[cell.text for cell in row] for row in table] for title, table in zip(page.iter("h2"), page.iter("table"))}
+print(tables)
+assert tables["Since the start"][1][:4] == ["2", "1", "1", "1"]
+assert tables["Interfaces"] == [["interface", "module", "state"], ["a", "sip", "in service"], ["b", "sip", "in service"]]
+assert tables["Peers"][1][2] == "called" and len(tables["Peers"]) == 3
+assert tables["Calls, the oldest first"] == [["call", "state", "age/s", "parties"]]
+END
+
 # connections that say nothing, and what is no request, by the thousand, while calls go on
 python3 "$HERE/operation/strangers.py" $PORT_METRICS >"$WORK/strangers.log" 2>&1 &
 background+=($!)
 expect_call
-wait $! || fail "the page is not to be had among strangers"
+wait "${background[0]}" || fail "the page is not to be had among strangers"
 expect_metric 'calls_answered_total 2'
 
 promtool check rules "$DEPLOY/alerts.yml" >"$WORK/promtool.log" 2>&1 || fail "the rules of alerts"

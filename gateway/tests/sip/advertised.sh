@@ -1,17 +1,20 @@
-# An interface that listens on every address and tells its peers one: Contact, Via and From have that one.
+# An interface that listens on every address and tells its peers one, with another port: Contact and From have both,
+# Via has the address, since answers come to where requests leave.
 . "$(dirname "$0")/../lib.bash"
 
 TOLD=127.0.0.9
+TOLD_A=$((PORT + 30))
+TOLD_B=$((PORT + 31))
 caller() {
     send_invite
     expect 100
-    expect 200 Contact: "sip:gateway@$TOLD:$PORT_A" nowhere "0\\.0\\.0\\.0"
+    expect 200 Contact: "sip:gateway@$TOLD:$TOLD_A" nowhere "0\\.0\\.0\\.0"
     send_ack
     send_bye
     expect 200
 }
 callee() {
-    expect_invite Contact: "sip:gateway@$TOLD:$PORT_B" Via: "$TOLD:$PORT_B" From: "@$TOLD:$PORT_B" nowhere "0\\.0\\.0\\.0"
+    expect_invite Contact: "sip:gateway@$TOLD:$TOLD_B" Via: "$TOLD:$PORT_B" From: "@$TOLD:$TOLD_B" nowhere "0\\.0\\.0\\.0"
     respond_with "$SDP_OF_CALLEE" retrans "200 OK"
     expect_request ACK
     expect_request BYE
@@ -20,6 +23,7 @@ callee() {
 
 write_configuration '' 'transports = ["udp", "tcp"]'
 sed -i -E "s/^listen = \"$HOST:([0-9]+)\"/listen = \"0.0.0.0:\\1\"\nadvertise = \"$TOLD:\\1\"/" "$WORK/gateway.toml"
+sed -i "s/$TOLD:$PORT_A/$TOLD:$TOLD_A/; s/$TOLD:$PORT_B/$TOLD:$TOLD_B/" "$WORK/gateway.toml"
 start_gateway
 for transport in u1 t1; do
     start_callee callee
