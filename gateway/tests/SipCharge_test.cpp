@@ -74,10 +74,25 @@ TEST(SipCharge, WhatIsNoChargeIsNone)
     for (int i = 0; i < 1000; ++i)
         deep += "<a>";
     for (std::string const& body :
-         {std::string(), std::string("hello"), std::string("<aoc/>"), BODY(""), BODY("<aoc-s/>"), bomb, deep,
-          BODY("<aoc-d><recorded-charges>"), AMOUNT("EUR", "-1"), AMOUNT("EUR", "1,5"), AMOUNT("EUR", "1.2.3"),
-          AMOUNT("EUR", ""), AMOUNT("EUR", "."), AMOUNT("", "1"), AMOUNT("UNIT", "1.5"),
-          AMOUNT("EUR", "99999999999999"), AMOUNT("EUR", "99999999999"),
+         {std::string(),
+          std::string("hello"),
+          std::string("<aoc/>"),
+          BODY(""),
+          BODY("<aoc-s/>"),
+          bomb,
+          deep,
+          BODY("<aoc-d><recorded-charges>"),
+          AMOUNT("EUR", "-1"),
+          AMOUNT("EUR", "1,5"),
+          AMOUNT("EUR", "1.2.3"),
+          AMOUNT("EUR", ""),
+          AMOUNT("EUR", "."),
+          AMOUNT("", "1"),
+          AMOUNT("more than ten", "1"),
+          AMOUNT("\xe2\x82\xac", "1"),
+          AMOUNT("UNIT", "1.5"),
+          AMOUNT("EUR", "99999999999999"),
+          AMOUNT("EUR", "99999999999"),
           std::string("<aoc><aoc-d><recorded-charges><free-charge/></recorded-charges></aoc-d></aoc>")})
         EXPECT_EQ(TEXT_OF(body), "none") << body.substr(0, 300);
 }

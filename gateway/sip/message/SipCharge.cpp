@@ -184,6 +184,9 @@ std::optional<Q956::EMultiplier::Type> MULTIPLIER_OF(Decimal const& decimal)
     return static_cast<Q956::EMultiplier::Type>(multiplier);
 }
 
+/// Of IA5, without its control characters.
+bool IS_PRINTABLE(char c) { return c >= ' ' && c < '\x7f'; }
+
 bool READ_AMOUNT(Told const& told, Charge::Specific::Recorded& recorded)
 {
     std::optional<Decimal> const amount = DECIMAL_OF(told.amount);
@@ -193,10 +196,11 @@ bool READ_AMOUNT(Told const& told, Charge::Specific::Recorded& recorded)
     if (told.currency != UNITS)
     {
         auto& currency = recorded.select(recorded.m_currency);
-        currency.m_rCurrency = SipProperty::STRING(told.currency.substr(0, LONGEST_CURRENCY));
+        currency.m_rCurrency = SipProperty::STRING(told.currency);
         currency.m_rAmount.m_currencyAmount = static_cast<int>(amount->value);
         currency.m_rAmount.m_multiplier = *multiplier;
-        return !told.currency.empty();
+        return !told.currency.empty() && told.currency.size() <= LONGEST_CURRENCY &&
+               std::all_of(told.currency.begin(), told.currency.end(), IS_PRINTABLE);
     }
     Q956::RecordedUnits* const units = recorded.select(recorded.m_unitsList).append();
     if (units == nullptr)
@@ -239,7 +243,7 @@ std::string ESCAPE(std::string_view text)
     for (char const c : text)
         if (c == '<' || c == '&' || c == '>')
             escaped += c == '<' ? "&lt;" : c == '&' ? "&amp;" : "&gt;";
-        else if (c >= ' ' && c < '\x7f') // IA5
+        else if (IS_PRINTABLE(c))
             escaped += c;
     return escaped;
 }
