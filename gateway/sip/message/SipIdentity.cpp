@@ -92,7 +92,8 @@ std::string SipIdentity::GET_ASSERTED(SipParty const& party, SocketAddress const
     std::string lines;
     if (party.isAsserted() && !party.number.empty() && (isTrusted || !party.isRestricted()))
         lines += "P-Asserted-Identity: " +
-                 SipAddress::MAKE_NAME_ADDR(party.name, SipAddress::MAKE_URI(party.getUser(), own, SipWay::UDP)) + "\r\n";
+                 SipAddress::MAKE_NAME_ADDR(party.name, SipAddress::MAKE_URI(party.getUser(), own, SipWay::UDP)) +
+                 "\r\n";
     if (party.isRestricted())
         lines += "Privacy: id\r\n";
     return lines;
