@@ -101,11 +101,11 @@ struct SipConfiguration
     /// Where the peers reach it.
     SocketAddress const& getAddress() const { return advertise.port != 0 ? advertise : listen; }
     /// Where it listens for what comes that way.
-    std::uint16_t getPort(SipWay::Way way) const { return SipWay::IS_SECURED(way) ? tlsPort : listen.port; }
+    std::uint16_t getPort(SipWay::Way by) const { return SipWay::IS_SECURED(by) ? tlsPort : listen.port; }
     /// The address for what goes that way.
-    SocketAddress getAddress(SipWay::Way way) const
+    SocketAddress getAddress(SipWay::Way by) const
     {
-        return SipWay::IS_SECURED(way) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
+        return SipWay::IS_SECURED(by) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
     }
 
     bool hasPeer() const { return !peer.host.empty(); }
