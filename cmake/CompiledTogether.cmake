@@ -1,7 +1,6 @@
 # Builds for tests compile eight sources at a time (CMAKE_UNITY_BUILD in CMakePresets.json), which takes a third of the
 # time. What the preprocessor and anonymous namespaces keep apart otherwise meets then, so a source whose own names are
 # those of another one in its target is compiled alone. A new one is to have names of its own, or to be named here.
-# TYEventLoop.cpp is for clang-tidy's sake, which, shown the list as well, does not see that elements leave it.
 function(compiled_alone target)
     if(TARGET ${target})
         get_target_property(folder ${target} SOURCE_DIR)
@@ -10,7 +9,7 @@ function(compiled_alone target)
     endif()
 endfunction()
 
-set(platform platform/eventloop/TYEventLoop.cpp platform/media/MG_Rtp.cpp platform/media/MG_Tones.cpp platform/media/VoipCodecAndMode.cpp)
+set(platform platform/media/MG_Rtp.cpp platform/media/MG_Tones.cpp platform/media/VoipCodecAndMode.cpp)
 foreach(class InformationTransferCapability NumberingPlan PresentationIndicator ReasonForRedirection ScreeningIndicator TypeOfNumber)
     list(APPEND platform platform/signalling/Q${class}.cpp)
     list(APPEND signalling_tests Q${class}_test.cpp)
