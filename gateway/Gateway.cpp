@@ -119,8 +119,16 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
         module->open(m_host);
     openControl();
     openMetrics();
-    if (m_media != nullptr)
-        m_media->start();
+    startMedia();
+}
+
+void Gateway::startMedia()
+{
+    if (m_media == nullptr)
+        return;
+    m_media->setRecordingFailure([](std::string const& path, std::string const& reason)
+                                 { spdlog::error("the recording {}: {}", path, reason); });
+    m_media->start();
 }
 
 void Gateway::watchCalls()

@@ -75,6 +75,7 @@ private:
     void onHangUp();
     void openControl();
     void openMetrics();
+    void startMedia();
     void watchCalls();
     void follow(Configuration configuration);
     std::string getState() const;

@@ -4,9 +4,12 @@
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <charconv>
+#include <cstring>
 #include <fstream>
 #include <limits>
+#include <unistd.h>
 
 namespace
 {
@@ -37,7 +40,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
 
 void READ_MEDIA(ConfigurationSection const& section, Configuration& configuration)
 {
-    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country"});
+    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country", "recordings"});
     MediaOptions& media = configuration.media;
     configuration.relaysMedia = section.oneOf("mode", "direct", {"direct", "relay"}) == "relay";
     media.firstPort = static_cast<unsigned short>(section.number("first-port", media.firstPort, 1024, 65534));
@@ -48,6 +51,11 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.silence = section.number("silence", 0, 0, 86400);
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
     media.country = section.text("country", media.country);
+    media.recordings = section.text("recordings", {});
+    if (!media.recordings.empty() && access(media.recordings.c_str(), W_OK | X_OK) != 0)
+        section.refuse("recordings", std::string("not a folder to write into: ") + std::strerror(errno));
+    if (!media.recordings.empty() && !configuration.relaysMedia)
+        section.refuse("recordings", "what is said can be kept in mode \"relay\" alone");
     std::string reason;
     if (!ToneTable().read(ToneTable::BUILT_IN(), media.country, reason))
         section.refuse("country", reason);

@@ -57,7 +57,7 @@ TEST(Configuration, EveryKeyIsRead)
                     "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
                     "\"/r\"\nrecording-size = 4096\n"
                     "[media]\nmode = \"relay\"\nfirst-port = 30000\nlast-port = 30999\nthreads = 2\nsilence = 30\n"
-                    "dscp = 0\ncountry = \"gb\"\n") +
+                    "dscp = 0\ncountry = \"gb\"\nrecordings = \"/tmp\"\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -77,6 +77,7 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.media.silence, 30u);
     EXPECT_EQ(configuration.media.differentiation, 0u);
     EXPECT_EQ(configuration.media.country, "gb");
+    EXPECT_EQ(configuration.media.recordings, "/tmp");
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].from, "a");
     EXPECT_EQ(configuration.routes[0].prefix, "49");
@@ -211,6 +212,10 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {"[gateway]\nrecording-size = 100\n" + good, "f: gateway.recording-size: expected 0, or at least 4096"},
         {"[gateway]\ncontext = \"a\\u007f\"\n" + good,
          "f: gateway.context: has a line break or another control character"},
+        {"[media]\nrecordings = \"/tmp\"\n" + good,
+         "f: media.recordings: what is said can be kept in mode \"relay\" alone"},
+        {"[media]\nmode = \"relay\"\nrecordings = \"/nowhere\"\n" + good,
+         "f: media.recordings: not a folder to write into: No such file or directory"},
         {"[media]\nmode = \"both\"\n" + good, "f: media.mode: must be one of direct, relay"},
         {"[media]\nfirst-port = 20000\nlast-port = 20000\n" + good, "f: media.last-port: must be above first-port"},
         {"[media]\nports = 1\n" + good, "f: media.ports: is not a key"},

@@ -235,7 +235,8 @@ void IsdnEndpoint::openMedia()
     if (m_media == nullptr || m_mediaTimeslot != m_timeslot)
     {
         m_mediaTimeslot = m_timeslot;
-        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this);
+        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this,
+                                   CallMedia::PART_OF(m_adapter));
         if (m_media != nullptr && !m_bearer.isSpeech())
             m_media->describe(ChannelTermination::DESCRIPTION(MG_Rtp::ECodec::CLEARMODE));
         else if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)
