@@ -97,7 +97,7 @@ figure_is() { [[ $(figure "$1") == "$2" ]]; }
 
 start_balancer() {
     here "$DEPLOY/kamailio/dispatcher.list" | sed "/^1 sip:$(trunk_of 1) /s/rweight=10/rweight=20/" >"$WORK/dispatcher.list"
-    kamailio -DD -E -f "$DEPLOY/kamailio/kamailio.cfg" -Y "$WORK" -m 32 -M 4 -A "TRUNK=udp:$BALANCER_TRUNK" -A "OFFICE=udp:$BALANCER_OFFICE" \
+    kamailio -DD -E -f "$DEPLOY/kamailio/kamailio.cfg" -Y "$WORK" -m 256 -M 4 -A "TRUNK=udp:$BALANCER_TRUNK" -A "OFFICE=udp:$BALANCER_OFFICE" \
         -A "LIST=\"$WORK/dispatcher.list\"" -A "CONTROL=\"unix:$WORK/kamailio_ctl\"" -A PROBE=1 >"$WORK/kamailio.log" 2>&1 &
     kamailio_pid=$!
     trap 'kill -TERM $kamailio_pid 2>/dev/null; wait $kamailio_pid; cleanup' EXIT # its processes end with it
