@@ -13,9 +13,6 @@ endif()
 if(CMAKE_UNITY_BUILD) # and one's names lie behind the other's
     target_compile_options(callcontrol_settings INTERFACE -Wno-shadow)
 endif()
-if(CMAKE_BUILD_TYPE STREQUAL "RelWithDebInfo") # debug information names sources by their place in the tree
-    target_compile_options(callcontrol_settings INTERFACE -ffile-prefix-map=${PROJECT_SOURCE_DIR}=.)
-endif()
 if(CALLCONTROL_SANITIZE)
     target_compile_options(callcontrol_settings INTERFACE
         -fsanitize=${CALLCONTROL_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
