@@ -7,8 +7,8 @@
 . "$(dirname "${BASH_SOURCE[0]}")/../../gateway/tests/lib.bash"
 . "$HERE/certificates.bash"
 CTL=$3
-RATE=${4:-60}
-SECONDS_EACH=${5:-1}
+RATE=${4:-30}
+SECONDS_EACH=${5:-0.5}
 TESTS=$(dirname "${BASH_SOURCE[0]}")
 HOLD=600 # milliseconds
 DEPLOY=$HERE/../../deploy
@@ -157,7 +157,7 @@ rpc dispatcher.reload >"$WORK/rpc.log" 2>&1 || fail "kamailio does not read its 
 sed -i 's/\]/, "'"$(exporter_of 4)"'"]/' "$WORK/prometheus/gateways.yml"
 expect_soon "gateway 4 is probed" 20 state_is 4 A
 settled=$(now)
-expect_soon "gateway 4 has its share of a hundred calls and more" 60 takes_calls 4 32
+expect_soon "gateway 4 has its share of a hundred calls and more" 60 takes_calls 4 27
 [[ -z ${5:-} ]] || go_on
 
 kill -USR1 $caller # no further calls
