@@ -95,6 +95,12 @@ print(*(sample["value"][1] for sample in answer["data"]["result"]))
 END_OF_QUERY
 figure_is() { [[ $(figure "$1") == "$2" ]]; }
 
+# strangers_see_figures: whether the figures are shown to who has no certificate
+strangers_see_figures() { python3 - "https://$(exporter_of 1)/proxy?module=callcontrol-gateway" 2>"$WORK/stranger.log" <<'END_OF_SCRAPE'; }
+import ssl, sys, urllib.request
+urllib.request.urlopen(sys.argv[1], context=ssl._create_unverified_context(), timeout=10).read()
+END_OF_SCRAPE
+
 start_balancer() {
     here "$DEPLOY/kamailio/dispatcher.list" | sed "/^1 sip:$(trunk_of 1) /s/rweight=10/rweight=20/" >"$WORK/dispatcher.list"
     kamailio -DD -E -f "$DEPLOY/kamailio/kamailio.cfg" -Y "$WORK" -m 256 -M 4 -A "TRUNK=udp:$BALANCER_TRUNK" -A "OFFICE=udp:$BALANCER_OFFICE" \
@@ -172,6 +178,8 @@ for n in 1 4; do
     expect_soon "Prometheus has the calls of gateway $n" 20 \
         figure_is "callcontrol_gateway_calls_answered_total{instance=\"$(exporter_of $n)\"}" "$(answered $n)"
 done
+strangers_see_figures && fail "figures are told to whoever asks"
+grep -q 'certificate required\|CERTIFICATE_REQUIRED' "$WORK/stranger.log" || fail "not for want of a certificate: $(tail -n 1 "$WORK/stranger.log")"
 for n in 1 2 4; do
     ask $n shutdown || fail "gateway $n does not end"
     ended $n
