@@ -45,14 +45,14 @@ String CONTEXT_NAME(Configuration const& configuration)
     return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
 }
 
-std::unique_ptr<RecordWriter> OPEN_RECORDS(Configuration const& configuration)
+std::unique_ptr<CallRecords> OPEN_RECORDS(Configuration const& configuration)
 try
 {
-    return configuration.records.file.empty() ? nullptr : std::make_unique<RecordWriter>(configuration.records);
+    return configuration.records.isOn() ? std::make_unique<CallRecords>(configuration.records) : nullptr;
 }
-catch (std::runtime_error const& error)
+catch (CallRecords::Failure const& error)
 {
-    throw ConfigurationError(configuration.file, "records.file", error.what());
+    throw ConfigurationError(configuration.file, "records." + error.key, error.what());
 }
 } // namespace
 
@@ -71,6 +71,7 @@ void Gateway::BLOCK_SIGNALS()
     sigset_t const signals = HANDLED_SIGNALS();
     sigprocmask(SIG_BLOCK, &signals, nullptr);
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN); // a limit of files' sizes is a disk that is full
 }
 
 unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
@@ -127,7 +128,10 @@ void Gateway::watchCalls()
 {
     m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
     if (m_records != nullptr)
+    {
+        m_watch.tellChange([this](CallRecord const& record) { m_records->note(record); });
         m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    }
     m_watch.tell([this](CallRecord const& record) { m_tracer.onCallOver(record); });
     if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
         m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
