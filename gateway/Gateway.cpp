@@ -237,7 +237,10 @@ std::string Gateway::reload()
         Configuration configuration = Configuration::READ(m_configuration.file);
         if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
             throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
+        prepareInterfaces(configuration);
+        Configuration const before = m_configuration;
         follow(std::move(configuration));
+        followInterfaces(before);
         for (auto const& readAgain : m_host.onReload)
             readAgain();
         spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
@@ -248,6 +251,38 @@ std::string Gateway::reload()
         spdlog::error("the configuration stays as it was: {}", error.what());
         return error.what();
     }
+}
+
+void Gateway::prepareInterfaces(Configuration const& configuration)
+try
+{
+    for (std::string const& name : configuration.interfaces)
+        if (m_host.leaving.contains(name))
+            throw ConfigurationError(configuration.file, "interfaces",
+                                     "'" + name + "' was removed and has calls that are not over");
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, m_configuration, configuration) &&
+            !module->prepareChange(configuration, configuration.modules.at(name)))
+            throw ConfigurationError(configuration.file, name, "a change of it needs a restart");
+}
+catch (std::exception const&)
+{
+    for (auto const& [name, module] : m_modules)
+        module->dropChange();
+    throw;
+}
+
+void Gateway::followInterfaces(Configuration const& before)
+{
+    for (std::string const& name : before.interfaces)
+        if (!m_configuration.interfaces.contains(name))
+        {
+            m_host.leaving.insert(name);
+            m_host.blocked.erase(name); // whoever comes under that name one day is another
+        }
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, before, m_configuration))
+            module->change();
 }
 
 void Gateway::follow(Configuration configuration)

@@ -76,6 +76,8 @@ private:
     void openControl();
     void openMetrics();
     void watchCalls();
+    void prepareInterfaces(Configuration const& configuration);
+    void followInterfaces(Configuration const& before);
     void follow(Configuration configuration);
     std::string getState() const;
 
