@@ -45,14 +45,14 @@ String CONTEXT_NAME(Configuration const& configuration)
     return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
 }
 
-std::unique_ptr<RecordWriter> OPEN_RECORDS(Configuration const& configuration)
+std::unique_ptr<CallRecords> OPEN_RECORDS(Configuration const& configuration)
 try
 {
-    return configuration.records.file.empty() ? nullptr : std::make_unique<RecordWriter>(configuration.records);
+    return configuration.records.isOn() ? std::make_unique<CallRecords>(configuration.records) : nullptr;
 }
-catch (std::runtime_error const& error)
+catch (CallRecords::Failure const& error)
 {
-    throw ConfigurationError(configuration.file, "records.file", error.what());
+    throw ConfigurationError(configuration.file, "records." + error.key, error.what());
 }
 } // namespace
 
@@ -71,6 +71,7 @@ void Gateway::BLOCK_SIGNALS()
     sigset_t const signals = HANDLED_SIGNALS();
     sigprocmask(SIG_BLOCK, &signals, nullptr);
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN); // a limit of files' sizes is a disk that is full
 }
 
 unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
@@ -135,7 +136,10 @@ void Gateway::watchCalls()
 {
     m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
     if (m_records != nullptr)
+    {
+        m_watch.tellChange([this](CallRecord const& record) { m_records->note(record); });
         m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    }
     m_watch.tell([this](CallRecord const& record) { m_tracer.onCallOver(record); });
     if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
         m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
@@ -241,7 +245,10 @@ std::string Gateway::reload()
         Configuration configuration = Configuration::READ(m_configuration.file);
         if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
             throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
+        prepareInterfaces(configuration);
+        Configuration const before = m_configuration;
         follow(std::move(configuration));
+        followInterfaces(before);
         for (auto const& readAgain : m_host.onReload)
             readAgain();
         spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
@@ -252,6 +259,38 @@ std::string Gateway::reload()
         spdlog::error("the configuration stays as it was: {}", error.what());
         return error.what();
     }
+}
+
+void Gateway::prepareInterfaces(Configuration const& configuration)
+try
+{
+    for (std::string const& name : configuration.interfaces)
+        if (m_host.leaving.contains(name))
+            throw ConfigurationError(configuration.file, "interfaces",
+                                     "'" + name + "' was removed and has calls that are not over");
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, m_configuration, configuration) &&
+            !module->prepareChange(configuration, configuration.modules.at(name)))
+            throw ConfigurationError(configuration.file, name, "a change of it needs a restart");
+}
+catch (std::exception const&)
+{
+    for (auto const& [name, module] : m_modules)
+        module->dropChange();
+    throw;
+}
+
+void Gateway::followInterfaces(Configuration const& before)
+{
+    for (std::string const& name : before.interfaces)
+        if (!m_configuration.interfaces.contains(name))
+        {
+            m_host.leaving.insert(name);
+            m_host.blocked.erase(name); // whoever comes under that name one day is another
+        }
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, before, m_configuration))
+            module->change();
 }
 
 void Gateway::follow(Configuration configuration)

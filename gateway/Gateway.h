@@ -16,7 +16,7 @@
 #include "operation/metric/HttpServer.h"
 #include "operation/page/StatusPage.h"
 #include "operation/record/CallWatch.h"
-#include "operation/record/RecordWriter.h"
+#include "operation/record/CallRecords.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -77,6 +77,8 @@ private:
     void openMetrics();
     void startMedia();
     void watchCalls();
+    void prepareInterfaces(Configuration const& configuration);
+    void followInterfaces(Configuration const& before);
     void follow(Configuration configuration);
     std::string getState() const;
 
@@ -93,7 +95,7 @@ private:
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
-    std::unique_ptr<RecordWriter> m_records; // null where it is not configured
+    std::unique_ptr<CallRecords> m_records; // null where it is not configured
     CallMetrics m_callMetrics;
     CallTracer m_tracer;
     CallWatch m_watch; // calls may last until call control ends

@@ -8,7 +8,9 @@
 #include <charconv>
 #include <cstring>
 #include <fstream>
+#include <libpq-fe.h>
 #include <limits>
+#include <memory>
 #include <unistd.h>
 
 namespace
@@ -86,15 +88,31 @@ void READ_CONTROL(ConfigurationSection const& section, ControlOptions& control)
         section.refuse("socket", "is missing");
 }
 
+/// What is wrong with it is not told, since a piece of a password may be.
+std::string READ_CONNECTION(ConfigurationSection const& section, char const* key)
+{
+    std::string text = section.text(key, {});
+    std::unique_ptr<PQconninfoOption, decltype(&PQconninfoFree)> const parsed(PQconninfoParse(text.c_str(), nullptr),
+                                                                              &PQconninfoFree);
+    if (parsed == nullptr)
+        section.refuse(key, "is no connection string");
+    return text;
+}
+
 void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
 {
-    section.allow({"file", "numbers", "kept", "when-full"});
+    section.allow({"file", "sqlite", "postgresql", "spool", "numbers", "kept", "when-full"});
     records.file = section.text("file", {});
+    records.sqlite = section.text("sqlite", {});
+    records.postgresql = READ_CONNECTION(section, "postgresql");
+    records.spool = section.text("spool", {});
     records.isWhole = section.oneOf("numbers", "withheld", {"withheld", "whole"}) == "whole";
     records.kept = section.number("kept", records.kept, 1, 1000000);
     records.refusesUnrecorded = section.oneOf("when-full", "lose", {"lose", "refuse"}) == "refuse";
-    if (records.file.empty() && !section.getKeys().empty())
+    if (!records.isOn() && !section.getKeys().empty())
         section.refuse("file", "is missing");
+    if (records.spool.empty() && !(records.sqlite.empty() && records.postgresql.empty()))
+        section.refuse("spool", "is missing: a database may not be there");
 }
 
 /// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.

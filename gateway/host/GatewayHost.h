@@ -37,6 +37,7 @@ struct GatewayHost
     std::set<std::string> blocked{};               ///< interfaces that an operator has taken out of service
     std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
     std::vector<std::function<void()>> onReload{}; ///< those that read files of theirs again with the configuration
+    std::set<std::string> leaving{};               ///< interfaces that are configured no more and go with their calls
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const
@@ -51,5 +52,8 @@ struct GatewayHost
         return {routing.find({from, number, calling, minute, callNumber}), number};
     }
     /// Whether no new call may come in or leave there.
-    bool isBlocked(std::string const& interface) const { return blocked.contains(interface); }
+    bool isBlocked(std::string const& interface) const
+    {
+        return blocked.contains(interface) || leaving.contains(interface);
+    }
 };

@@ -93,6 +93,13 @@ SipInterface::~SipInterface()
     m_cleanUpEvent->destroy();
 }
 
+void SipInterface::follow(SipConfiguration const& configuration)
+{
+    auto const passwords = m_configuration.passwords; // which others share
+    m_configuration = configuration;
+    m_configuration.passwords = passwords;
+}
+
 XCode SipInterface::dial(CC_Call& call, String const&, String const& destination,
                          CC_PropertyContainer const& offerProperties)
 {

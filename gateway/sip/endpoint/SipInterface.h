@@ -54,6 +54,8 @@ public:
 
     String const& getName() const { return m_name; }
     SipConfiguration const& getConfiguration() const { return m_configuration; }
+    /// Takes over what may change while calls are up; `configuration` differs in nothing else. The passwords stay.
+    void follow(SipConfiguration const& configuration);
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
     /// Where the peer reaches us, for what goes that way.
