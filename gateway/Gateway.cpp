@@ -182,6 +182,12 @@ void Gateway::openMetrics()
     }
 }
 
+/// The module whose loop it is ends last: what the others have there they take back.
+Gateway::~Gateway()
+{
+    std::erase_if(m_modules, [](auto const& one) { return one.second->getLoop() == nullptr; });
+}
+
 SignallingLoop& Gateway::findLoop(Modules const& modules)
 {
     SignallingLoop* found = nullptr;

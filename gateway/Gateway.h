@@ -38,6 +38,7 @@ public:
     /// Opens all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
     /// ConfigurationError for an interface that cannot be opened.
     Gateway(Configuration const& configuration, Modules modules, unsigned int tracedCalls);
+    ~Gateway();
     Gateway(Gateway const&) = delete;
     Gateway& operator=(Gateway const&) = delete;
 

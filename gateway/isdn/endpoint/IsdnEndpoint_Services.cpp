@@ -106,12 +106,15 @@ void IsdnEndpoint::readUserUser(char const* text, CC_PropertyContainer& own)
         ADD(own, CC_PropertyParametrizedString(CC_PropertyId::USER_TO_USER_INFORMATION, IsdnUserUser::FROM_WIRE(text)));
 }
 
-/// The next message takes it along; without memory it goes without.
+/// The next message takes it along, unless an earlier one has; without memory it goes without.
 void IsdnEndpoint::sendUserUser()
 try
 {
-    if (std::string const text = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser()); !text.empty())
-        pri_call_set_useruser(m_call, text.c_str());
+    std::string text = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser());
+    if (text == m_userUser)
+        return;
+    m_userUser = std::move(text);
+    pri_call_set_useruser(m_call, m_userUser.c_str());
 }
 catch (std::bad_alloc const&)
 {
