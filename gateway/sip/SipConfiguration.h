@@ -70,6 +70,7 @@ struct SipConfiguration
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
     bool isTrusted = true;              ///< its peers, in the sense of RFC 3325
+    std::vector<std::string> headers{}; ///< names of those that cross besides the usual ones
     std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
     std::shared_ptr<SipPasswords const> passwords; ///< with a user, or where it asks: never null
     bool authenticates = false;                    ///< asks who sends

@@ -57,6 +57,14 @@ TEST(SipConfiguration, WhatIsLeftOutHasItsDefault)
     EXPECT_FALSE(a.detectsDigits);
 }
 
+TEST(SipConfiguration, OnlyHeadersThatNobodyLivesByMayBeCarried)
+{
+    EXPECT_EQ(READ(LEAST + std::string("headers = [\"X-Customer\", \"Organization\"]\n")).at(0).headers,
+              (std::vector<std::string>{"X-Customer", "Organization"}));
+    EXPECT_EQ(COMPLAINT(LEAST + std::string("headers = [\"X-Customer\", \"Via\"]\n")),
+              "f: sip[0].headers: 'Via' is no header that may be carried");
+}
+
 TEST(SipConfiguration, EveryKeyIsRead)
 {
     SipConfiguration const b = READ(R"([[sip]]

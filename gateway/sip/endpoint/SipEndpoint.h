@@ -13,6 +13,7 @@
 #include "sip/dialog/SipOfferAnswer.h"
 #include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/message/SipCarriedHeaders.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipParty.h"
@@ -261,6 +262,14 @@ private:
     std::string getFinalCharge() const;
     void sendCharge();
 
+    // headers that cross: SipEndpoint_Carried.cpp
+    void addCarried(CC_PropertyContainer& own, sip_t const* message);
+    void addUserToUser(CC_PropertyContainer& own, sip_t const* message);
+    void takeCarried(sip_t const* message);
+    std::string getCarried(SipCarriedHeaders::Message message);
+    std::string getUserToUser();
+    std::string getLastUserToUser();
+
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
     /// Runs what something that happened asks for. When memory is out in the middle of it the call is cleared, since
@@ -374,11 +383,14 @@ private:
     std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
     std::string m_headersForTarget;
-    SipParty m_called;                    // as far as its number has come
-    std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
-    std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
-    std::vector<Attempt> m_attempts;      // called side
-    bool m_isNumberOpen = false;          // called side: digits may follow
+    std::string m_carried;                        // what our peer's last message had for the other side
+    unsigned int m_userToUsers = 0;               // that our peer has sent
+    std::optional<unsigned int> m_userToUserTold; // to our peer: its counter
+    SipParty m_called;                            // as far as its number has come
+    std::string m_firstOffer;                     // calling side: of the first INVITE, if others may follow
+    std::vector<nta_leg_t*> m_formerLegs;         // calling side: of INVITEs with fewer digits
+    std::vector<Attempt> m_attempts;              // called side
+    bool m_isNumberOpen = false;                  // called side: digits may follow
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has

@@ -141,7 +141,7 @@ bool SipEndpoint::inviteNumber()
     m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
     if (configuration.isTrusted || !diversion.isRestricted())
         m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
-    m_inviteHeaders += m_headersForTarget;
+    m_inviteHeaders += m_headersForTarget + getCarried(SipCarriedHeaders::REQUEST);
     m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
     return startInvite();
 }
@@ -307,6 +307,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     std::string const session = SESSION_OF(response);
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
+    addCarried(own, response);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
@@ -395,6 +396,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     CC_PropertyContainer own;
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
+    addCarried(own, response);
     addSession(own, session, true);
     addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
@@ -429,6 +431,8 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     m_invite.forget();
+    if (!isOurs)
+        takeCarried(response);
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else

@@ -175,6 +175,7 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     SipIdentity const& caller = m_caller;
     CC_PropertyContainer own;
     ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
+    addCarried(own, request);
     if (m_hasOffer)
         m_session.addOffer(own, SESSION_OF(request));
     CC_PropertyContainer offer;
@@ -210,6 +211,7 @@ bool SipEndpoint::tryNextRoute(SipCause const& cause)
     spdlog::debug("call {} {} goes on to {} after cause {} ({})", m_callNumber, getName().view(),
                   m_routes.getProvider(), static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause));
     m_hadPeer = false;
+    m_carried.clear(); // the leg's
     m_adapter.drop(cause.cause, 0);
     SipHeldMessage const request(nta_incoming_getrequest(m_transaction));
     if (!dial(sip_object(request.get()), media.get()).isOk())
@@ -369,12 +371,13 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
         return true; // it would have to bear an offer, which nobody has made
     if (!m_wantsReliable && !(m_allowsReliable && isAnswer))
         return false;
-    std::string const identity =
+    std::string const headers =
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
-                                  m_interface.getConfiguration().isTrusted);
+                                  m_interface.getConfiguration().isTrusted) +
+        getCarried(SipCarriedHeaders::RESPONSE);
     nta_reliable_t const* const reliable = nta_reliable_treply(
         m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
-        SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+        SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(isAnswer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(isAnswer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
     if (reliable == nullptr)
@@ -488,7 +491,8 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
-    std::string const headers = identity + (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
+    std::string const headers = identity + getCarried(SipCarriedHeaders::RESPONSE) +
+                                (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())
         m_ownSession = session;
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
@@ -501,7 +505,9 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
 void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)
 {
     trace("-> " + std::to_string(status) + (reasonHeader.empty() ? "" : ", Reason: ") + reasonHeader);
+    std::string const headers = getCarried(SipCarriedHeaders::RESPONSE);
     nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
+                        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
                         TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
     forgetTransaction(); // the stack goes on repeating the answer until its ACK
 }

@@ -60,6 +60,7 @@ int SipEndpoint::onBye(sip_t const* request)
         answerFinally(487, {});
     else if (!wasUp)
         return 200; // both sides hang up at once: ours is answered as well
+    takeCarried(request);
     endOffers();
     forgetTransaction();
     leaveCall(cause);
@@ -95,9 +96,11 @@ void SipEndpoint::sendBye(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
     std::string const charge = getFinalCharge();
+    std::string const userToUser = getLastUserToUser();
     trace("-> BYE" + std::string(charge.empty() ? "" : " with a charge") + ", Reason: " + reason);
     m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
                                          SIPTAG_REASON_STR(reason.c_str()),
+                                         TAG_IF(!userToUser.empty(), SIPTAG_HEADER_STR(userToUser.c_str())),
                                          TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipCharge::TYPE)),
                                          TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
     if (m_bye != nullptr)
