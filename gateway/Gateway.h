@@ -77,6 +77,7 @@ private:
     void openMetrics();
     void watchCalls();
     void follow(Configuration configuration);
+    void followDialling(Configuration const& configuration);
     std::string getState() const;
 
     // --- ControlledGateway

@@ -33,7 +33,7 @@ class SignallingModule
 {
 public:
     /// Changes whenever a module that was built before would not run any more.
-    static constexpr unsigned int VERSION = 3;
+    static constexpr unsigned int VERSION = 4;
 
     /// Ends what is still up without a word to the peers.
     virtual ~SignallingModule() = default;

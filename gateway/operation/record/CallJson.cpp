@@ -92,15 +92,16 @@ std::string CallJson::LINE_OF(CallRecord const& record, bool isWhole)
     std::string legs;
     for (CallRecord::Leg const& leg : record.legs)
         legs += (legs.empty() ? "" : ",") + LEG(leg, isWhole);
-    return CC_JsonLine()
-        .add("version", static_cast<unsigned long long>(VERSION))
+    CC_JsonLine line;
+    line.add("version", static_cast<unsigned long long>(VERSION))
         .add("call", record.serial)
         .add("start", TIME(record.start))
         .addJson("ringingAfter", SECONDS(record.ringing))
         .addJson("answeredAfter", SECONDS(record.answered))
         .addJson("endedAfter", SECONDS(record.ended))
         .addJson("clearedBy", record.clearedBy != 0 ? std::to_string(record.clearedBy) : "null")
-        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false")
-        .addJson("legs", "[" + legs + "]")
-        .get();
+        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false");
+    if (record.isEmergency)
+        line.addJson("emergency", "true");
+    return line.addJson("legs", "[" + legs + "]").get();
 }

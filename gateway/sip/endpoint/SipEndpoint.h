@@ -53,9 +53,10 @@ public:
     ~SipEndpoint() override;
 
     /// The calling side: takes over a new INVITE and dials the called party on the first of the routes, on the next one
-    /// when that reaches nobody. 0, or the status with which the transaction is given up at once.
+    /// when that reaches nobody; `user`: as whom the interface knows the caller. 0, or the status with which the
+    /// transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
-                      RouteHunt const& routes);
+                      RouteHunt const& routes, std::string const& user);
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
@@ -337,6 +338,8 @@ private:
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     SipIdentity m_caller;                  // calling side
     RouteHunt m_routes;
+    RouteHunt m_targetRoutes; // of a transfer
+    std::string m_user;       // calling side: as whom the interface knows our peer; empty: it asks nobody
     QCause m_dialFailure = QCause::NONE;
     std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;
@@ -382,6 +385,7 @@ private:
     bool m_isUnheard = false; // that one has said nothing yet
     std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
+    std::string m_inviteRoute;
     std::string m_headersForTarget;
     std::string m_carried;                        // what our peer's last message had for the other side
     unsigned int m_userToUsers = 0;               // that our peer has sent

@@ -1,6 +1,7 @@
 // The calling side: the INVITE was received, the peer leg says how it is answered.
 #include "sip/endpoint/SipEndpoint.h"
 
+#include "host/EmergencyCall.h"
 #include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_PropertyBoolean.h"
@@ -45,7 +46,7 @@ void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const*
 } // namespace
 
 int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
-                               RouteHunt const& routes)
+                               RouteHunt const& routes, std::string const& user)
 {
     m_isCalling = true;
     m_isInCall = true;
@@ -53,6 +54,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     {
         m_caller = caller;
         m_routes = routes;
+        m_user = user;
         return takeInvite(transaction, request);
     }
     catch (std::bad_alloc const&)
@@ -185,6 +187,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
         ADD(offer, CC_PropertyBoolean(SipPropertyId::SECURED, true));
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
+    if (m_routes.isEmergency())
+        ADD(call, CC_PropertyBoolean(EmergencyCall::PROPERTY, true));
     if (isTraced())
         trace("did  dial " + provider + " (" + called.getUser() + ") as " + caller.party.getText() +
               ", State=CONNECTED, " + TEXT_OF(own));
@@ -474,7 +478,8 @@ void SipEndpoint::answerWith(std::string const& session)
     m_timer.stop();
     answerFromPeer(SIP_200_OK, session);
     advance(SipDialogState::ANSWER_OUT);
-    if (unsigned int const longest = m_interface.getConfiguration().longestCall; longest != 0)
+    if (unsigned int const longest = m_interface.getConfiguration().longestCall;
+        longest != 0 && !m_routes.isEmergency())
         m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().host.counters.answered;
