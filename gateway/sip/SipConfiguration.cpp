@@ -321,6 +321,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "probe-down",
                    "failover-after",
                    "trusted",
+                   "redirections",
                    "headers",
                    "user",
                    "passwords",
@@ -402,6 +403,10 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL
                         : charges == "take" ? SipConfiguration::Charges::TAKE
                                             : SipConfiguration::Charges::OFF;
+    std::string const redirections = section.oneOf("redirections", "refuse", {"refuse", "follow", "hand-on"});
+    interface.redirections = redirections == "follow"    ? SipConfiguration::Redirections::FOLLOW
+                             : redirections == "hand-on" ? SipConfiguration::Redirections::HAND_ON
+                                                         : SipConfiguration::Redirections::REFUSE;
     if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
         interface.overlap = SipConfiguration::Overlap::INVITE;
     interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);

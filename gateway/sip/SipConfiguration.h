@@ -42,6 +42,14 @@ struct SipConfiguration
         TAKE  ///< the peers tell
     };
 
+    /// What becomes of a call that the peer sends elsewhere, with 300 to 302.
+    enum class Redirections
+    {
+        REFUSE, ///< it fails
+        FOLLOW, ///< we dial, by the routes of the interface
+        HAND_ON ///< the caller is told
+    };
+
     std::string name;
     SocketAddress listen;
     SocketAddress advertise;        ///< what the peers are told instead of `listen`; port 0: nothing
@@ -93,6 +101,7 @@ struct SipConfiguration
     std::string conference; ///< the number of the interface's conference; where media are relayed. Empty: none
     Charges charges = Charges::OFF;
     Overlap overlap = Overlap::OFF;
+    Redirections redirections = Redirections::REFUSE;
     unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
     unsigned int failureTone = 0;   ///< seconds for which a caller hears why his call fails; 0: he does not
     bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media

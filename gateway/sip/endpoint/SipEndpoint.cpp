@@ -172,7 +172,7 @@ void SipEndpoint::onPeerReleased()
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
-    if (tryNextRoute(cause) || tellByTone(cause))
+    if (goElsewhere(cause) || tryNextRoute(cause) || tellByTone(cause))
         return;
     endDialog(cause);
     leaveCall(cause);

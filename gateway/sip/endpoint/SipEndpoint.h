@@ -18,6 +18,7 @@
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
+#include "sip/message/SipRedirection.h"
 #include "sip/message/SipWay.h"
 
 #include <deque>
@@ -263,6 +264,14 @@ private:
     std::string getFinalCharge() const;
     void sendCharge();
 
+    // a call that goes elsewhere: SipEndpoint_Redirection.cpp
+    void tellRedirection(sip_t const* response);
+    bool goElsewhere(SipCause const& cause);
+    void follow(SipRedirection const& redirection, SipCause const& cause);
+    void handOn(SipRedirection const& redirection, SipCause const& cause);
+    void answerMoved(SipRedirection const& redirection, SipCause const& cause);
+    void dialAgain(SipCause const& cause, char const* why);
+
     // headers that cross: SipEndpoint_Carried.cpp
     void addCarried(CC_PropertyContainer& own, sip_t const* message);
     void addUserToUser(CC_PropertyContainer& own, sip_t const* message);
@@ -338,8 +347,9 @@ private:
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     SipIdentity m_caller;                  // calling side
     RouteHunt m_routes;
-    RouteHunt m_targetRoutes; // of a transfer
-    std::string m_user;       // calling side: as whom the interface knows our peer; empty: it asks nobody
+    RouteHunt m_targetRoutes;                   // of a transfer
+    std::vector<SipRedirection> m_redirections; // calling side: that we have followed
+    std::string m_user; // calling side: as whom the interface knows our peer; empty: it asks nobody
     QCause m_dialFailure = QCause::NONE;
     std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;

@@ -440,7 +440,10 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     m_invite.forget();
     if (!isOurs)
+    {
         takeCarried(response);
+        tellRedirection(response);
+    }
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else

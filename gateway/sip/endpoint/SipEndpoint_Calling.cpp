@@ -33,13 +33,15 @@ constexpr unsigned int MOST_FORKS = 32;
 
 /// What the INVITE tells of its side beyond the party that calls.
 void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession,
-                 bool isTrusted)
+                 bool isTrusted, std::vector<SipRedirection> const& redirections)
 {
     if (!second.number.empty())
         second.addAsSecondTo(own);
     SipDiversion diversion = SipDiversion::READ(request);
     if (!isTrusted)
         diversion.screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED; // whatever it says
+    for (SipRedirection const& redirection : redirections)
+        diversion.add(redirection.from, 1, redirection.isWithheld);
     diversion.addTo(own);
     ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, hasSession)); // else a new leg's: none
 }
@@ -176,7 +178,7 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const& caller = m_caller;
     CC_PropertyContainer own;
-    ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
+    ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted, m_redirections);
     addCarried(own, request);
     if (m_hasOffer)
         m_session.addOffer(own, SESSION_OF(request));
@@ -203,23 +205,13 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
                           !isOverlapping(), m_session.getCapability(), datapathContext, &own, &offer, &call);
 }
 
-/// Nobody was reached, and our peer has heard nothing: with a new leg in another call, but the same media, and as if
-/// the INVITE had just come.
+/// Nobody was reached, and our peer has heard nothing.
 bool SipEndpoint::tryNextRoute(SipCause const& cause)
 {
     if (!m_isCalling || m_dialog != SipDialogState::INVITE_RECEIVED || m_hasRung || m_hasEarlyMedia || m_fork != 0 ||
         m_dialFailure != QCause::NONE || !m_routes.goOn(static_cast<unsigned int>(cause.cause)))
         return false;
-    TYPtr<MG_IContext> const media(m_adapter.getDatapathContext());
-    trace("did  drop, State=RELEASED: the next route");
-    spdlog::debug("call {} {} goes on to {} after cause {} ({})", m_callNumber, getName().view(),
-                  m_routes.getProvider(), static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause));
-    m_hadPeer = false;
-    m_carried.clear(); // the leg's
-    m_adapter.drop(cause.cause, 0);
-    SipHeldMessage const request(nta_incoming_getrequest(m_transaction));
-    if (!dial(sip_object(request.get()), media.get()).isOk())
-        clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
+    dialAgain(cause, "the next route");
     return true;
 }
 
