@@ -321,6 +321,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "probe-down",
                    "failover-after",
                    "trusted",
+                   "nat",
                    "redirections",
                    "headers",
                    "user",
@@ -378,6 +379,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_CREDENTIALS(section, interface);
     READ_AUTHENTICATION(section, interface);
     READ_HEADERS(section, interface);
+    interface.isBehindNat = section.flag("nat");
     interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
     READ_REGISTRAR(section, interface);
     READ_REGISTRATION(section, interface);

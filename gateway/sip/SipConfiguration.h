@@ -77,6 +77,7 @@ struct SipConfiguration
     unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
+    bool isBehindNat = false;           ///< its peers: they are where their messages come from
     bool isTrusted = true;              ///< its peers, in the sense of RFC 3325
     std::vector<std::string> headers{}; ///< names of those that cross besides the usual ones
     std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not

@@ -316,6 +316,8 @@ private:
     XCode writeOwn(CC_PropertyContainer const& properties);
     static std::string REASON_OF(sip_t const* message);
     char const* getContact() const; // of the dialog
+    void routeAsServer(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) const;
+    void routeAsClient(nta_leg_t* leg, nta_outgoing_t* transaction, sip_t const* response) const;
     bool isInConference() const;
     static std::string SESSION_OF(sip_t const* message);
     template <class Property>

@@ -500,7 +500,7 @@ void SipEndpoint::confirmDialog(sip_t const* response)
         m_leg = std::exchange(fork->leg, nullptr);
     }
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
-    nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
+    routeAsClient(m_leg, m_invite.transaction, response);
     m_timer.stop();
 }
 
@@ -530,7 +530,7 @@ bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
                                    SIPTAG_CSEQ(response->sip_cseq), TAG_END());
     if (fork.leg == nullptr)
         return false;
-    nta_leg_client_route(fork.leg, response->sip_record_route, response->sip_contact);
+    routeAsClient(fork.leg, m_invite.transaction, response);
     noteAllow(response);
     std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
     trace("-> PRACK");

@@ -164,7 +164,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     if (m_leg == nullptr)
         return false;
     nta_leg_tag(m_leg, nta_incoming_tag(transaction, nullptr));
-    nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
+    routeAsServer(m_leg, transaction, request);
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     advance(SipDialogState::INVITE_IN);
@@ -445,7 +445,7 @@ nta_leg_t* SipEndpoint::makeFork()
     if (leg != nullptr)
     {
         nta_leg_tag(leg, nullptr);
-        nta_leg_server_route(leg, request->sip_record_route, request->sip_contact);
+        routeAsServer(leg, m_transaction, request);
     }
     return leg;
 }

@@ -1,4 +1,5 @@
 // What either side does inside its dialog, and how a dialog ends.
+#include "sip/dialog/SipTarget.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
@@ -161,6 +162,22 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
     }
     return text;
 }
+
+/// Where requests in the dialog go from now on. @{
+void SipEndpoint::routeAsServer(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) const
+{
+    bool const isBehindNat = m_interface.getConfiguration().isBehindNat;
+    SipHeldMessage const message(isBehindNat ? nta_incoming_getrequest(transaction) : nullptr);
+    nta_leg_server_route(leg, request->sip_record_route, SipTarget(request, message.get()).get());
+}
+
+void SipEndpoint::routeAsClient(nta_leg_t* leg, nta_outgoing_t* transaction, sip_t const* response) const
+{
+    bool const isBehindNat = m_interface.getConfiguration().isBehindNat;
+    SipHeldMessage const message(isBehindNat ? nta_outgoing_getresponse(transaction) : nullptr);
+    nta_leg_client_route(leg, response->sip_record_route, SipTarget(response, message.get()).get());
+}
+/// @}
 
 char const* SipEndpoint::getContact() const
 {
