@@ -111,7 +111,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
     , m_page(m_host, m_modules, m_configuration.moduleOf, m_watch)
 {
-    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
+    followDialling(configuration);
     watchCalls();
     m_loop.attach(m_callControlLoop);
     m_loop.attach(m_datapathLoop);
@@ -299,15 +299,24 @@ void Gateway::followInterfaces(Configuration const& before)
             module->change();
 }
 
+/// The context is there.
+void Gateway::followDialling(Configuration const& configuration)
+{
+    DialPlan const& plan = m_host.dialPlan = configuration.dialPlan;
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    std::ignore = CallControl::SET_INTERNATIONAL_PREFIX(m_host.contextName, plan.international.c_str());
+    std::ignore = CallControl::SET_NATIONAL_PREFIX(m_host.contextName, plan.national.c_str());
+}
+
 void Gateway::follow(Configuration configuration)
 {
     configuration.isLogLevelFixed = m_configuration.isLogLevelFixed;
     if (configuration.isLogLevelFixed)
         configuration.logLevel = m_configuration.logLevel;
-    m_host.routing = Routing(configuration.routes);
+    m_host.routing = Routing(configuration.routes, &m_host.routing);
     m_host.admission.setLimits(configuration.maxCalls, configuration.maxCallsPerSecond,
                                configuration.maxCallsPerSource);
-    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    followDialling(configuration);
     SET_LOG_LEVELS(configuration.logLevel, configuration.callControlLogLevel);
     m_configuration = std::move(configuration);
 }

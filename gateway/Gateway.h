@@ -81,6 +81,7 @@ private:
     void prepareInterfaces(Configuration const& configuration);
     void followInterfaces(Configuration const& before);
     void follow(Configuration configuration);
+    void followDialling(Configuration const& configuration);
     std::string getState() const;
 
     // --- ControlledGateway

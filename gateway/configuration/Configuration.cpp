@@ -22,7 +22,8 @@ constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 void READ_GATEWAY(ConfigurationSection const& section, Configuration& configuration)
 {
     section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-hops", "max-calls",
-                   "max-calls-per-second", "max-calls-per-source", "clear-after", "recording", "recording-size"});
+                   "max-calls-per-second", "max-calls-per-source", "clear-after", "recording", "recording-size",
+                   "international-prefix", "national-prefix", "country-code"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
     configuration.logFile = section.text("log-file", {});
@@ -34,6 +35,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
     configuration.maxCallsPerSource =
         section.number("max-calls-per-source", configuration.maxCallsPerSource, 0, UNLIMITED);
     configuration.clearAfter = section.number("clear-after", configuration.clearAfter, 0, 86400);
+    configuration.dialPlan = DialPlan::READ(section);
     configuration.recording = section.text("recording", {});
     configuration.recordingSize = section.number("recording-size", configuration.recordingSize, 0, MOST_RECORDED);
     if (configuration.recordingSize != 0 && configuration.recordingSize < LEAST_RECORDED)

@@ -265,3 +265,20 @@ TEST(Configuration, AFileThatCannotBeReadIsNamed)
         EXPECT_STREQ(error.what(), "/nonexistent/file.toml: file: cannot be read");
     }
 }
+
+TEST(Configuration, ARouteHasLimitsAUserOrIsForEmergencies)
+{
+    std::string const interfaces = "[[sip]]\nname = \"a\"\n[[route]]\nfrom = \"a\"\nto = \"a\"\nnumber = \"112\"\n";
+    Route const limited =
+        Configuration::PARSE(interfaces + "max-calls = 3\nmax-calls-per-second = 2\nuser = \"alice\"\n", "f")
+            .routes.at(0);
+    EXPECT_EQ(limited.maxCalls, 3u);
+    EXPECT_EQ(limited.maxCallsPerSecond, 2u);
+    EXPECT_EQ(limited.user, "alice");
+    EXPECT_FALSE(limited.isEmergency);
+    EXPECT_TRUE(Configuration::PARSE(interfaces + "emergency = true\n", "f").routes.at(0).isEmergency);
+    EXPECT_THROW(Configuration::PARSE(interfaces + "emergency = true\nmax-calls = 1\n", "f"), ConfigurationError);
+    EXPECT_THROW(
+        Configuration::PARSE("[[sip]]\nname = \"a\"\n[[route]]\nfrom = \"a\"\nto = \"a\"\nemergency = true\n", "f"),
+        ConfigurationError);
+}

@@ -98,8 +98,8 @@ std::string CallJson::LINE_OF(CallRecord const& record, Context const& context, 
     std::string legs;
     for (CallRecord::Leg const& leg : record.legs)
         legs += (legs.empty() ? "" : ",") + LEG(leg, context.isWhole);
-    return CC_JsonLine()
-        .add("version", static_cast<unsigned long long>(VERSION))
+    CC_JsonLine line;
+    line.add("version", static_cast<unsigned long long>(VERSION))
         .add("call", record.serial)
         .add("process", context.process) // up to here the key
         .add("start", TIME(record.start))
@@ -108,9 +108,10 @@ std::string CallJson::LINE_OF(CallRecord const& record, Context const& context, 
         .addJson("endedAfter", isInterrupted ? "null" : SECONDS(record.ended))
         .addJson("interrupted", isInterrupted ? "true" : "false")
         .addJson("clearedBy", record.clearedBy != 0 ? std::to_string(record.clearedBy) : "null")
-        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false")
-        .addJson("legs", "[" + legs + "]")
-        .get();
+        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false");
+    if (record.isEmergency)
+        line.addJson("emergency", "true");
+    return line.addJson("legs", "[" + legs + "]").get();
 }
 
 std::string CallJson::PROCESS_OF(std::int64_t start)

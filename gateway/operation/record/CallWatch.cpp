@@ -3,6 +3,7 @@
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "host/EmergencyCall.h"
 #include "properties/CC_PropertyKeys.h"
 
 #include <chrono>
@@ -200,9 +201,11 @@ void CallWatch::aboutCreateCall(CC_Context&, CC_Call* call)
 void CallWatch::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 {
     CC_CallLeg const& leg = *CC_EvCallCallLegModified::FROM(event).getCallLeg();
+    bool const isEmergency = event.getSource()->getProperties().get(EmergencyCall::PROPERTY) != nullptr;
     note(event.getSource()->getSerial(),
          [&](Call& call)
          {
+             call.record.isEmergency = call.record.isEmergency || isEmergency;
              JOIN(call.record, leg, call.getAge());
              tellChangeOf(call);
          });
