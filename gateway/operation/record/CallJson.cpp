@@ -111,6 +111,8 @@ std::string CallJson::LINE_OF(CallRecord const& record, Context const& context, 
         .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false");
     if (record.isEmergency)
         line.addJson("emergency", "true");
+    if (!record.recording.empty())
+        line.add("recording", record.recording);
     return line.addJson("legs", "[" + legs + "]").get();
 }
 

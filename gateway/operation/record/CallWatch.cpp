@@ -4,6 +4,8 @@
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "host/EmergencyCall.h"
+#include "media/context/CallMedia.h"
+#include "properties/CC_PropertyContextId.h"
 #include "properties/CC_PropertyKeys.h"
 
 #include <chrono>
@@ -132,6 +134,13 @@ void JOIN(CallRecord& record, CC_CallLeg const& leg, double seconds)
     joined.dialled = joined.number;
 }
 
+std::string RECORDING(CC_PropertyContainer const& properties)
+{
+    auto const* const context = dynamic_cast<CC_PropertyContextId const*>(properties.get(CC_PropertyId::CONTEXT));
+    CallMedia const* const media = CallMedia::OF(context != nullptr ? context->getContext() : nullptr);
+    return media != nullptr ? media->getRecording() : std::string();
+}
+
 /// Whether that says something new of the call.
 bool FOLLOW_STATE(CallRecord& record, CallRecord::Leg& known, int state, double seconds)
 {
@@ -201,11 +210,13 @@ void CallWatch::aboutCreateCall(CC_Context&, CC_Call* call)
 void CallWatch::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 {
     CC_CallLeg const& leg = *CC_EvCallCallLegModified::FROM(event).getCallLeg();
-    bool const isEmergency = event.getSource()->getProperties().get(EmergencyCall::PROPERTY) != nullptr;
+    CC_PropertyContainer const& properties = event.getSource()->getProperties();
+    bool const isEmergency = properties.get(EmergencyCall::PROPERTY) != nullptr;
     note(event.getSource()->getSerial(),
          [&](Call& call)
          {
              call.record.isEmergency = call.record.isEmergency || isEmergency;
+             call.record.recording = RECORDING(properties);
              JOIN(call.record, leg, call.getAge());
              tellChangeOf(call);
          });

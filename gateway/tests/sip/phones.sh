@@ -12,6 +12,9 @@ mode = "relay"
 recordings = "$WORK/kept"
 first-port = $((PORT + 8))
 last-port = $((PORT + 15))
+
+[records]
+file = "$WORK/records"
 END
 start_gateway
 start_phone alice "$PORT_CALLER" "$PORT_A" $((PORT + 16))
@@ -34,6 +37,7 @@ for number in 0 1; do
 done
 echo -n 'alice, as she was kept: ' && python3 "$HERE/speech.py" compare "$WORK/alice/said.wav" "$WORK/kept.0.wav" 250 || fail "what was kept of alice"
 echo -n 'bob, as he was kept: ' && python3 "$HERE/speech.py" compare "$WORK/bob/said.wav" "$WORK/kept.1.wav" 250 || fail "what was kept of bob"
+grep -q "\"recording\":\"$(echo "$WORK"/kept/*.wav)\"" "$WORK/records" || fail "the record does not name the file: $(cat "$WORK/records")"
 expect_trace 'State=HELD'
 expect_trace 'Quality-Of-Service=.*PCMU'
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
