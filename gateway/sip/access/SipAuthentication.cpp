@@ -41,7 +41,8 @@ SipAuthentication::SipAuthentication(std::string name, std::string realm, std::v
 {
 }
 
-SipAuthentication::Decision SipAuthentication::check(sip_t const* request, InternetAddress const& source, bool isEmergency)
+SipAuthentication::Decision SipAuthentication::check(sip_t const* request, InternetAddress const& source,
+                                                     bool isEmergency)
 {
     if (!isEmergency && m_bans.isBanned(source))
     {
@@ -53,16 +54,16 @@ SipAuthentication::Decision SipAuthentication::check(sip_t const* request, Inter
     {
     case RIGHT:
         ++m_counters.accepted;
-        return {ACCEPTED, shown.user, {}};
+        return {ACCEPTED, shown.user, {}, true};
     case STALE:
         ++m_counters.stale;
-        return {ASK, {}, makeChallenge(source, true)};
+        return {ASK, {}, makeChallenge(source, true), m_nonces.isOurs(shown.nonce, source)};
     case WRONG:
         onWrong(source);
-        break;
+        return {ASK, {}, makeChallenge(source, false), true};
     case REPLAYED:
         ++m_counters.replayed;
-        break;
+        return {ASK, {}, makeChallenge(source, false), true};
     case NOTHING:
         ++m_counters.asked;
         break;

@@ -35,7 +35,8 @@ public:
     {
         Verdict verdict;
         std::string user;
-        std::string challenge; ///< whole lines
+        std::string challenge;  ///< whole lines
+        bool isReached = false; ///< who sends has got an answer of ours: it knows a nonce that was for it
     };
 
     /// `name` of the interface, for the log.

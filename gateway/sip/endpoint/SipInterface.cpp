@@ -20,6 +20,7 @@
 #include <spdlog/spdlog.h>
 
 #include <algorithm>
+#include <cstring>
 #include <new>
 #include <stdexcept>
 
@@ -38,6 +39,26 @@ InternetAddress SOURCE_OF(nta_incoming_t* transaction)
 {
     SipHeldMessage const message(nta_incoming_getrequest(transaction));
     return AddressRange::ADDRESS_OF(msg_addr(message.get())->su_sa);
+}
+
+template <class Header>
+std::size_t OCTETS_IN(su_home_t* home, Header const* header)
+{
+    constexpr std::size_t LONGEST_NAME = 11; // "Call-ID: " and the line's end
+    char const* const text = sip_header_as_string(home, reinterpret_cast<sip_header_t const*>(header));
+    return LONGEST_NAME + (text != nullptr ? std::strlen(text) : 0);
+}
+
+/// At most, without headers of its own: what it has of the request, and what the stack adds to that.
+std::size_t OCTETS_OF_ANSWER(sip_t const* request)
+{
+    constexpr std::size_t ADDED = 150; // the status, a tag, where it came from, the length of no body
+    SipHome const home(su_home_create());
+    std::size_t octets = ADDED + OCTETS_IN(home.get(), request->sip_from) + OCTETS_IN(home.get(), request->sip_to) +
+                         OCTETS_IN(home.get(), request->sip_call_id) + OCTETS_IN(home.get(), request->sip_cseq);
+    for (sip_via_t const* via = request->sip_via; via != nullptr; via = via->v_next)
+        octets += OCTETS_IN(home.get(), via);
+    return octets;
 }
 
 std::optional<SipCredentials> CREDENTIALS_OF(SipConfiguration const& configuration)
@@ -195,11 +216,13 @@ catch (std::bad_alloc const&)
 bool SipInterface::authenticate(msg_t* message, sip_t const* sip, bool isEmergency)
 try
 {
+    InternetAddress const source = AddressRange::ADDRESS_OF(msg_addr(message)->su_sa);
     if (sip->sip_request->rq_method == sip_method_cancel)
-        return true;
-    SipAuthentication::Decision const decision =
-        m_authentication->check(sip, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa), isEmergency);
-    if (decision.verdict == SipAuthentication::ASK)
+        return mayAnswer(message, sip, source, 0);
+    SipAuthentication::Decision const decision = m_authentication->check(sip, source, isEmergency);
+    if (decision.isReached)
+        m_reflection.noteReached(source);
+    if (decision.verdict == SipAuthentication::ASK && mayAnswer(message, sip, source, decision.challenge.size()))
         nta_msg_treply(m_agent.get(), message, SIP_401_UNAUTHORIZED, SIPTAG_HEADER_STR(decision.challenge.c_str()),
                        TAG_END());
     else if (decision.verdict == SipAuthentication::IGNORE)
@@ -209,6 +232,16 @@ try
 }
 catch (std::bad_alloc const&)
 {
+    nta_msg_discard(m_agent.get(), message);
+    return false;
+}
+
+/// Otherwise it is done with: its source may be made up. Who has a connection has shown that it is not.
+bool SipInterface::mayAnswer(msg_t* message, sip_t const* sip, InternetAddress const& source, std::size_t octetsMore)
+{
+    bool const isDatagram = SipRules::WAY_OF(sip) == SipWay::UDP;
+    if (!isDatagram || m_reflection.admit(source, msg_size(message), OCTETS_OF_ANSWER(sip) + octetsMore))
+        return true;
     nta_msg_discard(m_agent.get(), message);
     return false;
 }

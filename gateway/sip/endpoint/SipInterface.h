@@ -5,6 +5,7 @@
 #include "sip/SipConfiguration.h"
 #include "sip/access/SipAuthentication.h"
 #include "sip/access/SipPeers.h"
+#include "sip/access/SipReflection.h"
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -109,6 +110,7 @@ private:
     void onMessage(msg_t* message, sip_t* sip);
     bool isEmergencyCall(sip_t const* invite) const;
     bool authenticate(msg_t* message, sip_t const* sip, bool isEmergency);
+    bool mayAnswer(msg_t* message, sip_t const* sip, InternetAddress const& source, std::size_t octetsMore);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
@@ -132,6 +134,7 @@ private:
     sip_supported_t* m_supported;
     SipGuard m_guard;
     std::optional<SipAuthentication> m_authentication;
+    SipReflection m_reflection;
     std::unique_ptr<SipTls> m_tls; // null: none
     SipResolver m_resolver;
     SipAgent m_agent;

@@ -1,0 +1,42 @@
+#include "sip/access/SipReflection.h"
+
+#include "platform/base/TYTime.h"
+
+#include <algorithm>
+
+namespace
+{
+long SECONDS_NOW() { return static_cast<long>(TY::Time::NOW(TY::Time::MONOTONIC).seconds); }
+} // namespace
+
+bool SipReflection::admit(InternetAddress const& source, std::size_t octetsOfRequest, std::size_t octetsOfAnswer)
+{
+    long const now = SECONDS_NOW();
+    Record& record = find(source, now);
+    record.received += octetsOfRequest;
+    bool const isAdmitted = now < record.reached || record.sent + octetsOfAnswer <= std::max(CREDIT, record.received);
+    if (isAdmitted)
+        record.sent += octetsOfAnswer;
+    else
+        ++m_heldBack;
+    return isAdmitted;
+}
+
+void SipReflection::noteReached(InternetAddress const& source)
+{
+    long const now = SECONDS_NOW();
+    find(source, now).reached = now + MEMORY;
+}
+
+SipReflection::Record& SipReflection::find(InternetAddress const& source, long now)
+{
+    if (m_records.size() >= m_most && !m_records.contains(source))
+        m_records.erase(std::min_element(m_records.begin(), m_records.end(),
+                                         [](auto const& one, auto const& other)
+                                         { return one.second.last < other.second.last; }));
+    Record& record = m_records[source];
+    if (now - record.last > MEMORY)
+        record = {};
+    record.last = now;
+    return record;
+}
