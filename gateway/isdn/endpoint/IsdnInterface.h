@@ -64,6 +64,7 @@ public:
 private:
     // --- IsdnLinkObserver
     void onLinkChange(bool isUp) override;
+    void onNewLine() override { clearCalls(QCause::DESTINATION_OUT_OF_ORDER); }
     void onLinkEvent(pri_event& event) override;
 
     void onRing(pri_event_ring& ring);

@@ -102,11 +102,14 @@ void IsdnLink::open()
 {
     if (m_isWatched)
         return;
+    bool const isNew = m_stack != nullptr;
     if (!m_line.open() || !makeStack())
     {
         m_reopening.start(m_options.timers.reopening);
         return;
     }
+    if (isNew)
+        m_observer.onNewLine();
     m_watch.watch(m_line.getDescriptor(), [this] { onReadable(); });
     m_isWatched = true;
     onReadable();
@@ -125,7 +128,7 @@ int IsdnLink::READ(pri* stack, void* buffer, int length)
     if (got == 0)
         return 0;
     link->m_hasRead = true;
-    std::memset(octets + got, 0, CHECK_SUM);
+    std::memset(octets + got, 0, room - got + CHECK_SUM); // the stack reads past the end of an element without octets
     return static_cast<int>(got + CHECK_SUM);
 }
 

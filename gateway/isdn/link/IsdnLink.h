@@ -14,6 +14,9 @@ class IsdnLinkObserver
 public:
     /// Layer 2 was established, or is no more: calls that are not up have ended by then, each with an event of its own.
     virtual void onLinkChange(bool isUp) = 0;
+    /// Another line has taken the place of one that was lost: no B channel of before leads anywhere, and who is at the
+    /// far end may know nothing of the calls. The stack may not even have noticed.
+    virtual void onNewLine() {}
     /// What the far side said, or a timer. The event is the stack's and holds until that is asked for anything.
     virtual void onLinkEvent(pri_event& event) = 0;
 

@@ -1,7 +1,9 @@
 #include "media/rtp/ChannelTermination.h"
 
 #include <algorithm>
+#include <fcntl.h>
 #include <sys/socket.h>
+#include <unistd.h>
 
 namespace
 {
@@ -33,6 +35,8 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
     for (unsigned int i = 0; i < MOST_BLOCKS; ++i)
     {
         ssize_t const length = recv(getRtp(), block, TIMESTAMP + BLOCK + 1, MSG_DONTWAIT);
+        if (length == 0)
+            closeChannel();
         if (length <= 0)
             return;
         if (static_cast<std::size_t>(length) != TIMESTAMP + BLOCK)
@@ -42,6 +46,14 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
         takeRtp(std::span(octets).first(RtpHeader::LENGTH + BLOCK), from, batch, now);
         sendRelayed(batch, now);
     }
+}
+
+/// The other end has gone: a socket that leads nowhere takes its place, since a loop would be woken by it for ever.
+void ChannelTermination::closeChannel()
+{
+    Descriptor const nowhere(socket(AF_UNIX, SOCK_SEQPACKET | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
+    if (nowhere.get() >= 0)
+        dup3(nowhere.get(), getRtp(), O_CLOEXEC);
 }
 
 void ChannelTermination::sendDatagram(std::span<unsigned char const> octets, DatagramBatch*)

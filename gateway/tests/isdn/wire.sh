@@ -1,11 +1,15 @@
-# The table wire/wire.table, row by row: what is said on one wire and what is heard on the other, between SIP and lines of
-# which the gateway is the user (b) and the network (c). All rows are calls through one gateway.
+# A table of wire/, row by row: what is said on one wire and what is heard on the other, between SIP and lines of which the
+# gateway is the user (b) and the network (c). All rows are calls through one gateway. wire.table is of what crosses,
+# faults.table of exchanges that do wrong; a test is called as
+#
+#     bash wire.sh GATEWAY PORT EXCHANGE wire|faults
 . "$(dirname "$0")/isdn.bash"
 
 WIRE=$(dirname "$0")/wire
-read -r rows from_sip to_sip < <(python3 "$WIRE/wire.py" write "$WIRE/wire.table" "$WORK") || fail "no table"
+TABLE=$WIRE/$4.table
+read -r rows from_sip to_sip < <(python3 "$WIRE/wire.py" write "$TABLE" "$WORK") || fail "no table"
 write_isdn_configuration '' 'codecs = ["PCMA", "CLEARMODE"]'
-sed -i "/^\[\[route/,\$d; s/^last-port = .*/last-port = $((PORT + 199))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
+sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt309 = 1000\nanswer = 1000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
 cat >>"$WORK/gateway.toml" <<END
 [[isdn]]
 name = "c"
@@ -13,6 +17,8 @@ line = "$LINE.c"
 side = "network"
 [isdn.timers]
 reopening = 50
+answer = 1000
+t302 = 500
 $(for from in a b c; do
     for to in a:44 b:49 c:48; do
         printf '[[route]]\nfrom = "%s"\nprefix = "%s"\nto = "%s"\n' $from ${to#*:} ${to%:*} $from "+${to#*:}" ${to%:*}
@@ -35,7 +41,7 @@ done
 
 sipp_rows() { # SCENARIO PORT CALLS: what SIPp is to be told
     ARGUMENTS=(-sf "$WORK/$1.xml" -i "$HOST" -bind_local -p "$2" -cp $(($2 + 1)) -mp $(($2 + 2)) -nostdin -m "$3" -trace_msg
-        -message_file "$WORK/$1.messages" -message_overwrite true -trace_err -error_file "$WORK/$1.log" -timeout 40s)
+        -message_file "$WORK/$1.messages" -message_overwrite true -trace_err -error_file "$WORK/$1.log" -timeout 40s -timeout_error)
 }
 sipp_rows to_sip "$PORT_CALLER" "$to_sip"
 sipp "${ARGUMENTS[@]}" "$HOST:$PORT_A" >"$WORK/to_sip.out" 2>&1 &
@@ -49,10 +55,16 @@ for ((i = 0; i < 300; i++)); do
     (($(grep -c 'calling side.* released' "$WORK/gateway.err") >= rows)) && break
     sleep 0.1
 done
-python3 "$WIRE/wire.py" judge "$WIRE/wire.table" "$WORK" || fail "rows"
+python3 "$WIRE/wire.py" judge "$TABLE" "$WORK" || fail "rows"
 for wire in b c; do
-    CAPTURE=$WORK/$wire.pcap expect_wellformed
+    [[ $4 == faults ]] || CAPTURE=$WORK/$wire.pcap expect_wellformed
 done
+for ((i = 0; i < 100; i++)); do # the last calls' ends are on their way
+    kill -USR1 $gateway_pid
+    sleep 0.1
+    (($(tail -n 40 "$WORK/gateway.out" | grep -cE 'interface [bc]: link up, 30 channels free') >= 2)) && break
+done
+((i < 100)) || fail "channels are left over: $(grep 'channels free' "$WORK/gateway.out" | tail -n 2)"
 kill -TERM $gateway_pid
 wait $gateway_pid || fail "gateway: exit status $?"
 gateway_pid=0

@@ -12,7 +12,8 @@ constexpr int TYPE_SHIFT = 4;
 constexpr int PRESENTATION_SHIFT = 5;
 constexpr unsigned int HOLD = 50; // milliseconds
 constexpr unsigned int TURN = 10; // the same, until a call that waits for others asks again
-constexpr int DEFLECTION = 4;     // Q.931; the stack says 3
+constexpr int LOW_BITS = 3;
+constexpr int DEFLECTION = 4; // Q.931; the stack says 3
 constexpr std::size_t FIRST_DIGITS = 2;
 constexpr long long TICK = 20; // milliseconds
 
@@ -101,14 +102,36 @@ int Exchange::WRITE(pri* stack, void* buffer, int length)
     auto* const self = static_cast<Exchange*>(pri_get_userdata(stack));
     if (self == nullptr || length <= CHECK_SUM)
         return length;
-    std::span<unsigned char const> const frame(static_cast<unsigned char const*>(buffer),
-                                               static_cast<std::size_t>(length - CHECK_SUM));
+    std::vector<unsigned char> const frame =
+        self->spoil({static_cast<unsigned char const*>(buffer), static_cast<std::size_t>(length - CHECK_SUM)});
     self->m_capture.write(frame, !self->m_plan.isUser);
     if (!self->isHit(self->m_plan.lost))
         self->m_line.send(frame);
     if (self->isHit(self->m_plan.repeated))
         self->m_line.send(frame);
     return length;
+}
+
+/// With the faults of the call that it is about.
+std::vector<unsigned char> Exchange::spoil(std::span<unsigned char const> frame) const
+{
+    std::vector<unsigned char> result(frame.begin(), frame.end());
+    int reference = 0;
+    bool isOfOriginator = false;
+    if (!Fault::READ_REFERENCE(frame, reference, isOfOriginator))
+        return result;
+    for (auto const& [handle, call] : m_calls)
+    {
+        int lowBits = 0; // three of them, as GR-303 has its call references
+        int const highBits = pri_get_crv(m_stack, handle, &lowBits);
+        bool const isIt = (call->own != nullptr) == isOfOriginator && (highBits << LOW_BITS | lowBits) == reference;
+        bool const isOwn = call->own != nullptr;
+        if (!isIt || (!isOwn && call->subscriber == nullptr))
+            continue;
+        for (Fault const& fault : isOwn ? call->own->faults : call->subscriber->faults)
+            result = fault.apply(result);
+    }
+    return result;
 }
 
 void Exchange::after(unsigned int milliseconds, CallHandle const& call,
@@ -264,6 +287,8 @@ void Exchange::answer(CallHandle const& call)
         speak(call, subscriber.speaks, subscriber.file, subscriber.record);
     if (subscriber.holds)
         hold(call);
+    if (subscriber.drops != 0)
+        after(subscriber.drops, call, [this](CallHandle const&) { m_line.close(); });
     if (subscriber.units != 0)
         after(subscriber.interval, call, [this](CallHandle const& one) { charge(one); });
     if (subscriber.releases != 0)

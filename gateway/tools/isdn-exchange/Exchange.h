@@ -17,6 +17,7 @@ extern "C"
 #include <memory>
 #include <random>
 #include <string>
+#include <vector>
 
 /// What became of the calls of an exchange.
 struct Report
@@ -68,6 +69,7 @@ private:
 
     static int READ(pri* stack, void* buffer, int length);
     static int WRITE(pri* stack, void* buffer, int length);
+    std::vector<unsigned char> spoil(std::span<unsigned char const> frame) const;
     bool isHit(unsigned int perCent);
     void after(unsigned int milliseconds, CallHandle const& call, std::function<void(CallHandle const&)> const& work);
     void takeEvent(pri_event& event);

@@ -50,6 +50,37 @@ private:
     std::string m_known;
 };
 
+template <class Read>
+void READ_EACH(toml::table const& toml, char const* key, Read const& read)
+{
+    if (toml::array const* const tables = toml.get_as<toml::array>(key))
+        for (toml::node const& node : *tables)
+            if (toml::table const* const table = node.as_table())
+                read(*table);
+}
+
+std::vector<Fault> READ_FAULTS(std::string const& file, toml::table const& toml)
+{
+    std::vector<Fault> faults;
+    READ_EACH(toml, "faults",
+              [&](toml::table const& one)
+              {
+                  Fault fault;
+                  std::string octets;
+                  Table table(file, one);
+                  table.read("message", fault.message);
+                  table.read("octets", octets);
+                  if (one.contains("element"))
+                      table.read("element", fault.element = 0);
+                  if (one.contains("length"))
+                      table.read("length", fault.length = 0);
+                  table.checkKeys();
+                  fault.octets = Fault::OCTETS_OF(octets);
+                  faults.push_back(fault);
+              });
+    return faults;
+}
+
 Plan::Subscriber READ_SUBSCRIBER(std::string const& file, toml::table const& toml)
 {
     Plan::Subscriber one;
@@ -76,6 +107,8 @@ Plan::Subscriber READ_SUBSCRIBER(std::string const& file, toml::table const& tom
     table.read("units", one.units);
     table.read("interval", one.interval);
     table.read("currency", one.currency);
+    table.read("drops", one.drops);
+    one.faults = READ_FAULTS(file, toml);
     table.checkKeys();
     return one;
 }
@@ -112,17 +145,9 @@ Plan::Call READ_CALL(std::string const& file, toml::table const& toml)
     table.read("speaks", one.speaks);
     table.read("file", one.file);
     table.read("record", one.record);
+    one.faults = READ_FAULTS(file, toml);
     table.checkKeys();
     return one;
-}
-
-template <class Read>
-void READ_EACH(toml::table const& toml, char const* key, Read const& read)
-{
-    if (toml::array const* const tables = toml.get_as<toml::array>(key))
-        for (toml::node const& node : *tables)
-            if (toml::table const* const table = node.as_table())
-                read(*table);
 }
 } // namespace
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Fault.h"
+
 #include <string>
 #include <vector>
 
@@ -31,6 +33,8 @@ struct Plan
         unsigned int units = 0;      ///< charged each interval; 0: nothing is
         unsigned int interval = 100; ///< milliseconds
         std::string currency;        ///< in hundredths of it; empty: units
+        unsigned int drops = 0;      ///< milliseconds from its answer until the line is lost; 0: it is not
+        std::vector<Fault> faults;   ///< of the exchange's messages
     };
     /// Calls of its own.
     struct Call
@@ -63,6 +67,7 @@ struct Plan
         std::string speaks = "silence";
         std::string file;
         std::string record;
+        std::vector<Fault> faults;
     };
 
     std::string line;            ///< the path where lines come in

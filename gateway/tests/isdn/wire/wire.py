@@ -1,18 +1,18 @@
 #!/usr/bin/env python3
 """What is said on one wire and what is heard on the other: the table beside this file, row by row.
 
-    wire.py write TABLE FOLDER      SIPp's scenarios, the plans of the exchanges, the number of calls
+    wire.py write TABLE FOLDER      SIPp's scenarios, the plans of the exchanges, how many calls
     wire.py judge TABLE FOLDER      by what SIPp has logged, and what tshark finds in the exchanges' packets
 
 Every row is a call of its own, by a number that ends with that of the row. On wire S is SIPp, on B an exchange, the
-gateway being its user, on C one that is the gateway's user.
+gateway being its user, on C one that is the gateway's user; what is for - is refused before anybody is called.
 """
 import re
 import subprocess
 import sys
 import xml.etree.ElementTree as ElementTree
 
-PREFIXES = {"S": "44", "B": "49", "C": "48"}
+PREFIXES = {"S": "44", "B": "49", "C": "48", "-": "44"}
 FIRST = 1001
 AT_ONCE = 8  # calls of an exchange, so that the channels suffice
 MESSAGES = {  # Q.931, table 4-2
@@ -160,10 +160,10 @@ def write(rows, folder):
                 plan += ["[[number]]"] + [line for line in usual if not row.has(keys, line.split()[0] + " ")] + keys
             if row.caller == wire:
                 keys = row.keys(wire)
-                usual = (f'to = "{row.called()}"', 'from = "30123"', "length = 100")
+                usual = (f'to = "{row.called()}"', f'from = "30{row.number}"', "length = 100")
                 plan += ["[[call]]"] + [line for line in usual if not row.has(keys, line.split()[0] + " ")] + keys
         open(f"{folder}/plan_{wire.lower()}.toml", "w").write("\n".join(plan) + "\n")
-    print(len(rows), len(from_sip), len(to_sip))
+    print(sum(row.callee != "-" for row in rows), len(from_sip), len(to_sip))
 
 
 # --- what was heard -------------------------------------------------------------------------------------------------
@@ -203,7 +203,7 @@ def field_of(packet, name):
     return found.get("show") if found is not None else None
 
 
-def heard_by_exchange(file, wire):
+def heard_by_exchange(file, wire, known):
     """By row, each message that the gateway sent: its name and its elements, as tshark reads them."""
     xml = subprocess.run(["tshark", "-r", file, "-Y", "q931", "-T", "pdml"], capture_output=True, check=True).stdout
     row_of, heard = {}, {}
@@ -214,7 +214,10 @@ def heard_by_exchange(file, wire):
         call = (field_of(body, "q931.call_ref"), is_network == is_caller)
         message = MESSAGES.get(int(field_of(body, "q931.message_type"), 16))
         if message == "SETUP":
-            row_of[call] = int(field_of(body, "q931.called_party_number.digits")[-4:])
+            for number in ("q931.called_party_number.digits", "q931.calling_party_number.digits"):
+                digits = re.search(r"\d{4}$", field_of(body, number) or "")
+                if digits and int(digits[0]) in known:
+                    row_of.setdefault(call, int(digits[0]))
         if is_network == (wire == "C"):
             heard.setdefault(row_of.get(call), []).append((message, packet))
     return heard
@@ -272,7 +275,8 @@ def tell(messages):
 
 
 def judge(rows, folder):
-    heard = {"B": heard_by_exchange(f"{folder}/b.pcap", "B"), "C": heard_by_exchange(f"{folder}/c.pcap", "C"), "S": {}}
+    known = {row.number for row in rows}
+    heard = {wire: heard_by_exchange(f"{folder}/{wire.lower()}.pcap", wire, known) for wire in "BC"} | {"S": {}}
     for file in ("from_sip", "to_sip"):
         heard["S"].update(heard_by_sip(f"{folder}/{file}.messages", rows))
     failures = 0
