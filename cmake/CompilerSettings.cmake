@@ -10,9 +10,8 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
     # sources that are compiled together are taken for headers, whose classes should not be in anonymous namespaces
     target_compile_options(callcontrol_settings INTERFACE -Wno-subobject-linkage)
 endif()
-if(CMAKE_UNITY_BUILD) # and one's names lie behind the other's
-    target_compile_options(callcontrol_settings INTERFACE -Wno-shadow)
-endif()
+# and one's names lie behind the other's
+target_compile_options(callcontrol_settings INTERFACE $<$<BOOL:$<TARGET_PROPERTY:UNITY_BUILD>>:-Wno-shadow>)
 if(CALLCONTROL_SANITIZE)
     target_compile_options(callcontrol_settings INTERFACE
         -fsanitize=${CALLCONTROL_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)

@@ -45,14 +45,14 @@ String CONTEXT_NAME(Configuration const& configuration)
     return configuration.context.empty() ? CallControl::DEFAULT_CONTEXT_NAME : configuration.context.c_str();
 }
 
-std::unique_ptr<RecordWriter> OPEN_RECORDS(Configuration const& configuration)
+std::unique_ptr<CallRecords> OPEN_RECORDS(Configuration const& configuration)
 try
 {
-    return configuration.records.file.empty() ? nullptr : std::make_unique<RecordWriter>(configuration.records);
+    return configuration.records.isOn() ? std::make_unique<CallRecords>(configuration.records) : nullptr;
 }
-catch (std::runtime_error const& error)
+catch (CallRecords::Failure const& error)
 {
-    throw ConfigurationError(configuration.file, "records.file", error.what());
+    throw ConfigurationError(configuration.file, "records." + error.key, error.what());
 }
 } // namespace
 
@@ -71,6 +71,7 @@ void Gateway::BLOCK_SIGNALS()
     sigset_t const signals = HANDLED_SIGNALS();
     sigprocmask(SIG_BLOCK, &signals, nullptr);
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN); // a limit of files' sizes is a disk that is full
 }
 
 unsigned int Gateway::GET_NUMBER_OF_LEFT_OVERS()
@@ -110,7 +111,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
     , m_page(m_host, m_modules, m_configuration.moduleOf, m_watch)
 {
-    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops); // the context is there
+    followDialling(configuration);
     watchCalls();
     m_loop.attach(m_callControlLoop);
     m_loop.attach(m_datapathLoop);
@@ -119,15 +120,26 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
         module->open(m_host);
     openControl();
     openMetrics();
-    if (m_media != nullptr)
-        m_media->start();
+    startMedia();
+}
+
+void Gateway::startMedia()
+{
+    if (m_media == nullptr)
+        return;
+    m_media->setRecordingFailure([](std::string const& path, std::string const& reason)
+                                 { spdlog::error("the recording {}: {}", path, reason); });
+    m_media->start();
 }
 
 void Gateway::watchCalls()
 {
     m_watch.tell([](CallRecord const& record) { spdlog::info("{}", CallLine::TEXT_OF(record)); });
     if (m_records != nullptr)
+    {
+        m_watch.tellChange([this](CallRecord const& record) { m_records->note(record); });
         m_watch.tell([this](CallRecord const& record) { m_records->write(record); });
+    }
     m_watch.tell([this](CallRecord const& record) { m_tracer.onCallOver(record); });
     if (m_records != nullptr && m_configuration.records.refusesUnrecorded)
         m_host.mustRefuse = [this] { return !m_records->hasRoom(); };
@@ -168,6 +180,12 @@ void Gateway::openMetrics()
     {
         throw ConfigurationError(m_configuration.file, "metrics.listen", error.what());
     }
+}
+
+/// The module whose loop it is ends last: what the others have there they take back.
+Gateway::~Gateway()
+{
+    std::erase_if(m_modules, [](auto const& one) { return one.second->getLoop() == nullptr; });
 }
 
 SignallingLoop& Gateway::findLoop(Modules const& modules)
@@ -233,7 +251,10 @@ std::string Gateway::reload()
         Configuration configuration = Configuration::READ(m_configuration.file);
         if (std::string const key = ConfigurationChange::FIND_RESTART(m_configuration, configuration); !key.empty())
             throw ConfigurationError(configuration.file, key, "a change of it needs a restart");
+        prepareInterfaces(configuration);
+        Configuration const before = m_configuration;
         follow(std::move(configuration));
+        followInterfaces(before);
         for (auto const& readAgain : m_host.onReload)
             readAgain();
         spdlog::info("the configuration is read again: {} routes", m_configuration.routes.size());
@@ -246,15 +267,56 @@ std::string Gateway::reload()
     }
 }
 
+void Gateway::prepareInterfaces(Configuration const& configuration)
+try
+{
+    for (std::string const& name : configuration.interfaces)
+        if (m_host.leaving.contains(name))
+            throw ConfigurationError(configuration.file, "interfaces",
+                                     "'" + name + "' was removed and has calls that are not over");
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, m_configuration, configuration) &&
+            !module->prepareChange(configuration, configuration.modules.at(name)))
+            throw ConfigurationError(configuration.file, name, "a change of it needs a restart");
+}
+catch (std::exception const&)
+{
+    for (auto const& [name, module] : m_modules)
+        module->dropChange();
+    throw;
+}
+
+void Gateway::followInterfaces(Configuration const& before)
+{
+    for (std::string const& name : before.interfaces)
+        if (!m_configuration.interfaces.contains(name))
+        {
+            m_host.leaving.insert(name);
+            m_host.blocked.erase(name); // whoever comes under that name one day is another
+        }
+    for (auto const& [name, module] : m_modules)
+        if (ConfigurationChange::IS_OF_MODULE(name, before, m_configuration))
+            module->change();
+}
+
+/// The context is there.
+void Gateway::followDialling(Configuration const& configuration)
+{
+    DialPlan const& plan = m_host.dialPlan = configuration.dialPlan;
+    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    std::ignore = CallControl::SET_INTERNATIONAL_PREFIX(m_host.contextName, plan.international.c_str());
+    std::ignore = CallControl::SET_NATIONAL_PREFIX(m_host.contextName, plan.national.c_str());
+}
+
 void Gateway::follow(Configuration configuration)
 {
     configuration.isLogLevelFixed = m_configuration.isLogLevelFixed;
     if (configuration.isLogLevelFixed)
         configuration.logLevel = m_configuration.logLevel;
-    m_host.routing = Routing(configuration.routes);
+    m_host.routing = Routing(configuration.routes, &m_host.routing);
     m_host.admission.setLimits(configuration.maxCalls, configuration.maxCallsPerSecond,
                                configuration.maxCallsPerSource);
-    std::ignore = CallControl::SET_MAX_HOPS(m_host.contextName, configuration.maxHops);
+    followDialling(configuration);
     SET_LOG_LEVELS(configuration.logLevel, configuration.callControlLogLevel);
     m_configuration = std::move(configuration);
 }

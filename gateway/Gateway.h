@@ -16,7 +16,7 @@
 #include "operation/metric/HttpServer.h"
 #include "operation/page/StatusPage.h"
 #include "operation/record/CallWatch.h"
-#include "operation/record/RecordWriter.h"
+#include "operation/record/CallRecords.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -38,6 +38,7 @@ public:
     /// Opens all interfaces. `tracedCalls`: how many calls get a ladder on the standard output. Throws
     /// ConfigurationError for an interface that cannot be opened.
     Gateway(Configuration const& configuration, Modules modules, unsigned int tracedCalls);
+    ~Gateway();
     Gateway(Gateway const&) = delete;
     Gateway& operator=(Gateway const&) = delete;
 
@@ -75,8 +76,12 @@ private:
     void onHangUp();
     void openControl();
     void openMetrics();
+    void startMedia();
     void watchCalls();
+    void prepareInterfaces(Configuration const& configuration);
+    void followInterfaces(Configuration const& before);
     void follow(Configuration configuration);
+    void followDialling(Configuration const& configuration);
     std::string getState() const;
 
     // --- ControlledGateway
@@ -92,7 +97,7 @@ private:
     Signals m_signals;
     Recording m_recording;
     StateDump m_dump;
-    std::unique_ptr<RecordWriter> m_records; // null where it is not configured
+    std::unique_ptr<CallRecords> m_records; // null where it is not configured
     CallMetrics m_callMetrics;
     CallTracer m_tracer;
     CallWatch m_watch; // calls may last until call control ends

@@ -32,6 +32,7 @@ struct Arguments
     std::string routed; // the number of a dry run
     std::string from;
     std::string calling;
+    std::string user;
     std::string modules = ModuleLoader::GET_INSTALLED_FOLDER();
 };
 
@@ -49,6 +50,7 @@ void DECLARE(CLI::App& app, Arguments& arguments)
     auto* const route = app.add_option("--route", arguments.routed, "Only tell where a call to this number leaves");
     app.add_option("--from", arguments.from, "The interface on which that call comes in")->needs(route);
     app.add_option("--calling", arguments.calling, "The number of its caller")->needs(route);
+    app.add_option("--user", arguments.user, "As whom the interface knows its caller")->needs(route);
     app.add_option("--modules", arguments.modules, "The folder of the signalling modules");
     app.add_option("--log-level", arguments.logLevel, "Instead of the configuration's log-level")
         ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
@@ -74,13 +76,19 @@ int TELL_ROUTE(Configuration const& configuration, Arguments const& arguments)
 {
     if (!configuration.interfaces.contains(arguments.from))
         return COMPLAIN(("there is no interface '" + arguments.from + "'").c_str());
-    Routing::Question question{arguments.from, arguments.routed, arguments.calling};
-    question.minuteOfWeek = WeekHours::MINUTE_OF(std::time(nullptr));
     Routing const routing(configuration.routes);
+    bool const isWhole = routing.isEmergency(arguments.from, arguments.routed);
+    std::string const number = isWhole ? arguments.routed : configuration.dialPlan.normalise(arguments.routed);
+    std::string const calling = configuration.dialPlan.normalise(arguments.calling);
+    if (number != arguments.routed)
+        std::printf("%s is %s\n", arguments.routed.c_str(), number.c_str());
+    Routing::Question question{arguments.from, number, calling};
+    question.minuteOfWeek = WeekHours::MINUTE_OF(std::time(nullptr));
+    question.user = arguments.user;
     for (std::string const& line : routing.explain(question))
         std::puts(line.c_str());
     if (routing.find(question).empty())
-        std::printf("%s from %s: no route, 404 with cause 3\n", arguments.routed.c_str(), arguments.from.c_str());
+        std::printf("%s from %s: no route, 404 with cause 3\n", number.c_str(), arguments.from.c_str());
     return ALL_RIGHT;
 }
 

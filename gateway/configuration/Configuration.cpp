@@ -4,9 +4,14 @@
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <charconv>
+#include <cstring>
 #include <fstream>
+#include <libpq-fe.h>
 #include <limits>
+#include <memory>
+#include <unistd.h>
 
 namespace
 {
@@ -17,7 +22,8 @@ constexpr unsigned int UNLIMITED = std::numeric_limits<int>::max();
 void READ_GATEWAY(ConfigurationSection const& section, Configuration& configuration)
 {
     section.allow({"context", "log-level", "log-file", "call-control-log-level", "max-hops", "max-calls",
-                   "max-calls-per-second", "max-calls-per-source", "clear-after", "recording", "recording-size"});
+                   "max-calls-per-second", "max-calls-per-source", "clear-after", "recording", "recording-size",
+                   "international-prefix", "national-prefix", "country-code"});
     configuration.context = section.text("context", {});
     configuration.logLevel = section.oneOf("log-level", "info", {"trace", "debug", "info", "warning", "error", "off"});
     configuration.logFile = section.text("log-file", {});
@@ -29,6 +35,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
     configuration.maxCallsPerSource =
         section.number("max-calls-per-source", configuration.maxCallsPerSource, 0, UNLIMITED);
     configuration.clearAfter = section.number("clear-after", configuration.clearAfter, 0, 86400);
+    configuration.dialPlan = DialPlan::READ(section);
     configuration.recording = section.text("recording", {});
     configuration.recordingSize = section.number("recording-size", configuration.recordingSize, 0, MOST_RECORDED);
     if (configuration.recordingSize != 0 && configuration.recordingSize < LEAST_RECORDED)
@@ -37,7 +44,7 @@ void READ_GATEWAY(ConfigurationSection const& section, Configuration& configurat
 
 void READ_MEDIA(ConfigurationSection const& section, Configuration& configuration)
 {
-    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country"});
+    section.allow({"mode", "first-port", "last-port", "threads", "silence", "dscp", "country", "recordings"});
     MediaOptions& media = configuration.media;
     configuration.relaysMedia = section.oneOf("mode", "direct", {"direct", "relay"}) == "relay";
     media.firstPort = static_cast<unsigned short>(section.number("first-port", media.firstPort, 1024, 65534));
@@ -48,6 +55,11 @@ void READ_MEDIA(ConfigurationSection const& section, Configuration& configuratio
     media.silence = section.number("silence", 0, 0, 86400);
     media.differentiation = section.number("dscp", media.differentiation, 0, 63);
     media.country = section.text("country", media.country);
+    media.recordings = section.text("recordings", {});
+    if (!media.recordings.empty() && access(media.recordings.c_str(), W_OK | X_OK) != 0)
+        section.refuse("recordings", std::string("not a folder to write into: ") + std::strerror(errno));
+    if (!media.recordings.empty() && !configuration.relaysMedia)
+        section.refuse("recordings", "what is said can be kept in mode \"relay\" alone");
     std::string reason;
     if (!ToneTable().read(ToneTable::BUILT_IN(), media.country, reason))
         section.refuse("country", reason);
@@ -78,15 +90,31 @@ void READ_CONTROL(ConfigurationSection const& section, ControlOptions& control)
         section.refuse("socket", "is missing");
 }
 
+/// What is wrong with it is not told, since a piece of a password may be.
+std::string READ_CONNECTION(ConfigurationSection const& section, char const* key)
+{
+    std::string text = section.text(key, {});
+    std::unique_ptr<PQconninfoOption, decltype(&PQconninfoFree)> const parsed(PQconninfoParse(text.c_str(), nullptr),
+                                                                              &PQconninfoFree);
+    if (parsed == nullptr)
+        section.refuse(key, "is no connection string");
+    return text;
+}
+
 void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
 {
-    section.allow({"file", "numbers", "kept", "when-full"});
+    section.allow({"file", "sqlite", "postgresql", "spool", "numbers", "kept", "when-full"});
     records.file = section.text("file", {});
+    records.sqlite = section.text("sqlite", {});
+    records.postgresql = READ_CONNECTION(section, "postgresql");
+    records.spool = section.text("spool", {});
     records.isWhole = section.oneOf("numbers", "withheld", {"withheld", "whole"}) == "whole";
     records.kept = section.number("kept", records.kept, 1, 1000000);
     records.refusesUnrecorded = section.oneOf("when-full", "lose", {"lose", "refuse"}) == "refuse";
-    if (records.file.empty() && !section.getKeys().empty())
+    if (!records.isOn() && !section.getKeys().empty())
         section.refuse("file", "is missing");
+    if (records.spool.empty() && !(records.sqlite.empty() && records.postgresql.empty()))
+        section.refuse("spool", "is missing: a database may not be there");
 }
 
 /// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.

@@ -2,6 +2,7 @@
 
 #include "configuration/ConfigurationSection.h"
 #include "configuration/ControlOptions.h"
+#include "configuration/DialPlan.h"
 #include "configuration/MetricOptions.h"
 #include "configuration/RecordOptions.h"
 #include "configuration/Route.h"
@@ -42,6 +43,7 @@ struct Configuration
     MetricOptions metrics;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
+    DialPlan dialPlan;
     std::set<std::string> interfaces;            ///< the names of all
     std::map<std::string, std::string> moduleOf; ///< by an interface's name, that of its module
     /// By the module's name, its interfaces. Each has a `name` that no other interface has.

@@ -13,12 +13,11 @@ bool ARE_SAME(std::vector<ConfigurationSection> const& before, std::vector<Confi
                       { return one.hasSameValues(other); });
 }
 
-/// The first module of `before` that is another in `after`, or is not there; empty: none.
-std::string FIND_MODULE(Configuration const& before, Configuration const& after)
+/// The first module of `before` that is not in `after`; empty: none.
+std::string FIND_MISSING(Configuration const& before, Configuration const& after)
 {
     for (auto const& [name, interfaces] : before.modules)
-        if (auto const found = after.modules.find(name);
-            found == after.modules.end() || !ARE_SAME(interfaces, found->second))
+        if (!after.modules.contains(name))
             return name;
     return {};
 }
@@ -42,6 +41,12 @@ std::string ConfigurationChange::FIND_RESTART(Configuration const& before, Confi
         return "records";
     if (before.metrics != after.metrics)
         return "metrics";
-    std::string const changed = FIND_MODULE(before, after);
-    return changed.empty() ? FIND_MODULE(after, before) : changed;
+    std::string const gone = FIND_MISSING(before, after);
+    return gone.empty() ? FIND_MISSING(after, before) : gone;
+}
+
+bool ConfigurationChange::IS_OF_MODULE(std::string const& module, Configuration const& before,
+                                       Configuration const& after)
+{
+    return !ARE_SAME(before.modules.at(module), after.modules.at(module));
 }

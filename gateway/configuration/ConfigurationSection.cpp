@@ -16,6 +16,15 @@ std::string ONE_LINE(std::string text)
 }
 
 toml::table const NO_KEYS;
+
+/// Of the table's keys that one, if it is there.
+toml::table ONLY(toml::table const& table, std::string const& key)
+{
+    toml::table only;
+    if (toml::node const* const node = table.get(key))
+        only.insert(key, *node);
+    return only;
+}
 } // namespace
 
 /// One table of the tree that it keeps alive.
@@ -66,6 +75,17 @@ bool ConfigurationSection::has(char const* key) const { return m_table->keys.con
 bool ConfigurationSection::hasSameValues(ConfigurationSection const& other) const
 {
     return m_table->keys == other.m_table->keys;
+}
+
+std::string ConfigurationSection::findChange(ConfigurationSection const& other,
+                                             std::span<std::string_view const> but) const
+{
+    for (ConfigurationSection const* const one : {this, &other})
+        for (std::string const& key : one->getKeys())
+            if (std::find(but.begin(), but.end(), key) == but.end() &&
+                ONLY(m_table->keys, key) != ONLY(other.m_table->keys, key))
+                return key;
+    return {};
 }
 
 std::vector<std::string> ConfigurationSection::getKeys() const

@@ -5,6 +5,7 @@
 
 #include <initializer_list>
 #include <memory>
+#include <span>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -38,6 +39,8 @@ public:
     bool has(char const* key) const;
     /// Whether the two have the same keys with the same values.
     bool hasSameValues(ConfigurationSection const& other) const;
+    /// The first key, but those, that only one of the two has, or with another value; empty: there is none.
+    std::string findChange(ConfigurationSection const& other, std::span<std::string_view const> but) const;
     std::vector<std::string> getKeys() const;
 
     std::string text(char const* key, std::string const& fallback) const;

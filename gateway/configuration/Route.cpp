@@ -1,12 +1,14 @@
 #include "configuration/Route.h"
 
 #include <algorithm>
+#include <limits>
 #include <stdexcept>
 #include <string_view>
 
 namespace
 {
 constexpr unsigned int HIGHEST_CAUSE = 127; // Q.850
+constexpr unsigned int HIGHEST_LIMIT = std::numeric_limits<int>::max();
 
 std::string READ_INTERFACE(ConfigurationSection const& section, char const* key,
                            std::set<std::string> const& interfaces)
@@ -15,6 +17,20 @@ std::string READ_INTERFACE(ConfigurationSection const& section, char const* key,
     if (!interfaces.contains(name))
         section.refuse(key, "there is no interface '" + name + "'");
     return name;
+}
+
+/// An emergency number is everybody's.
+void READ_LIMITS(ConfigurationSection const& section, Route& route)
+{
+    route.maxCalls = section.number("max-calls", 0, 0, HIGHEST_LIMIT);
+    route.maxCallsPerSecond = section.number("max-calls-per-second", 0, 0, HIGHEST_LIMIT);
+    route.isEmergency = section.flag("emergency");
+    if (!route.isEmergency)
+        return;
+    if (route.prefix.empty())
+        section.refuse("emergency", "for which number? number or prefix is needed");
+    if (route.isLimited())
+        section.refuse("emergency", "and a limit of calls exclude each other");
 }
 
 WeekHours READ_HOURS(ConfigurationSection const& section)
@@ -32,8 +48,8 @@ WeekHours READ_HOURS(ConfigurationSection const& section)
 
 Route Route::READ(ConfigurationSection const& section, std::set<std::string> const& interfaces)
 {
-    section.allow(
-        {"from", "prefix", "number", "calling", "days", "hours", "weight", "to", "strip", "prepend", "next-on"});
+    section.allow({"from", "prefix", "number", "calling", "days", "hours", "weight", "to", "strip", "prepend",
+                   "next-on", "user", "max-calls", "max-calls-per-second", "emergency"});
     Route route{READ_INTERFACE(section, "from", interfaces), section.text("prefix", {}),
                 READ_INTERFACE(section, "to", interfaces)};
     if (section.has("number"))
@@ -49,6 +65,8 @@ Route Route::READ(ConfigurationSection const& section, std::set<std::string> con
     route.strip = section.number("strip", 0, 0, static_cast<unsigned int>(route.prefix.size()));
     route.prepend = section.text("prepend", {});
     route.nextOn = section.numbers("next-on", 1, HIGHEST_CAUSE);
+    route.user = section.text("user", {});
+    READ_LIMITS(section, route);
     return route;
 }
 

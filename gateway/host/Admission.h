@@ -1,14 +1,14 @@
 #pragma once
 
 #include "configuration/AddressRange.h"
-#include "platform/base/TYTime.h"
+#include "host/CallRate.h"
 
 #include <map>
 
 /// Decides whether one more call may begin: by how many are up, how many of one source are, and how many began of late.
 /// Transactions outlive their calls by half a minute, so a rate without a limit costs memory without a limit.
 ///
-/// The rate is a bucket that holds one second's worth of calls and fills up evenly. One thread.
+/// One thread.
 ///
 ///     if (!admission.admit(CallControl::GET_NUMBER_OF_CALLS(), source))
 ///         ... // 503
@@ -18,10 +18,7 @@ class Admission
 public:
     /// 0: no limit.
     Admission(unsigned int maxCalls, unsigned int maxCallsPerSecond, unsigned int maxCallsPerSource = 0)
-        : m_maxCalls(maxCalls)
-        , m_perSecond(maxCallsPerSecond)
-        , m_perSource(maxCallsPerSource)
-        , m_tokens(maxCallsPerSecond)
+        : m_maxCalls(maxCalls), m_perSource(maxCallsPerSource), m_rate(maxCallsPerSecond)
     {
     }
 
@@ -37,13 +34,8 @@ public:
     void end(InternetAddress const& source);
 
 private:
-    void refill();
-
     unsigned int m_maxCalls;
-    unsigned int m_perSecond;
     unsigned int m_perSource;
-    double m_tokens;
-    TY::Time m_lastRefill;
-    bool m_hasStarted = false;
+    CallRate m_rate;
     std::map<InternetAddress, unsigned int> m_calls; // by source, those with one at least
 };

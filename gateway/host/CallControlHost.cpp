@@ -1,11 +1,14 @@
 #include "host/CallControlHost.h"
 
 #include "callcontrol/CallControl.h"
+#include "host/EmergencyCall.h"
 #include "host/MediaContexts.h"
 #include "media/context/MediaLayer.h"
 #include "platform/driver/DRIVER.h"
+#include "properties/CC_PropertyTable.h"
 
 #include <stdexcept>
+#include <tuple>
 
 CallControlHost::CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath, String const& contextName,
                                  MediaLayer* media)
@@ -19,6 +22,8 @@ CallControlHost::CallControlHost(TYEventLoop& callControl, TYEventLoop& datapath
     if (!DRIVER::INSTANCE().addDriverInterface(m_rebootLock.get(), TY::UUID::INVALID(), "reboot").isOk() ||
         !CallControl::ADD_PROPERTY_FACTORY(&m_factory).isOk() || !CallControl::CREATE_CONTEXT(contextName).isOk())
         throw std::runtime_error("call control cannot be set up");
+    if (CC_PropertyTable::FIND(EmergencyCall::PROPERTY) == nullptr) // for logs alone
+        std::ignore = CC_PropertyTable::DECLARE(EmergencyCall::PROPERTY, "Emergency", "emergency");
 }
 
 CallControlHost::~CallControlHost()

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "configuration/DialPlan.h"
 #include "host/Admission.h"
 #include "host/CallTrace.h"
 #include "host/Counters.h"
@@ -37,19 +38,40 @@ struct GatewayHost
     std::set<std::string> blocked{};               ///< interfaces that an operator has taken out of service
     std::vector<std::function<void()>> onEnding{}; ///< modules that are to be told when no new calls come any more
     std::vector<std::function<void()>> onReload{}; ///< those that read files of theirs again with the configuration
+    std::set<std::string> leaving{};               ///< interfaces that are configured no more and go with their calls
+    DialPlan dialPlan{};
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const
     {
         return !isEnding && !isDraining && !isBlocked(interface) && (!mustRefuse || !mustRefuse());
     }
-    /// By which routes a call that comes in there leaves now.
+    /// By which routes a call that comes in there leaves now; `number` as it was dialled, `user` as whom the interface
+    /// knows the caller, if it does. An emergency number is looked for as it is, any other one in its international
+    /// form.
     RouteHunt findRoutes(std::string_view from, std::string_view number, std::string_view calling,
-                         unsigned int callNumber) const
+                         unsigned int callNumber, std::string_view user = {}) const
     {
         unsigned int const minute = WeekHours::MINUTE_OF(std::time(nullptr));
-        return {routing.find({from, number, calling, minute, callNumber}), number};
+        if (dialPlan.isEmpty() || routing.isEmergency(from, number))
+            return {routing.find({from, number, calling, minute, callNumber, user}), number};
+        std::string const whole = dialPlan.normalise(number);
+        return {routing.find({from, whole, dialPlan.normalise(calling), minute, callNumber, user}), whole,
+                whole != number};
+    }
+    /// Whether more digits could give the number a route.
+    bool isBeginning(std::string_view from, std::string_view number) const
+    {
+        return dialPlan.isBeginning(number) || routing.isBeginning(from, dialPlan.normalise(number));
+    }
+    /// Whether a call to that number, which comes in there, may be refused for no limit and by no operator.
+    bool isEmergency(std::string_view from, std::string_view number) const
+    {
+        return !isEnding && routing.isEmergency(from, number);
     }
     /// Whether no new call may come in or leave there.
-    bool isBlocked(std::string const& interface) const { return blocked.contains(interface); }
+    bool isBlocked(std::string const& interface) const
+    {
+        return blocked.contains(interface) || leaving.contains(interface);
+    }
 };

@@ -33,7 +33,7 @@ class SignallingModule
 {
 public:
     /// Changes whenever a module that was built before would not run any more.
-    static constexpr unsigned int VERSION = 3;
+    static constexpr unsigned int VERSION = 4;
 
     /// Ends what is still up without a word to the peers.
     virtual ~SignallingModule() = default;
@@ -59,6 +59,16 @@ public:
     virtual std::vector<StateRow> getPeers() const { return {}; }
     virtual std::vector<StateRow> getRegistrations() const { return {}; }
     /// @}
+
+    /// A changed configuration is followed in two steps, so that nothing of it is if anything cannot be. The first one
+    /// checks the tables of the module's interfaces and opens those that are new, but takes no calls there yet; false:
+    /// the module can follow no change. Throws ConfigurationError for one that it cannot follow.
+    virtual bool prepareChange(Configuration const&, std::vector<ConfigurationSection> const&) { return false; }
+    /// Then this follows: from now on the interfaces are those. One that is not among them takes no new call, and goes
+    /// with its last one, which the host is told (GatewayHost::leaving).
+    virtual void change() {}
+    /// Or this: all stays as it was.
+    virtual void dropChange() {}
 };
 
 using SignallingModules = std::map<std::string, std::unique_ptr<SignallingModule>>; ///< by name

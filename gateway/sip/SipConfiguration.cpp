@@ -2,6 +2,7 @@
 
 #include "configuration/ConfigurationSection.h"
 #include "media/context/MediaDescription.h"
+#include "sip/message/SipCarriedHeaders.h"
 #include "sip/message/SipCodec.h"
 #include "sip/stack/SipTls.h"
 
@@ -282,6 +283,17 @@ void READ_REGISTRATION(ConfigurationSection const& section, SipConfiguration& in
         section.refuse("register", "as whom? user is needed");
 }
 
+/// That cross from side to side besides the usual ones.
+void READ_HEADERS(ConfigurationSection const& section, SipConfiguration& interface)
+{
+    interface.headers = section.texts("headers", {});
+    for (std::string const& name : interface.headers)
+        if (!SipCarriedHeaders::IS_LISTABLE(name))
+            section.refuse("headers", "'" + name + "' is no header that may be carried");
+    if (interface.headers.size() > SipCarriedHeaders::MOST_LINES)
+        section.refuse("headers", "may have " + std::to_string(SipCarriedHeaders::MOST_LINES) + " of them");
+}
+
 void CHECK_MEDIA_ADDRESS(ConfigurationSection const& section, SipConfiguration const& interface)
 {
     try
@@ -309,6 +321,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "probe-down",
                    "failover-after",
                    "trusted",
+                   "nat",
+                   "redirections",
+                   "headers",
                    "user",
                    "passwords",
                    "authenticate",
@@ -363,6 +378,8 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_TLS(section, interface);
     READ_CREDENTIALS(section, interface);
     READ_AUTHENTICATION(section, interface);
+    READ_HEADERS(section, interface);
+    interface.isBehindNat = section.flag("nat");
     interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
     READ_REGISTRAR(section, interface);
     READ_REGISTRATION(section, interface);
@@ -388,6 +405,10 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.charges = charges == "tell"   ? SipConfiguration::Charges::TELL
                         : charges == "take" ? SipConfiguration::Charges::TAKE
                                             : SipConfiguration::Charges::OFF;
+    std::string const redirections = section.oneOf("redirections", "refuse", {"refuse", "follow", "hand-on"});
+    interface.redirections = redirections == "follow"    ? SipConfiguration::Redirections::FOLLOW
+                             : redirections == "hand-on" ? SipConfiguration::Redirections::HAND_ON
+                                                         : SipConfiguration::Redirections::REFUSE;
     if (section.oneOf("overlap", "off", {"off", "invite"}) == "invite")
         interface.overlap = SipConfiguration::Overlap::INVITE;
     interface.digitTimeout = section.number("digit-timeout", interface.digitTimeout, 1, 60);

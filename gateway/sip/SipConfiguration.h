@@ -42,6 +42,14 @@ struct SipConfiguration
         TAKE  ///< the peers tell
     };
 
+    /// What becomes of a call that the peer sends elsewhere, with 300 to 302.
+    enum class Redirections
+    {
+        REFUSE, ///< it fails
+        FOLLOW, ///< we dial, by the routes of the interface
+        HAND_ON ///< the caller is told
+    };
+
     std::string name;
     SocketAddress listen;
     SocketAddress advertise;        ///< what the peers are told instead of `listen`; port 0: nothing
@@ -69,7 +77,9 @@ struct SipConfiguration
     unsigned int sessionExpires = 1800; ///< seconds within which a session is to be refreshed; 0: not asked for
     unsigned int leastExpires = 90;     ///< seconds: what a peer may ask for
     unsigned int longestCall = 0;       ///< seconds that an answered call from there may last; 0: no limit
+    bool isBehindNat = false;           ///< its peers: they are where their messages come from
     bool isTrusted = true;              ///< its peers, in the sense of RFC 3325
+    std::vector<std::string> headers{}; ///< names of those that cross besides the usual ones
     std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
     std::shared_ptr<SipPasswords const> passwords; ///< with a user, or where it asks: never null
     bool authenticates = false;                    ///< asks who sends
@@ -92,6 +102,7 @@ struct SipConfiguration
     std::string conference; ///< the number of the interface's conference; where media are relayed. Empty: none
     Charges charges = Charges::OFF;
     Overlap overlap = Overlap::OFF;
+    Redirections redirections = Redirections::REFUSE;
     unsigned int digitTimeout = 15; ///< seconds after which no further digit is waited for
     unsigned int failureTone = 0;   ///< seconds for which a caller hears why his call fails; 0: he does not
     bool ringsBack = false;         ///< a caller hears a tone of ours while the callee is alerted without media

@@ -1,6 +1,8 @@
 #include "sip/SipModule.h"
 
+#include "callcontrol/CallControl.h"
 #include "configuration/Configuration.h"
+#include "platform/eventloop/TYEvent.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipPropertyId.h"
 #include "sip/registrar/SipBindingStore.h"
@@ -23,10 +25,23 @@ std::string DESCRIBE(std::string_view name, SipAuthentication const& authenticat
 } // namespace
 
 SipModule::SipModule(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)
-    : m_file(configuration.file)
 {
+    readTables(configuration, interfaces);
+}
+
+SipModule::~SipModule()
+{
+    if (m_removal == nullptr)
+        return;
+    m_environment->host.onEndpointGone = nullptr;
+    m_removal->destroy();
+}
+
+void SipModule::readTables(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)
+{
+    m_tables.clear();
     for (ConfigurationSection const& interface : interfaces)
-        m_configurations.push_back(SipConfiguration::READ(interface, configuration.relaysMedia));
+        m_tables.push_back({interface, SipConfiguration::READ(interface, configuration.relaysMedia)});
 }
 
 void SipModule::open(GatewayHost& host)
@@ -34,42 +49,62 @@ void SipModule::open(GatewayHost& host)
     if (!SipPropertyId::DECLARE().isOk())
         throw std::runtime_error("the names of the SIP properties cannot be declared");
     m_environment.emplace(SipEnvironment{host, m_stack});
-    for (std::size_t i = 0; i < m_configurations.size(); ++i)
-        try
-        {
-            m_ports.push_back(std::make_unique<Port>(*m_environment, m_configurations[i]));
-        }
-        catch (SipBindingStore::Failure const& error)
-        {
-            throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].registrations", error.what());
-        }
-        catch (std::runtime_error const& error)
-        {
-            throw ConfigurationError(m_file, "sip[" + std::to_string(i) + "].listen", error.what());
-        }
+    m_removal = new TYEvent(
+        *CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW,
+        [](void* module) { static_cast<SipModule*>(module)->removeIdle(); }, this);
+    for (Table const& table : m_tables)
+        m_ports.push_back(makePort(table));
     for (auto const& port : m_ports)
-        if (SipRegistration* const registration = port->interface.getRegistration())
+        begin(*port);
+    host.onEnding.emplace_back(
+        [this]
         {
-            host.onEnding.emplace_back([registration] { registration->end(); });
-            registration->start();
-        }
-    for (auto const& port : m_ports)
-        if (SipTls* const tls = port->interface.getTls())
-            host.onReload.emplace_back([tls] { tls->reload(); });
-    for (auto const& port : m_ports)
-    {
-        SipPeers& peers = port->interface.getPeers();
-        host.onEnding.emplace_back([&peers] { peers.endProbing(); });
-        peers.startProbing();
-    }
-    for (SipConfiguration const& configuration : m_configurations)
-        if (host.relaysMedia && configuration.security == SipStream::SECURED && !SipWay::IS_SECURED(configuration.way))
-            spdlog::warn("interface {}: srtp is required, but its keys go to the peer in the clear: transport is not "
-                         "tls",
-                         configuration.name);
-    for (SipConfiguration const& configuration : m_configurations)
-        spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
-                     configuration.hasPeer() ? configuration.peer.text() : "nobody but who registers");
+            for (auto const& port : m_ports)
+                end(*port);
+        });
+    host.onReload.emplace_back(
+        [this]
+        {
+            for (auto const& port : m_ports)
+                if (SipTls* const tls = port->interface.getTls())
+                    tls->reload();
+        });
+    watchEnd(host);
+}
+
+std::unique_ptr<SipModule::Port> SipModule::makePort(Table const& table)
+try
+{
+    return std::make_unique<Port>(*m_environment, table);
+}
+catch (SipBindingStore::Failure const& error)
+{
+    table.section.refuse("registrations", error.what());
+}
+catch (std::runtime_error const& error)
+{
+    table.section.refuse("listen", error.what());
+}
+
+void SipModule::begin(Port& port)
+{
+    SipConfiguration const& configuration = port.interface.getConfiguration();
+    if (SipRegistration* const registration = port.interface.getRegistration())
+        registration->start();
+    port.interface.getPeers().startProbing();
+    if (m_environment->host.relaysMedia && configuration.security == SipStream::SECURED &&
+        !SipWay::IS_SECURED(configuration.way))
+        spdlog::warn("interface {}: srtp is required, but its keys go to the peer in the clear: transport is not tls",
+                     configuration.name);
+    spdlog::info("interface {} listens on {}, its peer is {}", configuration.name, configuration.listen.text(),
+                 configuration.hasPeer() ? configuration.peer.text() : "nobody but who registers");
+}
+
+void SipModule::end(Port& port)
+{
+    if (SipRegistration* const registration = port.interface.getRegistration())
+        registration->end();
+    port.interface.getPeers().endProbing();
 }
 
 unsigned int SipModule::clearCalls(QCause cause)
@@ -104,6 +139,8 @@ std::string SipModule::describe() const
     std::string text;
     for (auto const& port : m_ports)
     {
+        if (port->isLeaving)
+            text += fmt::format("interface {}: leaving\n", port->interface.getName().view());
         SipGuard const& guard = port->interface.getGuard();
         text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
                             port->interface.getName().view(), guard.getCounters().strangers,

@@ -44,6 +44,15 @@ protected:
 };
 } // namespace
 
+TEST_F(SipAuthenticationTest, WhoIsBannedIsAskedAllTheSameForAnEmergencyNumber)
+{
+    for (unsigned int i = 0; i < 5; ++i)
+        std::ignore = check(ANSWER(ask(), "alice", "wrong"));
+    SipMessage const invite = SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n");
+    EXPECT_EQ(authentication.check(invite.get(), SOURCE).verdict, SipAuthentication::IGNORE);
+    EXPECT_EQ(authentication.check(invite.get(), SOURCE, true).verdict, SipAuthentication::ASK);
+}
+
 TEST_F(SipAuthenticationTest, WhoKnowsThePasswordIsKnown)
 {
     SipChallenge challenge = ask();

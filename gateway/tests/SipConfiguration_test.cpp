@@ -57,6 +57,23 @@ TEST(SipConfiguration, WhatIsLeftOutHasItsDefault)
     EXPECT_FALSE(a.detectsDigits);
 }
 
+TEST(SipConfiguration, RedirectionsAreRefusedUnlessItSaysOtherwise)
+{
+    using Redirections = SipConfiguration::Redirections;
+    EXPECT_EQ(READ(LEAST).at(0).redirections, Redirections::REFUSE);
+    EXPECT_EQ(READ(LEAST + std::string("redirections = \"follow\"\n")).at(0).redirections, Redirections::FOLLOW);
+    EXPECT_EQ(READ(LEAST + std::string("redirections = \"hand-on\"\n")).at(0).redirections, Redirections::HAND_ON);
+    EXPECT_NE(COMPLAINT(LEAST + std::string("redirections = \"on\"\n")), "none");
+}
+
+TEST(SipConfiguration, OnlyHeadersThatNobodyLivesByMayBeCarried)
+{
+    EXPECT_EQ(READ(LEAST + std::string("headers = [\"X-Customer\", \"Organization\"]\n")).at(0).headers,
+              (std::vector<std::string>{"X-Customer", "Organization"}));
+    EXPECT_EQ(COMPLAINT(LEAST + std::string("headers = [\"X-Customer\", \"Via\"]\n")),
+              "f: sip[0].headers: 'Via' is no header that may be carried");
+}
+
 TEST(SipConfiguration, EveryKeyIsRead)
 {
     SipConfiguration const b = READ(R"([[sip]]

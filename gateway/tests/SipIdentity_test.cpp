@@ -214,3 +214,32 @@ TEST(SipIdentity, ASecondNumberThatIsRestrictedIsNotShown)
     caller.second.presentation = QPresentationIndicator::RESTRICTED;
     EXPECT_EQ(caller.getFrom(OURS), "<sip:4420@192.0.2.1:5060>");
 }
+
+TEST(SipIdentity, NumbersThatCameWithAPrefixBecomeInternational)
+{
+    DialPlan const plan{"00", "0", "49"};
+    SipMessage const invite =
+        SipMessage::INVITE("From: <sip:089123@host>;tag=a\r\nP-Asserted-Identity: <sip:004420@host>\r\n");
+    SipIdentity caller = SipIdentity::READ_CALLER(invite.get());
+    caller.normalise({});
+    EXPECT_EQ(caller.party.getUser(), "004420");
+    caller.normalise(plan);
+    EXPECT_EQ(caller.party.getUser(), "+4420");
+    EXPECT_EQ(caller.party.screening, QScreeningIndicator::NETWORK_PROVIDED);
+    EXPECT_EQ(caller.second.getUser(), "+4989123");
+    SipIdentity internal = SipIdentity::READ_CALLER(SipMessage::INVITE("From: <sip:4711@host>;tag=a\r\n").get());
+    internal.normalise(plan);
+    EXPECT_EQ(internal.party.getUser(), "4711");
+}
+
+TEST(SipIdentity, AServiceIsCalledInThePlaceOfANumber)
+{
+    auto const called = [](std::string const& uri)
+    { return SipIdentity::READ_CALLED(SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n", uri).get()).getUser(); };
+    EXPECT_EQ(called("urn:service:sos"), "urn:service:sos");
+    EXPECT_EQ(called("URN:service:SOS.Fire"), "urn:service:sos.fire");
+    EXPECT_EQ(called("urn:service:counseling"), "");
+    EXPECT_EQ(called("urn:service:sosial"), "");
+    EXPECT_EQ(called("urn:service:sos.a%0db"), "");
+    EXPECT_EQ(called("sip:112@host"), "112");
+}

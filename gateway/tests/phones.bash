@@ -6,7 +6,7 @@
 start_phone() {
     local folder="$WORK/$1" module
     mkdir -p "$folder"
-    python3 "$HERE/speech.py" ${SAID:-say $2 60} "$folder/said.wav"
+    python3 "$HERE/speech.py" ${SAID:-say $2 30} "$folder/said.wav"
     cat >"$folder/config" <<END
 sip_listen $HOST:$2
 rtp_ports $4-$(($4 + 3))

@@ -6,6 +6,7 @@
                                         whether at least so many frames of 20 ms of what was said came through mu-law
                                         without a bit changed, one after the other and none before its turn; LAWS: in
                                         which codecs it was one after the other, "a,mu"
+    speech.py channel FILE 0|1 ONE      writes a WAV of one channel of another one
     speech.py speak SEED SECONDS FILE   writes a WAV that sounds like somebody speaking, each seed another one
     speech.py key DIGITS FILE           writes a WAV of these digits as they sound (ITU-T Q.23), after 2 s of silence
     speech.py hum HERTZ SECONDS FILE    writes a WAV of one tone; of silence, for 0 Hz
@@ -244,7 +245,12 @@ def hum(hertz, seconds, path):
     write(path, [int(8000 * math.sin(2 * math.pi * hertz * i / 8000)) for i in range(8000 * seconds)])
 
 
+def channel(path, number, one_path):
+    write(one_path, read(path)[number::2])
+
+
 COMMANDS = {
+    "channel": lambda path, number, one_path: channel(path, int(number), one_path),
     "hum": lambda hertz, seconds, path: hum(float(hertz), int(seconds), path),
     "tone": lambda heard, hertz, least, most: tone(heard, float(hertz), int(least), int(most)),
     "overhear": lambda said, port, packets: overhear(said, int(port), int(packets)),

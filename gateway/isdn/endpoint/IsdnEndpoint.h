@@ -155,8 +155,9 @@ private:
     bool m_hasToldData = false;
     bool m_isPeerHeld = false;
     bool m_isFinished = false;
-    std::string m_digits; // called side: not sent yet
-    TYTimer m_timer;      // T302, T304, an answer; clearing
+    std::string m_digits;   // called side: not sent yet
+    std::string m_userUser; // that the wire has been told
+    TYTimer m_timer;        // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
     CC_PropertyContainer m_setup; // calling side: what the SETUP said
     std::unique_ptr<LegMedia> m_media;

@@ -96,8 +96,9 @@ bool IsdnEndpoint::startCall(pri_sr* request, bool isComplete)
         pri_party_redirecting const redirecting = redirection.getRedirecting();
         pri_sr_set_redirecting_parties(request, &redirecting);
     }
-    if (std::string const userUser = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser()); !userUser.empty())
-        pri_sr_set_useruser(request, userUser.c_str());
+    m_userUser = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser());
+    if (!m_userUser.empty())
+        pri_sr_set_useruser(request, m_userUser.c_str());
     m_isNumberComplete = isComplete;
     advance(IsdnCallState::SETUP_OUT);
     return ask([&](pri* stack) { return pri_setup(stack, m_call, request); }) == 0;

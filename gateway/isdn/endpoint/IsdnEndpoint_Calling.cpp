@@ -98,9 +98,10 @@ void IsdnEndpoint::dialIfComplete(bool isComplete)
         requestDigits();
     else
     {
-        spdlog::info("call {} {} refused: no route to '{}', cause 3 (no-route-to-destination)", m_callNumber,
-                     getName().view(), m_called.getText());
-        clear(m_called.number.empty() ? QCause::INVALID_NUMBER_FORMAT : QCause::NO_ROUTE_TO_DESTINATION);
+        QCause const why = m_routes.getRefusal();
+        spdlog::info("call {} {} refused: no route to '{}', cause {} ({})", m_callNumber, getName().view(),
+                     m_called.getText(), static_cast<int>(why), CAUSE_SHORT_NAME(why));
+        clear(m_called.number.empty() ? QCause::INVALID_NUMBER_FORMAT : why);
     }
 }
 

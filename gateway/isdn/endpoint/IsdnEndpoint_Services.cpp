@@ -106,12 +106,15 @@ void IsdnEndpoint::readUserUser(char const* text, CC_PropertyContainer& own)
         ADD(own, CC_PropertyParametrizedString(CC_PropertyId::USER_TO_USER_INFORMATION, IsdnUserUser::FROM_WIRE(text)));
 }
 
-/// The next message takes it along; without memory it goes without.
+/// The next message takes it along, unless an earlier one has; without memory it goes without.
 void IsdnEndpoint::sendUserUser()
 try
 {
-    if (std::string const text = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser()); !text.empty())
-        pri_call_set_useruser(m_call, text.c_str());
+    std::string text = IsdnUserUser::TO_WIRE(m_adapter.getPeerUserToUser());
+    if (text == m_userUser)
+        return;
+    m_userUser = std::move(text);
+    pri_call_set_useruser(m_call, m_userUser.c_str());
 }
 catch (std::bad_alloc const&)
 {
@@ -235,7 +238,8 @@ void IsdnEndpoint::openMedia()
     if (m_media == nullptr || m_mediaTimeslot != m_timeslot)
     {
         m_mediaTimeslot = m_timeslot;
-        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this);
+        m_media = call->addChannel(m_interface.getLink().getLine().openChannel(m_timeslot).release(), *this,
+                                   CallMedia::PART_OF(m_adapter));
         if (m_media != nullptr && !m_bearer.isSpeech())
             m_media->describe(ChannelTermination::DESCRIPTION(MG_Rtp::ECodec::CLEARMODE));
         else if (m_media != nullptr && m_interface.getConfiguration().digits == IsdnConfiguration::Digits::SOUND)

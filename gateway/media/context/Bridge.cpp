@@ -1,5 +1,6 @@
 #include "media/context/Bridge.h"
 
+#include "media/file/CallRecording.h"
 #include "media/rtp/RtpTermination.h"
 
 #include <algorithm>
@@ -11,6 +12,7 @@ Bridge::~Bridge() = default;
 void Bridge::add(RtpTermination& leg)
 {
     m_legs.push_back(&leg);
+    openEar(leg);
     connect();
 }
 
@@ -18,6 +20,7 @@ void Bridge::remove(RtpTermination& leg)
 {
     leg.setPartner(nullptr);
     leg.closeVoice();
+    leg.openEar(false);
     std::erase(m_legs, &leg);
     connect();
 }
@@ -54,8 +57,47 @@ catch (std::bad_alloc const&)
     m_conference.reset(); // what cannot be relayed is not heard
 }
 
+void Bridge::setRecording(CallRecording* recording)
+{
+    m_recording = recording;
+    for (RtpTermination* const leg : m_legs)
+        openEar(*leg);
+}
+
+void Bridge::openEar(RtpTermination& leg) const
+try
+{
+    leg.openEar(m_recording != nullptr);
+}
+catch (std::bad_alloc const&)
+{
+    // what it says is missing in the recording
+}
+
+/// Begins with the first word.
+void Bridge::record()
+{
+    std::array<short, CallRecording::FRAME> caller{};
+    std::array<short, CallRecording::FRAME> others{};
+    std::array<short, CallRecording::FRAME> one;
+    bool isHeard = m_recording->hasBegun();
+    for (RtpTermination* const leg : m_legs)
+    {
+        if (!leg->overhear(one))
+            continue;
+        isHeard = true;
+        std::array<short, CallRecording::FRAME>& channel = leg->isCaller() ? caller : others;
+        std::transform(channel.begin(), channel.end(), one.begin(), channel.begin(),
+                       [](int a, int b) { return static_cast<short>(std::clamp(a + b, -32768, 32767)); });
+    }
+    if (isHeard)
+        m_recording->put(caller, others);
+}
+
 void Bridge::tick(long long now)
 {
+    if (m_recording != nullptr)
+        record();
     if (m_conference != nullptr)
         m_conference->tick(m_legs, now);
     for (RtpTermination* const leg : m_legs)

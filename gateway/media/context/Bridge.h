@@ -5,6 +5,7 @@
 #include <memory>
 #include <vector>
 
+class CallRecording;
 class RtpTermination;
 
 /// A call in the datapath: the terminations of its legs, and who hears whom. Two that understand each other are
@@ -23,6 +24,8 @@ public:
     /// To be called when one of the legs was described anew.
     void connect();
     bool isEmpty() const { return m_legs.empty(); }
+    /// From now on what is said goes there; null: nowhere. It must outlive this, or the next call.
+    void setRecording(CallRecording* recording);
 
     /// Every 20 ms.
     void tick(long long now);
@@ -30,7 +33,10 @@ public:
 private:
     bool needsConference() const;
     void openConference();
+    void openEar(RtpTermination& leg) const;
+    void record();
 
     std::vector<RtpTermination*> m_legs;
     std::unique_ptr<Conference> m_conference; // null: all are relayed
+    CallRecording* m_recording = nullptr;
 };

@@ -3,12 +3,24 @@
 #include "media/rtp/ChannelTermination.h"
 
 #include <algorithm>
+#include <array>
+#include <ctime>
 #include <stdexcept>
 
 namespace
 {
 /// Calls' and legs' alike.
 std::atomic<unsigned long long> s_lastNumber{0};
+
+/// The time of day, as a part of file names: 20261122T184501Z.
+std::string NOW()
+{
+    std::time_t const now = std::time(nullptr);
+    std::tm parts;
+    std::array<char, 20> text;
+    std::strftime(text.data(), text.size(), "%Y%m%dT%H%M%SZ", gmtime_r(&now, &parts));
+    return text.data();
+}
 
 MediaOptions BROUGHT_INTO_RANGE(MediaOptions options)
 {
@@ -29,6 +41,11 @@ MediaCore::MediaCore(MediaOptions const& options, TYEventLoop& signalling)
     std::string error;
     if (!m_tones.read(m_options.tones.empty() ? ToneTable::BUILT_IN() : m_options.tones, m_options.country, error))
         throw std::runtime_error("tones: " + error);
+    if (!m_options.recordings.empty())
+    {
+        m_recordings = std::make_unique<RecordingWriter>();
+        m_recordingsPrefix = m_options.recordings + "/" + NOW() + "-";
+    }
     for (unsigned int i = 0; i < m_options.threads; ++i)
         m_loops.push_back(std::make_unique<MediaLoop>(*m_news, m_tones));
 }
@@ -37,6 +54,8 @@ void MediaCore::start()
 {
     for (std::unique_ptr<MediaLoop> const& loop : m_loops)
         loop->start();
+    if (m_recordings != nullptr)
+        m_recordings->start();
 }
 
 void MediaCore::close()
@@ -44,6 +63,7 @@ void MediaCore::close()
     for (std::unique_ptr<MediaLoop> const& loop : m_loops)
         loop->stop(); // all of them before the first ends: they hand legs to each other
     m_loops.clear();
+    m_recordings.reset(); // nobody puts any more
     m_news.reset();
     m_legs.clear();
 }
@@ -57,7 +77,23 @@ XCode MediaCore::createContext(TYPtr<MG_IContext>& context)
         return XCode::NO_ELEMENT;
     m_nextLoop = (m_nextLoop + 1) % m_options.threads;
     context.set(made);
+    record(*made);
     return XCode::OK;
+}
+
+/// Without memory the call is not recorded: it matters more.
+void MediaCore::record(CallMedia& call)
+try
+{
+    if (m_recordings == nullptr)
+        return;
+    auto const recording =
+        std::make_shared<CallRecording>(m_recordingsPrefix + std::to_string(call.getNumber()) + ".wav");
+    m_recordings->add(recording);
+    call.record(recording);
+}
+catch (std::bad_alloc const&)
+{
 }
 
 RtpTermination::Seed MediaCore::makeSeed()
@@ -71,7 +107,8 @@ std::unique_ptr<RtpTermination> MediaCore::createTermination(unsigned long long 
     return std::make_unique<RtpTermination>(number, std::move(ports), m_options, makeSeed());
 }
 
-std::unique_ptr<LegMedia> MediaCore::createChannelLeg(CallMedia& call, Descriptor&& channel, MediaObserver& observer)
+std::unique_ptr<LegMedia> MediaCore::createChannelLeg(CallMedia& call, Descriptor&& channel, MediaObserver& observer,
+                                                      CallMedia::Part part)
 try
 {
     if (m_loops.empty() || channel.get() < 0)
@@ -80,6 +117,7 @@ try
     m_legs[leg->m_number] = leg.get();
     MediaOrder::Make make{
         call.m_number, std::make_unique<ChannelTermination>(leg->m_number, std::move(channel), m_options, makeSeed())};
+    make.leg->setCaller(part == CallMedia::Part::CALLER);
     if (!getLoopOf(call)->post(std::move(make)))
         return nullptr;
     leg->describe(ChannelTermination::DESCRIPTION());
@@ -90,7 +128,8 @@ catch (std::bad_alloc const&)
     return nullptr;
 }
 
-std::unique_ptr<LegMedia> MediaCore::createLeg(CallMedia& call, IpAddress const& local, MediaObserver& observer)
+std::unique_ptr<LegMedia> MediaCore::createLeg(CallMedia& call, IpAddress const& local, MediaObserver& observer,
+                                               CallMedia::Part part)
 try
 {
     RtpPorts ports;
@@ -102,6 +141,7 @@ try
     m_legs[leg->m_number] = leg.get();
     MediaOrder::Make make{call.m_number, createTermination(leg->m_number, std::move(ports))};
     leg->m_cell = make.leg->getCell();
+    make.leg->setCaller(part == CallMedia::Part::CALLER);
     return getLoopOf(call)->post(std::move(make)) ? std::move(leg) : nullptr;
 }
 catch (std::bad_alloc const&)

@@ -19,6 +19,18 @@ MediaLayer::~MediaLayer() { m_core->close(); }
 
 void MediaLayer::start() { m_core->start(); }
 
+void MediaLayer::setRecordingFailure(RecordingWriter::Failure const& failure)
+{
+    if (m_core->getRecordings() != nullptr)
+        m_core->getRecordings()->setFailure(failure);
+}
+
+void MediaLayer::writeRecordings()
+{
+    if (m_core->getRecordings() != nullptr)
+        m_core->getRecordings()->write();
+}
+
 MG_IContextRepository* MediaLayer::getContexts() const { return m_core.get(); }
 
 TYEventLoop& MediaLayer::getDatapathLoop() const { return m_core->getLoop(0).getEvents(); }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/context/MediaOptions.h"
+#include "media/file/RecordingWriter.h"
 #include "platform/base/TYPtr.h"
 #include "platform/media/MG_IContextRepository.h"
 #include "platform/media/MG_ITerminationRepository.h"
@@ -28,6 +29,11 @@ public:
     ~MediaLayer();
     MediaLayer(MediaLayer const&) = delete;
     MediaLayer& operator=(MediaLayer const&) = delete;
+
+    /// Who is told, on a thread of the media layer, of a recording that came to nothing or has gaps. Before the start.
+    void setRecordingFailure(RecordingWriter::Failure const& failure);
+    /// Writes what was recorded up to now: for those who turn the loops by hand.
+    void writeRecordings();
 
     /// Starts the threads. Whoever does not turns the loops by hand, as tests do.
     void start();

@@ -50,6 +50,7 @@ void MediaLoop::stop()
         leg.termination->end(m_now);
     m_legs.clear();
     m_bridges.clear();
+    m_recordings.clear();
 }
 
 void MediaLoop::run()

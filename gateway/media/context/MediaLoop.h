@@ -83,6 +83,7 @@ private:
     void obey(MediaOrder::Aside& order);
     void obey(MediaOrder::Ask& order);
     void obey(MediaOrder::End& order);
+    void obey(MediaOrder::Record& order);
     void obey(MediaOrder::Stop& order);
     Leg* find(unsigned long long leg);
     void join(Leg& leg, unsigned long long call);
@@ -114,8 +115,9 @@ private:
     bool m_isStopping = false;
     bool m_isClosed = false; // orders are passed over
     std::unordered_map<unsigned long long, Leg> m_legs;
-    std::unordered_map<unsigned long long, std::vector<MediaOrder::Any>> m_expected; // with what waits for each
-    std::unordered_map<unsigned long long, Bridge> m_bridges;                        // by their calls
+    std::unordered_map<unsigned long long, std::vector<MediaOrder::Any>> m_expected;     // with what waits for each
+    std::unordered_map<unsigned long long, std::shared_ptr<CallRecording>> m_recordings; // by their calls
+    std::unordered_map<unsigned long long, Bridge> m_bridges;                            // the same
     MediaLoopCounters m_counters;
     DatagramBatch m_batch;
     std::thread m_thread;

@@ -11,7 +11,7 @@ unsigned long long MediaOrder::LEG_OF(Any const& order)
             using Order = std::remove_cvref_t<decltype(one)>;
             if constexpr (std::is_same_v<Order, Make>)
                 return one.leg->getNumber();
-            else if constexpr (std::is_same_v<Order, Stop>)
+            else if constexpr (std::is_same_v<Order, Stop> || std::is_same_v<Order, Record>)
                 return 0;
             else
                 return one.leg;
@@ -85,6 +85,8 @@ void MediaLoop::join(Leg& leg, unsigned long long call)
         leave(leg);
     leg.call = call;
     leg.bridge = &bridge;
+    if (auto const recording = m_recordings.find(call); recording != m_recordings.end() && bridge.isEmpty())
+        bridge.setRecording(recording->second.get());
     bridge.add(*leg.termination);
 }
 
@@ -174,6 +176,18 @@ void MediaLoop::obey(MediaOrder::End& order)
 {
     if (std::unique_ptr<RtpTermination> const leg = remove(order.leg))
         leg->end(m_now);
+}
+
+/// Before the call's first leg comes, or after; the call's end takes it back.
+void MediaLoop::obey(MediaOrder::Record& order)
+{
+    auto const bridge = m_bridges.find(order.call);
+    if (bridge != m_bridges.end())
+        bridge->second.setRecording(order.recording.get());
+    if (order.recording != nullptr)
+        m_recordings[order.call] = order.recording;
+    else
+        m_recordings.erase(order.call);
 }
 
 void MediaLoop::obey(MediaOrder::Stop&) { m_isStopping = true; }

@@ -13,6 +13,7 @@ struct MediaOptions
     unsigned int silence = 20;          ///< seconds without a packet until signalling is told; 0: it never is
     unsigned int reportInterval = 5000; ///< milliseconds between two RTCP reports
     std::string country = "de";         ///< whose tones are played
+    std::string recordings;             ///< the folder for what is said in every call; empty: that is not kept
     std::string tones;                  ///< where they are written (ToneTable); empty: the built-in ten countries
 
     friend bool operator==(MediaOptions const&, MediaOptions const&) = default;

@@ -8,6 +8,7 @@
 #include <memory>
 #include <variant>
 
+class CallRecording;
 class MediaLoop;
 class RtpTermination;
 
@@ -76,10 +77,16 @@ struct End
 {
     unsigned long long leg;
 };
+struct Record ///< what is said in the call
+{
+    unsigned long long call;
+    std::shared_ptr<CallRecording> recording; ///< null: ends it
+};
 struct Stop ///< the loop's running
 {
 };
-using Any = std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Play, Detect, Digit, Aside, Ask, End, Stop>;
+using Any =
+    std::variant<Make, Describe, Connect, Expect, HandOver, Tone, Play, Detect, Digit, Aside, Ask, End, Record, Stop>;
 
 /// Which leg it is about; 0: none.
 unsigned long long LEG_OF(Any const& order);

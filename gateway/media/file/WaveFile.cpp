@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <cstring>
+#include <fcntl.h>
 
 namespace
 {
@@ -30,17 +31,17 @@ bool IS(std::span<unsigned char const> octets, std::size_t at, char const (&name
     return std::memcmp(&octets[at], name, 4) == 0;
 }
 
-std::array<unsigned char, HEADER> MAKE_HEADER(unsigned int rate, std::size_t octets)
+std::array<unsigned char, HEADER> MAKE_HEADER(unsigned int rate, unsigned int channels, std::size_t octets)
 {
     std::array<unsigned char, HEADER> header;
     std::memcpy(header.data(), "RIFF....WAVEfmt ....................data....", HEADER);
     PUT(&header[4], 4, HEADER - 8 + octets);
     PUT(&header[16], 4, 16);
     PUT(&header[20], 2, LINEAR);
-    PUT(&header[22], 2, 1);
+    PUT(&header[22], 2, channels);
     PUT(&header[24], 4, rate);
-    PUT(&header[28], 4, std::size_t{rate} * BITS / 8);
-    PUT(&header[32], 2, BITS / 8);
+    PUT(&header[28], 4, std::size_t{rate} * channels * BITS / 8);
+    PUT(&header[32], 2, channels * BITS / 8);
     PUT(&header[34], 2, BITS);
     PUT(&header[40], 4, octets);
     return header;
@@ -104,11 +105,13 @@ void WaveReader::readSamples(std::span<unsigned char const> chunk)
 
 WaveWriter::~WaveWriter() { flush(); }
 
-bool WaveWriter::open(std::string const& path, unsigned int rate)
+bool WaveWriter::open(std::string const& path, unsigned int rate, unsigned int channels)
 {
     flush();
-    m_file.reset(std::fopen(path.c_str(), "wb"));
+    int const file = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    m_file.reset(file >= 0 ? fdopen(file, "wb") : nullptr);
     m_rate = rate;
+    m_channels = channels;
     m_octets = 0;
     return flush();
 }
@@ -130,7 +133,7 @@ bool WaveWriter::flush()
 {
     if (m_file == nullptr)
         return false;
-    std::array<unsigned char, HEADER> const header = MAKE_HEADER(m_rate, m_octets);
+    std::array<unsigned char, HEADER> const header = MAKE_HEADER(m_rate, m_channels, m_octets);
     bool const isWritten = std::fseek(m_file.get(), 0, SEEK_SET) == 0 &&
                            std::fwrite(header.data(), 1, header.size(), m_file.get()) == header.size() &&
                            std::fseek(m_file.get(), 0, SEEK_END) == 0;

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-/// Linear sound in a file (RIFF WAVE, 16 bits, one channel). @{
+/// Linear sound in a file (RIFF WAVE, 16 bits). @{
 
 /// Reads a whole file: announcements and music are short.
 class WaveReader
@@ -39,15 +39,17 @@ class WaveWriter
 {
 public:
     ~WaveWriter();
-    /// Whether the file could be made; one of that name is replaced. `rate`: Hz.
-    bool open(std::string const& path, unsigned int rate);
-    /// Whether it could be written.
+    /// Whether the file could be made; one of that name is replaced, a new one is its owner's
+    /// alone. `rate`: Hz.
+    bool open(std::string const& path, unsigned int rate, unsigned int channels = 1);
+    /// Whether it could be written; of several channels their samples in turn.
     bool write(std::span<short const> samples);
     bool flush();
 
 private:
     std::unique_ptr<std::FILE, int (*)(std::FILE*)> m_file{nullptr, std::fclose};
     unsigned int m_rate = 0;
+    unsigned int m_channels = 1;
     std::size_t m_octets = 0; // of samples
 };
 /// @}

@@ -93,6 +93,14 @@ public:
     void closeVoice();
     /// The next 20 ms of what the far side says, at the rate it was opened with; false: nothing.
     bool listen(std::span<short> frame);
+    /// Whether its side made the call. @{
+    bool isCaller() const { return m_isCaller; }
+    void setCaller(bool isCaller) { m_isCaller = isCaller; }
+    /// @}
+    /// Whether all that the far side says is decoded for a recording as well. Throws std::bad_alloc.
+    void openEar(bool isWanted);
+    /// The next 20 ms of that, at CallRecording::RATE; false: nothing.
+    bool overhear(std::span<short> frame);
     /// 20 ms for the far side, at that rate in Hz; passed over while a tone or a digit goes out.
     void speak(std::span<short const> frame, unsigned int rate, long long now);
     /// About once a second: reports, silence, quality.
@@ -142,6 +150,7 @@ private:
     RtpTerminationObserver* m_observer = nullptr;
     RtpTermination* m_partner = nullptr;
     bool m_isMultiplexed = false;
+    bool m_isCaller = false;
     bool m_isSilent = false;
     bool m_isDescribed = false;
     VoipCodecAndMode::Mode m_mode = VoipCodecAndMode::INACTIVE;
@@ -166,6 +175,7 @@ private:
     bool m_isUnusable = false; // its keys cannot be used: nothing goes in or out in the clear
     std::unique_ptr<SrtpSession> m_srtp;
     std::unique_ptr<VoiceReceiver> m_receiver;
+    std::unique_ptr<VoiceReceiver> m_ear; // of a recording; null: there is none
     std::unique_ptr<VoiceSender> m_sender;
     std::unique_ptr<DtmfDetector> m_detector;
     std::optional<ToneGenerator> m_tone;

@@ -1,5 +1,6 @@
 #include "media/codec/VoiceReceiver.h"
 #include "media/codec/VoiceSender.h"
+#include "media/file/CallRecording.h"
 #include "media/file/SoundPlayer.h"
 #include "media/rtp/RtpTermination.h"
 #include "media/tone/DtmfDetector.h"
@@ -44,6 +45,8 @@ void RtpTermination::hearVoice(RtpPacket const& packet, RtpRoutes::Route const& 
     MG_Rtp::ECodec::Type const codec = m_description.formats.begin()[route.format].codec.getCodec();
     if (m_receiver != nullptr && (m_isAllDecoded || route.relayType == MediaPayloadTypes::NONE))
         m_receiver->put(packet.header, codec, packet.payload);
+    if (m_ear != nullptr)
+        m_ear->put(packet.header, codec, packet.payload);
     if (m_detector == nullptr)
         return;
     m_detector->hear(codec, packet.payload);
@@ -52,6 +55,13 @@ void RtpTermination::hearVoice(RtpPacket const& packet, RtpRoutes::Route const& 
 }
 
 bool RtpTermination::listen(std::span<short> frame) { return m_receiver != nullptr && m_receiver->take(frame); }
+
+void RtpTermination::openEar(bool isWanted)
+{
+    m_ear = isWanted ? std::make_unique<VoiceReceiver>(CallRecording::RATE) : nullptr;
+}
+
+bool RtpTermination::overhear(std::span<short> frame) { return m_ear != nullptr && m_ear->take(frame); }
 
 void RtpTermination::speak(std::span<short const> frame, unsigned int rate, long long now)
 {

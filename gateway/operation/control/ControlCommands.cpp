@@ -224,6 +224,7 @@ ControlAnswer ControlCommands::stats(ControlRequest const& request)
         RecordWriter::Counters const records = m_records->getCounters();
         table.add("records-written", records.written);
         table.add("records-waiting", records.waiting);
+        table.add("records-spooled", records.spooled);
         table.add("records-lost", records.lost);
     }
     return table.get();

@@ -5,7 +5,7 @@
 #include "operation/CallTracer.h"
 #include "operation/control/ControlServer.h"
 #include "operation/record/CallWatch.h"
-#include "operation/record/RecordWriter.h"
+#include "operation/record/CallRecords.h"
 
 #include <map>
 #include <optional>
@@ -32,7 +32,7 @@ public:
     /// where none are written.
     ControlCommands(GatewayHost& host, SignallingModules const& modules,
                     std::map<std::string, std::string> const& interfaces, CallWatch& watch, CallTracer& tracer,
-                    RecordWriter const* records, ControlledGateway& gateway)
+                    CallRecords const* records, ControlledGateway& gateway)
         : m_host(host)
         , m_modules(modules)
         , m_interfaces(interfaces)
@@ -80,7 +80,7 @@ private:
     std::map<std::string, std::string> const& m_interfaces;
     CallWatch& m_watch;
     CallTracer& m_tracer;
-    RecordWriter const* m_records;
+    CallRecords const* m_records;
     ControlledGateway& m_gateway;
     TY::Time m_start = TY::Time::NOW(TY::Time::MONOTONIC);
 };

@@ -4,8 +4,8 @@
 #include "callcontrol/version.h"
 #include "operation/Log.h"
 #include "operation/metric/ProcessMetrics.h"
+#include "operation/record/CallRecords.h"
 #include "operation/record/CallWatch.h"
-#include "operation/record/RecordWriter.h"
 
 namespace
 {
@@ -14,7 +14,7 @@ constexpr double POOL_MILLISECONDS = 1e3; // in a second
 
 GatewayMetrics::GatewayMetrics(GatewayHost const& host, SignallingModules const& modules,
                                std::map<std::string, std::string> const& interfaces, CallWatch const& watch,
-                               CallMetrics const& calls, RecordWriter const* records, TYEventLoop& loop)
+                               CallMetrics const& calls, CallRecords const* records, TYEventLoop& loop)
     : m_host(host)
     , m_modules(modules)
     , m_interfaces(interfaces)
@@ -93,10 +93,13 @@ void GatewayMetrics::addRecords(MetricText& text) const
     if (m_records == nullptr)
         return;
     RecordWriter::Counters const records = m_records->getCounters();
-    text.begin("records_written_total", MetricText::COUNTER, "Records of calls that are in the file");
+    text.begin("records_written_total", MetricText::COUNTER,
+               "Records of calls that are where they belong, once for each file and database");
     text.add(records.written);
     text.begin("records_waiting", MetricText::GAUGE, "Records of calls that wait for the disk");
     text.add(records.waiting);
+    text.begin("records_spooled", MetricText::GAUGE, "Records of calls that wait on the disk for a database");
+    text.add(records.spooled);
     text.begin("records_lost_total", MetricText::COUNTER, "Records of calls for which there was no room");
     text.add(records.lost);
 }

@@ -8,8 +8,8 @@
 #include <map>
 #include <string>
 
+class CallRecords;
 class CallWatch;
-class RecordWriter;
 
 /// All figures of the gateway, gathered when somebody wants them. On the signalling thread.
 ///
@@ -22,7 +22,7 @@ public:
     /// written. `loop`: the one that is watched.
     GatewayMetrics(GatewayHost const& host, SignallingModules const& modules,
                    std::map<std::string, std::string> const& interfaces, CallWatch const& watch,
-                   CallMetrics const& calls, RecordWriter const* records, TYEventLoop& loop);
+                   CallMetrics const& calls, CallRecords const* records, TYEventLoop& loop);
 
     /// Throws std::bad_alloc.
     std::string getText() const;
@@ -38,6 +38,6 @@ private:
     std::map<std::string, std::string> const& m_interfaces;
     CallWatch const& m_watch;
     CallMetrics const& m_calls;
-    RecordWriter const* m_records;
+    CallRecords const* m_records;
     LoopLag m_lag;
 };

@@ -11,15 +11,20 @@ namespace
 constexpr std::int64_t NANOSECONDS = 1000000000; // in a second
 constexpr std::int64_t IN_MILLISECOND = 1000000;
 
-/// ISO 8601, of UTC.
-std::string TIME(std::int64_t nanoseconds)
+/// ISO 8601, of UTC, up to the second.
+std::string UP_TO_SECOND(std::int64_t nanoseconds)
 {
     std::time_t const seconds = nanoseconds / NANOSECONDS;
     std::tm parts = {};
     gmtime_r(&seconds, &parts);
     std::array<char, 32> text{};
     std::strftime(text.data(), text.size(), "%Y-%m-%dT%H:%M:%S", &parts);
-    return fmt::format("{}.{:03}Z", text.data(), nanoseconds % NANOSECONDS / IN_MILLISECOND);
+    return text.data();
+}
+
+std::string TIME(std::int64_t nanoseconds)
+{
+    return fmt::format("{}.{:03}Z", UP_TO_SECOND(nanoseconds), nanoseconds % NANOSECONDS / IN_MILLISECOND);
 }
 
 std::string SECONDS(std::optional<double> const& seconds) { return seconds ? fmt::format("{:.3f}", *seconds) : "null"; }
@@ -87,20 +92,31 @@ std::string LEG(CallRecord::Leg const& leg, bool isWhole)
 }
 } // namespace
 
-std::string CallJson::LINE_OF(CallRecord const& record, bool isWhole)
+std::string CallJson::LINE_OF(CallRecord const& record, Context const& context, End end)
 {
+    bool const isInterrupted = end == End::INTERRUPTED;
     std::string legs;
     for (CallRecord::Leg const& leg : record.legs)
-        legs += (legs.empty() ? "" : ",") + LEG(leg, isWhole);
-    return CC_JsonLine()
-        .add("version", static_cast<unsigned long long>(VERSION))
+        legs += (legs.empty() ? "" : ",") + LEG(leg, context.isWhole);
+    CC_JsonLine line;
+    line.add("version", static_cast<unsigned long long>(VERSION))
         .add("call", record.serial)
+        .add("process", context.process) // up to here the key
         .add("start", TIME(record.start))
         .addJson("ringingAfter", SECONDS(record.ringing))
         .addJson("answeredAfter", SECONDS(record.answered))
-        .addJson("endedAfter", SECONDS(record.ended))
+        .addJson("endedAfter", isInterrupted ? "null" : SECONDS(record.ended))
+        .addJson("interrupted", isInterrupted ? "true" : "false")
         .addJson("clearedBy", record.clearedBy != 0 ? std::to_string(record.clearedBy) : "null")
-        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false")
-        .addJson("legs", "[" + legs + "]")
-        .get();
+        .addJson("clearedByGateway", record.isClearedByGateway ? "true" : "false");
+    if (record.isEmergency)
+        line.addJson("emergency", "true");
+    return line.addJson("legs", "[" + legs + "]").get();
 }
+
+std::string CallJson::PROCESS_OF(std::int64_t start)
+{
+    return fmt::format("{}.{:09}Z", UP_TO_SECOND(start), start % NANOSECONDS);
+}
+
+std::string_view CallJson::KEY_OF(std::string_view line) { return line.substr(0, line.find(",\"start\"")); }

@@ -47,9 +47,9 @@ std::string CallLine::TEXT_OF(CallRecord const& record)
 {
     std::string const answer =
         record.answered ? fmt::format("answered after {:.3f} s", *record.answered) : "not answered";
-    std::string text =
-        fmt::format("call {}: {} to {}, {}, over after {:.3f} s{}{}", record.serial, PARTY_OF(record.getCaller()),
-                    PARTY_OF(record.getCalled()), answer, record.ended, END_OF(record), IDS_OF(record));
+    std::string text = fmt::format("call {}: {}{} to {}, {}, over after {:.3f} s{}{}", record.serial,
+                                   record.isEmergency ? "emergency, " : "", PARTY_OF(record.getCaller()),
+                                   PARTY_OF(record.getCalled()), answer, record.ended, END_OF(record), IDS_OF(record));
     if (record.legs.size() > 2)
         text += fmt::format(", {} parties in all", record.legs.size());
     return SAFE_TEXT(text);

@@ -3,6 +3,7 @@
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
+#include "host/EmergencyCall.h"
 #include "properties/CC_PropertyKeys.h"
 
 #include <chrono>
@@ -131,7 +132,8 @@ void JOIN(CallRecord& record, CC_CallLeg const& leg, double seconds)
     joined.dialled = joined.number;
 }
 
-void FOLLOW_STATE(CallRecord& record, CallRecord::Leg& known, int state, double seconds)
+/// Whether that says something new of the call.
+bool FOLLOW_STATE(CallRecord& record, CallRecord::Leg& known, int state, double seconds)
 {
     if (state == State::ALERTING && !known.isCalling && !record.ringing)
         record.ringing = seconds;
@@ -139,6 +141,9 @@ void FOLLOW_STATE(CallRecord& record, CallRecord::Leg& known, int state, double 
         record.answered = seconds;
     else if (state <= State::DISCONNECTING && state != State::IDLE && record.clearedBy == 0)
         record.clearedBy = known.serial;
+    else
+        return false;
+    return true;
 }
 } // namespace
 
@@ -196,7 +201,14 @@ void CallWatch::aboutCreateCall(CC_Context&, CC_Call* call)
 void CallWatch::onCallCallLegAdded(CC_Event<CC_Call> const& event)
 {
     CC_CallLeg const& leg = *CC_EvCallCallLegModified::FROM(event).getCallLeg();
-    note(event.getSource()->getSerial(), [&](Call& call) { JOIN(call.record, leg, call.getAge()); });
+    bool const isEmergency = event.getSource()->getProperties().get(EmergencyCall::PROPERTY) != nullptr;
+    note(event.getSource()->getSerial(),
+         [&](Call& call)
+         {
+             call.record.isEmergency = call.record.isEmergency || isEmergency;
+             JOIN(call.record, leg, call.getAge());
+             tellChangeOf(call);
+         });
 }
 
 void CallWatch::onCallCallLegRemoved(CC_Event<CC_Call> const& event)
@@ -222,9 +234,11 @@ void CallWatch::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
              CallRecord::Leg* const known = FIND(call.record, leg);
              if (known == nullptr)
                  return;
-             FOLLOW_STATE(call.record, *known, leg.getState(), call.getAge());
+             bool const isNew = FOLLOW_STATE(call.record, *known, leg.getState(), call.getAge());
              if (leg.getState() == State::RELEASED)
                  READ(leg, *known);
+             if (isNew)
+                 tellChangeOf(call);
          });
 }
 
@@ -247,6 +261,12 @@ void CallWatch::end(unsigned long long serial)
         {
             ++m_lost;
         }
+}
+
+void CallWatch::tellChangeOf(Call const& call) const
+{
+    for (Sink const& sink : m_changeSinks)
+        sink(call.record);
 }
 
 void CallWatch::noteCleared(unsigned long long serial)

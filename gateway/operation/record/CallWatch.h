@@ -28,6 +28,9 @@ public:
     void watch(String const& contextName);
     /// Tells of each call when it is over. A sink that throws std::bad_alloc has heard of the call in vain.
     void tell(Sink sink) { m_sinks.push_back(std::move(sink)); }
+    /// Tells of each call that is up, whenever it is more than before: a party has joined, it rang, it was answered or
+    /// is being cleared. The sink does not throw.
+    void tellChange(Sink sink) { m_changeSinks.push_back(std::move(sink)); }
     /// It was not a party that ended the call, or all that are up. @{
     void noteCleared(unsigned long long serial);
     void noteAllCleared();
@@ -76,8 +79,10 @@ private:
     template <class Work>
     void note(unsigned long long serial, Work const& work);
     void end(unsigned long long serial);
+    void tellChangeOf(Call const& call) const;
 
     std::unordered_map<unsigned long long, Call> m_calls; // by serial number
     std::vector<Sink> m_sinks;
+    std::vector<Sink> m_changeSinks;
     unsigned long long m_lost = 0;
 };

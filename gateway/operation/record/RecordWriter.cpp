@@ -1,59 +1,49 @@
 #include "operation/record/RecordWriter.h"
 
-#include "operation/record/CallJson.h"
-
-#include <cerrno>
+#include <algorithm>
 #include <chrono>
-#include <cstring>
-#include <fcntl.h>
 #include <new>
-#include <spdlog/spdlog.h>
-#include <stdexcept>
-#include <sys/stat.h>
-#include <unistd.h>
 #include <utility>
 
 namespace
 {
-constexpr std::chrono::milliseconds MOMENT(500); // until a disk that was full is tried again
-
-/// For the owner and the group alone: numbers are nobody else's business.
-int OPEN(std::string const& file)
-{
-    return open(file.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC | O_NOCTTY, 0640);
-}
+constexpr std::chrono::milliseconds MOMENT(500); // until what was not taken is tried again
+constexpr std::size_t AT_ONCE = 100;
 } // namespace
 
-RecordWriter::RecordWriter(RecordOptions const& options) : m_options(options), m_descriptor(OPEN(options.file))
+RecordWriter::RecordWriter(std::unique_ptr<RecordTarget> target, unsigned int kept, OnDone onDone)
+    : m_target(std::move(target)), m_kept(kept), m_onDone(std::move(onDone))
 {
-    if (m_descriptor < 0)
-        throw std::runtime_error(std::string("cannot be opened: ") + std::strerror(errno));
     m_thread = std::thread([this] { run(); });
 }
 
-RecordWriter::~RecordWriter()
+RecordWriter::~RecordWriter() { end(); }
+
+std::size_t RecordWriter::end()
 {
     {
         std::lock_guard const lock(m_mutex);
         m_isEnding = true;
     }
     m_changed.notify_all();
-    m_thread.join();
-    close(m_descriptor);
-    if (unsigned long long const lost = m_counters.lost + m_waiting.size(); lost != 0)
-        spdlog::error("{} records of calls are lost: {} takes no more", lost, m_options.file);
+    if (m_thread.joinable())
+        m_thread.join();
+    return m_waiting.size();
 }
 
-void RecordWriter::write(CallRecord const& record)
+void RecordWriter::write(std::string line, CallJournal::Ticket ticket)
 {
-    std::lock_guard const lock(m_mutex);
-    if (m_waiting.size() >= m_options.kept)
     {
-        ++m_counters.lost;
-        return;
+        std::lock_guard const lock(m_mutex);
+        if (m_waiting.size() < m_kept)
+        {
+            m_waiting.push_back({std::move(line), ticket});
+            m_changed.notify_all();
+            return;
+        }
+        ++m_lost;
     }
-    m_waiting.push_back(record);
-    m_changed.notify_all();
+    m_onDone(ticket);
 }
 
 void RecordWriter::reopen()
@@ -66,78 +56,92 @@ void RecordWriter::reopen()
 bool RecordWriter::hasRoom() const
 {
     std::lock_guard const lock(m_mutex);
-    return m_waiting.size() < m_options.kept;
+    return m_waiting.size() < m_kept;
 }
 
 RecordWriter::Counters RecordWriter::getCounters() const
 {
+    RecordTarget::Counters const target = m_target->getCounters();
     std::lock_guard const lock(m_mutex);
-    Counters counters = m_counters;
-    counters.waiting = m_waiting.size();
-    return counters;
+    return {target.written, m_waiting.size(), target.spooled, m_lost};
 }
 
 void RecordWriter::run()
 {
     std::unique_lock lock(m_mutex);
-    while (!m_isEnding)
+    while (true)
     {
-        m_changed.wait(lock, [this] { return m_isEnding || m_isReopening || !m_waiting.empty(); });
         if (std::exchange(m_isReopening, false))
-            openAgain();
-        writeWaiting(lock);
-        if (!m_waiting.empty() && !m_isEnding)
+            m_target->reopen();
+        bool const isBrought = bring(lock);
+        bool const isDelivered = deliver(lock); // also what was spooled just now
+        if (m_isEnding)
+            return;
+        if (isDelivered && isBrought)
+            m_changed.wait(lock, [this] { return m_isEnding || m_isReopening || !m_waiting.empty(); });
+        else
             m_changed.wait_for(lock, MOMENT, [this] { return m_isEnding || m_isReopening; });
     }
-    writeWaiting(lock);
 }
 
-/// Until one cannot be written. It stays in its place meanwhile, so that it counts as waiting.
-void RecordWriter::writeWaiting(std::unique_lock<std::mutex>& lock)
+/// Not at the end: it is safe where it is.
+bool RecordWriter::deliver(std::unique_lock<std::mutex>& lock)
 {
-    bool isWritten = true;
-    while (isWritten && !m_waiting.empty())
-    {
-        CallRecord const& record = m_waiting.front(); // stays where it is as others come
-        lock.unlock();
-        try
-        {
-            isWritten = writeLine(CallJson::LINE_OF(record, m_options.isWhole) + '\n');
-        }
-        catch (std::bad_alloc const&)
-        {
-            isWritten = false;
-        }
-        lock.lock();
-        if (!isWritten)
-            return;
-        m_waiting.pop_front();
-        ++m_counters.written;
-    }
-}
-
-bool RecordWriter::writeLine(std::string const& line) const
-{
-    struct stat before = {};
-    fstat(m_descriptor, &before);
-    ssize_t written = 0;
-    do
-        written = ::write(m_descriptor, line.data(), line.size());
-    while (written < 0 && errno == EINTR);
-    if (written == static_cast<ssize_t>(line.size()))
+    if (m_isEnding)
         return true;
-    if (written > 0 && S_ISREG(before.st_mode) && ftruncate(m_descriptor, before.st_size) != 0)
-        spdlog::error("{} ends with a piece of a record", m_options.file);
-    return false;
+    lock.unlock();
+    bool isDelivered = false;
+    try
+    {
+        isDelivered = m_target->deliver();
+    }
+    catch (std::bad_alloc const&)
+    {
+    }
+    lock.lock();
+    return isDelivered;
 }
 
-void RecordWriter::openAgain()
+/// Until one is not taken.
+bool RecordWriter::bring(std::unique_lock<std::mutex>& lock)
 {
-    int const descriptor = OPEN(m_options.file);
-    if (descriptor < 0)
+    while (!m_waiting.empty())
+        if (!bringSome(lock))
+            return false;
+    return true;
+}
+
+/// They stay in their place meanwhile, so that they count as waiting.
+bool RecordWriter::bringSome(std::unique_lock<std::mutex>& lock)
+{
+    RecordLines lines;
+    try
     {
-        spdlog::error("{} cannot be opened again: records go on where they were", m_options.file);
-        return;
+        for (std::size_t i = 0; i < std::min(m_waiting.size(), AT_ONCE); ++i)
+            lines.emplace_back(m_waiting[i].line); // which stays where it is as others come
     }
-    close(std::exchange(m_descriptor, descriptor));
+    catch (std::bad_alloc const&)
+    {
+    }
+    lock.unlock();
+    std::size_t const taken = take(lines);
+    lock.lock();
+    for (std::size_t i = 0; i < taken; ++i)
+    {
+        m_onDone(m_waiting.front().ticket);
+        m_waiting.pop_front();
+    }
+    return taken != 0;
+}
+
+std::size_t RecordWriter::take(RecordLines const& lines)
+{
+    try
+    {
+        return lines.empty() ? 0 : m_target->take(lines);
+    }
+    catch (std::bad_alloc const&)
+    {
+        return 0;
+    }
 }

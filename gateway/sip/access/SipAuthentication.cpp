@@ -41,9 +41,9 @@ SipAuthentication::SipAuthentication(std::string name, std::string realm, std::v
 {
 }
 
-SipAuthentication::Decision SipAuthentication::check(sip_t const* request, InternetAddress const& source)
+SipAuthentication::Decision SipAuthentication::check(sip_t const* request, InternetAddress const& source, bool isEmergency)
 {
-    if (m_bans.isBanned(source))
+    if (!isEmergency && m_bans.isBanned(source))
     {
         ++m_counters.ignored;
         return {IGNORE, {}, {}};

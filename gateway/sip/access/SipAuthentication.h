@@ -42,7 +42,8 @@ public:
     SipAuthentication(std::string name, std::string realm, std::vector<SipDigest::Algorithm> algorithms,
                       std::shared_ptr<SipPasswords const> passwords);
 
-    Decision check(sip_t const* request, InternetAddress const& source);
+    /// `isEmergency`: a ban is no reason not to ask.
+    Decision check(sip_t const* request, InternetAddress const& source, bool isEmergency = false);
     Counters const& getCounters() const { return m_counters; }
     std::size_t getNumberOfBanned() const { return m_bans.getNumberOfBanned(); }
 

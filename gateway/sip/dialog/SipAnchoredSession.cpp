@@ -55,7 +55,7 @@ bool SipAnchoredSession::open()
     if (m_leg != nullptr)
         return true;
     CallMedia* const call = CallMedia::OF(m_adapter.getDatapathContext());
-    m_leg = call != nullptr ? call->addLeg(m_local, *this) : nullptr;
+    m_leg = call != nullptr ? call->addLeg(m_local, *this, CallMedia::PART_OF(m_adapter)) : nullptr;
     if (m_leg != nullptr && m_interface.detectsDigits)
         m_leg->detectDigits(true);
     return m_leg != nullptr;

@@ -172,7 +172,7 @@ void SipEndpoint::onPeerReleased()
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
-    if (tryNextRoute(cause) || tellByTone(cause))
+    if (goElsewhere(cause) || tryNextRoute(cause) || tellByTone(cause))
         return;
     endDialog(cause);
     leaveCall(cause);
@@ -215,6 +215,8 @@ void SipEndpoint::leaveCall(SipCause const& cause)
         finishIfDone();
         return;
     }
+    m_routes.leave();
+    m_targetRoutes.leave();
     if (std::exchange(m_isTransferring, false) && m_target != nullptr)
         m_target->drop(cause.cause, 0); // our peer has gone: nobody is there to be transferred
     m_adapter.drop(sayWhy(cause) ? QCause::UNSPECIFIED : cause.cause, 0);

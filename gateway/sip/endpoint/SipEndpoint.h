@@ -13,10 +13,12 @@
 #include "sip/dialog/SipOfferAnswer.h"
 #include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
+#include "sip/message/SipCarriedHeaders.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
+#include "sip/message/SipRedirection.h"
 #include "sip/message/SipWay.h"
 
 #include <deque>
@@ -52,9 +54,10 @@ public:
     ~SipEndpoint() override;
 
     /// The calling side: takes over a new INVITE and dials the called party on the first of the routes, on the next one
-    /// when that reaches nobody. 0, or the status with which the transaction is given up at once.
+    /// when that reaches nobody; `user`: as whom the interface knows the caller. 0, or the status with which the
+    /// transaction is given up at once.
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
-                      RouteHunt const& routes);
+                      RouteHunt const& routes, std::string const& user);
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
     bool isReplaceable() const;
@@ -261,6 +264,22 @@ private:
     std::string getFinalCharge() const;
     void sendCharge();
 
+    // a call that goes elsewhere: SipEndpoint_Redirection.cpp
+    void tellRedirection(sip_t const* response);
+    bool goElsewhere(SipCause const& cause);
+    void follow(SipRedirection const& redirection, SipCause const& cause);
+    void handOn(SipRedirection const& redirection, SipCause const& cause);
+    void answerMoved(SipRedirection const& redirection, SipCause const& cause);
+    void dialAgain(SipCause const& cause, char const* why);
+
+    // headers that cross: SipEndpoint_Carried.cpp
+    void addCarried(CC_PropertyContainer& own, sip_t const* message);
+    void addUserToUser(CC_PropertyContainer& own, sip_t const* message);
+    void takeCarried(sip_t const* message);
+    std::string getCarried(SipCarriedHeaders::Message message);
+    std::string getUserToUser();
+    std::string getLastUserToUser();
+
     // either side: SipEndpoint.cpp and SipEndpoint_Dialog.cpp
 
     /// Runs what something that happened asks for. When memory is out in the middle of it the call is cleared, since
@@ -297,6 +316,8 @@ private:
     XCode writeOwn(CC_PropertyContainer const& properties);
     static std::string REASON_OF(sip_t const* message);
     char const* getContact() const; // of the dialog
+    void routeAsServer(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) const;
+    void routeAsClient(nta_leg_t* leg, nta_outgoing_t* transaction, sip_t const* response) const;
     bool isInConference() const;
     static std::string SESSION_OF(sip_t const* message);
     template <class Property>
@@ -328,6 +349,9 @@ private:
     unsigned char m_challenges = 0;        // of our peer in a row, to the request that goes out
     SipIdentity m_caller;                  // calling side
     RouteHunt m_routes;
+    RouteHunt m_targetRoutes;                   // of a transfer
+    std::vector<SipRedirection> m_redirections; // calling side: that we have followed
+    std::string m_user; // calling side: as whom the interface knows our peer; empty: it asks nobody
     QCause m_dialFailure = QCause::NONE;
     std::optional<SipCause> m_failure; // calling side: of which a tone tells our peer first
     bool m_hasRung = false;
@@ -373,12 +397,16 @@ private:
     bool m_isUnheard = false; // that one has said nothing yet
     std::string m_inviteUri;  // for an INVITE that is to be sent again
     std::string m_inviteHeaders;
+    std::string m_inviteRoute;
     std::string m_headersForTarget;
-    SipParty m_called;                    // as far as its number has come
-    std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
-    std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
-    std::vector<Attempt> m_attempts;      // called side
-    bool m_isNumberOpen = false;          // called side: digits may follow
+    std::string m_carried;                        // what our peer's last message had for the other side
+    unsigned int m_userToUsers = 0;               // that our peer has sent
+    std::optional<unsigned int> m_userToUserTold; // to our peer: its counter
+    SipParty m_called;                            // as far as its number has come
+    std::string m_firstOffer;                     // calling side: of the first INVITE, if others may follow
+    std::vector<nta_leg_t*> m_formerLegs;         // calling side: of INVITEs with fewer digits
+    std::vector<Attempt> m_attempts;              // called side
+    bool m_isNumberOpen = false;                  // called side: digits may follow
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has

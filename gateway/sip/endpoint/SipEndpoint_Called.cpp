@@ -2,6 +2,7 @@
 #include "sip/endpoint/SipEndpoint.h"
 
 #include "calls/CC_Call.h"
+#include "host/EmergencyCall.h"
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyCallProgressTone.h"
@@ -15,6 +16,7 @@
 #include "sip/message/SipPrivacy.h"
 #include "sip/message/SipProperty.h"
 #include "sip/message/SipPropertyId.h"
+#include "sip/message/SipService.h"
 
 #include <algorithm>
 #include <tuple>
@@ -94,7 +96,9 @@ XCode SipEndpoint::acceptOffer(CC_Call& call, String const& name, CC_PropertyCon
     m_hadPeer = true;
     if (isTraced())
         trace("did  accept as " + called.getText() + ", State=TRYING");
-    bool const isOutOfService = m_interface.getEnvironment().host.isBlocked(m_interface.getConfiguration().name);
+    bool const isEmergency = m_adapter.getCallProperty(EmergencyCall::PROPERTY) != nullptr;
+    bool const isOutOfService =
+        !isEmergency && m_interface.getEnvironment().host.isBlocked(m_interface.getConfiguration().name);
     if (isOutOfService)
         clear({QCause::TEMPORARY_FAILURE, 503, {}});
     else if (!m_session.open())
@@ -129,7 +133,10 @@ bool SipEndpoint::inviteNumber()
     SipConfiguration const& configuration = m_interface.getConfiguration();
     SipParty const& called = m_called;
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
-    std::string const uri = m_contacts.empty()
+    bool const isService = m_contacts.empty() && SipService::IS_ONE(called.number);
+    m_inviteRoute = isService ? "<" + SipAddress::MAKE_URI({}, getPeerAddress(), m_way) + ";lr>" : std::string();
+    std::string const uri = isService ? called.number
+                            : m_contacts.empty()
                                 ? SipAddress::MAKE_URI(called.getUser(), getPeerAddress(), m_way)
                                 : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), SipWay::UDP);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
@@ -141,7 +148,7 @@ bool SipEndpoint::inviteNumber()
     m_inviteHeaders = SipIdentity::GET_ASSERTED(caller.party, configuration.getAddress(), configuration.isTrusted);
     if (configuration.isTrusted || !diversion.isRestricted())
         m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
-    m_inviteHeaders += m_headersForTarget;
+    m_inviteHeaders += m_headersForTarget + getCarried(SipCarriedHeaders::REQUEST);
     m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
     return startInvite();
 }
@@ -253,6 +260,7 @@ bool SipEndpoint::startInvite()
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
         SIPTAG_SUPPORTED_STR(m_hasOffer ? "100rel, replaces, timer" : "replaces, timer"),
         TAG_IF(takesCharges, SIPTAG_ACCEPT_STR("application/sdp, application/vnd.etsi.aoc+xml")),
+        TAG_IF(!m_inviteRoute.empty(), SIPTAG_ROUTE_STR(m_inviteRoute.c_str())),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
@@ -307,6 +315,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     std::string const session = SESSION_OF(response);
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
+    addCarried(own, response);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
@@ -395,6 +404,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     CC_PropertyContainer own;
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
+    addCarried(own, response);
     addSession(own, session, true);
     addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);
@@ -429,6 +439,11 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         return;
     trace(isOurs ? "no answer to the INVITE (" + std::to_string(status) + ")" : "<- " + std::to_string(status));
     m_invite.forget();
+    if (!isOurs)
+    {
+        takeCarried(response);
+        tellRedirection(response);
+    }
     if (isOurs)
         leaveCall({status == 408 ? QCause::NO_USER_RESPONDING : QCause::DESTINATION_OUT_OF_ORDER, status, {}});
     else
@@ -485,7 +500,7 @@ void SipEndpoint::confirmDialog(sip_t const* response)
         m_leg = std::exchange(fork->leg, nullptr);
     }
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
-    nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
+    routeAsClient(m_leg, m_invite.transaction, response);
     m_timer.stop();
 }
 
@@ -515,7 +530,7 @@ bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
                                    SIPTAG_CSEQ(response->sip_cseq), TAG_END());
     if (fork.leg == nullptr)
         return false;
-    nta_leg_client_route(fork.leg, response->sip_record_route, response->sip_contact);
+    routeAsClient(fork.leg, m_invite.transaction, response);
     noteAllow(response);
     std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
     trace("-> PRACK");

@@ -1,6 +1,7 @@
 // The calling side: the INVITE was received, the peer leg says how it is answered.
 #include "sip/endpoint/SipEndpoint.h"
 
+#include "host/EmergencyCall.h"
 #include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_PropertyBoolean.h"
@@ -32,20 +33,22 @@ constexpr unsigned int MOST_FORKS = 32;
 
 /// What the INVITE tells of its side beyond the party that calls.
 void ADD_CALLING(CC_PropertyContainer& own, SipParty const& second, sip_t const* request, bool hasSession,
-                 bool isTrusted)
+                 bool isTrusted, std::vector<SipRedirection> const& redirections)
 {
     if (!second.number.empty())
         second.addAsSecondTo(own);
     SipDiversion diversion = SipDiversion::READ(request);
     if (!isTrusted)
         diversion.screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED; // whatever it says
+    for (SipRedirection const& redirection : redirections)
+        diversion.add(redirection.from, 1, redirection.isWithheld);
     diversion.addTo(own);
     ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, hasSession)); // else a new leg's: none
 }
 } // namespace
 
 int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request, SipIdentity const& caller,
-                               RouteHunt const& routes)
+                               RouteHunt const& routes, std::string const& user)
 {
     m_isCalling = true;
     m_isInCall = true;
@@ -53,6 +56,7 @@ int SipEndpoint::receiveInvite(nta_incoming_t* transaction, sip_t const* request
     {
         m_caller = caller;
         m_routes = routes;
+        m_user = user;
         return takeInvite(transaction, request);
     }
     catch (std::bad_alloc const&)
@@ -160,7 +164,7 @@ bool SipEndpoint::makeServerDialog(nta_incoming_t* transaction, sip_t const* req
     if (m_leg == nullptr)
         return false;
     nta_leg_tag(m_leg, nta_incoming_tag(transaction, nullptr));
-    nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
+    routeAsServer(m_leg, transaction, request);
     m_transaction = transaction;
     nta_incoming_bind(transaction, HANDLE_ACK_OR_CANCEL, this);
     advance(SipDialogState::INVITE_IN);
@@ -174,7 +178,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
     SipParty const called = m_routes.isNumberShaped() ? SipParty::OF_USER(m_routes.getNumber()) : m_called;
     SipIdentity const& caller = m_caller;
     CC_PropertyContainer own;
-    ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted);
+    ADD_CALLING(own, caller.second, request, m_hasOffer, m_interface.getConfiguration().isTrusted, m_redirections);
+    addCarried(own, request);
     if (m_hasOffer)
         m_session.addOffer(own, SESSION_OF(request));
     CC_PropertyContainer offer;
@@ -184,6 +189,8 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
         ADD(offer, CC_PropertyBoolean(SipPropertyId::SECURED, true));
     CC_PropertyContainer call;
     ADD(call, CC_PropertyUnsigned(SipPropertyId::CALL_NUMBER, m_callNumber)); // for logs alone
+    if (m_routes.isEmergency())
+        ADD(call, CC_PropertyBoolean(EmergencyCall::PROPERTY, true));
     if (isTraced())
         trace("did  dial " + provider + " (" + called.getUser() + ") as " + caller.party.getText() +
               ", State=CONNECTED, " + TEXT_OF(own));
@@ -198,22 +205,13 @@ XCode SipEndpoint::dial(sip_t const* request, MG_IContext* datapathContext)
                           !isOverlapping(), m_session.getCapability(), datapathContext, &own, &offer, &call);
 }
 
-/// Nobody was reached, and our peer has heard nothing: with a new leg in another call, but the same media, and as if
-/// the INVITE had just come.
+/// Nobody was reached, and our peer has heard nothing.
 bool SipEndpoint::tryNextRoute(SipCause const& cause)
 {
     if (!m_isCalling || m_dialog != SipDialogState::INVITE_RECEIVED || m_hasRung || m_hasEarlyMedia || m_fork != 0 ||
         m_dialFailure != QCause::NONE || !m_routes.goOn(static_cast<unsigned int>(cause.cause)))
         return false;
-    TYPtr<MG_IContext> const media(m_adapter.getDatapathContext());
-    trace("did  drop, State=RELEASED: the next route");
-    spdlog::debug("call {} {} goes on to {} after cause {} ({})", m_callNumber, getName().view(),
-                  m_routes.getProvider(), static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause));
-    m_hadPeer = false;
-    m_adapter.drop(cause.cause, 0);
-    SipHeldMessage const request(nta_incoming_getrequest(m_transaction));
-    if (!dial(sip_object(request.get()), media.get()).isOk())
-        clear({QCause::NETWORK_OUT_OF_ORDER, 0, {}});
+    dialAgain(cause, "the next route");
     return true;
 }
 
@@ -369,12 +367,13 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
         return true; // it would have to bear an offer, which nobody has made
     if (!m_wantsReliable && !(m_allowsReliable && isAnswer))
         return false;
-    std::string const identity =
+    std::string const headers =
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
-                                  m_interface.getConfiguration().isTrusted);
+                                  m_interface.getConfiguration().isTrusted) +
+        getCarried(SipCarriedHeaders::RESPONSE);
     nta_reliable_t const* const reliable = nta_reliable_treply(
         m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
-        SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!identity.empty(), SIPTAG_HEADER_STR(identity.c_str())),
+        SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(isAnswer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
         TAG_IF(isAnswer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
     if (reliable == nullptr)
@@ -446,7 +445,7 @@ nta_leg_t* SipEndpoint::makeFork()
     if (leg != nullptr)
     {
         nta_leg_tag(leg, nullptr);
-        nta_leg_server_route(leg, request->sip_record_route, request->sip_contact);
+        routeAsServer(leg, m_transaction, request);
     }
     return leg;
 }
@@ -471,7 +470,8 @@ void SipEndpoint::answerWith(std::string const& session)
     m_timer.stop();
     answerFromPeer(SIP_200_OK, session);
     advance(SipDialogState::ANSWER_OUT);
-    if (unsigned int const longest = m_interface.getConfiguration().longestCall; longest != 0)
+    if (unsigned int const longest = m_interface.getConfiguration().longestCall;
+        longest != 0 && !m_routes.isEmergency())
         m_lengthTimer.start(longest * 1000);
     m_wasAnswered = true;
     ++m_interface.getEnvironment().host.counters.answered;
@@ -488,7 +488,8 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
     if (m_hasOffer)
         m_quality.noteAnswer(session);
     trace("-> " + std::to_string(status) + (session.empty() ? "" : " with a session description"));
-    std::string const headers = identity + (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
+    std::string const headers = identity + getCarried(SipCarriedHeaders::RESPONSE) +
+                                (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())
         m_ownSession = session;
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
@@ -501,7 +502,9 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
 void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)
 {
     trace("-> " + std::to_string(status) + (reasonHeader.empty() ? "" : ", Reason: ") + reasonHeader);
+    std::string const headers = getCarried(SipCarriedHeaders::RESPONSE);
     nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
+                        TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
                         TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
     forgetTransaction(); // the stack goes on repeating the answer until its ACK
 }

@@ -1,4 +1,5 @@
 // What either side does inside its dialog, and how a dialog ends.
+#include "sip/dialog/SipTarget.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
@@ -60,6 +61,7 @@ int SipEndpoint::onBye(sip_t const* request)
         answerFinally(487, {});
     else if (!wasUp)
         return 200; // both sides hang up at once: ours is answered as well
+    takeCarried(request);
     endOffers();
     forgetTransaction();
     leaveCall(cause);
@@ -95,9 +97,11 @@ void SipEndpoint::sendBye(SipCause const& cause)
 {
     std::string const reason = cause.getReasonHeader(true);
     std::string const charge = getFinalCharge();
+    std::string const userToUser = getLastUserToUser();
     trace("-> BYE" + std::string(charge.empty() ? "" : " with a charge") + ", Reason: " + reason);
     m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
                                          SIPTAG_REASON_STR(reason.c_str()),
+                                         TAG_IF(!userToUser.empty(), SIPTAG_HEADER_STR(userToUser.c_str())),
                                          TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipCharge::TYPE)),
                                          TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
     if (m_bye != nullptr)
@@ -158,6 +162,22 @@ std::string SipEndpoint::REASON_OF(sip_t const* message)
     }
     return text;
 }
+
+/// Where requests in the dialog go from now on. @{
+void SipEndpoint::routeAsServer(nta_leg_t* leg, nta_incoming_t* transaction, sip_t const* request) const
+{
+    bool const isBehindNat = m_interface.getConfiguration().isBehindNat;
+    SipHeldMessage const message(isBehindNat ? nta_incoming_getrequest(transaction) : nullptr);
+    nta_leg_server_route(leg, request->sip_record_route, SipTarget(request, message.get()).get());
+}
+
+void SipEndpoint::routeAsClient(nta_leg_t* leg, nta_outgoing_t* transaction, sip_t const* response) const
+{
+    bool const isBehindNat = m_interface.getConfiguration().isBehindNat;
+    SipHeldMessage const message(isBehindNat ? nta_outgoing_getresponse(transaction) : nullptr);
+    nta_leg_client_route(leg, response->sip_record_route, SipTarget(response, message.get()).get());
+}
+/// @}
 
 char const* SipEndpoint::getContact() const
 {

@@ -44,8 +44,9 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
         trace("-> 484");
         return ADDRESS_INCOMPLETE; // the number was complete, or is shorter than what there is
     }
-    RouteHunt const routes = m_interface.getEnvironment().host.findRoutes(m_interface.getConfiguration().name, number,
-                                                                          m_caller.party.getUser(), m_callNumber);
+    m_routes.leave(); // else a limit of one call would be reached
+    RouteHunt const routes = m_interface.getEnvironment().host.findRoutes(
+        m_interface.getConfiguration().name, number, m_caller.party.getUser(), m_callNumber, m_user);
     std::string const digits = number.substr(known.size());
     bool const isSameRoute = !routes.isEmpty() && routes.getProvider() == m_routes.getProvider() &&
                              routes.getNumber() == m_routes.getNumber() + digits;

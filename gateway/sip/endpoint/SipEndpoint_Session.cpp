@@ -81,7 +81,7 @@ int SipEndpoint::onOffer(nta_incoming_t* transaction, sip_t const* request)
     int status = checkOffer(transaction, request);
     if (status == 0)
     {
-        nta_leg_server_route(m_leg, request->sip_record_route, request->sip_contact);
+        routeAsServer(m_leg, transaction, request);
         status = takeOffer(transaction, session, isUpdate);
     }
     if (status != 0)
@@ -391,7 +391,7 @@ void SipEndpoint::onOfferAccepted(sip_t const* response)
 {
     bool const isUpdate = nta_outgoing_method(m_reinvite.transaction) == sip_method_update;
     std::string const session = SESSION_OF(response);
-    nta_leg_client_route(m_leg, response->sip_record_route, response->sip_contact);
+    routeAsClient(m_leg, m_reinvite.transaction, response);
     m_isOffering = false;
     takeTimerOfAnswer(response);
     if (!m_offer.empty())

@@ -206,8 +206,9 @@ void SipEndpoint::transferTo(std::string const& number)
 void SipEndpoint::dialTarget(std::string const& number)
 {
     SipEnvironment& environment = m_interface.getEnvironment();
-    RouteHunt const routes = environment.host.findRoutes(m_interface.getConfiguration().name, number,
-                                                         SipProperty::TEXT_OF(m_adapter.getOwnE164()), m_callNumber);
+    m_targetRoutes = environment.host.findRoutes(m_interface.getConfiguration().name, number,
+                                                 SipProperty::TEXT_OF(m_adapter.getOwnE164()), m_callNumber, m_user);
+    RouteHunt const& routes = m_targetRoutes;
     if (routes.isEmpty() || environment.host.isEnding)
     {
         tellTransferStatus(QCause::NO_ROUTE_TO_DESTINATION);

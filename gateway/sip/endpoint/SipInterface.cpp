@@ -93,6 +93,13 @@ SipInterface::~SipInterface()
     m_cleanUpEvent->destroy();
 }
 
+void SipInterface::follow(SipConfiguration const& configuration)
+{
+    auto const passwords = m_configuration.passwords; // which others share
+    m_configuration = configuration;
+    m_configuration.passwords = passwords;
+}
+
 XCode SipInterface::dial(CC_Call& call, String const&, String const& destination,
                          CC_PropertyContainer const& offerProperties)
 {
@@ -150,10 +157,11 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         nta_msg_discard(m_agent.get(), message);
         return;
     }
-    if (m_authentication && !authenticate(message, sip))
-        return;
     bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && sip->sip_to->a_tag == nullptr;
-    if (isNewCall && !admits(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
+    bool const isEmergency = isNewCall && isEmergencyCall(sip);
+    if (m_authentication && !authenticate(message, sip, isEmergency))
+        return;
+    if (isNewCall && !isEmergency && !admits(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
     {
         nta_msg_treply(m_agent.get(), message, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
                        TAG_END());
@@ -169,15 +177,28 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
     nta_incoming_destroy(transaction);
 }
 
+/// What it costs where there is no such number is a look at a flag.
+bool SipInterface::isEmergencyCall(sip_t const* invite) const
+try
+{
+    GatewayHost const& host = m_environment.host;
+    return host.routing.hasEmergency() &&
+           host.isEmergency(m_configuration.name, SipIdentity::READ_CALLED(invite).getUser());
+}
+catch (std::bad_alloc const&)
+{
+    return false;
+}
+
 /// Whether the sender is known; else the message is done with. A CANCEL cannot be asked for (RFC 3261, 22.1), and one
 /// that comes here finds nothing to cancel.
-bool SipInterface::authenticate(msg_t* message, sip_t const* sip)
+bool SipInterface::authenticate(msg_t* message, sip_t const* sip, bool isEmergency)
 try
 {
     if (sip->sip_request->rq_method == sip_method_cancel)
         return true;
     SipAuthentication::Decision const decision =
-        m_authentication->check(sip, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa));
+        m_authentication->check(sip, AddressRange::ADDRESS_OF(msg_addr(message)->su_sa), isEmergency);
     if (decision.verdict == SipAuthentication::ASK)
         nta_msg_treply(m_agent.get(), message, SIP_401_UNAUTHORIZED, SIPTAG_HEADER_STR(decision.challenge.c_str()),
                        TAG_END());
@@ -235,15 +256,19 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     if (request->sip_replaces != nullptr)
         return receiveReplacing(transaction, request);
     std::string const number = SipIdentity::READ_CALLED(request).getUser();
-    SipIdentity const caller = SipIdentity::READ_CALLER(request, m_configuration.isTrusted);
+    SipIdentity caller = SipIdentity::READ_CALLER(request, m_configuration.isTrusted);
+    caller.normalise(m_environment.host.dialPlan);
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
     bool const isConference = m_conference != nullptr && number == m_configuration.conference;
-    RouteHunt const routes =
-        isConference ? RouteHunt::TO(m_conference->getName().c_str(), number)
-                     : m_environment.host.findRoutes(m_configuration.name, number, caller.party.getUser(), callNumber);
+    RouteHunt const routes = isConference
+                                 ? RouteHunt::TO(m_conference->getName().c_str(), number)
+                                 : m_environment.host.findRoutes(m_configuration.name, number, caller.party.getUser(),
+                                                                 callNumber, m_knownUser);
     if (routes.isEmpty())
-        return refuseUnrouted(transaction, callNumber, number);
+        return refuseUnrouted(transaction, callNumber, number, routes.getRefusal());
+    if (routes.isEmergency())
+        spdlog::warn("call {} {} is an emergency call to '{}'", callNumber, m_configuration.name, number);
     SipEndpoint* endpoint = nullptr;
     try
     {
@@ -255,7 +280,7 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
         ++m_environment.host.counters.failed;
         return 503;
     }
-    return endpoint->receiveInvite(transaction, request, caller, routes);
+    return endpoint->receiveInvite(transaction, request, caller, routes, m_knownUser);
 }
 
 SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const
@@ -283,15 +308,18 @@ int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* req
     return makeEndpoint(callNumber, &source).receiveReplacing(transaction, request, *replaced);
 }
 
-int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number)
+int SipInterface::refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number,
+                                 QCause why)
 {
-    bool const isBeginning = m_configuration.overlap == SipConfiguration::Overlap::INVITE &&
-                             m_environment.host.routing.isBeginning(m_configuration.name, number);
-    SipCause const cause = isBeginning ? SipCause{QCause::INVALID_NUMBER_FORMAT, 484, {}}
-                                       : SipCause{QCause::NO_ROUTE_TO_DESTINATION, 404, {}};
+    bool const isFull = why != QCause::NO_ROUTE_TO_DESTINATION;
+    bool const isBeginning = !isFull && m_configuration.overlap == SipConfiguration::Overlap::INVITE &&
+                             m_environment.host.isBeginning(m_configuration.name, number);
+    SipCause const cause =
+        isBeginning ? SipCause{QCause::INVALID_NUMBER_FORMAT, 484, {}} : SipCause{why, isFull ? 503u : 404u, {}};
     ++m_environment.host.counters.failed;
-    spdlog::info("call {} {} refused: no route to '{}', cause {} ({}), SIP {}", callNumber, m_configuration.name,
-                 number, static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause), cause.sipCode);
+    spdlog::info("call {} {} refused: no route to '{}'{}, cause {} ({}), SIP {}", callNumber, m_configuration.name,
+                 number, isFull ? " has room" : "", static_cast<int>(cause.cause), CAUSE_SHORT_NAME(cause.cause),
+                 cause.sipCode);
     nta_incoming_treply(transaction, static_cast<int>(cause.sipCode), nullptr,
                         SIPTAG_REASON_STR(cause.getReasonHeader(false).c_str()), TAG_END());
     return static_cast<int>(cause.sipCode);

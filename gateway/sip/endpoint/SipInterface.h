@@ -54,6 +54,8 @@ public:
 
     String const& getName() const { return m_name; }
     SipConfiguration const& getConfiguration() const { return m_configuration; }
+    /// Takes over what may change while calls are up; `configuration` differs in nothing else. The passwords stay.
+    void follow(SipConfiguration const& configuration);
     SipEnvironment& getEnvironment() const { return m_environment; }
     nta_agent_t* getAgent() const { return m_agent.get(); }
     /// Where the peer reaches us, for what goes that way.
@@ -105,12 +107,13 @@ public:
 private:
     static int HANDLE_MESSAGE(SipInterface* interface, nta_agent_t* agent, msg_t* message, sip_t* sip);
     void onMessage(msg_t* message, sip_t* sip);
-    bool authenticate(msg_t* message, sip_t const* sip);
+    bool isEmergencyCall(sip_t const* invite) const;
+    bool authenticate(msg_t* message, sip_t const* sip, bool isEmergency);
     int onRequest(nta_incoming_t* transaction, sip_t const* request);
     int receiveInvite(nta_incoming_t* transaction, sip_t const* request);
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request);
     int checkInvite(nta_incoming_t* transaction, sip_t const* request) const;
-    int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number);
+    int refuseUnrouted(nta_incoming_t* transaction, unsigned int callNumber, std::string const& number, QCause why);
     bool admits(InternetAddress const& source);
     SipEndpoint& makeEndpoint(unsigned int callNumber, InternetAddress const* source = nullptr);
     static void CLEAN_UP(void* interface);

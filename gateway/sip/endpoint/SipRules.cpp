@@ -1,6 +1,7 @@
 #include "sip/endpoint/SipRules.h"
 
 #include "sip/message/SipBody.h"
+#include "sip/message/SipService.h"
 
 #include <algorithm>
 #include <strings.h>
@@ -19,7 +20,8 @@ bool CAME_OVER(sip_t const* request, char const* protocol)
 bool IS_SCHEME_SERVED(sip_t const* request)
 {
     auto const scheme = static_cast<url_type_e>(request->sip_request->rq_url->url_type);
-    return scheme == url_sip || scheme == url_tel || (scheme == url_sips && CAME_OVER(request, "SIP/2.0/TLS"));
+    return scheme == url_sip || scheme == url_tel || (scheme == url_sips && CAME_OVER(request, "SIP/2.0/TLS")) ||
+           !SipService::READ(*request->sip_request->rq_url).empty();
 }
 
 bool IS_SIPS(url_t const& uri) { return uri.url_type == url_sips; }

@@ -116,7 +116,7 @@ SipCause SipCause::FROM_RESPONSE(unsigned int status, std::string_view phrase, s
     SipCause result;
     result.cause = reason.q850Cause != 0 ? static_cast<QCause>(reason.q850Cause) : CAUSE_OF_STATUS(status);
     if (status < 400 && reason.q850Cause == 0)
-        result.cause = QCause::REDIRECTION_TO_NEW_DESTINATION; // redirections are not followed
+        result.cause = QCause::REDIRECTION_TO_NEW_DESTINATION; // one that is not followed
     result.sipCode = status;
     result.text = reason.text.empty() ? SipReason::UNQUOTE(phrase) : reason.text;
     return result;

@@ -2,6 +2,7 @@
 
 #include "sip/message/SipAddress.h"
 #include "sip/message/SipPrivacy.h"
+#include "sip/message/SipService.h"
 
 namespace
 {
@@ -33,6 +34,18 @@ std::optional<SipParty> READ_ASSERTED(sip_t const* message, bool isTrusted)
     return asserted;
 }
 
+void NORMALISE(SipParty& party, DialPlan const& plan)
+{
+    if (party.type != QTypeOfNumber::UNKNOWN)
+        return;
+    SipParty const whole = SipParty::OF_USER(plan.normalise(party.number));
+    if (whole.type != QTypeOfNumber::INTERNATIONAL)
+        return;
+    party.number = whole.number;
+    party.type = whole.type;
+    party.plan = whole.plan;
+}
+
 SipNameAddr ADDRESS_OF(sip_addr_t const& header) { return SipNameAddr::OF(header.a_display, *header.a_url, nullptr); }
 } // namespace
 
@@ -55,9 +68,20 @@ SipIdentity SipIdentity::READ_CALLER(sip_t const* invite, bool isTrusted)
     return identity;
 }
 
+void SipIdentity::normalise(DialPlan const& plan)
+{
+    if (plan.isEmpty())
+        return;
+    NORMALISE(party, plan);
+    NORMALISE(second, plan);
+}
+
 SipParty SipIdentity::READ_CALLED(sip_t const* invite)
 {
-    SipParty called = SipParty::OF_USER(SipNameAddr::OF(nullptr, *invite->sip_request->rq_url, nullptr).user);
+    std::string const service = SipService::READ(*invite->sip_request->rq_url);
+    SipParty called = service.empty()
+                          ? SipParty::OF_USER(SipNameAddr::OF(nullptr, *invite->sip_request->rq_url, nullptr).user)
+                          : SipParty::OF_USER(service);
     called.name = READ_NAME_OF_TO(invite);
     return called;
 }

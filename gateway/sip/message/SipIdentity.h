@@ -1,5 +1,6 @@
 #pragma once
 
+#include "configuration/DialPlan.h"
 #include "configuration/SocketAddress.h"
 #include "sip/message/SipParty.h"
 
@@ -26,7 +27,9 @@ struct SipIdentity
     SipParty second; ///< no number: there is none
 
     static SipIdentity READ_CALLER(sip_t const* invite, bool isTrusted = true);
-    /// The number of the Request-URI, the name of To.
+    /// Numbers that came with a prefix become international ones.
+    void normalise(DialPlan const& plan);
+    /// The number of the Request-URI, or the whole of one that is a service's (RFC 5031); the name of To.
     static SipParty READ_CALLED(sip_t const* invite);
     /// Who is at the other end, by P-Asserted-Identity of a response, with the name of To for want of another; nothing
     /// when nobody is asserted.

@@ -18,7 +18,8 @@ XCode SipPropertyId::DECLARE()
           Names{SECURED, "Secured", "secured"}, Names{HEADERS_FOR_TARGET, "Headers-For-Target", "headers-for-target"},
           Names{SESSION_OFFER, "Session-Offer", "session-offer"},
           Names{SESSION_ANSWER, "Session-Answer", "session-answer"}, Names{CALL_NUMBER, "Call-Number", "call-number"},
-          Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}})
+          Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}, Names{REDIRECTION, "Redirection", "redirection"},
+          Names{CARRIED_HEADERS, "Carried-Headers", "carried-headers"}})
         if (std::strcmp(NAME(names.id), names.longName) != 0)
             if (XCode const result = CC_PropertyTable::DECLARE(names.id, names.longName, names.shortName);
                 !result.isOk())

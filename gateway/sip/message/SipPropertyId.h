@@ -26,6 +26,10 @@ inline constexpr unsigned int HEADERS_FOR_TARGET = CC_PropertyId::FIRST_OF_MODUL
 inline constexpr unsigned int CONFERENCE = CC_PropertyId::FIRST_OF_MODULES + 6;
 /// CC_PropertyBoolean, of an offer: the caller asks for TLS on every hop of SIP
 inline constexpr unsigned int SECURED = CC_PropertyId::FIRST_OF_MODULES + 7;
+/// CC_PropertyString, of a leg: header lines that its side lets through (SipCarriedHeaders)
+inline constexpr unsigned int CARRIED_HEADERS = CC_PropertyId::FIRST_OF_MODULES + 8;
+/// CC_PropertyParametrizedString, of a leg: its peer has sent the call elsewhere (SipRedirection)
+inline constexpr unsigned int REDIRECTION = CC_PropertyId::FIRST_OF_MODULES + 9;
 
 /// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
 /// already; otherwise as CC_PropertyTable::DECLARE.

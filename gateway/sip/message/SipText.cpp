@@ -30,6 +30,16 @@ bool SipText::EQUALS_IGNORING_CASE(std::string_view left, std::string_view right
                       [](unsigned char a, unsigned char b) { return std::tolower(a) == std::tolower(b); });
 }
 
+bool SipText::IS_ONE_TOKEN(std::string_view text)
+{
+    constexpr std::string_view MARKS = "-.!%*_+`'~";
+    return !text.empty() && std::all_of(text.begin(), text.end(),
+                                        [&](unsigned char c) {
+                                            return (c < 0x80 && std::isalnum(c) != 0) ||
+                                                   MARKS.find(static_cast<char>(c)) != std::string_view::npos;
+                                        });
+}
+
 bool SipText::IS_ONE_OF(std::string_view text, std::initializer_list<char const*> words)
 {
     return std::any_of(words.begin(), words.end(), [&](char const* word) { return EQUALS_IGNORING_CASE(text, word); });

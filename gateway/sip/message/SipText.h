@@ -11,6 +11,7 @@ bool IS_CONTROL(char c);
 /// Without blanks and line breaks at its ends.
 std::string_view TRIM(std::string_view text);
 bool EQUALS_IGNORING_CASE(std::string_view left, std::string_view right);
+bool IS_ONE_TOKEN(std::string_view text);                                        ///< of RFC 3261, 25.1
 bool IS_ONE_OF(std::string_view text, std::initializer_list<char const*> words); ///< in whatever case
 /// Cuts the text up to `separator` off `rest`, and the separator; trimmed. A separator inside quotes does not count.
 std::string_view CUT(std::string_view& rest, char separator);

@@ -66,7 +66,8 @@ SipBindingStore::SipBindingStore(std::string const& file, std::string interface,
                         execute("CREATE TABLE IF NOT EXISTS binding (interface TEXT NOT NULL, user TEXT NOT NULL, "
                                 "uri TEXT NOT NULL, call_id TEXT NOT NULL, sequence INTEGER NOT NULL, "
                                 "preference INTEGER NOT NULL, until INTEGER NOT NULL, place INTEGER NOT NULL, "
-                                "PRIMARY KEY (interface, user, uri))");
+                                "called TEXT NOT NULL DEFAULT '', PRIMARY KEY (interface, user, uri))");
+    execute("ALTER TABLE binding ADD COLUMN called TEXT NOT NULL DEFAULT ''"); // refused where it has that already
     umask(before);
     if (!isGood)
     {
@@ -101,14 +102,16 @@ void SipBindingStore::write(std::string const& user, std::vector<SipBinding> bin
 
 void SipBindingStore::load(std::function<void(std::string const&, SipBinding const&)> const& restore)
 {
-    Statement const rows = PREPARE(m_database, "SELECT user, uri, call_id, sequence, preference, until FROM binding "
-                                               "WHERE interface = ? AND until > ? ORDER BY user, place");
+    Statement const rows =
+        PREPARE(m_database, "SELECT user, uri, call_id, sequence, preference, until, called FROM binding "
+                            "WHERE interface = ? AND until > ? ORDER BY user, place");
     BIND(rows, 1, m_interface);
     sqlite3_bind_int64(rows.get(), 2, SipBindings::NOW());
     while (sqlite3_step(rows.get()) == SQLITE_ROW)
         restore(TEXT(rows, 0),
                 {TEXT(rows, 1), TEXT(rows, 2), static_cast<std::uint32_t>(sqlite3_column_int64(rows.get(), 3)),
-                 static_cast<unsigned int>(sqlite3_column_int64(rows.get(), 4)), sqlite3_column_int64(rows.get(), 5)});
+                 static_cast<unsigned int>(sqlite3_column_int64(rows.get(), 4)), sqlite3_column_int64(rows.get(), 5),
+                 TEXT(rows, 6)});
 }
 
 void SipBindingStore::run()
@@ -153,7 +156,9 @@ bool SipBindingStore::writeUser(std::string const& user, std::vector<SipBinding>
     bool isGood = sqlite3_step(removal.get()) == SQLITE_DONE;
     for (std::size_t i = 0; isGood && i < bindings.size(); ++i)
     {
-        Statement const row = PREPARE(m_database, "INSERT INTO binding VALUES (?, ?, ?, ?, ?, ?, ?, ?)");
+        Statement const row =
+            PREPARE(m_database, "INSERT INTO binding (interface, user, uri, call_id, sequence, "
+                                "preference, until, place, called) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?)");
         BIND(row, 1, m_interface);
         BIND(row, 2, user);
         BIND(row, 3, bindings[i].uri);
@@ -162,6 +167,7 @@ bool SipBindingStore::writeUser(std::string const& user, std::vector<SipBinding>
         sqlite3_bind_int64(row.get(), 6, bindings[i].preference);
         sqlite3_bind_int64(row.get(), 7, bindings[i].until);
         sqlite3_bind_int64(row.get(), 8, static_cast<sqlite3_int64>(i));
+        BIND(row, 9, bindings[i].called);
         isGood = sqlite3_step(row.get()) == SQLITE_DONE;
     }
     return isGood;

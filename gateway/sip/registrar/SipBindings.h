@@ -15,6 +15,7 @@ struct SipBinding
     std::uint32_t sequence = 0;
     unsigned int preference = 1000; ///< thousandths: the contact's q
     long long until = 0;            ///< seconds of the time of day
+    std::string called{};           ///< where he is called instead; empty: at the URI
 };
 
 /// Which contacts the users of a registrar have, as REGISTER changes them (RFC 3261, 10.3), in memory. One thread.
@@ -27,6 +28,7 @@ public:
         std::string uri;
         unsigned int preference = 1000;
         unsigned int seconds = 0; ///< 0: to be forgotten
+        std::string called{};     ///< as SipBinding's
     };
     enum Result
     {

@@ -1,5 +1,6 @@
 #include "sip/registrar/SipRegistrar.h"
 
+#include "sip/dialog/SipTarget.h"
 #include "sip/message/SipAddress.h"
 #include "sip/registrar/SipBindingStore.h"
 #include "sip/stack/SipGuard.h"
@@ -57,7 +58,7 @@ std::vector<std::string> SipRegistrar::find(std::string_view user) const
 {
     std::vector<std::string> uris;
     for (SipBinding& binding : m_bindings.find(user))
-        uris.push_back(std::move(binding.uri));
+        uris.push_back(std::move(binding.called.empty() ? binding.uri : binding.called));
     return uris;
 }
 
@@ -105,6 +106,7 @@ int SipRegistrar::readWishes(nta_incoming_t* transaction, sip_t const* request,
                              std::vector<SipBindings::Wish>& wishes) const
 {
     SipHome const home(su_home_create());
+    SipHeldMessage const message(m_configuration.isBehindNat ? nta_incoming_getrequest(transaction) : nullptr);
     for (sip_contact_t const* contact = request->sip_contact; contact != nullptr; contact = contact->m_next)
     {
         if (IS_EVERYTHING(contact))
@@ -122,7 +124,8 @@ int SipRegistrar::readWishes(nta_incoming_t* transaction, sip_t const* request,
         }
         wishes.push_back(
             {uri, PREFERENCE_OF(contact->m_q),
-             static_cast<unsigned int>(std::min<unsigned long>(seconds, m_configuration.longestRegistration))});
+             static_cast<unsigned int>(std::min<unsigned long>(seconds, m_configuration.longestRegistration)),
+             m_configuration.isBehindNat ? SipTarget::AT_SOURCE(*contact->m_url, message.get()) : std::string()});
     }
     return 0;
 }
@@ -135,6 +138,8 @@ bool SipRegistrar::isServed(url_t const& uri) const
     SocketAddress const& self = m_configuration.getAddress();
     if (uri.url_host == self.host && std::to_string(self.port) == url_port(&uri))
         return false; // we would call ourselves
+    if (m_configuration.isBehindNat)
+        return true; // he is called where he is, and is served there
     try
     {
         std::string host = uri.url_host;

@@ -62,6 +62,11 @@ void CHECK_PORT(SocketAddress const& address, int type, char const* transport)
 
 namespace
 {
+/// When an answer goes to the port that its request came from (RFC 3581), in the stack's words. @{
+constexpr int ASKED_FOR = 1;
+constexpr int ALWAYS = 2;
+/// @}
+
 url_string_t const* const NO_PORT =
     std::bit_cast<url_string_t const*>(std::intptr_t{-1}); // null would be one on every address
 
@@ -88,11 +93,11 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
 {
     SipGuard::PROVE(stack, configuration.listen.host);
     unsigned int const idle = configuration.tcpIdle * 1000;
-    SipAgent agent(nta_agent_create(stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1),
-                                    NTATAG_MERGE_482(1), NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)),
-                                    NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
-                                    NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(1),
-                                    TAG_IF(means.resolver != nullptr, SRESTAG_RESOLV_CONF(means.resolver)), TAG_END()));
+    SipAgent agent(nta_agent_create(
+        stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1), NTATAG_MERGE_482(1),
+        NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)), NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
+        NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(configuration.isBehindNat ? ALWAYS : ASKED_FOR),
+        TAG_IF(means.resolver != nullptr, SRESTAG_RESOLV_CONF(means.resolver)), TAG_END()));
     for (Transport const& transport : {Transport{"udp", SipWay::UDP, configuration.listensOnUdp},
                                        Transport{"tcp", SipWay::TCP, configuration.listensOnTcp},
                                        Transport{"tls", SipWay::SIPS, configuration.listensOnTls}})

@@ -84,6 +84,16 @@ expect_report() {
     grep -qxF "exchange: $1" "$WORK/exchange.out" || fail "the exchange does not report: $1, but $(cat "$WORK/exchange.out")"
 }
 
+# await_wire FILTER: until the exchange has seen such a message
+await_wire() {
+    local i
+    for ((i = 0; i < 50; i++)); do
+        [[ -n $(tshark -r "$CAPTURE" -Y "$1" 2>/dev/null) ]] && return 0
+        sleep 0.1
+    done
+    fail "the exchange sees nothing of $1"
+}
+
 # expect_wire FILTER FIELD VALUE [TIMES]: what another reader finds in that field of the messages that the filter takes
 expect_wire() {
     local found count

@@ -1,89 +1,114 @@
-# A SIP phone calls a number of the exchange: numbers, names and causes cross, and another reader finds on the D channel
-# what was said.
+# A SIP phone dials a number of the exchange digit by digit; another subscriber answers, to whom the number is forwarded. The
+# exchange charges while speech goes both ways, and releases the call: charges and cause arrive as they were said.
 . "$(dirname "$0")/isdn.bash"
 
-write_isdn_configuration
-PLAN=$(
-    cat <<END
-[[number]]
-number = "4989123"
-connected = "89124"
-name = "Bob"
-units = 3
-interval = 50
-
-[[number]]
-number = "4989200"
-does = "busy"
-
+head -c 16000 /dev/urandom >"$WORK/speech"
+write_isdn_configuration '' $'overlap = "invite"\ncharges = "tell"'
+start_exchange <<END
 [[number]]
 number = "4989124"
+connected = "89300"
+name = "Bob"
+speaks = "file"
+file = "$WORK/speech"
+record = "$WORK/heard"
 units = 25
 currency = "EUR"
-releases = 150
-
-[[number]]
-number = "4989300"
-does = "reject"
-cause = 88
+interval = 400
+releases = 1500
+release-cause = 41
 END
-)
-start_exchange <<<"$PLAN"
 start_isdn_gateway
 
-answered() {
-    send_invite
+session_of_phone="${SDP_OF_CALLER/40000/[media_port]}"
+dial() { # DIGITS SEQUENCE
+    send_text retrans "$(request_text INVITE "$2" '[branch]' '' | sed "s/\[service\]/$1/")" "$session_of_phone"
     expect 100
-    expect 180
-    expect 200 body "m=audio" P-Asserted-Identity: "89124"
-    send_ack
-    pause 300
-    send_bye "Reason: Q.850;cause=31"
-    expect 200
 }
-refused() {
-    send_invite
+refused_as_incomplete() { # DIGITS SEQUENCE STEPS-SINCE-ITS-INVITE
+    expect 484 CSeq: "$2 INVITE"
+    send_text '' "$(request_text ACK "$2" "[branch-$3]" '[peer_tag_param]' | sed "s/\[service\]/$1/")" ''
+}
+phone() {
+    dial 498 1
+    pause 100
+    send_text retrans "$(request_text INVITE 2 '[branch]' '' | sed 's/\[service\]/4989/')" "$session_of_phone"
+    refused_as_incomplete 498 1 5
     expect 100
-    expect "$STATUS" Reason: "Q.850;cause=$CAUSE"
-    send_ack
+    pause 100
+    send_text retrans "$(request_text INVITE 3 '[branch]' '' | sed 's/\[service\]/4989124/')" "$session_of_phone"
+    refused_as_incomplete 4989 2 6
+    expect 100
+    expect_optional 180
+    expect 200 body "m=audio" P-Asserted-Identity: "Bob.*89300"
+    send_ack '' 3
+    echo '<label id="talk"/>'
+    expect_request INFO Content-Type: "application/vnd.etsi.aoc.xml" | sed 's/<recv /<recv optional="true" next="charged" /'
+    expect_request BYE Reason: "Q.850;cause=41" body "aoc-e.*currency-id.EUR.*currency-amount"
+    respond_in_dialog "200 OK"
+    echo '<nop next="over"/><label id="charged"/>'
+    respond_once "200 OK"
+    echo '<nop next="talk"/><label id="over"/><nop/>'
+}
+amounts() { # ELEMENT: the amounts of money that the phone was told in it
+    python3 - "$WORK/messages" "$1" <<'END'
+import re, sys
+text = open(sys.argv[1], errors="replace").read()
+bodies = re.findall(f"<{sys.argv[2]}>.*?</{sys.argv[2]}>", text, re.S)
+told = [re.search(r"currency-id>(\w+)<.*?currency-amount>([0-9.]+)<", body, re.S).groups() for body in bodies]
+print(", ".join(dict.fromkeys(" ".join(one) for one in told)))
+END
+}
+# both ways: each block of 20 ms that the exchange said went to the phone, which sent it back
+expect_speech_back() {
+    python3 - "$WORK/speech" "$WORK/heard" <<'END' || fail "the speech is not what was said"
+import sys
+said, heard = (open(name, "rb").read() for name in sys.argv[1:])
+same = sum(said[i:i + 160] in heard for i in range(0, len(said), 160))
+print(f"speech: {same} of {len(said) // 160} blocks of 20 ms came back from the phone as the exchange had said them, to the bit")
+sys.exit(same < 20)
+END
 }
 
-expect_caller answered 4989123
-expect_isdn_causes 1 31
-STATUS=486 CAUSE=17 expect_caller refused 4989200
-expect_isdn_causes 2 17
-STATUS=503 CAUSE=88 expect_caller refused 4989300
-expect_isdn_causes 3 88
-STATUS=404 CAUSE=1 expect_caller refused 4989400
-expect_isdn_causes 4 1
+expect_caller phone 498 -rtp_echo -trace_msg -message_file "$WORK/messages"
+expect_log 'call 1 a .calling side. released: cause 41 '
 stop_exchange
-expect_report "cause 31: 1"
 expect_wellformed
-SETUP='q931.message_type == 0x05'
-expect_wire "$SETUP" q931.called_party_number.digits 4989123
-expect_wire "$SETUP" q931.calling_party_number.digits 4420 4
-expect_wire "$SETUP" q931.information_transfer_capability 0x00 4
-expect_wire 'q931.message_type == 0x45' q931.cause_value 31
+expect_wire 'q931.message_type == 0x05' q931.called_party_number.digits 498
+expect_wire 'q931.message_type == 0x45' q931.cause_value 41
+digits=$(tshark -r "$CAPTURE" -Y 'q931.message_type == 0x7b' -T fields -e q931.called_party_number.digits 2>/dev/null | xargs)
+[[ $digits == "9 1 2 4" ]] || fail "digits of INFORMATION: $digits"
+expect_log 'call 1: 4420 on a to 89300 on b, '
+during=$(amounts aoc-d)
+total=$(amounts aoc-e)
+[[ $during == "EUR 0.25"* && -n $total && $during == *"$total" ]] || fail "charges of '$during', then '$total'"
+echo "dialled: 498 in SETUP, $digits in INFORMATION; forwarded to and answered by Bob, 89300"
+expect_speech_back
+echo "charged while it was up: $during; at the end: $total"
+echo "released by the exchange with cause 41, by the gateway with BYE and cause 41"
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+
+# in units, by an interface that tells nobody
+write_isdn_configuration
+start_exchange <<END
+[[number]]
+number = "4989123"
+units = 3
+interval = 50
+END
+start_isdn_gateway
+answered() {
+    call_up
+    pause 300
+    send_bye
+    expect 200
+}
+RELAYED=m=audio expect_caller answered 4989123
+await_wire 'q931.message_type == 0x5a'
+stop_exchange
 # AOC-D in units (operation 34) of 3, 6, ...: the subtotal; AOC-E (36) goes with RELEASE
 expect_wire 'q931.message_type == 0x62 && q932.ros.argument[0:12] == 30:0a:a1:05:30:03:02:01:03:82:01:00' q932.ros.local 34
 expect_wire 'q931.message_type == 0x4d && q932.ros.local == 36' q932.ros.local 36
 expect_trace 'told peer Charge=3 units .subTotal.'
-tell_trace 'Charge=[0-9]+ units .*'
-stop_gateway "4 calls placed, 1 answered, 1 cleared, 3 failed"
-
-# the same charges where the phone is told them, in money
-charged() {
-    call_up
-    expect_request INFO Content-Type: "application/vnd.etsi.aoc.xml" body \
-        "aoc-d..charging-info.subtotal.*currency-id.EUR.*currency-amount.0.25.*/aoc-d"
-    respond_once "200 OK"
-    expect_request BYE body "aoc-e.*currency-amount.0.25./currency-amount"
-    respond_in_dialog "200 OK"
-}
-write_isdn_configuration '' 'charges = "tell"'
-start_exchange <<<"$PLAN"
-start_isdn_gateway
-RELAYED=m=audio expect_caller charged 4989124
-stop_exchange
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 finish

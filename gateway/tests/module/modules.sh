@@ -13,7 +13,7 @@ refused() {
 
 refused "ghost: is not a key, and there is no module $MODULES/callcontrol-gateway-ghost.so" $'[[ghost]]\nname = "a"\n'
 refused "\.\./fakes: is neither a key nor the name of a module" $'[["../fakes"]]\nname = "a"\n'
-refused "old: $MODULES/callcontrol-gateway-old.so is a module of version 0, this gateway's are of version 3" \
+refused "old: $MODULES/callcontrol-gateway-old.so is a module of version 0, this gateway's are of version 4" \
     $'[[old]]\nname = "a"\n'
 refused "text: $MODULES/callcontrol-gateway-text.so: (file too short|invalid ELF header)" $'[[text]]\nname = "a"\n'
 refused "empty: $MODULES/callcontrol-gateway-empty.so is no module of a gateway" $'[[empty]]\nname = "a"\n'

@@ -2,7 +2,9 @@
 
 #include "configuration/Configuration.h"
 
+#include <array>
 #include <gtest/gtest.h>
+#include <string_view>
 
 namespace
 {
@@ -30,6 +32,15 @@ std::string CHANGED(std::string text, std::string const& what, std::string const
     return ConfigurationChange::FIND_RESTART(Configuration::PARSE(FILE_TEXT, "f"), Configuration::PARSE(text, "f"));
 }
 std::string CHANGED(std::string const& what, std::string const& into) { return CHANGED(FILE_TEXT, what, into); }
+
+/// Whether a change of that text is one of its module.
+bool IS_CHANGED(std::string const& what, std::string const& into)
+{
+    std::string text = FILE_TEXT;
+    text.replace(text.find(what), what.size(), into);
+    return ConfigurationChange::IS_OF_MODULE("sip", Configuration::PARSE(FILE_TEXT, "f"),
+                                             Configuration::PARSE(text, "f"));
+}
 } // namespace
 
 TEST(ConfigurationChange, OfRoutesLimitsAndLogLevelsCanBeFollowed)
@@ -53,10 +64,29 @@ TEST(ConfigurationChange, OfWhatIsOpenNeedsARestart)
     EXPECT_EQ(CHANGED("[control]", "[metrics]\nlisten = \"127.0.0.1:9100\"\n[control]"), "metrics");
 }
 
-TEST(ConfigurationChange, OfInterfacesNeedsARestart)
+TEST(ConfigurationChange, OfModulesNeedsARestart)
 {
-    EXPECT_EQ(CHANGED("port = 1", "port = 2"), "sip");
-    EXPECT_EQ(CHANGED("port = 1", ""), "sip");
     EXPECT_EQ(CHANGED("[[route]]", "[[isdn]]\nname = \"c\"\n[[route]]"), "isdn");
-    EXPECT_EQ(CHANGED("[[route]]", "[[sip]]\nname = \"c\"\n[[route]]"), "sip");
+    EXPECT_EQ(ConfigurationChange::FIND_RESTART(Configuration::PARSE("[[sip]]\nname = \"a\"", "f"),
+                                                Configuration::PARSE("[[isdn]]\nname = \"a\"", "f")),
+              "sip");
+}
+
+TEST(ConfigurationChange, OfInterfacesIsForTheirModules)
+{
+    EXPECT_FALSE(IS_CHANGED("[gateway]", "[gateway]\nmax-hops = 3"));
+    EXPECT_TRUE(IS_CHANGED("port = 1", "port = 2"));
+    EXPECT_TRUE(IS_CHANGED("port = 1", ""));
+    EXPECT_TRUE(IS_CHANGED("[[route]]", "[[sip]]\nname = \"c\"\n[[route]]"));
+}
+
+TEST(ConfigurationSection, FindsTheKeyThatIsAnother)
+{
+    static constexpr std::array<std::string_view, 1> FREE{"free"};
+    auto const findChange = [](char const* before, char const* after)
+    { return ConfigurationSection::PARSE(before, "f").findChange(ConfigurationSection::PARSE(after, "f"), FREE); };
+    EXPECT_EQ(findChange("a = 1\nfree = 1", "free = 2\na = 1"), "");
+    EXPECT_EQ(findChange("a = 1", "a = 2\nfree = 2"), "a");
+    EXPECT_EQ(findChange("a = 1", ""), "a");
+    EXPECT_EQ(findChange("", "a = [1]"), "a");
 }

@@ -40,7 +40,7 @@ change 's/^max-calls = .*/max-calls = "many"/'
 refuse 'gateway.max-calls: expected a whole number'
 cp "$WORK/good.toml" "$WORK/gateway.toml"
 change "s/^listen = \"$HOST:$PORT_B\"/listen = \"$HOST:9\"/"
-refuse 'sip: a change of it needs a restart'
+refuse 'sip\[1\].listen: a change of it needs a restart'
 rm "$WORK/gateway.toml"
 refuse 'file: cannot be read'
 expect_caller refused 7789123 -cp $((PORT + 7)) -mp $((PORT + 24))

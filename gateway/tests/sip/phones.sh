@@ -1,13 +1,15 @@
 # Two phones call each other through the gateway, which relays what they say: each hears the other to the bit, also after
-# one of them has held and resumed. What was measured is in the quality record.
+# one of them has held and resumed; and so it is kept. What was measured is in the quality record.
 . "$(dirname "$0")/../lib.bash"
 . "$HERE/phones.bash"
 
+mkdir "$WORK/kept"
 write_configuration
 cat >>"$WORK/gateway.toml" <<END
 
 [media]
 mode = "relay"
+recordings = "$WORK/kept"
 first-port = $((PORT + 8))
 last-port = $((PORT + 15))
 END
@@ -27,6 +29,11 @@ expect_causes 1 16
 stop_phones
 expect_speech alice bob 250
 expect_speech bob alice 250
+for number in 0 1; do
+    python3 "$HERE/speech.py" channel "$WORK"/kept/*.wav $number "$WORK/kept.$number.wav"
+done
+echo -n 'alice, as she was kept: ' && python3 "$HERE/speech.py" compare "$WORK/alice/said.wav" "$WORK/kept.0.wav" 250 || fail "what was kept of alice"
+echo -n 'bob, as he was kept: ' && python3 "$HERE/speech.py" compare "$WORK/bob/said.wav" "$WORK/kept.1.wav" 250 || fail "what was kept of bob"
 expect_trace 'State=HELD'
 expect_trace 'Quality-Of-Service=.*PCMU'
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"

@@ -1,4 +1,5 @@
-# A phone transfers the one that it talks to: that one and the target then hear each other, on the ports they had.
+# A phone holds the one that it talks to, resumes, and is the one that transfers it: that one and the target then hear each
+# other, on the ports they had.
 . "$(dirname "$0")/../lib.bash"
 . "$HERE/target.bash"
 . "$HERE/phones.bash"
@@ -20,11 +21,16 @@ start_phone 77 "$PORT_TARGET" "$PORT_C" $((PORT + 26)) answermode=auto
 tell_phone "$PORT_CALLER" dial "sip:bob@$HOST:$PORT_A"
 expect_log 'Accept call'
 sleep 3
+tell_phone "$PORT_CALLEE" hold
+sleep 0.5
+tell_phone "$PORT_CALLEE" resume
+sleep 1
 tell_phone "$PORT_CALLEE" transfer "sip:77@$HOST:$PORT_B"
 expect_log 'Transfer call'
 sleep 3
 tell_phone "$PORT_CALLER" hangup
 expect_log 'call 2 c \(called side\) released: cause 16 '
+expect_trace 'State=HELD'
 stop_phones
 expect_speech alice bob 100
 expect_speech bob alice 100

@@ -40,17 +40,17 @@ bool Capture::open(std::string const& file)
     return std::fwrite(header.data(), 1, header.size(), m_file) == header.size();
 }
 
-void Capture::write(std::span<unsigned char const> frame, bool isOurs)
+void Capture::write(std::span<unsigned char const> frame, bool isNetworks)
 {
     if (m_file == nullptr)
         return;
     timeval now = {};
     gettimeofday(&now, nullptr);
     std::vector<unsigned char> lapd;
-    PUT(lapd, isOurs ? 4 : 0, 2); // sent, or received
+    PUT(lapd, isNetworks ? 4 : 0, 2); // sent, or received: as the network sees it
     PUT(lapd, 0, 2);
-    PUT(lapd, 1, 2);              // length of the address,
-    PUT(lapd, isOurs ? 1 : 0, 1); // which says the side: network or user
+    PUT(lapd, 1, 2);                  // length of the address,
+    PUT(lapd, isNetworks ? 1 : 0, 1); // which says the side: network or user
     PUT(lapd, 0, 4);
     PUT(lapd, 0, 3);
     PUT(lapd, PROTOCOL, 2);

@@ -16,8 +16,8 @@ public:
 
     /// Whether the file can be written.
     bool open(std::string const& file);
-    /// `isOurs`: the network side, which the exchange is, sent it. Nothing happens before `open`.
-    void write(std::span<unsigned char const> frame, bool isOurs);
+    /// `isNetworks`: that side sent it. Nothing happens before `open`.
+    void write(std::span<unsigned char const> frame, bool isNetworks);
 
 private:
     std::FILE* m_file = nullptr;

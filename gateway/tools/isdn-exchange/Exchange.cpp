@@ -8,7 +8,11 @@ namespace
 {
 constexpr int CHECK_SUM = 2;
 constexpr int CHANNEL_MASK = 0xff;
-constexpr int DEFLECTION = 4; // Q.931; the stack says 3
+constexpr int TYPE_SHIFT = 4;
+constexpr int PRESENTATION_SHIFT = 5;
+constexpr unsigned int HOLD = 50; // milliseconds
+constexpr unsigned int TURN = 10; // the same, until a call that waits for others asks again
+constexpr int DEFLECTION = 4;     // Q.931; the stack says 3
 constexpr std::size_t FIRST_DIGITS = 2;
 constexpr long long TICK = 20; // milliseconds
 
@@ -60,7 +64,7 @@ void WRITE_CHARGE(std::string const& currency, unsigned int units, Advice& advic
 Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report& report)
     : m_line(std::move(wires)), m_plan(plan), m_capture(capture), m_report(report)
 {
-    m_stack = pri_new_cb(0, PRI_NETWORK, PRI_SWITCH_EUROISDN_E1, READ, WRITE, this);
+    m_stack = pri_new_cb(0, plan.isUser ? PRI_CPE : PRI_NETWORK, PRI_SWITCH_EUROISDN_E1, READ, WRITE, this);
     pri_set_overlapdial(m_stack, 1);
     pri_facility_enable(m_stack);
     pri_aoc_events_enable(m_stack, 1);
@@ -85,7 +89,7 @@ int Exchange::READ(pri* stack, void* buffer, int length)
     self->m_hasRead = got != 0;
     if (got == 0)
         return 0;
-    self->m_capture.write({octets, got}, false);
+    self->m_capture.write({octets, got}, self->m_plan.isUser);
     if (self->isHit(self->m_plan.lost))
         return 0;
     std::memset(octets + got, 0, CHECK_SUM);
@@ -99,7 +103,7 @@ int Exchange::WRITE(pri* stack, void* buffer, int length)
         return length;
     std::span<unsigned char const> const frame(static_cast<unsigned char const*>(buffer),
                                                static_cast<std::size_t>(length - CHECK_SUM));
-    self->m_capture.write(frame, true);
+    self->m_capture.write(frame, !self->m_plan.isUser);
     if (!self->isHit(self->m_plan.lost))
         self->m_line.send(frame);
     if (self->isHit(self->m_plan.repeated))
@@ -153,7 +157,7 @@ void Exchange::takeEvent(pri_event& event)
         if (!std::exchange(m_isUp, true))
             for (Plan::Call const& own : m_plan.calls)
                 for (unsigned int i = 0; i < own.count; ++i)
-                    m_timers.emplace(m_now + own.after + i * own.interval, [this, &own] { place(own); });
+                    m_timers.emplace(m_now + own.after + i * own.interval, [this, &own] { placeInTurn(own); });
         break;
     case PRI_EVENT_RING:
         onRing(event.ring);
@@ -237,6 +241,8 @@ void Exchange::begin(CallHandle const& call)
               {
                   if (one->subscriber->isInBand)
                       speak(one, one->subscriber->speaks, one->subscriber->file, one->subscriber->record);
+                  if (!one->subscriber->userUser.empty())
+                      pri_call_set_useruser(one->handle, one->subscriber->userUser.c_str());
                   pri_acknowledge(m_stack, one->handle, one->channel, one->subscriber->isInBand);
               });
     if (subscriber.does == "answer")
@@ -250,13 +256,14 @@ void Exchange::answer(CallHandle const& call)
     call->isUp = true;
     pri_party_connected_line connected = {};
     connected.id = PARTY(subscriber.connected.empty() ? subscriber.number : subscriber.connected, subscriber.name,
-                         PRI_NATIONAL_ISDN, PRI_PRES_NETWORK_NUMBER);
+                         subscriber.connectedType << TYPE_SHIFT | PRI_NPI_E163_E164,
+                         subscriber.connectedPresentation << PRESENTATION_SHIFT | subscriber.connectedScreening);
     pri_connected_line_update(m_stack, call->handle, &connected);
-    if (!subscriber.userUser.empty())
-        pri_call_set_useruser(call->handle, subscriber.userUser.c_str());
-    pri_answer(m_stack, call->handle, call->channel, 0);
+    pri_answer(m_stack, call->handle, call->channel, subscriber.isForeign);
     if (call->speech == nullptr)
         speak(call, subscriber.speaks, subscriber.file, subscriber.record);
+    if (subscriber.holds)
+        hold(call);
     if (subscriber.units != 0)
         after(subscriber.interval, call, [this](CallHandle const& one) { charge(one); });
     if (subscriber.releases != 0)
@@ -270,6 +277,20 @@ void Exchange::speak(CallHandle const& call, std::string const& what, std::strin
     IsdnDescriptor channel = m_line.openChannel(static_cast<unsigned int>(call->channel & CHANNEL_MASK));
     if (channel.get() >= 0)
         call->speech = std::make_unique<Speech>(std::move(channel), what, file, record);
+}
+
+/// What its user does is told to the far side's (EN 300 141-1), again and again.
+void Exchange::hold(CallHandle const& call)
+{
+    after(HOLD, call,
+          [this](CallHandle const& one)
+          {
+              one->isHeld = !one->isHeld;
+              if (one->isUp)
+                  pri_notify(m_stack, one->handle, 0,
+                             one->isHeld ? PRI_NOTIFY_REMOTE_HOLD : PRI_NOTIFY_REMOTE_RETRIEVAL);
+              hold(one);
+          });
 }
 
 /// AOC-D, again and again (EN 300 182-1).
@@ -320,11 +341,13 @@ void Exchange::onHangUp(pri_event& event)
 
 // --- calls of its own ------------------------------------------------------------------------------------------------
 
-/// The network begins at the top.
+/// The network begins at the top, the user at the bottom.
 int Exchange::hunt() const
 {
-    for (int timeslot = static_cast<int>(IsdnLine::LAST_TIMESLOT); timeslot > 0; --timeslot)
+    int const last = static_cast<int>(IsdnLine::LAST_TIMESLOT);
+    for (int i = 1; i <= last; ++i)
     {
+        int const timeslot = m_plan.isUser ? i : last + 1 - i;
         bool const isTaken =
             std::any_of(m_calls.begin(), m_calls.end(),
                         [&](auto const& one) { return (one.second->channel & CHANNEL_MASK) == timeslot; });
@@ -332,6 +355,16 @@ int Exchange::hunt() const
             return timeslot;
     }
     return 0;
+}
+
+void Exchange::placeInTurn(Plan::Call const& own)
+{
+    auto const count =
+        std::count_if(m_calls.begin(), m_calls.end(), [](auto const& one) { return one.second->own != nullptr; });
+    if (m_plan.atOnce == 0 || static_cast<unsigned int>(count) < m_plan.atOnce)
+        place(own);
+    else
+        m_timers.emplace(m_now + TURN, [this, &own] { placeInTurn(own); });
 }
 
 void Exchange::place(Plan::Call const& own)
@@ -354,15 +387,16 @@ void Exchange::place(Plan::Call const& own)
     pri_sr* const request = pri_sr_new();
     pri_sr_set_channel(request, call->channel, own.isExclusive, 0);
     pri_sr_set_bearer(request, BEARER(own.bearer), own.bearer == "digital" ? -1 : PRI_LAYER_1_ALAW);
-    pri_sr_set_called(request, first.data(), PRI_UNKNOWN | PRI_NPI_E163_E164, !own.isOverlap);
-    pri_party_id const caller =
-        PARTY(own.from, own.name, own.type << 4 | PRI_NPI_E163_E164, own.presentation << 5 | own.screening);
+    pri_sr_set_called(request, first.data(), static_cast<int>(own.toType << TYPE_SHIFT | own.toPlan), !own.isOverlap);
+    pri_party_id const caller = PARTY(own.from, own.name, own.type << TYPE_SHIFT | own.plan,
+                                      own.presentation << PRESENTATION_SHIFT | own.screening);
     pri_sr_set_caller_party(request, &caller);
     if (!own.redirecting.empty())
     {
         pri_party_redirecting redirecting = {};
-        redirecting.from = PARTY(own.redirecting, {}, PRI_NATIONAL_ISDN, 0);
-        redirecting.count = 1;
+        redirecting.from = PARTY(own.redirecting, {}, own.redirectingType << TYPE_SHIFT | PRI_NPI_E163_E164,
+                                 own.redirectingPresentation << PRESENTATION_SHIFT);
+        redirecting.count = static_cast<int>(own.redirections);
         redirecting.reason =
             static_cast<int>(own.reason) == DEFLECTION ? PRI_REDIR_DEFLECTION : static_cast<int>(own.reason);
         pri_sr_set_redirecting_parties(request, &redirecting);
@@ -387,9 +421,12 @@ void Exchange::onAnswer(pri_event_answer const& answer)
     if (call == nullptr || call->own == nullptr)
         return;
     ++m_report.placedAnswered;
+    call->isUp = true;
     call->channel = answer.channel;
     speak(call, call->own->speaks, call->own->file, call->own->record);
     if (!call->own->keys.empty())
         pri_keypad_facility(m_stack, call->handle, call->own->keys.c_str());
-    after(call->own->length, call, [this](CallHandle const& one) { release(one, PRI_CAUSE_NORMAL_CLEARING); });
+    if (call->own->holds)
+        hold(call);
+    after(call->own->length, call, [this](CallHandle const& one) { release(one, one->own->cause); });
 }

@@ -31,7 +31,7 @@ struct Report
     std::map<std::string, unsigned int> keyed;
 };
 
-/// The network side of one line: answers calls by its plan, and places its own.
+/// The far side of one line, the network's or the user's: answers calls by its plan, and places its own.
 ///
 ///     Exchange exchange(std::move(wires), plan, capture, report);
 ///     // whenever its descriptor is readable, and every few milliseconds:
@@ -59,6 +59,7 @@ private:
         Plan::Subscriber const* subscriber = nullptr;
         Plan::Call const* own = nullptr;
         bool isUp = false;
+        bool isHeld = false;
         bool isAcknowledged = false;
         unsigned int units = 0;
         std::unique_ptr<Speech> speech;
@@ -78,8 +79,10 @@ private:
     void begin(CallHandle const& call);
     void answer(CallHandle const& call);
     void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
+    void hold(CallHandle const& call);
     void charge(CallHandle const& call);
     void chargeFinally(Call& call);
+    void placeInTurn(Plan::Call const& own);
     void place(Plan::Call const& own);
     void dialOn(CallHandle const& call);
     int hunt() const;

@@ -20,9 +20,14 @@ struct Plan
         std::string file;               ///< raw A-law
         std::string record;             ///< where what it hears is kept, raw A-law
         std::string connected;          ///< the number that answers, if another
+        unsigned int connectedType = 2; ///< 0 to 7
+        unsigned int connectedPresentation = 0;
+        unsigned int connectedScreening = 3;
         std::string name;
         std::string userUser;
         bool isInBand = false;       ///< its ringing tone comes in the channel
+        bool isForeign = false;      ///< it is no ISDN telephone
+        bool holds = false;          ///< it holds the call that is up, and takes it back, again and again
         unsigned int units = 0;      ///< charged each interval; 0: nothing is
         unsigned int interval = 100; ///< milliseconds
         std::string currency;        ///< in hundredths of it; empty: units
@@ -31,21 +36,29 @@ struct Plan
     struct Call
     {
         std::string to;
+        unsigned int toType = 0; ///< of the called number, 0 to 7
+        unsigned int toPlan = 1; ///< 0 to 15
         std::string from;
         unsigned int type = 0; ///< of the calling number, 0 to 7
+        unsigned int plan = 1;
         unsigned int presentation = 0;
         unsigned int screening = 0;
         std::string name;
         std::string redirecting;
+        unsigned int redirectingType = 2;
+        unsigned int redirectingPresentation = 0;
         unsigned int reason = 0;
+        unsigned int redirections = 1;
         std::string userUser;
         std::string bearer = "speech"; ///< speech, audio, digital
         bool isOverlap = false;
         bool isExclusive = false;
+        bool holds = false; ///< as of a subscriber
         unsigned int count = 1;
         unsigned int after = 500;    ///< milliseconds until the first
         unsigned int interval = 100; ///< milliseconds between two
         unsigned int length = 500;   ///< milliseconds that an answered one lasts
+        int cause = 16;              ///< with which it ends then
         std::string keys;            ///< keyed in once it is answered
         std::string speaks = "silence";
         std::string file;
@@ -53,9 +66,11 @@ struct Plan
     };
 
     std::string line;            ///< the path where lines come in
+    bool isUser = false;         ///< the user's side of the lines; else the network's
     std::string capture;         ///< a file of packets for the D channel; empty: none
     unsigned int seconds = 0;    ///< until it ends by itself; 0: it does not
     bool endsAfterCalls = false; ///< when its own are over
+    unsigned int atOnce = 0;     ///< calls of its own; those that are too many wait. 0: no limit
     unsigned int lost = 0;       ///< frames of the D channel, per cent
     unsigned int repeated = 0;   ///< the same
     std::vector<Subscriber> subscribers;

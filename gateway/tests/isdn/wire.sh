@@ -1,0 +1,60 @@
+# The table wire/wire.table, row by row: what is said on one wire and what is heard on the other, between SIP and lines of
+# which the gateway is the user (b) and the network (c). All rows are calls through one gateway.
+. "$(dirname "$0")/isdn.bash"
+
+WIRE=$(dirname "$0")/wire
+read -r rows from_sip to_sip < <(python3 "$WIRE/wire.py" write "$WIRE/wire.table" "$WORK") || fail "no table"
+write_isdn_configuration '' 'codecs = ["PCMA", "CLEARMODE"]'
+sed -i "/^\[\[route/,\$d; s/^last-port = .*/last-port = $((PORT + 199))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
+cat >>"$WORK/gateway.toml" <<END
+[[isdn]]
+name = "c"
+line = "$LINE.c"
+side = "network"
+[isdn.timers]
+reopening = 50
+$(for from in a b c; do
+    for to in a:44 b:49 c:48; do
+        printf '[[route]]\nfrom = "%s"\nprefix = "%s"\nto = "%s"\n' $from ${to#*:} ${to%:*} $from "+${to#*:}" ${to%:*}
+    done
+done)
+END
+for wire in b c; do
+    {
+        printf 'line = "%s"\ncapture = "%s"\n' "$LINE$([[ $wire == b ]] || echo .c)" "$WORK/$wire.pcap"
+        [[ $wire == b ]] || echo 'user = true'
+        cat "$WORK/plan_$wire.toml"
+    } >"$WORK/$wire.toml"
+    "$EXCHANGE" "$WORK/$wire.toml" >"$WORK/exchange_$wire.out" 2>"$WORK/exchange_$wire.log" &
+    background+=($!)
+done
+for ((i = 0; i < 200; i++)); do
+    (($(cat "$WORK"/exchange_?.out | grep -c listens) == 2)) && break
+    sleep 0.05
+done
+
+sipp_rows() { # SCENARIO PORT CALLS: what SIPp is to be told
+    ARGUMENTS=(-sf "$WORK/$1.xml" -i "$HOST" -bind_local -p "$2" -cp $(($2 + 1)) -mp $(($2 + 2)) -nostdin -m "$3" -trace_msg
+        -message_file "$WORK/$1.messages" -message_overwrite true -trace_err -error_file "$WORK/$1.log" -timeout 40s)
+}
+sipp_rows to_sip "$PORT_CALLER" "$to_sip"
+sipp "${ARGUMENTS[@]}" "$HOST:$PORT_A" >"$WORK/to_sip.out" 2>&1 &
+background+=($!)
+wait_for_port $! "$PORT_CALLER" udp || fail "the callee does not start"
+start_isdn_gateway
+expect_log 'interface c: the link is up'
+sipp_rows from_sip $((PORT_CALLER + 16)) "$from_sip"
+sipp "${ARGUMENTS[@]}" -inf "$WORK/from_sip.csv" -r 100 -l 8 "$HOST:$PORT_A" >"$WORK/from_sip.out" 2>&1 # the judge tells of which it makes nothing
+for ((i = 0; i < 300; i++)); do
+    (($(grep -c 'calling side.* released' "$WORK/gateway.err") >= rows)) && break
+    sleep 0.1
+done
+python3 "$WIRE/wire.py" judge "$WIRE/wire.table" "$WORK" || fail "rows"
+for wire in b c; do
+    CAPTURE=$WORK/$wire.pcap expect_wellformed
+done
+kill -TERM $gateway_pid
+wait $gateway_pid || fail "gateway: exit status $?"
+gateway_pid=0
+grep -q " 0 left over" "$WORK/gateway.out" || fail "calls are left over"
+finish
