@@ -32,9 +32,9 @@ tell_phone "$PORT_CALLER" hangup
 expect_log 'call 2 c \(called side\) released: cause 16 '
 expect_trace 'State=HELD'
 stop_phones
-expect_speech alice bob 100
-expect_speech bob alice 100
-expect_speech alice 77 100
-expect_speech 77 alice 100
+expect_speech alice bob 50
+expect_speech bob alice 50
+expect_speech alice 77 50
+expect_speech 77 alice 50
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 finish
