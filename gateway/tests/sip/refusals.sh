@@ -37,7 +37,7 @@ long_caller() { send_invite; expect 100; expect_optional 180; expect 503; send_a
 
 write_configuration 'clear-after = 1' 'transports = ["udp", "tcp"]'
 start_gateway
-for uri in mailto:4989123@x http://4989123@x urn:service:sos sips:4989123@x; do
+for uri in mailto:4989123@x http://4989123@x urn:service:counseling sips:4989123@x; do
     expect_answer 416 -- request INVITE "$uri"
     expect_answer 416 -- request OPTIONS "$uri"
 done
