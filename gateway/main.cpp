@@ -12,6 +12,7 @@
 #include <ctime>
 #include <exception>
 #include <string>
+#include <sys/resource.h>
 #include <unistd.h>
 #include <utility>
 #include <vector>
@@ -56,9 +57,21 @@ void DECLARE(CLI::App& app, Arguments& arguments)
         ->check(CLI::IsMember({"trace", "debug", "info", "warning", "error", "off"}));
 }
 
+/// A line with its calls takes 61 descriptors, a call with media four: the usual soft limit of 1024 is for programs
+/// that wait for theirs with select.
+void TAKE_ALL_DESCRIPTORS()
+{
+    rlimit limit = {};
+    if (getrlimit(RLIMIT_NOFILE, &limit) != 0)
+        return;
+    limit.rlim_cur = limit.rlim_max;
+    setrlimit(RLIMIT_NOFILE, &limit);
+}
+
 int SERVE(Configuration const& configuration, Gateway::Modules modules, unsigned int tracedCalls)
 {
     Counters counters;
+    TAKE_ALL_DESCRIPTORS();
     {
         Gateway gateway(configuration, std::move(modules), tracedCalls);
         gateway.run();

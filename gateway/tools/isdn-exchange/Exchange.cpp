@@ -11,7 +11,6 @@ constexpr int CHANNEL_MASK = 0xff;
 constexpr int TYPE_SHIFT = 4;
 constexpr int PRESENTATION_SHIFT = 5;
 constexpr unsigned int HOLD = 50; // milliseconds
-constexpr unsigned int TURN = 10; // the same, until a call that waits for others asks again
 constexpr int LOW_BITS = 3;
 constexpr int DEFLECTION = 4; // Q.931; the stack says 3
 constexpr std::size_t FIRST_DIGITS = 2;
@@ -160,6 +159,7 @@ void Exchange::run(long long now)
         takeEvent(*event);
     while (!m_timers.empty() && m_timers.begin()->first <= now)
         m_timers.extract(m_timers.begin()).mapped()();
+    placeWaiting();
     for (m_nextTick = std::max(m_nextTick, now - 3 * TICK); m_nextTick <= now; m_nextTick += TICK)
         for (auto const& [handle, call] : m_calls)
             if (call->speech != nullptr)
@@ -180,7 +180,7 @@ void Exchange::takeEvent(pri_event& event)
         if (!std::exchange(m_isUp, true))
             for (Plan::Call const& own : m_plan.calls)
                 for (unsigned int i = 0; i < own.count; ++i)
-                    m_timers.emplace(m_now + own.after + i * own.interval, [this, &own] { placeInTurn(own); });
+                    m_timers.emplace(m_now + own.after + i * own.interval, [this, &own] { m_waiting.push_back(&own); });
         break;
     case PRI_EVENT_RING:
         onRing(event.ring);
@@ -382,14 +382,16 @@ int Exchange::hunt() const
     return 0;
 }
 
-void Exchange::placeInTurn(Plan::Call const& own)
+void Exchange::placeWaiting()
 {
-    auto const count =
-        std::count_if(m_calls.begin(), m_calls.end(), [](auto const& one) { return one.second->own != nullptr; });
-    if (m_plan.atOnce == 0 || static_cast<unsigned int>(count) < m_plan.atOnce)
-        place(own);
-    else
-        m_timers.emplace(m_now + TURN, [this, &own] { placeInTurn(own); });
+    auto const hasRoom = [this]
+    {
+        auto const count =
+            std::count_if(m_calls.begin(), m_calls.end(), [](auto const& one) { return one.second->own != nullptr; });
+        return m_plan.atOnce == 0 || static_cast<unsigned int>(count) < m_plan.atOnce;
+    };
+    for (; !m_waiting.empty() && hasRoom(); m_waiting.pop_front())
+        place(*m_waiting.front());
 }
 
 void Exchange::place(Plan::Call const& own)

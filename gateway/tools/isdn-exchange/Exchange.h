@@ -12,6 +12,7 @@ extern "C"
 #include <libpri.h>
 }
 
+#include <deque>
 #include <functional>
 #include <map>
 #include <memory>
@@ -84,7 +85,7 @@ private:
     void hold(CallHandle const& call);
     void charge(CallHandle const& call);
     void chargeFinally(Call& call);
-    void placeInTurn(Plan::Call const& own);
+    void placeWaiting();
     void place(Plan::Call const& own);
     void dialOn(CallHandle const& call);
     int hunt() const;
@@ -100,6 +101,7 @@ private:
     long long m_now = 0;
     long long m_nextTick = 0;
     std::multimap<long long, std::function<void()>> m_timers;
+    std::deque<Plan::Call const*> m_waiting; // that are due
     std::map<q931_call*, CallHandle> m_calls;
     std::minstd_rand m_random; // the same in each run
 };
