@@ -171,8 +171,9 @@ TEST(Configuration, SaysWhereRecordsOfCallsGo)
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nsqlite = \"r\"\n"),
               "f: records.spool: is missing: a database may not be there");
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nspool = \"s\"\npostgresql = \"host=h password = pass phrase\"\n"),
-              "f: records.postgresql: is no connection string") << "nor any word of it";
-    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nspool = \"s\"\npostgresql = \"host=h password=pass\"\n"), "");
+              "f: records.postgresql: is no connection string")
+        << "nor any word of it";
+    EXPECT_EQ(COMPLAINT(interfaces + "[records]\nspool = \"s\"\npostgresql = \"host=h password=pass\"\n"), "none");
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nfile = \"r\"\nwhen-full = \"x\"\n"),
               "f: records.when-full: must be one of lose, refuse");
 }
