@@ -12,11 +12,11 @@
 #include "operation/StateDump.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
+#include "operation/http/HttpServer.h"
 #include "operation/metric/GatewayMetrics.h"
-#include "operation/metric/HttpServer.h"
 #include "operation/page/StatusPage.h"
-#include "operation/record/CallWatch.h"
 #include "operation/record/CallRecords.h"
+#include "operation/record/CallWatch.h"
 #include "platform/eventloop/TYEventLoop.h"
 #include "platform/eventloop/TYTimer.h"
 

@@ -57,7 +57,7 @@ TEST(Configuration, EveryKeyIsRead)
                     "max-calls-per-second = 8\nmax-calls-per-source = 6\nclear-after = 9\nrecording = "
                     "\"/r\"\nrecording-size = 4096\n"
                     "[media]\nmode = \"relay\"\nfirst-port = 30000\nlast-port = 30999\nthreads = 2\nsilence = 30\n"
-                    "dscp = 0\ncountry = \"gb\"\nrecordings = \"/tmp\"\n") +
+                    "dscp = 0\ncountry = \"gb\"\n") +
             TWO_INTERFACES + "[[route]]\nfrom = \"a\"\nprefix = \"49\"\nto = \"b\"\n",
         "f");
     EXPECT_EQ(configuration.context, "X");
@@ -77,7 +77,6 @@ TEST(Configuration, EveryKeyIsRead)
     EXPECT_EQ(configuration.media.silence, 30u);
     EXPECT_EQ(configuration.media.differentiation, 0u);
     EXPECT_EQ(configuration.media.country, "gb");
-    EXPECT_EQ(configuration.media.recordings, "/tmp");
     ASSERT_EQ(configuration.routes.size(), 1u);
     EXPECT_EQ(configuration.routes[0].from, "a");
     EXPECT_EQ(configuration.routes[0].prefix, "49");
@@ -172,7 +171,8 @@ TEST(Configuration, SaysWhereRecordsOfCallsGo)
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nsqlite = \"r\"\n"),
               "f: records.spool: is missing: a database may not be there");
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nspool = \"s\"\npostgresql = \"host=h password = pass phrase\"\n"),
-              "f: records.postgresql: is no connection string") << "nor any word of it";
+              "f: records.postgresql: is no connection string")
+        << "nor any word of it";
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nspool = \"s\"\npostgresql = \"host=h password=pass\"\n"), "none");
     EXPECT_EQ(COMPLAINT(interfaces + "[records]\nfile = \"r\"\nwhen-full = \"x\"\n"),
               "f: records.when-full: must be one of lose, refuse");
@@ -217,10 +217,6 @@ TEST(Configuration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {"[gateway]\nrecording-size = 100\n" + good, "f: gateway.recording-size: expected 0, or at least 4096"},
         {"[gateway]\ncontext = \"a\\u007f\"\n" + good,
          "f: gateway.context: has a line break or another control character"},
-        {"[media]\nrecordings = \"/tmp\"\n" + good,
-         "f: media.recordings: what is said can be kept in mode \"relay\" alone"},
-        {"[media]\nmode = \"relay\"\nrecordings = \"/nowhere\"\n" + good,
-         "f: media.recordings: not a folder to write into: No such file or directory"},
         {"[media]\nmode = \"both\"\n" + good, "f: media.mode: must be one of direct, relay"},
         {"[media]\nfirst-port = 20000\nlast-port = 20000\n" + good, "f: media.last-port: must be above first-port"},
         {"[media]\nports = 1\n" + good, "f: media.ports: is not a key"},
@@ -264,21 +260,4 @@ TEST(Configuration, AFileThatCannotBeReadIsNamed)
     {
         EXPECT_STREQ(error.what(), "/nonexistent/file.toml: file: cannot be read");
     }
-}
-
-TEST(Configuration, ARouteHasLimitsAUserOrIsForEmergencies)
-{
-    std::string const interfaces = "[[sip]]\nname = \"a\"\n[[route]]\nfrom = \"a\"\nto = \"a\"\nnumber = \"112\"\n";
-    Route const limited =
-        Configuration::PARSE(interfaces + "max-calls = 3\nmax-calls-per-second = 2\nuser = \"alice\"\n", "f")
-            .routes.at(0);
-    EXPECT_EQ(limited.maxCalls, 3u);
-    EXPECT_EQ(limited.maxCallsPerSecond, 2u);
-    EXPECT_EQ(limited.user, "alice");
-    EXPECT_FALSE(limited.isEmergency);
-    EXPECT_TRUE(Configuration::PARSE(interfaces + "emergency = true\n", "f").routes.at(0).isEmergency);
-    EXPECT_THROW(Configuration::PARSE(interfaces + "emergency = true\nmax-calls = 1\n", "f"), ConfigurationError);
-    EXPECT_THROW(
-        Configuration::PARSE("[[sip]]\nname = \"a\"\n[[route]]\nfrom = \"a\"\nto = \"a\"\nemergency = true\n", "f"),
-        ConfigurationError);
 }

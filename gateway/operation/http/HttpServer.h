@@ -1,7 +1,7 @@
 #pragma once
 
 #include "configuration/SocketAddress.h"
-#include "operation/metric/HttpRequest.h"
+#include "operation/http/HttpRequest.h"
 
 #include <atomic>
 #include <chrono>

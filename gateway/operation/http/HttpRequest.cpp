@@ -1,4 +1,4 @@
-#include "operation/metric/HttpRequest.h"
+#include "operation/http/HttpRequest.h"
 
 #include <algorithm>
 #include <cctype>

@@ -1,4 +1,4 @@
-#include "operation/metric/HttpServer.h"
+#include "operation/http/HttpServer.h"
 
 #include "host/SignallingLoop.h"
 
