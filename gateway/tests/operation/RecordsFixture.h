@@ -55,7 +55,7 @@ protected:
     template <class Is>
     static bool WAIT_UNTIL(Is const& is)
     {
-        for (int i = 0; i < 2000 && !is(); ++i)
+        for (int i = 0; i < 6000 && !is(); ++i)
             std::this_thread::sleep_for(std::chrono::milliseconds(10));
         return is();
     }
