@@ -9,7 +9,7 @@
 seconds=${4:-10}
 pairs=$((${5:-2} / 2))
 write_isdn_configuration
-sed -i '/^\[\[isdn/,$d; s/^mode = .*/&\nthreads = 2/; s/^\[gateway\]/&\nmax-calls-per-second = 0/' "$WORK/gateway.toml"
+sed -i '/^\[\[isdn/,$d; s/^call-control-log-level = .*/call-control-log-level = 1/; s/^mode = .*/&\nthreads = 2/; s/^\[gateway\]/&\nmax-calls-per-second = 0/' "$WORK/gateway.toml"
 for ((i = 1; i <= pairs; i++)); do
     printf '[[isdn]]\nname = "%s"\nline = "%s"\n[isdn.timers]\nreopening = 50\nt200 = 200\n' "b$i" "$LINE" "c$i" "$LINE.c"
     printf '[[route]]\nfrom = "b%d"\nto = "c%d"\n' $i $i
@@ -23,6 +23,7 @@ at-once = 30
 to = "4989123"
 count = $((seconds * 40))
 interval = 0
+after = $((500 + 100 * pairs))
 length = 900
 END
 cat >"$WORK/plan_c.toml" <<END
