@@ -62,7 +62,7 @@ struct CallRecord
     std::vector<Leg> legs;            ///< in the order of their joining
     unsigned long long clearedBy = 0; ///< the leg that was released first; 0: none was
     bool isEmergency = false;
-    bool isClearedByGateway = false;  ///< by an operator, or at its end
+    bool isClearedByGateway = false; ///< by an operator, or at its end
 
     /// Null when there is none. @{
     Leg const* getCaller() const;
