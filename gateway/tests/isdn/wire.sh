@@ -9,7 +9,7 @@ WIRE=$(dirname "$0")/wire
 TABLE=$WIRE/$4.table
 read -r rows from_sip to_sip < <(python3 "$WIRE/wire.py" write "$TABLE" "$WORK") || fail "no table"
 write_isdn_configuration '' 'codecs = ["PCMA", "CLEARMODE"]'
-sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt309 = 1000\nanswer = 1000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
+sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt305 = 500\nt308 = 500\nt309 = 1000\nanswer = 1000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
 cat >>"$WORK/gateway.toml" <<END
 [[isdn]]
 name = "c"
