@@ -4,8 +4,8 @@
 #include "host/SignallingModule.h"
 #include "operation/CallTracer.h"
 #include "operation/control/ControlServer.h"
-#include "operation/record/CallWatch.h"
 #include "operation/record/CallRecords.h"
+#include "operation/record/CallWatch.h"
 
 #include <map>
 #include <optional>
