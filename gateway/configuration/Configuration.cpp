@@ -1,6 +1,7 @@
 #include "configuration/Configuration.h"
 
 #include "media/tone/ToneTable.h"
+#include "operation/record/Libpq.h"
 
 #include <algorithm>
 #include <array>
@@ -8,7 +9,6 @@
 #include <charconv>
 #include <cstring>
 #include <fstream>
-#include <libpq-fe.h>
 #include <limits>
 #include <memory>
 #include <unistd.h>
@@ -94,8 +94,13 @@ void READ_CONTROL(ConfigurationSection const& section, ControlOptions& control)
 std::string READ_CONNECTION(ConfigurationSection const& section, char const* key)
 {
     std::string text = section.text(key, {});
-    std::unique_ptr<PQconninfoOption, decltype(&PQconninfoFree)> const parsed(PQconninfoParse(text.c_str(), nullptr),
-                                                                              &PQconninfoFree);
+    if (text.empty())
+        return text;
+    Libpq const* const pq = Libpq::GET();
+    if (pq == nullptr)
+        section.refuse(key, "needs libpq.so.5, which is not installed");
+    std::unique_ptr<PQconninfoOption, decltype(&PQconninfoFree)> const parsed(pq->conninfoParse(text.c_str(), nullptr),
+                                                                              pq->conninfoFree);
     if (parsed == nullptr)
         section.refuse(key, "is no connection string");
     return text;

@@ -97,6 +97,8 @@ void MediaLoop::onReadable(Socket const& socket)
         socket.leg->receiveRtcp(m_batch, m_now);
     else
         socket.leg->receiveRtp(m_batch, m_now);
+    if (socket.leg->isCutOff())
+        epoll_ctl(m_epoll.get(), EPOLL_CTL_DEL, socket.leg->getRtp(), nullptr);
 }
 
 void MediaLoop::startClock()

@@ -1,9 +1,7 @@
 #include "media/rtp/ChannelTermination.h"
 
 #include <algorithm>
-#include <fcntl.h>
 #include <sys/socket.h>
-#include <unistd.h>
 
 namespace
 {
@@ -36,7 +34,7 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
     {
         ssize_t const length = recv(getRtp(), block, TIMESTAMP + BLOCK + 1, MSG_DONTWAIT);
         if (length == 0)
-            closeChannel();
+            cutOff();
         if (length <= 0)
             return;
         if (static_cast<std::size_t>(length) != TIMESTAMP + BLOCK)
@@ -46,14 +44,6 @@ void ChannelTermination::receiveRtp(DatagramBatch& batch, long long now)
         takeRtp(std::span(octets).first(RtpHeader::LENGTH + BLOCK), from, batch, now);
         sendRelayed(batch, now);
     }
-}
-
-/// The other end has gone: a socket that leads nowhere takes its place, since a loop would be woken by it for ever.
-void ChannelTermination::closeChannel()
-{
-    Descriptor const nowhere(socket(AF_UNIX, SOCK_SEQPACKET | SOCK_NONBLOCK | SOCK_CLOEXEC, 0));
-    if (nowhere.get() >= 0)
-        dup3(nowhere.get(), getRtp(), O_CLOEXEC);
 }
 
 void ChannelTermination::sendDatagram(std::span<unsigned char const> octets, DatagramBatch*)

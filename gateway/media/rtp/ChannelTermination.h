@@ -25,7 +25,6 @@ private:
     static constexpr std::size_t TIMESTAMP = 4; // octets
 
     void sendDatagram(std::span<unsigned char const> octets, DatagramBatch* batch) override;
-    void closeChannel();
     void sendReport(bool, long long) override {}
 
     std::uint16_t m_sequence = 0;

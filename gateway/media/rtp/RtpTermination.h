@@ -73,6 +73,8 @@ public:
     /// Takes what has come to a socket, and sends on what is relayed.
     virtual void receiveRtp(DatagramBatch& batch, long long now);
     void receiveRtcp(DatagramBatch& batch, long long now);
+    /// Whether nothing can come any more: a loop that went on waiting for it would be woken for ever.
+    bool isCutOff() const { return m_isCutOff; }
 
     bool sendDigit(char digit, unsigned int milliseconds) { return m_digits.add(digit, milliseconds); }
     /// Digits that the partner's far side tells do not become digits or sounds of ours; its packets are relayed yet.
@@ -114,6 +116,7 @@ public:
 
 protected:
     void takeRtp(std::span<unsigned char> octets, DatagramAddress const& from, DatagramBatch& batch, long long now);
+    void cutOff() { m_isCutOff = true; }
     /// What was queued for the partner goes out.
     void sendRelayed(DatagramBatch& batch, long long now);
 
@@ -151,6 +154,7 @@ private:
     RtpTermination* m_partner = nullptr;
     bool m_isMultiplexed = false;
     bool m_isCaller = false;
+    bool m_isCutOff = false;
     bool m_isSilent = false;
     bool m_isDescribed = false;
     VoipCodecAndMode::Mode m_mode = VoipCodecAndMode::INACTIVE;

@@ -1,19 +1,24 @@
 #include "operation/record/PostgresqlStore.h"
 
+#include "operation/record/Libpq.h"
+
 #include <array>
 #include <cerrno>
-#include <libpq-fe.h>
 #include <poll.h>
+#include <stdexcept>
 #include <string_view>
 
 namespace
 {
 constexpr int ANSWER_PATIENCE = 5000; // milliseconds
 
+/// REQUIRES: it is there, which the constructor has asked.
+Libpq const& PQ() { return *Libpq::GET(); }
+
 /// Of an error of connecting, what comes behind the server's address.
 std::string REASON_OF(pg_conn* connection)
 {
-    std::string const text = PQerrorMessage(connection);
+    std::string const text = PQ().errorMessage(connection);
     std::string const first = text.substr(0, text.find('\n'));
     auto const found = first.rfind("failed: ");
     return found == std::string::npos ? "no connection" : first.substr(found + std::string_view("failed: ").size());
@@ -31,10 +36,14 @@ std::string ARRAY_OF(RecordLines const& lines)
 }
 } // namespace
 
-void PostgresqlStore::Closer::operator()(pg_conn* connection) const { PQfinish(connection); }
-void PostgresqlStore::Closer::operator()(pg_result* result) const { PQclear(result); }
+void PostgresqlStore::Closer::operator()(pg_conn* connection) const { PQ().finish(connection); }
+void PostgresqlStore::Closer::operator()(pg_result* result) const { PQ().clear(result); }
 
-PostgresqlStore::PostgresqlStore(std::string connection) : m_options(std::move(connection)) {}
+PostgresqlStore::PostgresqlStore(std::string connection) : m_options(std::move(connection))
+{
+    if (Libpq::GET() == nullptr)
+        throw std::runtime_error("libpq.so.5 is not installed");
+}
 
 PostgresqlStore::~PostgresqlStore() = default;
 
@@ -54,10 +63,10 @@ bool PostgresqlStore::connect()
     std::array<char const*, 6> const keys{"connect_timeout", "tcp_user_timeout", "application_name",
                                           "dbname",          "client_encoding",  nullptr};
     std::array<char const*, 6> const values{"5", "5000", "callcontrol-gateway", m_options.c_str(), "UTF8", nullptr};
-    m_connection.reset(PQconnectdbParams(keys.data(), values.data(), 1)); // the later ones win
-    if (PQsetnonblocking(m_connection.get(), 1) == 0 && makeTable())
+    m_connection.reset(PQ().connectdbParams(keys.data(), values.data(), 1)); // the later ones win
+    if (PQ().setnonblocking(m_connection.get(), 1) == 0 && makeTable())
         return true;
-    if (PQstatus(m_connection.get()) != CONNECTION_OK || m_reason.empty())
+    if (PQ().status(m_connection.get()) != CONNECTION_OK || m_reason.empty())
         m_reason = REASON_OF(m_connection.get());
     m_connection.reset();
     return false;
@@ -69,19 +78,19 @@ bool PostgresqlStore::makeTable()
     Answer const found = ask("SELECT to_regclass('call_record') IS NOT NULL");
     if (!isDone(found))
         return false;
-    return std::string_view(PQgetvalue(found.get(), 0, 0)) == "t" ||
+    return std::string_view(PQ().getvalue(found.get(), 0, 0)) == "t" ||
            isDone(ask("CREATE TABLE call_record (process text NOT NULL, call bigint NOT NULL, record jsonb NOT NULL, "
                       "PRIMARY KEY (process, call))"));
 }
 
 PostgresqlStore::Answer PostgresqlStore::ask(char const* statement, char const* parameter)
 {
-    if (PQsendQueryParams(m_connection.get(), statement, parameter != nullptr ? 1 : 0, nullptr, &parameter, nullptr,
-                          nullptr, 0) == 0 ||
+    if (PQ().sendQueryParams(m_connection.get(), statement, parameter != nullptr ? 1 : 0, nullptr, &parameter, nullptr,
+                             nullptr, 0) == 0 ||
         !awaitSent() || !awaitAnswer())
         return nullptr;
-    Answer answer(PQgetResult(m_connection.get()));
-    while (Answer const rest{PQgetResult(m_connection.get())})
+    Answer answer(PQ().getResult(m_connection.get()));
+    while (Answer const rest{PQ().getResult(m_connection.get())})
     {
     }
     return answer;
@@ -90,7 +99,7 @@ PostgresqlStore::Answer PostgresqlStore::ask(char const* statement, char const* 
 bool PostgresqlStore::awaitSent()
 {
     int left = 0;
-    while ((left = PQflush(m_connection.get())) > 0)
+    while ((left = PQ().flush(m_connection.get())) > 0)
         if (!await(POLLIN | POLLOUT))
             return false;
     return left == 0;
@@ -98,7 +107,7 @@ bool PostgresqlStore::awaitSent()
 
 bool PostgresqlStore::awaitAnswer()
 {
-    while (PQisBusy(m_connection.get()) != 0)
+    while (PQ().isBusy(m_connection.get()) != 0)
         if (!await(POLLIN))
             return false;
     return true;
@@ -106,19 +115,20 @@ bool PostgresqlStore::awaitAnswer()
 
 bool PostgresqlStore::await(short events)
 {
-    pollfd socket{PQsocket(m_connection.get()), events, 0};
+    pollfd socket{PQ().socket(m_connection.get()), events, 0};
     int const ready = poll(&socket, 1, ANSWER_PATIENCE);
     if (ready <= 0)
         return ready < 0 && errno == EINTR;
-    return socket.revents == POLLOUT || PQconsumeInput(m_connection.get()) != 0;
+    return socket.revents == POLLOUT || PQ().consumeInput(m_connection.get()) != 0;
 }
 
 bool PostgresqlStore::isDone(Answer const& answer)
 {
-    ExecStatusType const status = PQresultStatus(answer.get());
+    ExecStatusType const status = PQ().resultStatus(answer.get());
     if (status == PGRES_COMMAND_OK || status == PGRES_TUPLES_OK)
         return true;
-    char const* const message = answer != nullptr ? PQresultErrorField(answer.get(), PG_DIAG_MESSAGE_PRIMARY) : nullptr;
+    char const* const message =
+        answer != nullptr ? PQ().resultErrorField(answer.get(), PG_DIAG_MESSAGE_PRIMARY) : nullptr;
     m_reason = message != nullptr ? message : "the connection is lost";
     return false;
 }
@@ -126,7 +136,7 @@ bool PostgresqlStore::isDone(Answer const& answer)
 /// After any other fault it begins with a new connection.
 RecordStore::Result PostgresqlStore::fail(Answer const& answer)
 {
-    char const* const state = answer != nullptr ? PQresultErrorField(answer.get(), PG_DIAG_SQLSTATE) : nullptr;
+    char const* const state = answer != nullptr ? PQ().resultErrorField(answer.get(), PG_DIAG_SQLSTATE) : nullptr;
     if (state != nullptr && IS_OF_DATA(state))
         return Result::REFUSED;
     m_connection.reset();

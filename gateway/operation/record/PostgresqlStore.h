@@ -12,7 +12,8 @@ struct pg_result;
 class PostgresqlStore : public RecordStore
 {
 public:
-    /// As libpq has the connection string. Connects when there is something to store.
+    /// As libpq has the connection string. Connects when there is something to store. Throws std::runtime_error where
+    /// libpq is not installed.
     explicit PostgresqlStore(std::string connection);
     ~PostgresqlStore() override;
 
