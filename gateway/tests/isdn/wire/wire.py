@@ -156,7 +156,7 @@ def write(rows, folder):
         for row in rows:
             if row.callee == wire:
                 keys = row.keys(wire)
-                usual = (f'number = "{row.called().lstrip("+")}"', "answers = 50")
+                usual = (f'number = "{row.called().lstrip("+")}"', "answers = 300")
                 plan += ["[[number]]"] + [line for line in usual if not row.has(keys, line.split()[0] + " ")] + keys
             if row.caller == wire:
                 keys = row.keys(wire)
