@@ -57,7 +57,7 @@ void SipEndpoint::takeCarried(sip_t const* message)
 std::string SipEndpoint::getCarried(SipCarriedHeaders::Message message)
 {
     auto const* const property = getPeer<CC_PropertyString>(SipPropertyId::CARRIED_HEADERS);
-    std::string const told = getUserToUser();
+    std::string told = getUserToUser();
     if (property == nullptr || property->getValue().isEmpty())
         return told;
     bool const isRestricted = SipParty::OF_PEER(m_adapter).isRestricted();
