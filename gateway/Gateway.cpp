@@ -54,6 +54,16 @@ catch (CallRecords::Failure const& error)
 {
     throw ConfigurationError(configuration.file, "records." + error.key, error.what());
 }
+
+std::unique_ptr<Capture> OPEN_CAPTURE(Configuration const& configuration)
+try
+{
+    return configuration.capture.isOn() ? std::make_unique<Capture>(configuration.capture) : nullptr;
+}
+catch (std::runtime_error const& error)
+{
+    throw ConfigurationError(configuration.file, "capture.server", error.what());
+}
 } // namespace
 
 Gateway::Signals::Signals()
@@ -91,6 +101,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     , m_loop(findLoop(modules))
     , m_recording(configuration)
     , m_records(OPEN_RECORDS(configuration))
+    , m_capture(OPEN_CAPTURE(configuration))
     , m_callControl(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
     , m_host{m_loop,
              m_callControl.getContextName(),
@@ -111,6 +122,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     , m_commands(m_host, m_modules, m_configuration.moduleOf, m_watch, m_tracer, m_records.get(), *this)
     , m_page(m_host, m_modules, m_configuration.moduleOf, m_watch)
 {
+    m_host.capture = m_capture.get();
     followDialling(configuration);
     watchCalls();
     m_loop.attach(m_callControlLoop);

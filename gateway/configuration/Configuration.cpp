@@ -135,7 +135,17 @@ void READ_METRICS(ConfigurationSection const& section, MetricOptions& metrics)
         section.refuse("listen", "must be a loopback address");
 }
 
-constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records", "metrics"};
+void READ_CAPTURE(ConfigurationSection const& section, CaptureOptions& capture)
+{
+    section.allow({"server", "id", "password"});
+    if (section.getKeys().empty())
+        return;
+    capture.server = section.address("server");
+    capture.id = section.number("id", capture.id, 1, 4294967295);
+    capture.password = section.text("password", {});
+}
+
+constexpr std::array OWN_TABLES{"gateway", "media", "route", "control", "records", "metrics", "capture"};
 
 /// Every table that is not the gateway's own is a module's.
 void READ_MODULES(ConfigurationSection const& root, Configuration& configuration)
@@ -180,6 +190,8 @@ Configuration Configuration::PARSE(std::string_view text, std::string const& fil
     READ_CONTROL(root.section("control"), configuration.control);
     READ_RECORDS(root.section("records"), configuration.records);
     READ_METRICS(root.section("metrics"), configuration.metrics);
+    READ_CAPTURE(root.section("capture"), configuration.capture);
+    configuration.media.tellsReports = configuration.capture.isOn();
     READ_MODULES(root, configuration);
     for (ConfigurationSection const& route : root.sections("route"))
         configuration.routes.push_back(Route::READ(route, configuration.interfaces));

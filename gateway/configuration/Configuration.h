@@ -1,5 +1,6 @@
 #pragma once
 
+#include "configuration/CaptureOptions.h"
 #include "configuration/ConfigurationSection.h"
 #include "configuration/ControlOptions.h"
 #include "configuration/DialPlan.h"
@@ -41,6 +42,7 @@ struct Configuration
     ControlOptions control;
     RecordOptions records;
     MetricOptions metrics;
+    CaptureOptions capture;
     unsigned int clearAfter = 10; ///< seconds that calls may go on after the request to end
     std::vector<Route> routes;
     DialPlan dialPlan;

@@ -41,6 +41,8 @@ std::string ConfigurationChange::FIND_RESTART(Configuration const& before, Confi
         return "records";
     if (before.metrics != after.metrics)
         return "metrics";
+    if (before.capture != after.capture)
+        return "capture";
     std::string const gone = FIND_MISSING(before, after);
     return gone.empty() ? FIND_MISSING(after, before) : gone;
 }

@@ -14,6 +14,7 @@
 #include <string_view>
 #include <vector>
 
+class Capture;
 class SignallingLoop;
 
 /// What the gateway gives its signalling modules, for all of them. Owned by the gateway, which outlives them; on the
@@ -40,6 +41,7 @@ struct GatewayHost
     std::vector<std::function<void()>> onReload{}; ///< those that read files of theirs again with the configuration
     std::set<std::string> leaving{};               ///< interfaces that are configured no more and go with their calls
     DialPlan dialPlan{};
+    Capture* capture = nullptr; ///< that is to be shown what goes over the wire; null: nobody is
 
     /// Whether new calls may come in on that interface.
     bool takesCallsFrom(std::string const& interface) const

@@ -70,6 +70,8 @@ void SipModule::open(GatewayHost& host)
                     tls->reload();
         });
     watchEnd(host);
+    if (host.capture != nullptr)
+        m_capture.emplace(*host.capture);
 }
 
 std::unique_ptr<SipModule::Port> SipModule::makePort(Table const& table)

@@ -6,6 +6,7 @@
 #include "sip/SipConfiguration.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/stack/SipCapture.h"
 #include "sip/stack/SipStack.h"
 
 #include <memory>
@@ -78,6 +79,7 @@ private:
     std::vector<Table> m_tables; // as they are to be
     SipStack m_stack;
     std::optional<SipEnvironment> m_environment;
+    std::optional<SipCapture> m_capture;
     Ports m_ports;
     Ports m_prepared; // for a change
     TYEvent* m_removal = nullptr;

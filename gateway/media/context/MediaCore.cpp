@@ -197,5 +197,8 @@ void MediaCore::take(MediaNews const& news)
     case MediaNews::QUALITY:
         leg.m_observer.onQuality(news.quality);
         break;
+    case MediaNews::REPORT:
+        leg.m_observer.onReport(news.report);
+        break;
     }
 }

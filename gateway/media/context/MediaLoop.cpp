@@ -169,4 +169,9 @@ void MediaLoop::onQuality(RtpTermination& leg)
     tell({leg.getNumber(), MediaNews::QUALITY, '\0', 0, leg.getQuality()});
 }
 
+void MediaLoop::onReport(RtpTermination const& leg, MediaReport const& report)
+{
+    tell({.leg = leg.getNumber(), .kind = MediaNews::REPORT, .report = report});
+}
+
 void MediaLoop::tell(MediaNews const& news) { m_news.post(news); }

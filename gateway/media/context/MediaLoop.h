@@ -100,6 +100,7 @@ private:
     void onSilence(RtpTermination const& leg, unsigned int seconds) override;
     void onSpeech(RtpTermination const& leg) override;
     void onQuality(RtpTermination& leg) override;
+    void onReport(RtpTermination const& leg, MediaReport const& report) override;
     void tell(MediaNews const& news);
 
     Mailbox<MediaNews>& m_news;

@@ -2,6 +2,8 @@
 
 #include "media/quality/MediaQuality.h"
 
+struct MediaReport;
+
 /// What a leg's media tell its signalling module, on the signalling thread, from the event loop. The observer may do
 /// anything inside, also end the leg's media; nothing is told after that.
 class MediaObserver
@@ -18,4 +20,6 @@ public:
     virtual void onSpeech();
     /// Asked for, and every five seconds besides.
     virtual void onQuality(MediaQuality const& quality);
+    /// An RTCP packet came or went, where the media layer was told to tell of them (MediaOptions::tellsReports).
+    virtual void onReport(MediaReport const& report);
 };

@@ -12,6 +12,7 @@ struct MediaOptions
     unsigned int learningTime = 2000;   ///< milliseconds after the first packet in which the far address may settle
     unsigned int silence = 20;          ///< seconds without a packet until signalling is told; 0: it never is
     unsigned int reportInterval = 5000; ///< milliseconds between two RTCP reports
+    bool tellsReports = false;          ///< each RTCP packet to the leg's observer
     std::string country = "de";         ///< whose tones are played
     std::string recordings;             ///< the folder for what is said in every call; empty: that is not kept
     std::string tones;                  ///< where they are written (ToneTable); empty: the built-in ten countries

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/context/MediaDescription.h"
+#include "media/context/MediaReport.h"
 #include "media/file/RecordedSound.h"
 #include "media/quality/MediaQuality.h"
 #include "platform/media/MG_Tones.h"
@@ -100,7 +101,8 @@ struct MediaNews
         DIGIT,
         SILENCE,
         SPEECH,
-        QUALITY
+        QUALITY,
+        REPORT
     };
     unsigned long long leg;
     Kind kind;
@@ -108,4 +110,5 @@ struct MediaNews
     unsigned int amount = 0; ///< milliseconds of a digit, seconds of silence
     MediaQuality quality{};
     bool isSound = false; ///< of a digit: heard in speech
+    MediaReport report{};
 };

@@ -33,8 +33,8 @@ bool RtcpReports::isDue(long long now)
     return true;
 }
 
-std::size_t RtcpReports::write(std::span<unsigned char, RtcpPacket::LONGEST> out, RtpNumbering const& numbering,
-                               RtpReception& reception, MediaQuality const& counted, bool isBye, long long now)
+RtcpPacket RtcpReports::make(RtpNumbering const& numbering, RtpReception& reception, MediaQuality const& counted,
+                             bool isBye, long long now)
 {
     RtcpPacket packet;
     packet.sender = numbering.getSource();
@@ -55,7 +55,7 @@ std::size_t RtcpReports::write(std::span<unsigned char, RtcpPacket::LONGEST> out
                                    m_lastReport,
                                    delay};
     }
-    return packet.write(out, m_name);
+    return packet;
 }
 
 void RtcpReports::take(RtcpPacket const& packet, RtpReception& reception, unsigned int clockRate, MediaQuality& quality,

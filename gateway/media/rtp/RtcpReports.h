@@ -8,7 +8,7 @@
 /// One leg's side of RTCP: when to report, what, and what the far side's reports say.
 ///
 ///     if (reports.isDue(now))
-///         length = reports.write(buffer, numbering, reception, quality, now);
+///         length = reports.make(numbering, reception, quality, false, now).write(buffer, reports.getName());
 ///     ...
 ///     reports.take(packet, reception, 8000, quality, now);
 class RtcpReports
@@ -20,10 +20,11 @@ public:
 
     /// Whether it is time, counted from the first time it was asked.
     bool isDue(long long now);
-    /// Writes a report of what was received and, if anything was sent since the report before, of that. `isBye`: the
-    /// last one. The number of octets.
-    std::size_t write(std::span<unsigned char, RtcpPacket::LONGEST> out, RtpNumbering const& numbering,
-                      RtpReception& reception, MediaQuality const& counted, bool isBye, long long now);
+    /// A report of what was received and, if anything was sent since the report before, of that. `isBye`: the last one.
+    RtcpPacket make(RtpNumbering const& numbering, RtpReception& reception, MediaQuality const& counted, bool isBye,
+                    long long now);
+    /// From which the canonical name is made.
+    unsigned long long getName() const { return m_name; }
     /// Takes in what came. `clockRate`: of what we send, in Hz.
     void take(RtcpPacket const& packet, RtpReception& reception, unsigned int clockRate, MediaQuality& quality,
               long long now);
@@ -33,7 +34,7 @@ private:
     long long draw();
 
     long long m_interval;
-    unsigned long long m_name; // from which the canonical name is made, the same in each report
+    unsigned long long m_name; // the same in each report
     unsigned long long m_seed;
     long long m_next = 0; // 0: not begun
     unsigned long long m_sentBefore = 0;

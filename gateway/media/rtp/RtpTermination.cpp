@@ -22,6 +22,7 @@ RtpTermination::RtpTermination(unsigned long long number, RtpPorts&& ports, Medi
     : m_number(number)
     , m_ports(std::move(ports))
     , m_silence(options.silence * SECOND)
+    , m_tellsReports(options.tellsReports)
     , m_latch(options.learningTime * MILLISECOND)
     , m_rtcpLatch(options.learningTime * MILLISECOND)
     , m_numbering(seed.source, seed.sequence, seed.timestamp)
@@ -223,7 +224,18 @@ void RtpTermination::takeRtcp(std::span<unsigned char> octets, DatagramAddress c
     else if (!latch.accept(from, now))
         ++m_quality.strayPackets;
     else
+    {
         m_reports.take(packet, m_reception, getClockRate(), m_quality, now);
+        tellReport(packet, from, false);
+    }
+}
+
+void RtpTermination::tellReport(RtcpPacket const& packet, DatagramAddress const& far, bool isOurs)
+{
+    if (!m_tellsReports || m_observer == nullptr)
+        return;
+    MediaAddress const own = m_isMultiplexed ? m_ports.address : m_ports.getRtcp();
+    m_observer->onReport(*this, isOurs ? MediaReport{packet, own, far.get()} : MediaReport{packet, far.get(), own});
 }
 
 void RtpTermination::tick(long long now)
@@ -326,13 +338,14 @@ void RtpTermination::sendReport(bool isBye, long long now)
     if (!to.isSomewhere() || m_isUnusable)
         return;
     std::array<unsigned char, RtcpPacket::LONGEST + SrtpSession::MOST_GROWTH> octets;
-    std::size_t length = m_reports.write(std::span(octets).first<RtcpPacket::LONGEST>(), m_numbering, m_reception,
-                                         m_quality, isBye, now);
+    RtcpPacket const packet = m_reports.make(m_numbering, m_reception, m_quality, isBye, now);
+    std::size_t length = packet.write(std::span(octets).first<RtcpPacket::LONGEST>(), m_reports.getName());
     if (m_srtp != nullptr)
         length = m_srtp->protectRtcp(octets.data(), length);
     if (length == 0)
         return;
     sendto(m_isMultiplexed ? getRtp() : getRtcp(), octets.data(), length, 0, &to.any, to.length);
+    tellReport(packet, to, true);
 }
 
 MediaQuality const& RtpTermination::getQuality()

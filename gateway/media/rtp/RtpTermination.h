@@ -2,6 +2,7 @@
 
 #include "media/context/MediaDescription.h"
 #include "media/context/MediaOptions.h"
+#include "media/context/MediaReport.h"
 #include "media/file/RecordedSound.h"
 #include "media/quality/QualityCell.h"
 #include "media/rtp/DatagramBatch.h"
@@ -28,6 +29,7 @@ public:
     virtual void onSilence(RtpTermination const& leg, unsigned int seconds) = 0;
     virtual void onSpeech(RtpTermination const& leg) = 0;
     virtual void onQuality(RtpTermination& leg) = 0;
+    virtual void onReport(RtpTermination const& leg, MediaReport const& report) = 0;
 
 protected:
     ~RtpTerminationObserver() = default;
@@ -136,6 +138,7 @@ private:
     void prepareSender(unsigned int rate);
     unsigned int getClockRate() const { return m_routes.getClockRate(); }
     void takeRtcp(std::span<unsigned char> octets, DatagramAddress const& from, long long now);
+    void tellReport(RtcpPacket const& packet, DatagramAddress const& far, bool isOurs);
     void takeEvent(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void noteArrival(RtpPacket const& packet, RtpRoutes::Route const& route, long long now);
     void relay(RtpPacket const& packet, RtpRoutes::Route const& route, DatagramBatch& batch, long long now);
@@ -163,6 +166,7 @@ private:
     std::shared_ptr<QualityCell> const m_cell = std::make_shared<QualityCell>();
     long long m_lastTold = 0; // of the quality
     long long m_silence;
+    bool m_tellsReports;
     RtpLatch m_latch;
     RtpLatch m_rtcpLatch;
     RtpNumbering m_numbering;

@@ -3,6 +3,7 @@
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/version.h"
 #include "operation/Log.h"
+#include "operation/capture/Capture.h"
 #include "operation/metric/ProcessMetrics.h"
 #include "operation/record/CallRecords.h"
 #include "operation/record/CallWatch.h"
@@ -33,6 +34,7 @@ std::string GatewayMetrics::getText() const
     m_calls.add(text, m_watch);
     addPool(text);
     addRecords(text);
+    addCapture(text);
     for (auto const& [name, module] : m_modules)
         module->addMetrics(text);
     ProcessMetrics::ADD(text);
@@ -102,4 +104,15 @@ void GatewayMetrics::addRecords(MetricText& text) const
     text.add(records.spooled);
     text.begin("records_lost_total", MetricText::COUNTER, "Records of calls for which there was no room");
     text.add(records.lost);
+}
+
+void GatewayMetrics::addCapture(MetricText& text) const
+{
+    if (m_host.capture == nullptr)
+        return;
+    Capture::Counters const& counters = m_host.capture->getCounters();
+    text.begin("capture_packets_total", MetricText::COUNTER, "Messages and reports that the capture server was sent");
+    text.add(counters.sent);
+    text.begin("capture_packets_lost_total", MetricText::COUNTER, "Those that could not be sent");
+    text.add(counters.lost);
 }

@@ -32,6 +32,7 @@ private:
     void addCounters(MetricText& text) const;
     void addPool(MetricText& text) const;
     void addRecords(MetricText& text) const;
+    void addCapture(MetricText& text) const;
 
     GatewayHost const& m_host;
     SignallingModules const& m_modules;

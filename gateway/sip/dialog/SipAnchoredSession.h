@@ -72,6 +72,7 @@ private:
     void onSilence(unsigned int seconds) override;
     void onDigit(char digit, unsigned int milliseconds) override;
     void onQuality(MediaQuality const&) override { m_wire.onQuality(); }
+    void onReport(MediaReport const& report) override { m_wire.onReport(report); }
 
     SipCodecChoice::Across getAcross() const;
     std::optional<SipStream> read(std::string const& description) const;

@@ -9,6 +9,7 @@
 #include <string>
 
 class CC_PropertyContainer;
+struct MediaReport;
 
 /// What a session asks of its dialog.
 class SipSessionWire
@@ -33,6 +34,8 @@ public:
     virtual void onDigit(char digit, unsigned int milliseconds) = 0;
     /// Every five seconds.
     virtual void onQuality() = 0;
+    /// An RTCP packet came or went.
+    virtual void onReport(MediaReport const& report) = 0;
 };
 
 /// Who makes and answers the offers of a dialog: the other side of the call, when the peers exchange media themselves

@@ -2,6 +2,7 @@
 
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
+#include "operation/capture/Capture.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"
@@ -251,15 +252,22 @@ bool SipEndpoint::sayWhy(SipCause const& cause)
     }
 }
 
-/// For the call's record.
-void SipEndpoint::addCallId(CC_PropertyContainer& own) const
+/// Of the dialog; empty: there is none.
+std::string SipEndpoint::getCallId() const
 {
     SipHome const home(su_home_create());
     sip_replaces_t const* const dialog = m_leg != nullptr ? nta_leg_make_replaces(m_leg, home.get(), 0) : nullptr;
-    if (dialog == nullptr)
+    return dialog != nullptr ? dialog->rp_call_id : "";
+}
+
+/// For the call's record.
+void SipEndpoint::addCallId(CC_PropertyContainer& own) const
+{
+    std::string const callId = getCallId();
+    if (callId.empty())
         return;
     CC_PropertyParametrizedString id(CC_PropertyId::UNIQUE_IDENTIFIER);
-    id.setContent(0, CC_PropertyParametrizedString::ParametrizedString(String(std::string_view(dialog->rp_call_id))));
+    id.setContent(0, CC_PropertyParametrizedString::ParametrizedString(String(std::string_view(callId))));
     std::ignore = own.set(id);
 }
 
@@ -280,6 +288,12 @@ void SipEndpoint::onQuality()
 {
     if (m_dialog == SipDialogState::UP && m_isInCall && ++m_qualitiesTold % 2 == 0)
         handle([&] { recordQuality(); });
+}
+
+void SipEndpoint::onReport(MediaReport const& report)
+{
+    if (Capture* const capture = m_interface.getEnvironment().host.capture)
+        capture->show(report, getCallId());
 }
 
 SipDialogState::Action SipEndpoint::advance(SipDialogState::Event event)

@@ -211,6 +211,7 @@ private:
     void onSilence(unsigned int seconds) override;
     void onDigit(char digit, unsigned int milliseconds) override;
     void onQuality() override;
+    void onReport(MediaReport const& report) override;
     void noteSession(SipOfferAnswer::Direction direction, SipOfferAnswer::Carrier carrier, std::string const& session);
     void forgetOffer();
     void endOffers();
@@ -310,6 +311,7 @@ private:
     SipDialogState::Action advance(SipDialogState::Event event);
     void leaveCall(SipCause const& cause);
     void recordQuality();
+    std::string getCallId() const;
     void addCallId(CC_PropertyContainer& own) const;
     void onPeerReleased();
     void finishIfDone();

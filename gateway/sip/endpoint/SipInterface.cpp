@@ -81,7 +81,8 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_guard(configuration)
     , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)
     , m_resolver(configuration.resolver)
-    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration, {m_guard, m_tls.get(), m_resolver.getFile()},
+    , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration,
+                                      {m_guard, m_tls.get(), m_resolver.getFile(), environment.host.capture != nullptr},
                                       HANDLE_MESSAGE, this))
     , m_sender(m_agent.get(), CREDENTIALS_OF(configuration))
     , m_peers(m_configuration, m_agent.get(), m_sender)

@@ -1,9 +1,10 @@
 #include "sip/stack/SipGuard.h"
 
+#include "sip/stack/SipCapture.h"
 #include "sip/stack/SipStack.h"
+#include "sip/stack/StackFunction.h"
 
 #include <algorithm>
-#include <dlfcn.h>
 #include <netdb.h>
 #include <netinet/in.h>
 #include <stdexcept>
@@ -31,14 +32,6 @@ enum Called : unsigned int
     ALL = 31
 };
 unsigned int s_called = 0;
-
-/// The stack's own function of that name, which it would have called without us.
-template <class Function>
-Function* ORIGINAL(char const* name)
-{
-    static void* const s_stack = dlopen("libsofia-sip-ua.so.0", RTLD_NOW | RTLD_NOLOAD);
-    return reinterpret_cast<Function*>(dlsym(s_stack, name));
-}
 
 bool IS_ASKED() { return s_called == ALL && ConnectionGuard::GET_NUMBER_OF_CALLS() != 0; }
 } // namespace
@@ -204,7 +197,7 @@ void SipGuard::PROVE(SipStack& stack, std::string const& host)
 /// The stack's own forgets the limit from the second message of a connection on.
 IN_PLACE msg_t* msg_next(msg_t* message)
 {
-    static auto* const s_original = ORIGINAL<msg_t*(msg_t*)>("msg_next");
+    static auto* const s_original = STACK_FUNCTION<msg_t*(msg_t*)>("msg_next");
     s_called |= NEXT;
     msg_t* const next = s_original(message);
     if (next != nullptr)
@@ -215,19 +208,22 @@ IN_PLACE msg_t* msg_next(msg_t* message)
 /// Every message passes here, those that are no SIP among them.
 IN_PLACE void tport_deliver(tport_t* port, msg_t* message, msg_t* next, void* compressor, su_time_t now)
 {
-    static auto* const s_original = ORIGINAL<void(tport_t*, msg_t*, msg_t*, void*, su_time_t)>("tport_deliver");
+    static auto* const s_original = STACK_FUNCTION<void(tport_t*, msg_t*, msg_t*, void*, su_time_t)>("tport_deliver");
     s_called |= DELIVER;
-    if (SipGuard::ADMIT(port, message))
-        s_original(port, message, next, compressor, now);
-    else
+    if (!SipGuard::ADMIT(port, message))
+    {
         msg_destroy(message);
+        return;
+    }
+    SipCapture::ON_RECEIVED(port, message);
+    s_original(port, message, next, compressor, now);
 }
 
 /// The stack starts the time of a connection with its first message; one that never brings any must end as well.
 IN_PLACE int tport_register_secondary(tport_t* connection, su_wakeup_f wakeup, int events)
 {
-    static auto* const s_original = ORIGINAL<int(tport_t*, su_wakeup_f, int)>("tport_register_secondary");
-    static auto* const s_startTime = ORIGINAL<int(tport_t*)>("tport_set_secondary_timer");
+    static auto* const s_original = STACK_FUNCTION<int(tport_t*, su_wakeup_f, int)>("tport_register_secondary");
+    static auto* const s_startTime = STACK_FUNCTION<int(tport_t*)>("tport_set_secondary_timer");
     s_called |= REGISTER;
     int const result = s_original(connection, wakeup, events);
     if (result == 0)

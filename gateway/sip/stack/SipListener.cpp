@@ -97,6 +97,7 @@ SipAgent SipListener::MAKE_AGENT(SipStack& stack, SipConfiguration const& config
         stack.getRoot(), NO_PORT, onMessage, interface, NTATAG_UA(1), NTATAG_PASS_100(1), NTATAG_MERGE_482(1),
         NTATAG_MAXSIZE(SipGuard::LIMIT_OF(configuration)), NTATAG_UDP_MTU(UDP_MTU), NTATAG_SIP_T1(configuration.t1),
         NTATAG_SIP_T1X64(configuration.t1x64), NTATAG_SERVER_RPORT(configuration.isBehindNat ? ALWAYS : ASKED_FOR),
+        TAG_IF(means.isShown, NTATAG_SIPFLAGS(MSG_DO_CANONIC | MSG_DO_EXTRACT_COPY)),
         TAG_IF(means.resolver != nullptr, SRESTAG_RESOLV_CONF(means.resolver)), TAG_END()));
     for (Transport const& transport : {Transport{"udp", SipWay::UDP, configuration.listensOnUdp},
                                        Transport{"tcp", SipWay::TCP, configuration.listensOnTcp},

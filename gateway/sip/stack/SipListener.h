@@ -16,6 +16,7 @@ struct Means
     SipGuard& guard;
     SipTls* tls;          ///< null where it has none
     char const* resolver; ///< the file that says where names are asked for; null: that of the system
+    bool isShown;         ///< what comes in is kept as it came, for SipCapture
 };
 
 /// A transaction engine that listens on the interface's address, on the transports that it has, with the interface's

@@ -1,6 +1,7 @@
 #include "sip/stack/SipTls.h"
 
 #include "platform/base/TYTime.h"
+#include "sip/stack/StackFunction.h"
 
 #include <openssl/err.h>
 #include <openssl/ssl.h>
@@ -10,7 +11,6 @@
 #include <algorithm>
 #include <arpa/inet.h>
 #include <cerrno>
-#include <dlfcn.h>
 #include <netdb.h>
 #include <new>
 #include <sys/socket.h>
@@ -47,14 +47,6 @@ tls_s* s_port = nullptr; // that the stack has opened last
 tport_t const* s_connecting = nullptr;
 SSL_CTX* s_making = nullptr;
 SSL* s_made = nullptr;
-
-/// The stack's own function of that name, or that of a library of the stack's.
-template <class Function>
-Function* STACK_FUNCTION(char const* name)
-{
-    static void* const s_stack = dlopen("libsofia-sip-ua.so.0", RTLD_NOW | RTLD_NOLOAD);
-    return reinterpret_cast<Function*>(dlsym(s_stack, name));
-}
 
 std::string REASON()
 {

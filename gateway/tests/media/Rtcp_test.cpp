@@ -260,3 +260,49 @@ TEST(RtpReception, WithoutPacketsNothingIsKnown)
     EXPECT_EQ(RtpReception().getTotalLost(), std::nullopt);
     EXPECT_EQ(RtpReception().getJitterMilliseconds(), std::nullopt);
 }
+
+namespace
+{
+struct Listener : Side
+{
+    void onReport(MediaReport const& report) override
+    {
+        (report.from == far.getRtcp() ? came : went).push_back(report);
+    }
+
+    std::vector<MediaReport> came;
+    std::vector<MediaReport> went;
+};
+} // namespace
+
+TEST_F(MediaFixture, ReportsAreToldAsTheyComeAndGoWhereThatIsWanted)
+{
+    MediaOptions options = OPTIONS();
+    options.tellsReports = true;
+    layer = std::make_unique<MediaLayer>(options, signalling);
+    TYPtr<CallMedia> const call = makeCallOfTheSameLoop();
+    Listener a;
+    join(a, *call, {PCMA});
+    pass(8000);
+    ASSERT_FALSE(a.went.empty());
+    EXPECT_EQ(a.went.front().from, a.leg->getLocalRtcp());
+    EXPECT_EQ(a.went.front().to, a.far.getRtcp());
+    EXPECT_TRUE(a.came.empty());
+
+    RtcpPacket packet;
+    packet.sender = 4711;
+    a.far.sendRtcp(packet);
+    pass(20);
+    ASSERT_EQ(a.came.size(), 1u);
+    EXPECT_EQ(a.came.front().packet.sender, 4711u);
+    EXPECT_EQ(a.came.front().to, a.leg->getLocalRtcp());
+}
+
+TEST_F(MediaFixture, ReportsAreNotToldWhereNobodyAsked)
+{
+    TYPtr<CallMedia> const call = makeCallOfTheSameLoop();
+    Listener a;
+    join(a, *call, {PCMA});
+    pass(8000);
+    EXPECT_TRUE(a.went.empty());
+}

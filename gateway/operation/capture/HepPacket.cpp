@@ -1,0 +1,92 @@
+#include "operation/capture/HepPacket.h"
+
+#include <netinet/in.h>
+
+namespace
+{
+enum Chunk : unsigned int
+{
+    FAMILY = 1,
+    TRANSPORT = 2,
+    FROM_VERSION_4 = 3,
+    TO_VERSION_4 = 4,
+    FROM_VERSION_6 = 5,
+    TO_VERSION_6 = 6,
+    FROM_PORT = 7,
+    TO_PORT = 8,
+    SECONDS = 9,
+    MICROSECONDS = 10,
+    PROTOCOL = 11,
+    AGENT = 12,
+    PASSWORD = 14,
+    PAYLOAD = 15,
+    CORRELATION = 17
+};
+constexpr std::string_view BEGINNING = "HEP3";
+constexpr std::size_t HEAD = 6;     // of the packet, and of each chunk
+constexpr unsigned int GENERIC = 0; // the vendor of all these chunks
+constexpr unsigned char VERSION_4 = 2;
+constexpr unsigned char VERSION_6 = 10;
+
+void ADD_NUMBER(std::string& octets, std::uint32_t value, unsigned int length)
+{
+    for (unsigned int i = length; i-- > 0;)
+        octets += static_cast<char>(value >> (8 * i) & 0xff);
+}
+
+void ADD(std::string& octets, Chunk chunk, std::string_view value)
+{
+    ADD_NUMBER(octets, GENERIC, 2);
+    ADD_NUMBER(octets, chunk, 2);
+    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD + value.size()), 2);
+    octets += value;
+}
+
+void ADD(std::string& octets, Chunk chunk, std::uint32_t value, unsigned int length)
+{
+    std::string text;
+    ADD_NUMBER(text, value, length);
+    ADD(octets, chunk, text);
+}
+
+std::string_view HOST_OF(sockaddr const& address)
+{
+    if (address.sa_family == AF_INET)
+        return {reinterpret_cast<char const*>(&reinterpret_cast<sockaddr_in const&>(address).sin_addr),
+                sizeof(in_addr)};
+    return {reinterpret_cast<char const*>(&reinterpret_cast<sockaddr_in6 const&>(address).sin6_addr), sizeof(in6_addr)};
+}
+
+/// At the same place in both versions.
+std::uint32_t PORT_OF(sockaddr const& address) { return ntohs(reinterpret_cast<sockaddr_in const&>(address).sin_port); }
+} // namespace
+
+std::string HepPacket::encode(std::uint32_t agent, std::string_view password) const
+{
+    bool const isVersion4 = from.sa_family == AF_INET;
+    auto const now = std::chrono::duration_cast<std::chrono::microseconds>(time.time_since_epoch()).count();
+    std::string octets(BEGINNING);
+    octets.reserve(256 + password.size() + correlation.size() + payload.size());
+    octets.append(2, '\0'); // the length
+    ADD(octets, FAMILY, isVersion4 ? VERSION_4 : VERSION_6, 1);
+    ADD(octets, TRANSPORT, transport, 1);
+    ADD(octets, isVersion4 ? FROM_VERSION_4 : FROM_VERSION_6, HOST_OF(from));
+    ADD(octets, isVersion4 ? TO_VERSION_4 : TO_VERSION_6, HOST_OF(to));
+    ADD(octets, FROM_PORT, PORT_OF(from), 2);
+    ADD(octets, TO_PORT, PORT_OF(to), 2);
+    ADD(octets, SECONDS, static_cast<std::uint32_t>(now / 1000000), 4);
+    ADD(octets, MICROSECONDS, static_cast<std::uint32_t>(now % 1000000), 4);
+    ADD(octets, PROTOCOL, protocol, 1);
+    ADD(octets, AGENT, agent, 4);
+    if (!password.empty())
+        ADD(octets, PASSWORD, password);
+    if (!correlation.empty())
+        ADD(octets, CORRELATION, correlation);
+    if (octets.size() + HEAD + payload.size() > LONGEST)
+        return {};
+    ADD(octets, PAYLOAD, payload);
+    std::string length;
+    ADD_NUMBER(length, static_cast<std::uint32_t>(octets.size()), 2);
+    octets.replace(BEGINNING.size(), length.size(), length);
+    return octets;
+}
