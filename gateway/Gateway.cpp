@@ -181,12 +181,17 @@ void Gateway::openMetrics()
                                                  m_records.get(), m_callControlLoop);
     try
     {
-        HttpServer::Pages pages{{"/metrics", [this] {
-                                     return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
-                                 }}};
+        HttpContents contents{{{"/metrics", [this] {
+                                    return HttpAnswer{200, m_metrics->getText(), MetricText::CONTENT_TYPE};
+                                }}}};
         if (m_configuration.metrics.hasPage)
-            pages["/"] = [this] { return HttpAnswer{200, m_page.getText(), StatusPage::CONTENT_TYPE}; };
-        m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, pages);
+            contents.pages["/"] = [this] { return HttpAnswer{200, m_page.getText(), StatusPage::CONTENT_TYPE}; };
+        if (m_configuration.metrics.hasPage && m_control != nullptr)
+        {
+            contents.files = CallPage::FILES();
+            contents.relay = &m_relay.emplace(m_configuration.control.path);
+        }
+        m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, std::move(contents));
     }
     catch (std::runtime_error const& error)
     {

@@ -15,6 +15,8 @@
 #include "operation/control/ControlServer.h"
 #include "operation/http/HttpServer.h"
 #include "operation/metric/GatewayMetrics.h"
+#include "operation/page/CallPage.h"
+#include "operation/page/ControlRelay.h"
 #include "operation/page/StatusPage.h"
 #include "operation/record/CallRecords.h"
 #include "operation/record/CallWatch.h"
@@ -113,6 +115,7 @@ private:
     ControlCommands m_commands;
     std::unique_ptr<ControlServer> m_control; // null where it is not configured
     StatusPage m_page;
+    std::optional<ControlRelay> m_relay; // where there is a page and a socket
     std::unique_ptr<GatewayMetrics>
         m_metrics; // null where they are not configured, and so are the pages, which end first
     std::unique_ptr<HttpServer> m_pages;

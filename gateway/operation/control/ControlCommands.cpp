@@ -87,6 +87,13 @@ ControlCommands::Command const* ControlCommands::FIND(std::string_view verb)
         Command{"call", "SERIAL", "one call: who holds it, its quality, its ladder", &This::call, 1, {}, true},
         Command{
             "history", "SERIAL PROPERTY", "each value that a property of the leg took", &This::history, 2, {}, true},
+        Command{"recorded",
+                "",
+                "the calls that the recorder knows, also those that are over",
+                &This::recorded,
+                0,
+                {},
+                true},
         Command{"interfaces", "", "the interfaces and their state", &This::interfaces, 0},
         Command{"peers", "", "whom the interfaces talk to", &This::peers, 0, {}, true},
         Command{"registrations", "", "who is registered, here or with a peer", &This::registrations, 0, {}, true},

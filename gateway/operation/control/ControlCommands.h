@@ -66,6 +66,7 @@ private:
     ControlAnswer calls(ControlRequest const& request);
     ControlAnswer call(ControlRequest const& request);
     ControlAnswer history(ControlRequest const& request);
+    ControlAnswer recorded(ControlRequest const& request);
     // ControlCommands_Top.cpp
     ControlAnswer top(ControlRequest const& request);
     // ControlCommands_Trace.cpp

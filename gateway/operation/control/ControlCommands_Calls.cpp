@@ -5,6 +5,7 @@
 #include "calls/CC_Call.h"
 #include "calls/CC_CallLeg.h"
 #include "diagnosis/CC_Explanation.h"
+#include "diagnosis/CC_JsonLine.h"
 #include "diagnosis/CC_RecordingReport.h"
 #include "operation/control/ControlNumber.h"
 #include "operation/record/CallLine.h"
@@ -84,13 +85,23 @@ CC_Call const* FIND_CALL(unsigned long long serial, String const& context)
     return nullptr;
 }
 
-void ADD_QUALITY(std::vector<std::string>& lines, CC_Call const& call)
+/// A line of text and the record's own, or a line of JSON, for each leg that has one.
+void ADD_QUALITY(std::vector<std::string>& lines, CC_Call const& call, bool isJson)
 {
     for (unsigned int i = 0; CC_CallLeg const* const leg = call.getCallLeg(i); ++i)
         if (CC_Property const* const quality = leg->getProperties().get(CC_PropertyId::QUALITY_OF_SERVICE))
         {
             String value;
             quality->getValueString(value);
+            if (isJson)
+            {
+                lines.push_back(CC_JsonLine()
+                                    .add("leg", leg->getSerial())
+                                    .add("legName", leg->getName().view())
+                                    .add("quality", value.view())
+                                    .get());
+                continue;
+            }
             lines.push_back(fmt::format("quality of leg {} {}", leg->getSerial(), leg->getName().view()));
             ADD_LINES(lines, value.view());
         }
@@ -127,9 +138,12 @@ ControlAnswer ControlCommands::call(ControlRequest const& request)
     ControlAnswer answer;
     CC_Explanation const explanation = CC_Explanation::OF_CALL(serial);
     CC_RecordingReport const report = RECORDED();
+    CC_Call const* const up = FIND_CALL(serial, m_host.contextName);
     if (request.isJson)
     {
         ADD_LINES(answer.lines, explanation.getJson());
+        if (up != nullptr)
+            ADD_QUALITY(answer.lines, *up, true);
         ADD_LINES(answer.lines, report.getJson(serial));
     }
     else
@@ -137,8 +151,8 @@ ControlAnswer ControlCommands::call(ControlRequest const& request)
         InfoContainer info;
         explanation.getInfo(info, EVERYTHING, 0, 0, 0, String::s_empty); // without observers
         ADD_LINES(answer.lines, info.getString_TreeFormat().view());
-        if (CC_Call const* const call = FIND_CALL(serial, m_host.contextName))
-            ADD_QUALITY(answer.lines, *call);
+        if (up != nullptr)
+            ADD_QUALITY(answer.lines, *up, false);
         ADD_LINES(answer.lines, report.getLadder(serial));
     }
     if (answer.lines.empty())
@@ -157,4 +171,10 @@ ControlAnswer ControlCommands::history(ControlRequest const& request)
     if (answer.lines.empty())
         answer.error = "nothing is known of " + property + " of a leg " + request.arguments[0];
     return answer;
+}
+
+ControlAnswer ControlCommands::recorded(ControlRequest const& request)
+{
+    CC_RecordingReport const report = RECORDED();
+    return {request.isJson ? report.getCallsJson() : report.getCalls(), {}};
 }

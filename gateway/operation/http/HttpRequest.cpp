@@ -9,10 +9,11 @@ namespace
 {
 constexpr std::string_view END_OF_LINE = "\r\n";
 
-/// No page is kept, runs anything, loads anything, or is shown inside of another.
+/// No page is kept, loads or runs what is not ours, or is shown inside of another.
 constexpr char const* FOR_BROWSERS =
     "Cache-Control: no-store\r\nX-Content-Type-Options: nosniff\r\nContent-Security-Policy: "
-    "default-src 'none'; style-src 'unsafe-inline'; frame-ancestors 'none'\r\n";
+    "default-src 'none'; style-src 'self' 'unsafe-inline'; script-src 'self'; connect-src 'self'; base-uri 'none'; "
+    "form-action 'none'; frame-ancestors 'none'\r\n";
 
 struct HttpStatus
 {
@@ -97,7 +98,9 @@ HttpRequest HttpRequest::PARSE(std::string_view head)
     std::string_view line = TAKE(head, END_OF_LINE);
     std::string_view const method = TAKE(line, " ");
     std::string_view const target = TAKE(line, " ");
-    return {REFUSAL_OF(method, target, line, head), method == "HEAD", std::string(target.substr(0, target.find('?')))};
+    std::string_view query = target;
+    std::string_view const path = TAKE(query, "?");
+    return {REFUSAL_OF(method, target, line, head), method == "HEAD", std::string(path), std::string(query)};
 }
 
 std::string HttpAnswer::getText(bool isHead) const

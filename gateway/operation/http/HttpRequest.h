@@ -9,6 +9,7 @@ struct HttpRequest
     unsigned int refusal = 0; ///< the status of the answer to what is no request, or none for us; 0: all right
     bool isHead = false;      ///< the answer without its contents
     std::string path;         ///< without what follows a "?"
+    std::string query;        ///< that
 
     /// Of everything up to and with the empty line.
     static HttpRequest PARSE(std::string_view head);

@@ -84,15 +84,15 @@ HttpServer::Descriptor::Descriptor(int descriptor) : m_descriptor(descriptor)
 
 HttpServer::Descriptor::~Descriptor() { close(m_descriptor); }
 
-HttpServer::HttpServer(SocketAddress const& listen, SignallingLoop& loop, Pages pages, Milliseconds patience)
-    : m_pages(std::move(pages))
+HttpServer::HttpServer(SocketAddress const& listen, SignallingLoop& loop, HttpContents contents, Milliseconds patience)
+    : m_contents(std::move(contents))
     , m_loop(loop)
     , m_patience(patience)
     , m_listening(LISTEN_ON(listen))
     , m_asked(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK))
     , m_wake(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK))
 {
-    for (auto const& page : m_pages)
+    for (auto const& page : m_contents.pages)
         m_made[page.first] = {HttpAnswer::REFUSING(503), {}};
     m_loop.watch(m_asked.get(), [this] { onAsked(); });
     m_thread = std::thread([this] { run(); });
@@ -118,7 +118,7 @@ void HttpServer::onAsked()
     }
     for (std::string const& path : wanted)
     {
-        HttpAnswer made = MAKE(m_pages.find(path)->second);
+        HttpAnswer made = MAKE(m_contents.pages.find(path)->second);
         std::lock_guard const lock(m_mutex);
         m_made.find(path)->second = {std::move(made), Clock::now()};
     }
@@ -146,6 +146,7 @@ void HttpServer::runTurn()
     std::vector<pollfd> polled{{m_wake.get(), POLLIN, 0}, {isResting ? -1 : m_listening.get(), POLLIN, 0}};
     for (Client const& client : m_clients)
     {
+        polled.push_back({client.source ? client.source->get() : -1, POLLIN, 0});
         polled.push_back({client.descriptor.get(), 0, 0});
         if (client.state == State::READING || client.state == State::CLOSING)
             polled.back().events = POLLIN;
@@ -158,6 +159,8 @@ void HttpServer::runTurn()
     std::size_t place = 2;
     for (Client& client : m_clients)
     {
+        if (polled[place++].revents != 0)
+            collect(client);
         if (polled[place++].revents != 0)
             onEvent(client);
         if (client.state == State::WAITING)
@@ -239,11 +242,36 @@ void HttpServer::begin(Client& client)
 {
     if (client.request.refusal != 0)
         return answer(client, HttpAnswer::REFUSING(client.request.refusal));
-    if (!m_pages.contains(client.request.path))
-        return answer(client, HttpAnswer::REFUSING(404));
-    client.state = State::WAITING;
+    if (auto const file = m_contents.files.find(client.request.path); file != m_contents.files.end())
+        return answer(client, file->second);
+    bool const isMade = m_contents.pages.contains(client.request.path);
+    if (!isMade)
+    {
+        unsigned int refusal = 404;
+        int const source = m_contents.relay != nullptr ? m_contents.relay->open(client.request, refusal) : -1;
+        if (source < 0)
+            return answer(client, HttpAnswer::REFUSING(refusal));
+        client.source.emplace(source);
+        client.text.clear();
+    }
+    client.state = isMade ? State::WAITING : State::COLLECTING;
     client.asked = Clock::now();
     client.deadline = client.asked + m_patience;
+}
+
+void HttpServer::collect(Client& client)
+{
+    std::array<char, 65536> piece;
+    ssize_t const size = read(client.source->get(), piece.data(), piece.size());
+    if (size < 0 && (errno == EAGAIN || errno == EINTR))
+        return;
+    client.text.append(piece.data(), size > 0 ? static_cast<std::size_t>(size) : 0);
+    bool const isTooLong = client.text.size() > LONGEST_RELAYED;
+    if (std::optional<HttpAnswer> const whole = m_contents.relay->read(client.text, size <= 0); whole || isTooLong)
+    {
+        client.source.reset();
+        answer(client, isTooLong ? HttpAnswer::REFUSING(503) : *whole);
+    }
 }
 
 void HttpServer::ask(Client& client)
@@ -288,7 +316,8 @@ void HttpServer::expire(Client& client)
 {
     if (Clock::now() < client.deadline)
         return;
-    if (client.state == State::WAITING)
+    client.source.reset();
+    if (client.state == State::WAITING || client.state == State::COLLECTING)
         answer(client, {503, "the gateway's loop does not turn\n"});
     else
         client.state = State::OVER;

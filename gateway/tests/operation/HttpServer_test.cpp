@@ -5,6 +5,7 @@
 #include <arpa/inet.h>
 #include <array>
 #include <deque>
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <memory>
 #include <netinet/in.h>
@@ -77,14 +78,16 @@ struct HttpServerTest : testing::Test
 {
     void open(HttpServer::Milliseconds patience = HttpServer::PATIENCE)
     {
-        HttpServer::Pages const pages{{"/page",
-                                       [this]
-                                       {
-                                           ++made;
-                                           return HttpAnswer{200, content};
-                                       }},
-                                      {"/none", []() -> HttpAnswer { throw std::bad_alloc(); }}};
-        server = std::make_unique<HttpServer>(SocketAddress{"127.0.0.1", port}, loop, pages, patience);
+        std::map<std::string, std::function<HttpAnswer()>> const pages{
+            {"/page",
+             [this]
+             {
+                 ++made;
+                 return HttpAnswer{200, content};
+             }},
+            {"/none", []() -> HttpAnswer { throw std::bad_alloc(); }}};
+        server = std::make_unique<HttpServer>(SocketAddress{"127.0.0.1", port}, loop, HttpContents{pages, files, relay},
+                                              patience);
     }
     /// What is answered to that while the loop turns.
     std::string ask(std::string const& request)
@@ -110,6 +113,8 @@ struct HttpServerTest : testing::Test
     std::uint16_t port = FREE_PORT();
     std::string content = "figures\n";
     unsigned int made = 0;
+    std::map<std::string, HttpAnswer> files;
+    HttpRelay* relay = nullptr;
     std::unique_ptr<HttpServer> server;
 };
 
@@ -119,9 +124,105 @@ TEST_F(HttpServerTest, GivesOutAPage)
     EXPECT_EQ(ask("GET /page?x=1 HTTP/1.1\r\nHost: localhost:1\r\n\r\n"),
               "HTTP/1.1 200 OK\r\nContent-Type: text/plain; charset=utf-8\r\nContent-Length: 8\r\n"
               "Cache-Control: no-store\r\nX-Content-Type-Options: nosniff\r\n"
-              "Content-Security-Policy: default-src 'none'; style-src 'unsafe-inline'; frame-ancestors 'none'\r\n"
+              "Content-Security-Policy: default-src 'none'; style-src 'self' 'unsafe-inline'; script-src 'self'; "
+              "connect-src 'self'; base-uri 'none'; form-action 'none'; frame-ancestors 'none'\r\n"
               "Connection: close\r\n\r\nfigures\n");
     EXPECT_TRUE(ask("HEAD /page HTTP/1.0\r\n\r\n").ends_with("Connection: close\r\n\r\n"));
+}
+
+TEST_F(HttpServerTest, GivesOutAFileWithoutTheLoop)
+{
+    files["/file"] = {200, "as it is\n", "text/css"};
+    open();
+    Browser browser(port);
+    browser.say("GET /file HTTP/1.0\r\n\r\n");
+    browser.hearAll();
+    EXPECT_TRUE(browser.heard.starts_with("HTTP/1.1 200 OK\r\nContent-Type: text/css\r\n"));
+    EXPECT_TRUE(browser.heard.ends_with("as it is\n"));
+}
+
+namespace
+{
+/// Gives out what is written into a pipe, up to a full stop.
+class PipeRelay : public HttpRelay
+{
+public:
+    PipeRelay() { EXPECT_EQ(pipe2(ends, O_NONBLOCK | O_CLOEXEC), 0); }
+    ~PipeRelay() override { closeWriting(); }
+
+    int open(HttpRequest const& request, unsigned int& refusal) override
+    {
+        refusal = 503;
+        return request.path == "/piped" ? ends[0] : -1;
+    }
+    std::optional<HttpAnswer> read(std::string_view come, bool isEnd) override
+    {
+        if (come.ends_with('.'))
+            return HttpAnswer{200, std::string(come)};
+        return isEnd ? std::optional(HttpAnswer::REFUSING(503)) : std::nullopt;
+    }
+    void say(std::string_view text) const
+    {
+        EXPECT_EQ(write(ends[1], text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    }
+    void closeWriting()
+    {
+        if (ends[1] >= 0)
+            close(std::exchange(ends[1], -1));
+    }
+
+private:
+    int ends[2]{-1, -1};
+};
+} // namespace
+
+TEST_F(HttpServerTest, RelaysWhatComesInPiecesOnceItIsWhole)
+{
+    PipeRelay pipe;
+    relay = &pipe;
+    open();
+    Browser browser(port);
+    browser.say("GET /piped HTTP/1.0\r\n\r\n");
+    pipe.say("one, ");
+    pipe.say("two.");
+    browser.hearAll();
+    EXPECT_TRUE(browser.heard.ends_with("\r\n\r\none, two."));
+}
+
+TEST_F(HttpServerTest, TellsThatWhatItRelaysHasEndedEarly)
+{
+    PipeRelay pipe;
+    relay = &pipe;
+    open();
+    Browser browser(port);
+    browser.say("GET /piped HTTP/1.0\r\n\r\n");
+    pipe.say("one, ");
+    pipe.closeWriting();
+    browser.hearAll();
+    EXPECT_TRUE(browser.heard.starts_with("HTTP/1.1 503 "));
+}
+
+TEST_F(HttpServerTest, WaitsForWhatItRelaysAsLongAsForTheLoop)
+{
+    PipeRelay pipe;
+    relay = &pipe;
+    open(HttpServer::Milliseconds(50));
+    Browser browser(port);
+    browser.say("GET /piped HTTP/1.0\r\n\r\n");
+    browser.hearAll();
+    EXPECT_TRUE(browser.heard.starts_with("HTTP/1.1 503 "));
+}
+
+TEST_F(HttpServerTest, AnswersWithTheReasonWhyNothingIsRelayed)
+{
+    PipeRelay pipe;
+    relay = &pipe;
+    open();
+    Browser browser(port);
+    browser.say("GET /other HTTP/1.0\r\n\r\n");
+    browser.hearAll();
+    EXPECT_TRUE(browser.heard.starts_with("HTTP/1.1 503 "));
+    pipe.say("for nobody");
 }
 
 TEST_F(HttpServerTest, MakesAPageOnceForManyWhoAskAtOnce)

@@ -1,7 +1,7 @@
 # Completion for gatewayctl: options, commands, and the names of interfaces, which the gateway tells.
 _gatewayctl() {
     local word=${COMP_WORDS[COMP_CWORD]} before=${COMP_WORDS[COMP_CWORD - 1]}
-    local commands="status calls call history interfaces peers registrations top trace stats drop block unblock drain resume
+    local commands="status calls call history recorded interfaces peers registrations top trace stats drop block unblock drain resume
         reload shutdown help"
     local i command="" options=()
     for ((i = 1; i < COMP_CWORD; i++)); do
