@@ -217,6 +217,7 @@ IN_PLACE void tport_deliver(tport_t* port, msg_t* message, msg_t* next, void* co
 {
     static auto* const s_original = ORIGINAL<void(tport_t*, msg_t*, msg_t*, void*, su_time_t)>("tport_deliver");
     s_called |= DELIVER;
+    SipStack::NOTE_MESSAGE();
     if (SipGuard::ADMIT(port, message))
         s_original(port, message, next, compressor, now);
     else
