@@ -3,26 +3,13 @@
 #
 #     bash benchmarks/gateway/figures.sh GATEWAY PORT [CALLS [CONTACTS]]
 . "$(dirname "${BASH_SOURCE[0]}")/../../gateway/tests/lib.bash"
+. "$(dirname "${BASH_SOURCE[0]}")/measure.bash"
 CALLS=${3:-1000}
 CONTACTS=${4:-2000}
 PORT_METRICS=$((PORT + 30))
 SIPP_TIMEOUT=300s
 LOG_LEVEL=info
 
-memory() { awk '/^Pss:/ { print $2 }' /proc/$gateway_pid/smaps_rollup; }     # KiB
-processor() { cat /proc/$gateway_pid/task/*/schedstat | awk '{ sum += $1 } END { printf "%d", sum / 1000 }'; } # microseconds
-tell() { printf '%-58s %12s %s\n' "$1" "$2" "$3"; }
-divided() { awk -v a="$1" -v b="$2" 'BEGIN { printf "%.*f", (a / b < 100 ? 1 : 0), a / b }'; }
-
-callee() {
-    expect_invite
-    respond "180 Ringing"
-    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
-    expect_request ACK
-    expect_request BYE
-    respond_in_dialog "200 OK"
-}
-caller() { call_up; pause "$HELD"; send_bye; expect 200; }
 probe() { send_request OPTIONS; expect 200; }
 register() {
     local text="REGISTER sip:$HOST:$PORT_A SIP/2.0
@@ -39,20 +26,6 @@ Max-Forwards: 70"
     expect 200
 }
 
-configure() { # LINES-OF-INTERFACE [LINES]
-    write_configuration $'max-calls = 0\nmax-calls-per-second = 0\nmax-calls-per-source = 0\n'"recording = \"$WORK/calls.ring\"" "$1"
-    printf '\n[records]\nfile = "%s"\n\n[metrics]\nlisten = "%s:%d"\n%s\n' "$WORK/calls.jsonl" "$HOST" $PORT_METRICS "${2:-}" >>"$WORK/gateway.toml"
-}
-# the log as a gateway has it that nobody looks into
-start_gateway_as_shipped() {
-    sed -i "s/^call-control-log-level = .*/call-control-log-level = 1/" "$WORK/gateway.toml"
-    TRACED=0 start_gateway
-}
-scrape() { # TIMES
-    python3 -c 'import sys, urllib.request as r
-for i in range(int(sys.argv[2])): page = r.urlopen(sys.argv[1], timeout=20).read()
-sys.stdout.buffer.write(page)' "http://$HOST:$PORT_METRICS/metrics" "$1"
-}
 load() { # CALLS PER-SECOND MILLISECONDS
     HELD=$3
     start_callee callee -m "$1"
@@ -76,7 +49,7 @@ calls_up() {
     expect_callee
 }
 
-configure ''
+configure 'max-requests-per-source = 0'
 start_gateway_as_shipped
 tell "memory, no call yet" "$(memory)" KiB
 before=$(processor)
@@ -95,8 +68,7 @@ scrape 200 >"$WORK/page"
 tell "processor time of a scrape" "$(divided $(($(processor) - before)) 200)" us
 tell "a scrape" "$(stat -c %s "$WORK/page")" octets
 tell "figures in a scrape" "$(grep -vc '^#' "$WORK/page")" ''
-kill -TERM $gateway_pid
-wait $gateway_pid
+end_gateway
 
 RELAYED=gateway # what session descriptions have then
 configure "codecs = [\"PCMA\"]" $'\n[media]\nmode = "relay"\nfirst-port = 40000\nlast-port = 59999'
@@ -106,14 +78,13 @@ calls_up "speech through the gateway"
 before=$(processor)
 load "$CALLS" 100 100
 tell "processor time of a call, speech through the gateway" "$(divided $(($(processor) - before)) "$CALLS")" "us, without its packets"
-kill -TERM $gateway_pid
-wait $gateway_pid
+end_gateway
 
 for ((i = 0; i < CONTACTS; i++)); do echo "u$i:office:secret"; done >"$WORK/passwords"
 chmod 600 "$WORK/passwords"
 RELAYED=
 { echo SEQUENTIAL; for ((i = 0; i < CONTACTS; i++)); do echo "u$i;[authentication username=u$i password=secret]"; done; } >"$WORK/users.csv"
-configure ''
+configure 'max-requests-per-source = 0'
 sed -i -e "s,^name = \"a\",&\nauthenticate = true\nregistrar = true\nrealm = \"office\"\nalgorithms = [\"MD5\"]\npasswords = \"$WORK/passwords\"\nregistrations = \"$WORK/contacts\"\nallow = [\"$HOST\"]," \
     -e "/^peer = \"$HOST:$PORT_CALLER\"/d" "$WORK/gateway.toml"
 start_gateway_as_shipped
@@ -123,6 +94,4 @@ tell "memory of a contact, with its transactions" "$(divided $((($(memory) - bef
 before=$(processor)
 run_caller register x -inf "$WORK/users.csv" -m "$CONTACTS" -r 200 || fail "registrations: exit status $?"
 tell "processor time of a registration (401, then 200)" "$(divided $(($(processor) - before)) "$CONTACTS")" us
-kill -TERM $gateway_pid
-wait $gateway_pid
-gateway_pid=0
+end_gateway

@@ -5,6 +5,7 @@
 #include <charconv>
 #include <netinet/in.h>
 #include <stdexcept>
+#include <string_view>
 #include <system_error>
 
 namespace
@@ -48,6 +49,15 @@ AddressRange AddressRange::PARSE(std::string const& text)
         if ((range.m_first[i] & BEYOND(range.m_bits, i)) != 0)
             throw std::invalid_argument("'" + text + "' has bits beyond its prefix");
     return range;
+}
+
+std::string AddressRange::TEXT_OF(InternetAddress const& address)
+{
+    constexpr std::string_view WRITTEN = "::ffff:";
+    char text[INET6_ADDRSTRLEN] = "";
+    inet_ntop(AF_INET6, address.data(), text, sizeof text);
+    std::string_view const whole = text;
+    return std::string(whole.starts_with(WRITTEN) ? whole.substr(WRITTEN.size()) : whole);
 }
 
 InternetAddress AddressRange::ADDRESS_OF(sockaddr const& address)

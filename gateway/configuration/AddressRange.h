@@ -22,6 +22,8 @@ public:
     static AddressRange PARSE(std::string const& text);
     /// All zeros for what is no address of the internet, which only the range of everything contains.
     static InternetAddress ADDRESS_OF(sockaddr const& address);
+    /// "192.0.2.1", "2001:db8::1".
+    static std::string TEXT_OF(InternetAddress const& address);
 
     InternetAddress const& getFirst() const { return m_first; }
     bool contains(InternetAddress const& address) const;

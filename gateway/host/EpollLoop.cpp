@@ -44,10 +44,12 @@ void EpollLoop::runTurn()
 {
     std::array<epoll_event, 64> events{};
     int const count = epoll_wait(m_descriptor, events.data(), static_cast<int>(events.size()), -1);
+    beginBusy();
     for (int i = 0; i < count; ++i)
         if (auto const found = m_handlers.find(events[static_cast<std::size_t>(i)].data.fd); found != m_handlers.end())
         {
             auto const handler = found->second;
             (*handler)();
         }
+    endBusy();
 }

@@ -1,7 +1,9 @@
 #pragma once
 
 #include <functional>
+#include <vector>
 
+class TurnTime;
 class TYEventLoop;
 
 /// The outermost event loop of the process, from which all others of the signalling thread run. A module whose protocol
@@ -26,6 +28,19 @@ public:
     /// Ends `run()`.
     virtual void stop() = 0;
 
-    /// Runs a turn of `loop`, which must outlive this loop's running, whenever work is pending in it.
+    /// Runs turns of `loop`, which must outlive this loop's running, whenever work is pending in it.
     void attach(TYEventLoop& loop);
+    /// Notes each turn there from now on; null: nowhere.
+    void setTurnTime(TurnTime* time) { m_turnTime = time; }
+
+protected:
+    /// Around what is done between two waits: what is posted meanwhile runs before the second, without a system call.
+    /// @{
+    void beginBusy();
+    void endBusy();
+    /// @}
+
+private:
+    std::vector<TYEventLoop*> m_attached;
+    TurnTime* m_turnTime = nullptr;
 };

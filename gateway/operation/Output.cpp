@@ -50,6 +50,7 @@ void Output::setDescriptor(int descriptor)
     struct stat status = {};
     m_descriptor = descriptor;
     m_isSocket = fstat(descriptor, &status) == 0 && S_ISSOCK(status.st_mode);
+    m_isFile = S_ISREG(status.st_mode);
     if (!S_ISFIFO(status.st_mode) && !S_ISCHR(status.st_mode))
         return;
     std::string const name = "/proc/self/fd/" + std::to_string(descriptor);
@@ -84,7 +85,7 @@ long Output::tryToWrite(std::string_view text)
         ssize_t result = 0;
         if (m_isSocket)
             result = send(m_descriptor, rest.data(), rest.size(), MSG_DONTWAIT | MSG_NOSIGNAL);
-        else if (m_isOwn)
+        else if (m_isOwn || m_isFile)
             result = ::write(m_descriptor, rest.data(), rest.size());
         else if (IS_WRITABLE(m_descriptor, 0)) // a pipe that has any room has it for so much
             result = ::write(m_descriptor, rest.data(), std::min<std::size_t>(rest.size(), PIPE_BUF));

@@ -59,5 +59,6 @@ private:
     int m_descriptor = -1;
     bool m_isOwn = false; // the descriptor
     bool m_isSocket = false;
+    bool m_isFile = false; // which takes all at once
     bool m_isEnding = false;
 };

@@ -352,6 +352,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "max-message-size",
                    "max-header-size",
                    "max-connections-per-source",
+                   "max-requests-per-source",
                    "tcp-idle",
                    "t1",
                    "t1x64",
@@ -389,6 +390,8 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     interface.maxHeaderSize = section.number("max-header-size", interface.maxHeaderSize, LEAST_MESSAGE, MOST_MESSAGE);
     interface.maxConnectionsPerSource =
         section.number("max-connections-per-source", interface.maxConnectionsPerSource, 1, UNLIMITED);
+    interface.maxRequestsPerSource =
+        section.number("max-requests-per-source", interface.maxRequestsPerSource, 0, UNLIMITED);
     interface.tcpIdle = section.number("tcp-idle", interface.tcpIdle, 1, 86400);
     interface.t1 = section.number("t1", interface.t1, 10, 10000);
     interface.t1x64 = section.number("t1x64", 64 * interface.t1, interface.t1, 640000);

@@ -70,6 +70,8 @@ struct SipConfiguration
     unsigned int maxMessageSize = 65535; ///< octets
     unsigned int maxHeaderSize = 32768;  ///< octets: a message without its body
     unsigned int maxConnectionsPerSource = 16;
+    unsigned int maxRequestsPerSource =
+        100;                            ///< a second, of those that belong to no dialog and begin none; 0: no limit
     unsigned int tcpIdle = 120;         ///< seconds that a connection may stay without a message
     unsigned int t1 = 500;              ///< milliseconds: the first retransmission
     unsigned int t1x64 = 32000;         ///< milliseconds: how long a transaction waits for its answer

@@ -144,9 +144,10 @@ std::string SipModule::describe() const
         if (port->isLeaving)
             text += fmt::format("interface {}: leaving\n", port->interface.getName().view());
         SipGuard const& guard = port->interface.getGuard();
-        text += fmt::format("interface {}: {} messages of strangers, {} too large, {} connections refused\n",
-                            port->interface.getName().view(), guard.getCounters().strangers,
-                            guard.getCounters().tooLarge, guard.getNumberOfRefused());
+        text +=
+            fmt::format("interface {}: {} messages of strangers, {} too large, {} too many, {} connections refused\n",
+                        port->interface.getName().view(), guard.getCounters().strangers, guard.getCounters().tooLarge,
+                        port->interface.getRequestRate().getNumberOfRefused(), guard.getNumberOfRefused());
         text += port->interface.getPeers().describe();
         if (SipTls const* const tls = port->interface.getTls())
             text += fmt::format("interface {}: {} connections of TLS, {} refused\n", port->interface.getName().view(),

@@ -11,9 +11,9 @@
 namespace
 {
 /// What may change while calls are up: it is looked at anew for each call, or each time.
-constexpr std::array<std::string_view, 11> IN_PLACE{
-    "answer-timeout", "digit-timeout", "failure-tone",    "max-call-duration", "max-expires", "min-expires",
-    "min-se",         "ringback",      "session-expires", "transfer",          "trusted"};
+constexpr std::array<std::string_view, 12> IN_PLACE{
+    "answer-timeout",          "digit-timeout", "failure-tone", "max-call-duration", "max-expires", "min-expires",
+    "max-requests-per-source", "min-se",        "ringback",     "session-expires",   "transfer",    "trusted"};
 } // namespace
 
 bool SipModule::prepareChange(Configuration const& configuration, std::vector<ConfigurationSection> const& interfaces)

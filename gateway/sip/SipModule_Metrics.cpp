@@ -84,6 +84,8 @@ void SipModule::addGuarded(MetricText& text) const
     addOfEach(text, [](SipInterface const& one) { return one.getGuard().getCounters().strangers; });
     text.begin("sip_large_messages_total", MetricText::COUNTER, "SIP messages that were too large");
     addOfEach(text, [](SipInterface const& one) { return one.getGuard().getCounters().tooLarge; });
+    text.begin("sip_requests_dropped_total", MetricText::COUNTER, "SIP requests beyond what an address may send");
+    addOfEach(text, [](SipInterface const& one) { return one.getRequestRate().getNumberOfRefused(); });
     text.begin("sip_connections_refused_total", MetricText::COUNTER, "Connections that were not taken");
     addOfEach(text, [](SipInterface const& one) { return one.getGuard().getNumberOfRefused(); });
 }

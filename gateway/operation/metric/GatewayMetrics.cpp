@@ -2,6 +2,7 @@
 
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/version.h"
+#include "host/SignallingLoop.h"
 #include "operation/Log.h"
 #include "operation/capture/Capture.h"
 #include "operation/metric/ProcessMetrics.h"
@@ -24,7 +25,10 @@ GatewayMetrics::GatewayMetrics(GatewayHost const& host, SignallingModules const&
     , m_records(records)
     , m_lag(loop)
 {
+    m_host.loop.setTurnTime(&m_turns);
 }
+
+GatewayMetrics::~GatewayMetrics() { m_host.loop.setTurnTime(nullptr); }
 
 std::string GatewayMetrics::getText() const
 {
@@ -55,6 +59,8 @@ void GatewayMetrics::addState(MetricText& text) const
         text.add(module->getNumberOfEndpoints(), {{"module", name}});
     text.begin("loop_lag_seconds", MetricText::HISTOGRAM, "How late the call-control loop runs what is due");
     text.add(m_lag.getHistogram());
+    text.begin("loop_turn_seconds", MetricText::HISTOGRAM, "Processor time of the turns of the signalling loop");
+    text.add(m_turns.getHistogram());
     text.begin("log_lines_dropped_total", MetricText::COUNTER, "Lines of the log that nobody took in time");
     text.add(GET_DROPPED_LOG_LINES());
 }

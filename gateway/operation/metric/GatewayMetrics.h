@@ -2,6 +2,7 @@
 
 #include "host/GatewayHost.h"
 #include "host/SignallingModule.h"
+#include "host/TurnTime.h"
 #include "operation/metric/CallMetrics.h"
 #include "operation/metric/LoopLag.h"
 
@@ -24,6 +25,10 @@ public:
                    std::map<std::string, std::string> const& interfaces, CallWatch const& watch,
                    CallMetrics const& calls, CallRecords const* records, TYEventLoop& loop);
 
+    ~GatewayMetrics();
+    GatewayMetrics(GatewayMetrics const&) = delete;
+    GatewayMetrics& operator=(GatewayMetrics const&) = delete;
+
     /// Throws std::bad_alloc.
     std::string getText() const;
 
@@ -41,4 +46,5 @@ private:
     CallMetrics const& m_calls;
     CallRecords const* m_records;
     LoopLag m_lag;
+    TurnTime m_turns;
 };

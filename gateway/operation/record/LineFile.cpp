@@ -35,14 +35,13 @@ bool LineFile::append(std::string_view line)
 {
     char end = '\n';
     std::array<iovec, 2> const whole{{{const_cast<char*>(line.data()), line.size()}, {&end, 1}}};
-    off_t const before = getSize();
     ssize_t written = 0;
     do
         written = writev(m_descriptor, whole.data(), whole.size());
     while (written < 0 && errno == EINTR);
     if (written == static_cast<ssize_t>(line.size() + 1))
         return true;
-    if (written > 0 && isRegular() && !cut(before))
+    if (written > 0 && isRegular() && !cut(getSize() - written))
         spdlog::error("{} ends with a piece of a record", m_name);
     return false;
 }

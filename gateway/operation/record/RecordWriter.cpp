@@ -7,7 +7,8 @@
 
 namespace
 {
-constexpr std::chrono::milliseconds MOMENT(500); // until what was not taken is tried again
+constexpr std::chrono::milliseconds MOMENT(500);   // until what was not taken is tried again
+constexpr std::chrono::milliseconds GATHERING(20); // for which others may join one that has come
 constexpr std::size_t AT_ONCE = 100;
 } // namespace
 
@@ -33,17 +34,21 @@ std::size_t RecordWriter::end()
 
 void RecordWriter::write(std::string line, CallJournal::Ticket ticket)
 {
+    std::size_t waiting = 0;
     {
         std::lock_guard const lock(m_mutex);
         if (m_waiting.size() < m_kept)
         {
             m_waiting.push_back({std::move(line), ticket});
-            m_changed.notify_all();
-            return;
+            waiting = m_waiting.size();
         }
-        ++m_lost;
+        else
+            ++m_lost;
     }
-    m_onDone(ticket);
+    if (waiting == 0)
+        m_onDone(ticket);
+    else if (waiting == 1 || waiting == AT_ONCE) // else the thread knows
+        m_changed.notify_all();
 }
 
 void RecordWriter::reopen()
@@ -78,7 +83,11 @@ void RecordWriter::run()
         if (m_isEnding)
             return;
         if (isDelivered && isBrought)
+        {
             m_changed.wait(lock, [this] { return m_isEnding || m_isReopening || !m_waiting.empty(); });
+            m_changed.wait_for(lock, GATHERING,
+                               [this] { return m_isEnding || m_isReopening || m_waiting.size() >= AT_ONCE; });
+        }
         else
             m_changed.wait_for(lock, MOMENT, [this] { return m_isEnding || m_isReopening; });
     }

@@ -12,15 +12,6 @@ namespace
 {
 constexpr std::size_t NOBODY = 16; // octets
 
-std::string TEXT_OF(InternetAddress const& address)
-{
-    constexpr std::string_view MAPPED = "::ffff:";
-    char text[INET6_ADDRSTRLEN] = "";
-    inet_ntop(AF_INET6, address.data(), text, sizeof text);
-    std::string_view const whole = text;
-    return std::string(whole.starts_with(MAPPED) ? whole.substr(MAPPED.size()) : whole);
-}
-
 /// Of a "nc" in hexadecimal digits; one of before RFC 2617 has none, and its nonce serves once.
 std::uint32_t COUNT_OF(std::string const& quality, std::string const& text)
 {
@@ -136,7 +127,7 @@ void SipAuthentication::onWrong(InternetAddress const& source)
     ++m_counters.wrong;
     if (long const seconds = m_bans.note(source); seconds != 0)
         spdlog::warn("interface {}: {} has failed to say who it is, and is not served for {} s", m_name,
-                     TEXT_OF(source), seconds);
+                     AddressRange::TEXT_OF(source), seconds);
 }
 
 std::string SipAuthentication::makeChallenge(InternetAddress const& source, bool isStale) const

@@ -21,9 +21,7 @@ long SipBans::note(InternetAddress const& source)
 {
     long const now = NOW();
     InternetAddress const party = PARTY_OF(source);
-    if (m_records.size() >= m_most && !m_records.contains(party))
-        makeRoom(now);
-    Record& record = m_records[party];
+    Record& record = find(party);
     if (now - std::max(record.last, record.until) > LONGEST)
         record = {};
     record.last = now;
@@ -32,32 +30,31 @@ long SipBans::note(InternetAddress const& source)
     record.failures = 0;
     record.ban = record.ban == 0 ? FIRST : std::min(2 * record.ban, LONGEST);
     record.until = now + record.ban;
-    return record.ban;
+    long const ban = record.ban;
+    if (m_banned.find(party) == nullptr)
+    {
+        m_banned.use(party) = record;
+        m_failing.erase(party);
+    }
+    return ban;
+}
+
+SipBans::Record& SipBans::find(InternetAddress const& party)
+{
+    return m_banned.find(party) != nullptr ? m_banned.use(party) : m_failing.use(party);
 }
 
 bool SipBans::isBanned(InternetAddress const& source) const
 {
-    if (m_records.empty())
+    if (m_banned.getSize() == 0)
         return false;
-    auto const found = m_records.find(PARTY_OF(source));
-    return found != m_records.end() && NOW() < found->second.until;
+    Record const* const record = m_banned.find(PARTY_OF(source));
+    return record != nullptr && NOW() < record->until;
 }
 
 std::size_t SipBans::getNumberOfBanned() const
 {
     long const now = NOW();
     return static_cast<std::size_t>(
-        std::count_if(m_records.begin(), m_records.end(), [&](auto const& entry) { return now < entry.second.until; }));
-}
-
-/// One who is banned stays as long as there is another.
-void SipBans::makeRoom(long now)
-{
-    auto const isBefore = [&](auto const& one, auto const& other)
-    {
-        bool const isOneBanned = now < one.second.until;
-        bool const isOtherBanned = now < other.second.until;
-        return isOneBanned != isOtherBanned ? isOtherBanned : one.second.last < other.second.last;
-    };
-    m_records.erase(std::min_element(m_records.begin(), m_records.end(), isBefore));
+        std::count_if(m_banned.begin(), m_banned.end(), [&](auto const& entry) { return now < entry.second.until; }));
 }

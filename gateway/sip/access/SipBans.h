@@ -1,13 +1,12 @@
 #pragma once
 
-#include "configuration/AddressRange.h"
+#include "sip/access/SipSources.h"
 
 #include <cstddef>
-#include <map>
 
 /// Who has failed too often to say who he is, by his address; of version 6 by its first 64 bits, which are one party's.
-/// Each ban is twice as long as the one before, up to an hour. A bounded number of addresses is kept; of those the one
-/// that has failed least lately goes when another comes.
+/// Each ban is twice as long as the one before, up to an hour. A bounded number of addresses is kept, of those that
+/// were banned and of the others; the one that has failed least lately of its kind goes when another comes.
 class SipBans
 {
 public:
@@ -16,7 +15,7 @@ public:
     static constexpr long LONGEST = 3600;       ///< seconds; without a failure for so long all is forgotten
     static constexpr std::size_t MOST = 4096;
 
-    explicit SipBans(std::size_t most = MOST) : m_most(most) {}
+    explicit SipBans(std::size_t most = MOST) : m_failing(most), m_banned(most) {}
 
     /// One more failure. Seconds of the ban that begins with it; 0: none does.
     long note(InternetAddress const& source);
@@ -32,8 +31,8 @@ private:
         long last = 0; ///< failure
     };
 
-    void makeRoom(long now);
+    Record& find(InternetAddress const& party);
 
-    std::size_t m_most;
-    std::map<InternetAddress, Record> m_records;
+    SipSources<Record> m_failing; // not banned yet
+    SipSources<Record> m_banned;  // once
 };

@@ -30,11 +30,7 @@ void SipReflection::noteReached(InternetAddress const& source)
 
 SipReflection::Record& SipReflection::find(InternetAddress const& source, long now)
 {
-    if (m_records.size() >= m_most && !m_records.contains(source))
-        m_records.erase(std::min_element(m_records.begin(), m_records.end(),
-                                         [](auto const& one, auto const& other)
-                                         { return one.second.last < other.second.last; }));
-    Record& record = m_records[source];
+    Record& record = m_records.use(source);
     if (now - record.last > MEMORY)
         record = {};
     record.last = now;

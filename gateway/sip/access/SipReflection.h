@@ -1,9 +1,8 @@
 #pragma once
 
-#include "configuration/AddressRange.h"
+#include "sip/access/SipSources.h"
 
 #include <cstddef>
-#include <map>
 
 /// Keeps answers to those whose address may be made up from being a weapon against whoever has that address: beyond a
 /// first few octets, which a phone's first question needs, a source gets no more than it has sent. Who has shown that
@@ -17,7 +16,7 @@ public:
     static constexpr std::size_t MOST = 4096;   ///< sources
     static constexpr long MEMORY = 3600;        ///< seconds
 
-    explicit SipReflection(std::size_t most = MOST) : m_most(most) {}
+    explicit SipReflection(std::size_t most = MOST) : m_records(most) {}
 
     /// Whether the answer may be sent; it then counts. Throws std::bad_alloc.
     bool admit(InternetAddress const& source, std::size_t octetsOfRequest, std::size_t octetsOfAnswer);
@@ -36,7 +35,6 @@ private:
 
     Record& find(InternetAddress const& source, long now);
 
-    std::size_t m_most;
-    std::map<InternetAddress, Record> m_records;
+    SipSources<Record> m_records;
     unsigned long long m_heldBack = 0;
 };

@@ -31,7 +31,7 @@ public:
                              : nta_outgoing_tcreate(leg, onResponse, endpoint, nullptr, method, name, uri, tags...);
     }
     /// The ACK of an INVITE that was answered with 200: it bears the INVITE's credentials (RFC 3261, 22.1). The stack
-    /// goes on by itself.
+    /// keeps it for its time, since it tells by it whose a repeated answer is.
     template <class... Tags>
     void acknowledge(nta_leg_t* leg, nta_outgoing_t* invite, Tags... tags)
     {

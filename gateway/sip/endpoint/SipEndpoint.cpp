@@ -14,6 +14,8 @@
 #include "services/CC_ServiceBlindTransfer.h"
 #include "services/CC_ServiceBlindTransferStatus.h"
 #include "services/CC_ServiceUserInput.h"
+#include "sip/dialog/SipAnchoredSession.h"
+#include "sip/dialog/SipDirectSession.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipPropertyId.h"
 
@@ -41,6 +43,15 @@ std::string ON_ONE_LINE(std::string_view text)
         }
     return line;
 }
+
+std::unique_ptr<SipSession> MAKE_SESSION(SipInterface const& interface, CC_CallAdapterE164& adapter,
+                                         SipSessionWire& wire)
+{
+    if (!interface.getEnvironment().host.relaysMedia)
+        return std::make_unique<SipDirectSession>(adapter, wire);
+    return std::make_unique<SipAnchoredSession>(adapter, wire, interface.getConfiguration(),
+                                                interface.getMediaAddress());
+}
 } // namespace
 
 SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
@@ -48,8 +59,8 @@ SipEndpoint::SipEndpoint(SipInterface& interface, unsigned int callNumber)
     , m_interface(interface)
     , m_callNumber(callNumber)
     , m_timer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_TIMER, this)
-    , m_anchored(m_adapter, *this, interface.getConfiguration(), interface.getMediaAddress())
-    , m_session(interface.getEnvironment().host.relaysMedia ? static_cast<SipSession&>(m_anchored) : m_direct)
+    , m_sessionOfKind(MAKE_SESSION(interface, m_adapter, *this))
+    , m_session(*m_sessionOfKind)
     , m_sessionTimer(interface.getConfiguration().sessionExpires, interface.getConfiguration().leastExpires)
     , m_refreshTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_REFRESH_TIMER, this)
     , m_lengthTimer(*CallControl::GET_CC_EVENT_LOOP(), EventPrio::NORMAL, ON_LENGTH_TIMER, this)

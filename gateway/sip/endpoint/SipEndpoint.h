@@ -7,10 +7,9 @@
 #include "host/RouteHunt.h"
 #include "platform/eventloop/TYTimer.h"
 #include "sip/access/SipPeers.h"
-#include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDialogState.h"
-#include "sip/dialog/SipDirectSession.h"
 #include "sip/dialog/SipOfferAnswer.h"
+#include "sip/dialog/SipSession.h"
 #include "sip/dialog/SipSessionTimer.h"
 #include "sip/endpoint/SipRequestHandler.h"
 #include "sip/message/SipCarriedHeaders.h"
@@ -21,7 +20,6 @@
 #include "sip/message/SipRedirection.h"
 #include "sip/message/SipWay.h"
 
-#include <deque>
 #include <memory>
 #include <new>
 #include <optional>
@@ -309,6 +307,7 @@ private:
     void endDialog(SipCause const& cause);
     bool authenticate(nta_outgoing_t*& request, sip_t const* response, nta_leg_t* leg, nta_response_f* onResponse);
     SipDialogState::Action advance(SipDialogState::Event event);
+    void forgetSetUp();
     void leaveCall(SipCause const& cause);
     void recordQuality();
     std::string getCallId() const;
@@ -375,9 +374,8 @@ private:
     SipQuality m_quality;
     unsigned int m_qualitiesTold = 0;
     SipOfferAnswer m_negotiation;
-    SipDirectSession m_direct{m_adapter, *this};
-    SipAnchoredSession m_anchored;
-    SipSession& m_session;                     // one of the two
+    std::unique_ptr<SipSession> const m_sessionOfKind; // where media are relayed or where they are not
+    SipSession& m_session;
     nta_incoming_t* m_offerReceived = nullptr; // a re-INVITE or UPDATE that is not done
     bool m_isOfferAnswered = false;            // that re-INVITE: its ACK is outstanding
     Invitation m_reinvite;                     // or UPDATE
@@ -415,8 +413,8 @@ private:
     bool m_hasTarget = false;      // its leg was seen
     bool m_isReplacing = false;    // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
-    std::deque<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
-    std::string m_charge;                               // to be told
+    std::vector<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
+    std::string m_charge;                                // to be told
     nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;

@@ -362,6 +362,7 @@ void SipEndpoint::onAnswer(sip_t const* response)
         endAttempts();
         confirmDialog(response);
         takeAnswer(response);
+        forgetSetUp();
         break;
     case SipDialogState::ACK_AND_BYE:
         confirmDialog(response);
@@ -568,7 +569,6 @@ void SipEndpoint::acknowledge(Invitation& invitation, std::string const& session
         m_lateAck = nullptr;
     if (hasSession)
         m_ownSession = sessionDescription;
-    // the stack keeps it for its time, not for as long as the call; a repeated answer gets another
     m_interface.getSender().acknowledge(m_leg, invitation.transaction, SIPTAG_CSEQ_STR(sequence.c_str()),
                                         TAG_IF(hasSession, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
                                         TAG_IF(hasSession, SIPTAG_PAYLOAD_STR(sessionDescription.c_str())), TAG_END());

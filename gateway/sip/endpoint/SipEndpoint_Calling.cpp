@@ -265,6 +265,7 @@ void SipEndpoint::onAck(sip_t const* request)
         return;
     forgetTransaction(); // it would live on for half a minute
     trace("<- ACK");
+    forgetSetUp();
     startSessionTimer();
     if (!m_hasOffer && m_isInCall)
         takeAnswerOfAck(request);

@@ -48,6 +48,15 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     return refused != 0 ? refused : 481;
 }
 
+/// The call is up: no INVITE of its beginning is sent or answered again, and calls last far longer than they begin.
+void SipEndpoint::forgetSetUp()
+{
+    for (std::string* const text :
+         {&m_inviteUri, &m_inviteHeaders, &m_inviteRoute, &m_headersForTarget, &m_earlySession})
+        std::string().swap(*text);
+    std::vector<SipRedirection>().swap(m_redirections);
+}
+
 int SipEndpoint::onBye(sip_t const* request)
 {
     SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));

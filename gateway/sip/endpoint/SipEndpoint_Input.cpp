@@ -75,7 +75,7 @@ void SipEndpoint::sendInfo()
 void SipEndpoint::sendDigit()
 {
     auto const [digit, duration] = m_digits.front();
-    m_digits.pop_front();
+    m_digits.erase(m_digits.begin());
     trace(std::string("-> INFO ") + digit);
     std::string const body = SipDigits::WRITE(digit, duration);
     m_info = m_interface.getSender().send(m_leg, HANDLE_INFO_RESPONSE, this, SIP_METHOD_INFO, nullptr,

@@ -79,6 +79,7 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
     , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
     , m_guard(configuration)
+    , m_requestRate(configuration.name, configuration.maxRequestsPerSource)
     , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)
     , m_resolver(configuration.resolver)
     , m_agent(SipListener::MAKE_AGENT(environment.stack, configuration,
@@ -120,6 +121,7 @@ void SipInterface::follow(SipConfiguration const& configuration)
     auto const passwords = m_configuration.passwords; // which others share
     m_configuration = configuration;
     m_configuration.passwords = passwords;
+    m_requestRate.setLimit(configuration.maxRequestsPerSource);
 }
 
 XCode SipInterface::dial(CC_Call& call, String const&, String const& destination,
@@ -179,7 +181,10 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         nta_msg_discard(m_agent.get(), message);
         return;
     }
-    bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && sip->sip_to->a_tag == nullptr;
+    bool const isOfDialog = sip->sip_to->a_tag != nullptr; // of none that is here
+    bool const isNewCall = sip->sip_request->rq_method == sip_method_invite && !isOfDialog;
+    if (!isNewCall && !isWithinRate(message, sip))
+        return;
     bool const isEmergency = isNewCall && isEmergencyCall(sip);
     if (m_authentication && !authenticate(message, sip, isEmergency))
         return;
@@ -187,6 +192,11 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
     {
         nta_msg_treply(m_agent.get(), message, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
                        TAG_END());
+        return;
+    }
+    if (isOfDialog || sip->sip_request->rq_method == sip_method_cancel)
+    {
+        nta_msg_treply(m_agent.get(), message, SIP_481_NO_TRANSACTION, TAG_END());
         return;
     }
     nta_incoming_t* const transaction = nta_incoming_create(m_agent.get(), nullptr, message, sip, TAG_END());
@@ -197,6 +207,25 @@ void SipInterface::onMessage(msg_t* message, sip_t* sip)
         return;
     nta_incoming_treply(transaction, status, nullptr, TAG_END()); // nothing if it was answered finally
     nta_incoming_destroy(transaction);
+}
+
+/// Else it is done with. Who sends datagrams sends them again, of a connection nothing gets lost.
+bool SipInterface::isWithinRate(msg_t* message, sip_t const* sip)
+try
+{
+    if (m_requestRate.admit(AddressRange::ADDRESS_OF(msg_addr(message)->su_sa)))
+        return true;
+    if (SipRules::WAY_OF(sip) == SipWay::UDP)
+        nta_msg_discard(m_agent.get(), message);
+    else
+        nta_msg_treply(m_agent.get(), message, SIP_503_SERVICE_UNAVAILABLE, SIPTAG_RETRY_AFTER_STR(RETRY_AFTER_SECONDS),
+                       TAG_END());
+    return false;
+}
+catch (std::bad_alloc const&)
+{
+    nta_msg_discard(m_agent.get(), message);
+    return false;
 }
 
 /// What it costs where there is no such number is a look at a flag.
@@ -250,8 +279,6 @@ bool SipInterface::mayAnswer(msg_t* message, sip_t const* sip, InternetAddress c
 int SipInterface::onRequest(nta_incoming_t* transaction, sip_t const* request)
 {
     sip_method_t const method = request->sip_request->rq_method;
-    if (method == sip_method_cancel || (request->sip_to != nullptr && request->sip_to->a_tag != nullptr))
-        return 481;
     if (int const refused = refuseMethod(transaction, request); refused != 0)
         return refused;
     if (int const refused = SipRules::CHECK(transaction, request, m_supported); refused != 0)

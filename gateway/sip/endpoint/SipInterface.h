@@ -6,6 +6,7 @@
 #include "sip/access/SipAuthentication.h"
 #include "sip/access/SipPeers.h"
 #include "sip/access/SipReflection.h"
+#include "sip/access/SipRequestRate.h"
 #include "sip/access/SipSender.h"
 #include "sip/endpoint/SipEnvironment.h"
 #include "sip/endpoint/SipRequestHandler.h"
@@ -72,6 +73,7 @@ public:
     /// Null where the interface asks nobody.
     SipAuthentication const* getAuthentication() const { return m_authentication ? &*m_authentication : nullptr; }
     SipGuard const& getGuard() const { return m_guard; }
+    SipRequestRate const& getRequestRate() const { return m_requestRate; }
     /// Null where the interface has no TLS. @{
     SipTls* getTls() { return m_tls.get(); }
     SipTls const* getTls() const { return m_tls.get(); }
@@ -108,6 +110,7 @@ public:
 private:
     static int HANDLE_MESSAGE(SipInterface* interface, nta_agent_t* agent, msg_t* message, sip_t* sip);
     void onMessage(msg_t* message, sip_t* sip);
+    bool isWithinRate(msg_t* message, sip_t const* sip);
     bool isEmergencyCall(sip_t const* invite) const;
     bool authenticate(msg_t* message, sip_t const* sip, bool isEmergency);
     bool mayAnswer(msg_t* message, sip_t const* sip, InternetAddress const& source, std::size_t octetsMore);
@@ -135,6 +138,7 @@ private:
     SipGuard m_guard;
     std::optional<SipAuthentication> m_authentication;
     SipReflection m_reflection;
+    SipRequestRate m_requestRate;
     std::unique_ptr<SipTls> m_tls; // null: none
     SipResolver m_resolver;
     SipAgent m_agent;

@@ -210,6 +210,7 @@ IN_PLACE void tport_deliver(tport_t* port, msg_t* message, msg_t* next, void* co
 {
     static auto* const s_original = STACK_FUNCTION<void(tport_t*, msg_t*, msg_t*, void*, su_time_t)>("tport_deliver");
     s_called |= DELIVER;
+    SipStack::NOTE_MESSAGE();
     if (!SipGuard::ADMIT(port, message))
     {
         msg_destroy(message);

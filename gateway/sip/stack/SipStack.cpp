@@ -2,6 +2,11 @@
 
 #include <stdexcept>
 
+namespace
+{
+SipStack* s_running = nullptr;
+}
+
 /// What is told when a descriptor that the stack watches becomes readable.
 class SipDescriptorHandler : public std::enable_shared_from_this<SipDescriptorHandler>
 {
@@ -59,7 +64,24 @@ void SipStack::forget(int descriptor)
     m_watched.erase(found);
 }
 
-void SipStack::run() { su_root_run(m_root); }
+void SipStack::run()
+{
+    su_root_add_prepoll(m_root, BEFORE_WAIT, reinterpret_cast<su_prepoll_magic_t*>(this));
+    s_running = this;
+    su_root_run(m_root);
+    s_running = nullptr;
+    su_root_remove_prepoll(m_root);
+    endBusy();
+}
+
+void SipStack::NOTE_MESSAGE()
+{
+    if (s_running != nullptr)
+        s_running->beginBusy();
+}
+
+/// The stack's own timers run after this, so what they lead to makes a descriptor readable.
+void SipStack::BEFORE_WAIT(su_prepoll_magic_t* stack, su_root_t*) { reinterpret_cast<SipStack*>(stack)->endBusy(); }
 
 void SipStack::stop() { su_root_break(m_root); }
 

@@ -26,12 +26,16 @@ public:
 
     su_root_t* getRoot() const { return m_root; }
 
+    /// A message has come: what it leads to runs before the stack waits for others.
+    static void NOTE_MESSAGE();
+
 private:
     struct Watched
     {
         int registration;
         std::shared_ptr<SipDescriptorHandler> handler; // shared: one may forget itself
     };
+    static void BEFORE_WAIT(su_prepoll_magic_t* stack, su_root_t*);
     static int ON_READABLE(su_root_magic_t*, su_wait_t*, SipDescriptorHandler* handler);
 
     su_root_t* m_root = nullptr;

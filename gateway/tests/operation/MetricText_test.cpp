@@ -1,5 +1,6 @@
 #include "host/MetricText.h"
 
+#include "host/TurnTime.h"
 #include "operation/metric/CallMetrics.h"
 #include "operation/metric/LoopLag.h"
 #include "operation/metric/ProcessMetrics.h"
@@ -153,4 +154,23 @@ TEST(ProcessMetrics, TellOfThisProcess)
     EXPECT_NE(text.get().find("\nprocess_resident_memory_bytes "), text.get().npos);
     EXPECT_EQ(text.get().find("\nprocess_resident_memory_bytes 0\n"), text.get().npos);
     EXPECT_EQ(text.get().find("\nprocess_start_time_seconds 0\n"), text.get().npos);
+}
+
+TEST(TurnTime, IsProcessorTimeFromOneTurnToTheNext)
+{
+    TurnTime time;
+    EXPECT_EQ(time.getHistogram().getSum(), 0);
+    time.note(); // one begins
+    unsigned int volatile work = 0;
+    for (unsigned int i = 0; i < 3000000; ++i)
+        work = work + 1;
+    time.note();
+    double const busy = time.getHistogram().getSum();
+    EXPECT_GT(busy, 0.0005);
+    time.note();
+    EXPECT_LT(time.getHistogram().getSum() - busy, busy / 2) << "nothing was done";
+    unsigned long long turns = 0;
+    for (unsigned long long const count : time.getHistogram().getCounts())
+        turns += count;
+    EXPECT_EQ(turns, 2u);
 }

@@ -83,6 +83,6 @@ close_connections
 expect_connections 0
 expect_call -t t1
 kill -USR1 $gateway_pid
-expect_trace "^interface a: [0-9]+ messages of strangers, [0-9]+ too large, [1-9][0-9]* connections refused$"
+expect_trace "^interface a: [0-9]+ messages of strangers, [0-9]+ too large, 0 too many, [1-9][0-9]* connections refused$"
 stop_gateway "2 calls placed, 2 answered, 2 cleared, 0 failed"
 finish

@@ -1,5 +1,6 @@
 # Datagrams and streams that are no SIP, or nearly: an error answer or silence, and a good call still works after them.
 . "$(dirname "$0")/../lib.bash"
+. "$HERE/turns.bash"
 
 send() { printf '%b' "$1" >"/dev/udp/$HOST/$PORT_A"; }
 head_of() {
@@ -29,6 +30,7 @@ poor_callee() {
 }
 
 write_configuration '' 'transports = ["udp", "tcp"]'
+watch_turns
 start_gateway
 start_callee poor_callee
 expect_caller poor_caller 4989123
@@ -67,6 +69,7 @@ expect_caller good_caller 4989123
 expect_callee
 kill -USR1 $gateway_pid
 expect_trace "^counters: "
+expect_short_turns
 kill -TERM $gateway_pid
 status=0
 wait $gateway_pid || status=$?

@@ -2,6 +2,7 @@
 # call succeeds.
 . "$(dirname "$0")/../lib.bash"
 . "$(dirname "$0")/../datagrams.bash"
+. "$HERE/turns.bash"
 
 RATE=200
 CALLS=600
@@ -30,6 +31,7 @@ mutated() {
 }
 
 write_configuration 'max-calls-per-second = 0' 'transports = ["udp", "tcp"]' 4989
+watch_turns
 start_gateway
 start_callee callee -m $CALLS
 run_caller caller 4989123 -m $CALLS -r $RATE &
@@ -48,6 +50,7 @@ done
 wait $load || fail "caller: exit status $?, seed $SEED"
 ((sent * 100 >= CALLS)) || fail "only $sent broken messages among $CALLS calls"
 expect_callee
+expect_short_turns
 kill -TERM $gateway_pid
 status=0
 wait $gateway_pid || status=$?

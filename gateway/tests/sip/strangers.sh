@@ -19,9 +19,9 @@ expect_state() {
 write_configuration '' 'transports = ["udp", "tcp"]'
 start_gateway
 ask_as_stranger 1s && fail "a stranger was served"
-expect_state '^interface a: [1-9][0-9]* messages of strangers, 0 too large, 0 connections refused$'
+expect_state '^interface a: [1-9][0-9]* messages of strangers, 0 too large, 0 too many, 0 connections refused$'
 ask_as_stranger 1s -t t1 && fail "a stranger was served over TCP"
-expect_state '^interface a: [1-9][0-9]* messages of strangers, 0 too large, [1-9][0-9]* connections refused$'
+expect_state '^interface a: [1-9][0-9]* messages of strangers, 0 too large, 0 too many, [1-9][0-9]* connections refused$'
 expect_answer 200 -- request OPTIONS "sip:x@$HOST"
 stop_gateway "0 calls placed, 0 answered, 0 cleared, 0 failed"
 

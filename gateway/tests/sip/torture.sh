@@ -3,6 +3,7 @@
 . "$(dirname "$0")/../lib.bash"
 . "$HERE/plain_call.bash"
 . "$HERE/torture.bash"
+. "$HERE/turns.bash"
 
 LONG=$(printf '%300s' '' | tr ' ' l)
 SDP='v=0\r\no=a 1 1 IN IP4 192.0.2.1\r\ns=-\r\nc=IN IP4 192.0.2.1\r\nt=0 0\r\nm=audio 49217 RTP/AVP 0\r\n'
@@ -66,11 +67,13 @@ torture sdp01 '100 404|404|406' 'INVITE sip:user@example.com SIP/2.0' 'Accept: t
 torture inv2543 '100 404|404|400' 'INVITE sip:UserB@example.com SIP/2.0' "Via: SIP/2.0/TRANSPORT $HOST:9;rport" -Max-Forwards 'From: <sip:iamalegal2543@h>' -Contact
 
 write_configuration 'max-calls-per-second = 0' $'transports = ["udp", "tcp"]\nmax-connections-per-source = 200\ntcp-idle = 2' 4989
+watch_turns
 start_gateway
 send_datagrams
 expect_call
 send_streams expect_call -t t1
 expect_call -t t1
+expect_short_turns
 kill -TERM $gateway_pid
 status=0
 wait $gateway_pid || status=$?

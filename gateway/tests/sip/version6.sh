@@ -38,6 +38,6 @@ for fd in 11 12 13 14 15; do
     eval "exec $fd<>/dev/tcp/::1/$PORT_A" || fail "no connection"
 done
 kill -USR1 $gateway_pid
-expect_trace "^interface a: 0 messages of strangers, 0 too large, [1-9][0-9]* connections refused$"
+expect_trace "^interface a: 0 messages of strangers, 0 too large, 0 too many, [1-9][0-9]* connections refused$"
 stop_gateway "2 calls placed, 2 answered, 2 cleared, 0 failed"
 finish

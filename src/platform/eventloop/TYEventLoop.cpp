@@ -19,6 +19,7 @@ namespace
 {
 constexpr long long NANOSECONDS_IN_SECOND = 1000000000;
 constexpr long long NANOSECONDS_IN_MILLISECOND = 1000000;
+constexpr unsigned int MOST_BUSY_TURNS = 8;
 
 long long NOW(TY::Time::Source source = TY::Time::MONOTONIC)
 {
@@ -124,6 +125,22 @@ bool TYEventLoop::runTurn()
     }
     m_isInTurn = false;
     return hadWork;
+}
+
+void TYEventLoop::endBusy()
+{
+    struct End
+    {
+        ~End() { isBusy = false; }
+        bool& isBusy;
+    } const end{m_isBusy};
+    for (unsigned int i = 0; i < MOST_BUSY_TURNS && m_wasPosted.load(std::memory_order_acquire); ++i)
+        runTurn();
+    if (!m_wasPosted.load(std::memory_order_acquire))
+        return;
+    std::lock_guard const lock(m_mutex);
+    if (hasPending() || m_isTimerSignalled)
+        setPollFd();
 }
 
 /// Whoever called `runTurn` hears of a handler's exception. What has not run yet is the next turn's.
@@ -384,7 +401,8 @@ void TYEventLoop::signalTimer()
     std::lock_guard const lock(m_mutex);
     m_isTimerSignalled = true;
     m_wasPosted.store(true, std::memory_order_release); // so that the next turn makes it unreadable
-    setPollFd();
+    if (isPollFdNeeded())
+        setPollFd();
 }
 
 TYSyncEvent& TYEventLoop::getSyncEvent(EventPrio::Type priority)
@@ -430,7 +448,8 @@ void TYEventLoop::wake()
 {
     if (m_isSleeping)
         m_wakeUp.notify_one();
-    setPollFd();
+    if (isPollFdNeeded())
+        setPollFd();
 }
 
 void TYEventLoop::setPollFd()

@@ -47,6 +47,17 @@ public:
     /// Call it once before other threads post; it lives as long as the loop. While a replaced clock is moved by hand
     /// every call looks at it again, since the system cannot know that a timer has become due.
     int getPollFd();
+    /// A host that runs turns itself before it waits says so, and saves the system calls that the descriptor costs:
+    /// from `beginBusy()` on, what the loop's own thread posts does not make it readable. `endBusy()` runs turns as
+    /// long as something was posted, a few at most, so that the host is heard as well; for what is left then the
+    /// descriptor is readable. Not from inside a handler.
+    ///
+    ///     loop.beginBusy();
+    ///     ... // what the host has to do, which posts
+    ///     loop.endBusy(); // then it waits @{
+    void beginBusy() { m_isBusy = true; }
+    void endBusy();
+    /// @}
     /// For how many milliseconds the loop wants no turn, rounded up: 0 when work is pending or a timer due, -1 when
     /// there is neither work nor a timer that runs. For hosts whose wait takes such a number (epoll_wait, poll); events
     /// that other threads post meanwhile they learn from `getPollFd()` alone.
@@ -94,6 +105,7 @@ private:
     long long getNanosecondsToTimer() const;
     void armTimerFd(long long due);
     void signalTimer();
+    bool isPollFdNeeded() const { return !(m_isBusy && isLoopThread()); }
     XCode post(TYEvent& event);
     void withdraw(TYEvent& event);
     bool hasPending() const;
@@ -125,6 +137,7 @@ private:
     bool m_isStopped = false;
     bool m_isEnded = false;
     bool m_isInTurn = false;
+    bool m_isBusy = false;          // the loop's thread
     unsigned long long m_turns = 0; // that have begun
     long long m_turnTime = NEVER;   // what the turn has read, or who asked last between turns
 };

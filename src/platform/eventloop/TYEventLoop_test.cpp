@@ -198,6 +198,74 @@ TEST_F(TYEventLoopTest, AHostLoopSeesWorkOfAnotherThread)
     poster.join();
 }
 
+TEST_F(TYEventLoopTest, ABusyHostRunsWhatItPostedWithoutTheDescriptor)
+{
+    int const fd = m_loop->getPollFd();
+    Event& later = event(EventPrio::NORMAL, 'b');
+    Event& first = event(EventPrio::NORMAL,
+                         [&]
+                         {
+                             m_order += 'a';
+                             later.post();
+                         });
+    TYTimer timer(
+        *m_loop, EventPrio::NORMAL, [](void* order) { *static_cast<std::string*>(order) += 't'; }, &m_order);
+    m_loop->beginBusy();
+    first.post();
+    timer.start(0);
+    EXPECT_FALSE(IS_READABLE(fd)) << "the host is not waiting";
+    m_loop->endBusy();
+    EXPECT_EQ(m_order, "tab");
+    EXPECT_FALSE(IS_READABLE(fd));
+    first.post();
+    EXPECT_TRUE(IS_READABLE(fd)) << "it is no longer busy";
+}
+
+TEST_F(TYEventLoopTest, ABusyHostIsNotKeptByOneThatPostsItselfForEver)
+{
+    int const fd = m_loop->getPollFd();
+    unsigned int runs = 0;
+    Event* self = nullptr;
+    self = &event(EventPrio::NORMAL,
+                  [&]
+                  {
+                      if (++runs < 1000)
+                          self->post();
+                  });
+    m_loop->beginBusy();
+    self->post();
+    m_loop->endBusy();
+    EXPECT_LT(runs, 100u);
+    EXPECT_TRUE(IS_READABLE(fd)) << "the rest is told";
+    while (m_loop->runTurn())
+    {
+    }
+    EXPECT_EQ(runs, 1000u);
+}
+
+TEST_F(TYEventLoopTest, ABusyHostHearsOfAnotherThread)
+{
+    int const fd = m_loop->getPollFd();
+    m_loop->beginBusy();
+    std::thread([&] { event(EventPrio::NORMAL, 'a').post(); }).join();
+    EXPECT_TRUE(IS_READABLE(fd));
+    m_loop->endBusy();
+    EXPECT_EQ(m_order, "a");
+    EXPECT_FALSE(IS_READABLE(fd));
+}
+
+TEST_F(TYEventLoopTest, ABusyHostIsOverWithAnException)
+{
+    int const fd = m_loop->getPollFd();
+    Event& failing = event(EventPrio::NORMAL, [] { throw std::runtime_error("a handler"); });
+    m_loop->beginBusy();
+    failing.post();
+    EXPECT_THROW(m_loop->endBusy(), std::runtime_error);
+    EXPECT_FALSE(IS_READABLE(fd));
+    event(EventPrio::NORMAL, 'a').post();
+    EXPECT_TRUE(IS_READABLE(fd));
+}
+
 TEST_F(TYEventLoopTest, AnExceptionOfAHandlerLeavesTheTurnAndTheRestRunsInTheNext)
 {
     Event& thrower = event(EventPrio::HIGH, [] { throw std::runtime_error("a module's"); });
