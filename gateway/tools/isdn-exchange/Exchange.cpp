@@ -361,7 +361,8 @@ void Exchange::onHangUp(pri_event& event)
         ++m_report.over;
     if (!isRequest)
         m_calls.erase(event.hangup.call);
-    pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
+    if (event.e != PRI_EVENT_HANGUP_ACK) // then the stack has it no more
+        pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
 }
 
 // --- calls of its own ------------------------------------------------------------------------------------------------
