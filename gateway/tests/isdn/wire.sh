@@ -1,8 +1,8 @@
 # A table of wire/, row by row: what is said on one wire and what is heard on the other, between SIP and lines of which the
 # gateway is the user (b) and the network (c). All rows are calls through one gateway. wire.table is of what crosses,
-# faults.table of exchanges that do wrong; a test is called as
+# faults.table of exchanges that do wrong, prefixes.table of a gateway that knows its country; a test is called as
 #
-#     bash wire.sh GATEWAY PORT EXCHANGE wire|faults
+#     bash wire.sh GATEWAY PORT EXCHANGE wire|faults|prefixes
 . "$(dirname "$0")/isdn.bash"
 
 WIRE=$(dirname "$0")/wire
@@ -25,6 +25,12 @@ $(for from in a b c; do
     done
 done)
 END
+if [[ $4 == prefixes ]]; then
+    sed -i 's/^\[gateway\]/&\ninternational-prefix = "00"\nnational-prefix = "0"\ncountry-code = "49"/' "$WORK/gateway.toml"
+    for prefix in +498 +4948; do
+        printf '[[route]]\nfrom = "b"\nprefix = "%s"\nto = "c"\n' $prefix
+    done >>"$WORK/gateway.toml"
+fi
 for wire in b c; do
     {
         printf 'line = "%s"\ncapture = "%s"\n' "$LINE$([[ $wire == b ]] || echo .c)" "$WORK/$wire.pcap"
