@@ -36,7 +36,8 @@ void IsdnModule::open(GatewayHost& host)
         [&host](std::string const& from, std::string const& number, std::string const& calling, unsigned int call)
         { return host.findRoutes(from, number, calling, call); },
         [&host](std::string const& from) { return BEGIN_CALL(host, from); },
-        [&host](std::string const& interface) { return host.isBlocked(interface); }, host.counters, host.relaysMedia,
+        [&host](std::string const& interface) { return host.isBlocked(interface); }, host.dialPlan, host.counters,
+        host.relaysMedia,
         [&host]
         {
             if (host.onEndpointGone)

@@ -96,9 +96,3 @@ TEST(SipCharge, WhatIsNoChargeIsNone)
           std::string("<aoc><aoc-d><recorded-charges><free-charge/></recorded-charges></aoc-d></aoc>")})
         EXPECT_EQ(TEXT_OF(body), "none") << body.substr(0, 300);
 }
-
-TEST(SipCharge, TheTypeOfItsBody)
-{
-    EXPECT_TRUE(SipCharge::IS_TYPE("application/vnd.etsi.AOC+xml;charset=utf-8"));
-    EXPECT_FALSE(SipCharge::IS_TYPE("application/vnd.etsi.aoc"));
-}

@@ -1,6 +1,7 @@
 #include "isdn/element/IsdnParty.h"
 
 #include "adapters/CC_CallAdapterE164.h"
+#include "configuration/DialPlan.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnText.h"
 #include "properties/CC_PropertyKeys.h"
@@ -59,6 +60,23 @@ IsdnParty IsdnParty::OF_CALLED(char const* number, int plan)
     party.number = number;
     if (plan >= 0)
         SET_PLAN(party, plan);
+    return party;
+}
+
+IsdnParty IsdnParty::normalised(DialPlan const& dialPlan) const
+{
+    bool const isOfNetwork = plan == QNumberingPlan::ISDN || plan == QNumberingPlan::UNKNOWN;
+    bool const isNational = type == QTypeOfNumber::NATIONAL && !dialPlan.country.empty();
+    bool const isAsDialled = type == QTypeOfNumber::UNKNOWN;
+    if (!isOfNetwork || number.empty() || (!isNational && !isAsDialled))
+        return *this;
+    IsdnParty const whole = OF_TEXT(isNational ? "+" + dialPlan.country + number : dialPlan.normalise(number));
+    if (whole.type != QTypeOfNumber::INTERNATIONAL)
+        return *this;
+    IsdnParty party = *this;
+    party.number = whole.number;
+    party.type = whole.type;
+    party.plan = whole.plan;
     return party;
 }
 

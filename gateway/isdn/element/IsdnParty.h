@@ -11,6 +11,7 @@
 
 class CC_CallAdapterE164;
 class CC_PropertyContainer;
+struct DialPlan;
 
 /// Somebody who calls, is called or has answered, as the elements Calling Party Number (Q.931, 4.5.10), Called Party
 /// Number (4.5.8) and Connected Number (Q.951, 5.4.1) tell of him:
@@ -39,6 +40,9 @@ struct IsdnParty
     static IsdnParty OF(pri_party_id const& id);
     static IsdnParty OF_CALLED(char const* number, int plan);
     /// @}
+    /// What came from the wire as an international number, if it is one by its type or by how it is dialled here; what
+    /// is neither of the ISDN's plan nor of an unknown one stays.
+    IsdnParty normalised(DialPlan const& plan) const;
     /// From call control: the other side, and whom an offer is for. @{
     static IsdnParty OF_PEER(CC_CallAdapterE164 const& adapter);
     static IsdnParty OF_OFFER(CC_PropertyContainer const& properties);

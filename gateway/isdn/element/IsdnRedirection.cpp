@@ -68,6 +68,14 @@ IsdnRedirection IsdnRedirection::OF(pri_party_redirecting const& redirecting)
     return result;
 }
 
+IsdnRedirection IsdnRedirection::normalised(DialPlan const& plan) const
+{
+    IsdnRedirection redirection = *this;
+    redirection.last = last.normalised(plan);
+    redirection.first = first.normalised(plan);
+    return redirection;
+}
+
 IsdnRedirection IsdnRedirection::OF_PEER(CC_CallAdapterE164 const& adapter)
 {
     IsdnRedirection result;

@@ -16,6 +16,8 @@ struct IsdnRedirection
     int count = 0; ///< 0: it was not
 
     static IsdnRedirection OF(pri_party_redirecting const& redirecting);
+    /// With its numbers as IsdnParty::normalised has them.
+    IsdnRedirection normalised(DialPlan const& plan) const;
     static IsdnRedirection OF_PEER(CC_CallAdapterE164 const& adapter);
     pri_party_redirecting getRedirecting() const;
     /// Nothing when there is none.

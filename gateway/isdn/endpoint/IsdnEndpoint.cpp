@@ -64,7 +64,7 @@ void IsdnEndpoint::take(pri_event& event)
         break;
     case PRI_EVENT_HANGUP:
     case PRI_EVENT_HANGUP_ACK:
-        onReleased(event.hangup);
+        onReleased(event.hangup, event.e == PRI_EVENT_HANGUP_ACK);
         break;
     case PRI_EVENT_INFO_RECEIVED:
         onDigits(event.ring.callednum);
@@ -155,7 +155,8 @@ void IsdnEndpoint::onDisconnect(pri_event_hangup const& hangup)
     leaveCall(cause);
 }
 
-void IsdnEndpoint::onReleased(pri_event_hangup const& hangup)
+/// `isGivenUp`: the stack has the call no more; else it waits for us.
+void IsdnEndpoint::onReleased(pri_event_hangup const& hangup, bool isGivenUp)
 {
     if (advance(IsdnCallState::RELEASED_IN) == IsdnCallState::IGNORE)
         return;
@@ -167,7 +168,8 @@ void IsdnEndpoint::onReleased(pri_event_hangup const& hangup)
         std::ignore = m_adapter.setOwnProperties(m_own);
     q931_call* const call = std::exchange(m_call, nullptr);
     m_interface.forget(call);
-    ask([&](pri* stack) { return pri_hangup(stack, call, -1); });
+    if (!isGivenUp)
+        ask([&](pri* stack) { return pri_hangup(stack, call, -1); });
     leaveCall(cause);
 }
 

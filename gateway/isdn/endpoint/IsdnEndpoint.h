@@ -73,6 +73,7 @@ private:
     bool takeRequestedChannel(int channel, bool isFlexible);
     void readSetup(pri_event_ring const& ring);
     void collect(std::string_view digits);
+    IsdnParty getDialled() const;
     void dialIfComplete(bool isComplete);
     void dial(bool isComplete);
     void placeCall(MG_IContext* datapathContext);
@@ -108,7 +109,7 @@ private:
     void take(pri_event& event);
     void followCall(CC_Flags const& flags);
     void onDisconnect(pri_event_hangup const& hangup);
-    void onReleased(pri_event_hangup const& hangup);
+    void onReleased(pri_event_hangup const& hangup, bool isGivenUp);
     void readCommands(pri_subcommands const* commands, CC_PropertyContainer& own);
     void readUserUser(char const* text, CC_PropertyContainer& own);
     void onNotify(int indicator);

@@ -63,7 +63,7 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
     if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
         m_called.number = ring.keypad_digits;
-    IsdnParty const calling = IsdnParty::OF(ring.calling);
+    IsdnParty const calling = IsdnParty::OF(ring.calling).normalised(m_interface.getEnvironment().dialPlan);
     m_calling = calling.getText();
     calling.addTo(m_setup);
     IsdnProgress const progress = IsdnProgress::OF(ring.progressmask);
@@ -84,13 +84,21 @@ void IsdnEndpoint::collect(std::string_view digits)
         dialIfComplete(end != std::string_view::npos && m_interface.getConfiguration().collects);
 }
 
+/// The called number as far as its type alone tells; what was dialled with a prefix may be an emergency number, and the
+/// routes' own to tell.
+IsdnParty IsdnEndpoint::getDialled() const
+{
+    bool const isTyped = m_called.type != QTypeOfNumber::UNKNOWN;
+    return isTyped ? m_called.normalised(m_interface.getEnvironment().dialPlan) : m_called;
+}
+
 /// Overlap receiving (Q.931, 5.1.3 and 5.2.4): what is not complete is collected, or dialled as soon as it has a route.
 void IsdnEndpoint::dialIfComplete(bool isComplete)
 {
     m_isNumberComplete = m_isNumberComplete || isComplete;
     bool const mayDial = m_isNumberComplete || !m_interface.getConfiguration().collects;
     if (mayDial)
-        m_routes = m_interface.getEnvironment().findRoutes(m_interface.getConfiguration().name, m_called.getText(),
+        m_routes = m_interface.getEnvironment().findRoutes(m_interface.getConfiguration().name, getDialled().getText(),
                                                            m_calling, m_callNumber);
     if (!m_routes.isEmpty())
         dial(m_isNumberComplete);
@@ -130,7 +138,7 @@ void IsdnEndpoint::placeCall(MG_IContext* datapathContext)
     String name;
     name.format("%u", m_callNumber);
     XCode result = m_adapter.setup(name, *this, this);
-    IsdnParty const called = m_routes.isNumberShaped() ? IsdnParty::OF_TEXT(m_routes.getNumber()) : m_called;
+    IsdnParty const called = m_routes.isNumberShaped() ? IsdnParty::OF_TEXT(m_routes.getNumber()) : getDialled();
     if (result.isOk())
         result = m_adapter.dial(
             {.contextName = m_interface.getEnvironment().contextName,

@@ -70,6 +70,7 @@ void IsdnEndpoint::endNumber()
 
 void IsdnEndpoint::readCommands(pri_subcommands const* commands, CC_PropertyContainer& own)
 {
+    DialPlan const& plan = m_interface.getEnvironment().dialPlan;
     for (int i = 0; commands != nullptr && i < commands->counter_subcmd; ++i)
     {
         pri_subcommand const& command = commands->subcmd[i];
@@ -77,10 +78,10 @@ void IsdnEndpoint::readCommands(pri_subcommands const* commands, CC_PropertyCont
         {
         case PRI_SUBCMD_REDIRECTING:
             if (m_isCalling)
-                IsdnRedirection::OF(command.u.redirecting).addTo(own);
+                IsdnRedirection::OF(command.u.redirecting).normalised(plan).addTo(own);
             break;
         case PRI_SUBCMD_CONNECTED_LINE:
-            IsdnParty::OF(command.u.connected_line.id).addTo(own);
+            IsdnParty::OF(command.u.connected_line.id).normalised(plan).addTo(own);
             break;
         case PRI_SUBCMD_AOC_S:
             ADD(own, CC_PropertyTariff(CC_PropertyId::TARIFF, IsdnCharge::OF_S(command.u.aoc_s)));

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "configuration/DialPlan.h"
 #include "host/Counters.h"
 #include "host/RouteHunt.h"
 #include "host/SignallingLoop.h"
@@ -21,6 +22,7 @@ struct IsdnEnvironment
     std::function<unsigned int(std::string const& from)> beginCall;
     /// Whether that interface is out of service.
     std::function<bool(std::string const& interface)> isBlocked;
+    DialPlan const& dialPlan; ///< how numbers are dialled here
     Counters& counters;
     bool relaysMedia = false;               ///< there is a media layer
     std::function<void()> onEndpointGone{}; ///< told when an endpoint was destroyed; may be empty

@@ -123,7 +123,7 @@ void IsdnInterface::onLinkEvent(pri_event& event)
         onRing(event.ring);
     else if (found != m_calls.end())
         found->second->onEvent(event);
-    else if (event.e == PRI_EVENT_HANGUP || event.e == PRI_EVENT_HANGUP_ACK || event.e == PRI_EVENT_HANGUP_REQ)
+    else if (event.e == PRI_EVENT_HANGUP || event.e == PRI_EVENT_HANGUP_REQ)
         refuse(call, IsdnCause::FROM_WIRE(event.hangup.cause)); // we know nothing of it any more
 }
 

@@ -256,7 +256,13 @@ private:
     static int HANDLE_INFO_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
 
     // SipEndpoint_Charge.cpp
+    void noteAccept(sip_t const* request);
     bool takeCharge(sip_t const* request);
+    bool takeAdvice(std::string const& body);
+    void addTariff(CC_PropertyContainer& own, sip_t const* response);
+    std::string getTariff() const;
+    std::string getTariffForAnswer();
+    void tellTariff();
     int onChargeInfo(nta_incoming_t* transaction, sip_t const* request);
     bool tellsCharges() const;
     void followCharge(CC_Flags const& flags);
@@ -415,6 +421,8 @@ private:
     nta_outgoing_t* m_refer = nullptr;
     std::vector<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration
     std::string m_charge;                                // to be told
+    std::string m_tariff;                                // that was told
+    bool m_takesTariff = false;                          // in the answers to its INVITE
     nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;

@@ -316,6 +316,7 @@ void SipEndpoint::onProvisional(unsigned int status, sip_t const* response)
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     addCarried(own, response);
+    addTariff(own, response);
     if (m_hasOffer && (fork == nullptr || !fork->isAgreed))
         addSession(own, session, isReliable);
     if (isReliable && !session.empty() && !std::exchange(fork->isAgreed, true))
@@ -406,6 +407,7 @@ void SipEndpoint::takeAnswer(sip_t const* response)
     addFork(own, fork);
     ADD_CONNECTED(own, response, m_interface.getConfiguration().isTrusted);
     addCarried(own, response);
+    addTariff(own, response);
     addSession(own, session, true);
     addTone(own, false);
     ADD_STATE(own, CC_PropertyCallLegState::CONNECTED);

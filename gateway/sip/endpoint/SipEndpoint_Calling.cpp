@@ -11,6 +11,7 @@
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
+#include "sip/message/SipContent.h"
 #include "sip/message/SipDiversion.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipProperty.h"
@@ -86,6 +87,7 @@ int SipEndpoint::takeInvite(nta_incoming_t* transaction, sip_t const* request)
     }
     if (m_session.check(SESSION_OF(request)) != 0)
         return refuseSession(transaction);
+    noteAccept(request);
     m_wantsReliable = sip_has_feature(request->sip_require, "100rel") != 0;
     m_allowsReliable = m_wantsReliable || sip_has_feature(request->sip_supported, "100rel") != 0;
     if (!makeServerDialog(transaction, request))
@@ -272,7 +274,10 @@ void SipEndpoint::onAck(sip_t const* request)
     if (m_byeAfterAck)
         endDialog(*m_byeAfterAck);
     else
+    {
         sendWaitingOffer();
+        tellTariff(); // and what else waits
+    }
 }
 
 void SipEndpoint::onAckMissing()
@@ -372,11 +377,12 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
                                   m_interface.getConfiguration().isTrusted) +
         getCarried(SipCarriedHeaders::RESPONSE);
+    SipContent const content = SipContent::OF(isAnswer ? session : std::string(), getTariffForAnswer());
     nta_reliable_t const* const reliable = nta_reliable_treply(
         m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
         SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
-        TAG_IF(isAnswer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-        TAG_IF(isAnswer, SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+        TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
+        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD_STR(content.body.c_str())), TAG_END());
     if (reliable == nullptr)
         return false;
     trace("-> " + std::to_string(status) + (isAnswer ? " with a session description" : "") + ", reliably");
@@ -493,11 +499,12 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
                                 (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())
         m_ownSession = session;
+    SipContent const content = SipContent::OF(session, getTariffForAnswer());
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
                         SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED(m_interface.getSupported()),
                         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
-                        TAG_IF(!session.empty(), SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-                        TAG_IF(!session.empty(), SIPTAG_PAYLOAD_STR(session.c_str())), TAG_END());
+                        TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
+                        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD_STR(content.body.c_str())), TAG_END());
 }
 
 void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)

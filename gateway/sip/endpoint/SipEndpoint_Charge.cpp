@@ -1,30 +1,69 @@
-// What the call costs (3GPP TS 24.647): told in INFO while it is up and in BYE, as the property Charge on the leg.
+// What the call costs (3GPP TS 24.647): the property Charge on the leg, told in INFO while the call is up and in BYE,
+// and the property Tariff, told in the answers to INVITE and in INFO.
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyId.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/message/SipAdvice.h"
 #include "sip/message/SipBody.h"
 #include "sip/message/SipCharge.h"
+#include "sip/message/SipProperty.h"
+#include "sip/message/SipTariff.h"
 
 #include <spdlog/spdlog.h>
 
 #include <tuple>
 #include <utility>
 
-/// Whether the body was one; its charge is the other side's to tell.
+/// Whether answers to that INVITE may have more than a session description in them.
+void SipEndpoint::noteAccept(sip_t const* request)
+{
+    for (sip_accept_t const* accept = request->sip_accept; accept != nullptr; accept = accept->ac_next)
+        m_takesTariff = m_takesTariff || (accept->ac_type != nullptr && SipAdvice::IS_TYPE(accept->ac_type));
+}
+
+/// Whether the body was one; what it tells is the other side's to tell.
 bool SipEndpoint::takeCharge(sip_t const* request)
 {
-    bool const isCharge = request->sip_payload != nullptr && request->sip_content_type != nullptr &&
-                          SipCharge::IS_TYPE(request->sip_content_type->c_type);
-    if (!isCharge || m_interface.getConfiguration().charges != SipConfiguration::Charges::TAKE)
+    bool const isAdvice = request->sip_payload != nullptr && request->sip_content_type != nullptr &&
+                          SipAdvice::IS_TYPE(request->sip_content_type->c_type);
+    if (!isAdvice || m_interface.getConfiguration().charges != SipConfiguration::Charges::TAKE)
         return true;
-    std::optional<SipCharge::Charge> const charge = SipCharge::READ(SipBody::PAYLOAD_OF(request));
-    trace(charge ? "<- " + TEXT_OF(CC_PropertyCharge(CC_PropertyId::CHARGE, *charge)) : "<- a charge that is none");
-    if (charge && m_isInCall)
-        std::ignore = m_adapter.setOwnCharge(*charge); // without memory the next one may fit
-    if (!charge)
+    bool const isTaken = takeAdvice(SipBody::PAYLOAD_OF(request));
+    if (!isTaken)
+    {
+        trace("<- a charge that is none");
         spdlog::info("call {} {}: the peer's charge cannot be read", m_callNumber, getName().view());
-    return charge.has_value();
+    }
+    return isTaken;
+}
+
+bool SipEndpoint::takeAdvice(std::string const& body)
+{
+    std::optional<SipCharge::Charge> const charge = SipCharge::READ(body);
+    std::optional<SipTariff::Tariff> const tariff = SipTariff::READ(body);
+    CC_PropertyContainer own;
+    if (charge)
+        SipProperty::ADD(own, CC_PropertyCharge(CC_PropertyId::CHARGE, *charge));
+    if (tariff)
+        SipProperty::ADD(own, CC_PropertyTariff(CC_PropertyId::TARIFF, *tariff));
+    if (!own.isEmpty())
+        trace("<- " + TEXT_OF(own));
+    if (!own.isEmpty() && m_isInCall)
+        std::ignore = m_adapter.setOwnProperties(own); // without memory the next one may fit
+    return charge || tariff;
+}
+
+/// What cannot be read does not stop the call.
+void SipEndpoint::addTariff(CC_PropertyContainer& own, sip_t const* response)
+{
+    if (m_interface.getConfiguration().charges != SipConfiguration::Charges::TAKE)
+        return;
+    std::string const body = SipBody::READ(response).advice;
+    if (std::optional<SipTariff::Tariff> const tariff = SipTariff::READ(body))
+        SipProperty::ADD(own, CC_PropertyTariff(CC_PropertyId::TARIFF, *tariff));
+    else if (!body.empty())
+        spdlog::info("call {} {}: the peer's tariff cannot be read", m_callNumber, getName().view());
 }
 
 int SipEndpoint::onChargeInfo(nta_incoming_t* transaction, sip_t const* request)
@@ -40,9 +79,37 @@ bool SipEndpoint::tellsCharges() const
     return m_interface.getConfiguration().charges == SipConfiguration::Charges::TELL;
 }
 
+/// Empty: it is not known, or not to be told.
+std::string SipEndpoint::getTariff() const
+{
+    auto const* const tariff = tellsCharges() && m_isInCall ? m_adapter.getPeerTariff() : nullptr;
+    return tariff != nullptr ? SipTariff::WRITE(*tariff) : std::string();
+}
+
+/// For a response to the INVITE; each one has it, since a provisional one may be lost.
+std::string SipEndpoint::getTariffForAnswer()
+{
+    std::string tariff = m_takesTariff ? getTariff() : std::string();
+    if (!tariff.empty())
+        m_tariff = tariff;
+    return tariff;
+}
+
+/// By INFO, once the dialog is up: to a peer that takes none in answers, and what is new since.
+void SipEndpoint::tellTariff()
+{
+    if (m_dialog != SipDialogState::UP)
+        return;
+    if (std::string tariff = getTariff(); !tariff.empty() && tariff != m_tariff)
+        m_charge = m_tariff = std::move(tariff);
+    sendInfo();
+}
+
 /// The final one waits for the BYE.
 void SipEndpoint::followCharge(CC_Flags const& flags)
 {
+    if (flags.get(CC_PropertyId::TARIFF))
+        tellTariff();
     auto const* const charge = flags.get(CC_PropertyId::CHARGE) && tellsCharges() ? m_adapter.getPeerCharge() : nullptr;
     if (charge == nullptr || SipCharge::IS_TOTAL(*charge))
         return;
@@ -63,6 +130,6 @@ void SipEndpoint::sendCharge()
     std::string const body = std::exchange(m_charge, {});
     trace("-> INFO with a charge");
     m_info = m_interface.getSender().send(m_leg, HANDLE_INFO_RESPONSE, this, SIP_METHOD_INFO, nullptr,
-                                          SIPTAG_CONTENT_TYPE_STR(SipCharge::TYPE), SIPTAG_PAYLOAD_STR(body.c_str()),
+                                          SIPTAG_CONTENT_TYPE_STR(SipAdvice::TYPE), SIPTAG_PAYLOAD_STR(body.c_str()),
                                           TAG_END());
 }

@@ -3,8 +3,8 @@
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
+#include "sip/message/SipAdvice.h"
 #include "sip/message/SipBody.h"
-#include "sip/message/SipCharge.h"
 #include "sip/message/SipPropertyId.h"
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
@@ -111,7 +111,7 @@ void SipEndpoint::sendBye(SipCause const& cause)
     m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
                                          SIPTAG_REASON_STR(reason.c_str()),
                                          TAG_IF(!userToUser.empty(), SIPTAG_HEADER_STR(userToUser.c_str())),
-                                         TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipCharge::TYPE)),
+                                         TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipAdvice::TYPE)),
                                          TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
     if (m_bye != nullptr)
         return;

@@ -2,8 +2,8 @@
 #include "services/CC_ServiceUserInput.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/message/SipAdvice.h"
 #include "sip/message/SipBody.h"
-#include "sip/message/SipCharge.h"
 #include "sip/message/SipDigits.h"
 #include "sip/message/SipProperty.h"
 
@@ -23,7 +23,7 @@ int SipEndpoint::onInfo(nta_incoming_t* transaction, sip_t const* request)
     if (request->sip_payload == nullptr || request->sip_content_type == nullptr)
         return 200; // asks whether we are here
     char const* const type = request->sip_content_type->c_type;
-    if (SipCharge::IS_TYPE(type) && m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE)
+    if (SipAdvice::IS_TYPE(type) && m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE)
         return onChargeInfo(transaction, request);
     if (!SipDigits::IS_TYPE(type))
     {

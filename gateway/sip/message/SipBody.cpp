@@ -1,5 +1,6 @@
 #include "sip/message/SipBody.h"
 
+#include "sip/message/SipAdvice.h"
 #include "sip/message/SipReason.h"
 #include "sip/message/SipText.h"
 
@@ -151,6 +152,8 @@ SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternat
             result.obstacle = read.obstacle;
         else if (!read.session.empty() && (isAlternative || result.session.empty()))
             result.session = read.session;
+        if (read.isUnderstood() && result.advice.empty())
+            result.advice = read.advice;
     }
     if (!parts.isComplete())
         return {{}, SipBody::TYPE};
@@ -175,6 +178,8 @@ SipBody SipBody::READ(std::string_view body, std::string_view type, std::string_
         result.obstacle = ENCODING;
     else if (isSession)
         result = {std::string(body), NONE};
+    else if (SipAdvice::IS_TYPE(type) && IS_IDENTITY(encoding))
+        result = {{}, NONE, std::string(body)};
     else if (isMultipart)
         result = READ_PARTS(body, type, isAlternative, depth);
     if (IS_OPTIONAL(disposition))

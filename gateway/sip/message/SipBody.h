@@ -8,8 +8,9 @@
 /// What a message's body holds for us: the session description, alone or as a part of a multipart. A plain value.
 ///
 /// By RFC 3261 (8.2.3, 20.11) and RFC 5621: a body, or a part of one, that we do not understand is in the way unless
-/// its Content-Disposition says handling=optional. Understood are application/sdp for a session, multipart/mixed, whose
-/// first description is taken, and multipart/alternative, whose last one is; nothing encoded.
+/// its Content-Disposition says handling=optional. Understood are application/sdp for a session, an advice of charge,
+/// which who does not take any passes over, multipart/mixed, whose first description is taken, and
+/// multipart/alternative, whose last one is; nothing encoded.
 ///
 ///     SipBody const body = SipBody::READ(request);
 ///     if (!body.isUnderstood())
@@ -26,6 +27,7 @@ struct SipBody
 
     std::string session; ///< empty: none
     Obstacle obstacle = NONE;
+    std::string advice{}; ///< of charge (SipAdvice); empty: none
 
     static SipBody READ(sip_t const* message);
     /// The whole body, of whatever type; empty: none.

@@ -6,8 +6,8 @@
 #include <string>
 #include <string_view>
 
-/// Advice of charge as SIP has it (3GPP TS 24.647): the body application/vnd.etsi.aoc+xml, whose elements aoc-d, during
-/// the call, and aoc-e, at its end, are the property Charge.
+/// What a call costs as SIP tells it (3GPP TS 24.647; SipAdvice): the elements aoc-d, during the call, and aoc-e, at
+/// its end, are the property Charge.
 ///
 ///     <aoc xmlns="http://uri.etsi.org/ngn/params/xml/simservs/aoc">
 ///       <aoc-d>
@@ -22,15 +22,11 @@
 ///       </aoc-d>
 ///     </aoc>
 ///
-/// Units of several types are told as their sum. What the property does not hold is passed over, aoc-s among it.
+/// Units of several types are told as their sum. What the property does not hold is passed over.
 namespace SipCharge
 {
 using Charge = CC_PropertyCharge::Charge;
 
-inline constexpr char const* TYPE = "application/vnd.etsi.aoc+xml";
-
-/// Whether it is that type, whatever the case of its letters; parameters are not part of it.
-bool IS_TYPE(std::string_view contentType);
 /// Nothing for what is no such body, has no charge, or has one out of the property's range. An amount with more than
 /// three decimals, or that is too large for those that it has, is rounded. Throws std::bad_alloc.
 std::optional<Charge> READ(std::string_view body);

@@ -1,5 +1,9 @@
 #include "IsdnFixture.h"
 
+#include <spdlog/sinks/ostream_sink.h>
+
+#include <sstream>
+
 namespace
 {
 struct IsdnCallingTest : IsdnFixture
@@ -41,6 +45,64 @@ TEST_F(IsdnCallingTest, TheOtherSideClearsWithEachCause)
         side->take();
         expectNothingLeft();
     }
+}
+
+TEST_F(IsdnCallingTest, NothingIsAskedOfACallThatTheStackHasGivenUp)
+{
+    std::ostringstream log;
+    auto const before = spdlog::default_logger();
+    spdlog::set_default_logger(
+        std::make_shared<spdlog::logger>("test", std::make_shared<spdlog::sinks::ostream_sink_st>(log)));
+    spdlog::set_level(spdlog::level::debug);
+    open();
+    for (bool const isClearedByWire : {true, false})
+        for (bool const isUp : {true, false})
+        {
+            side->call("4989123");
+            ASSERT_TRUE(waitForOffer());
+            if (isUp)
+                std::ignore = other.become(FakeModule::State::CONNECTED);
+            settle();
+            isClearedByWire ? side->clear(16) : other.hangUp();
+            expectNothingLeft();
+            other.hangUp();
+        }
+    spdlog::set_default_logger(before);
+    spdlog::set_level(spdlog::level::off);
+    EXPECT_NE(log.str().find("released: cause 16"), std::string::npos);
+    EXPECT_EQ(log.str().find("invalid call"), std::string::npos) << log.str();
+}
+
+TEST_F(IsdnCallingTest, ANationalNumberIsDialledAsAnInternationalOneWhereTheCountryIsKnown)
+{
+    dialPlan = {"00", "0", "49"};
+    open();
+    auto const call = [&](int type, char const* calling)
+    {
+        side->call("89123", true, 20, false,
+                   [&](pri_sr* request)
+                   {
+                       char called[] = "89123";
+                       pri_sr_set_called(request, called, type << 4 | PRI_NPI_E163_E164, 1);
+                       pri_party_id caller = {};
+                       caller.number.valid = 1;
+                       caller.number.plan = type << 4 | PRI_NPI_E163_E164;
+                       std::strcpy(caller.number.str, calling);
+                       pri_sr_set_caller_party(request, &caller);
+                   });
+        ASSERT_TRUE(waitForOffer());
+    };
+    call(PRI_TON_NATIONAL, "30123");
+    EXPECT_NE(other.take().front().find(" +4989123 "), std::string::npos);
+    EXPECT_EQ(other.getPeerValue(CC_PropertyId::E164_NUMBER), "4930123");
+    EXPECT_EQ(other.m_adapter->getPeerTypeOfNumber(), QTypeOfNumber::INTERNATIONAL);
+    other.hangUp();
+    expectNothingLeft();
+    call(PRI_TON_SUBSCRIBER, "30123");
+    EXPECT_NE(other.take().front().find(" 89123 "), std::string::npos);
+    EXPECT_EQ(other.getPeerValue(CC_PropertyId::E164_NUMBER), "30123");
+    other.hangUp();
+    expectNothingLeft();
 }
 
 TEST_F(IsdnCallingTest, TheCallerGivesUpInEachState)

@@ -221,12 +221,14 @@ private:
     AsideLoop m_aside{m_loop};
     unsigned int m_lastCall = 0;
     Counters m_counters;
+    DialPlan m_dialPlan;
     IsdnEnvironment m_environment{m_loop,
                                   "SWITCH",
                                   [](std::string const&, std::string const& number, std::string const&, unsigned int)
                                   { return RouteHunt::TO(PEER, number); },
                                   [this](std::string const&) { return ++m_lastCall; },
                                   [](std::string const&) { return false; },
+                                  m_dialPlan,
                                   m_counters};
     std::unique_ptr<IsdnSocketLine> m_near, m_far;
     std::unique_ptr<IsdnInterface> m_interface;

@@ -1,3 +1,4 @@
+#include "configuration/DialPlan.h"
 #include "isdn/element/IsdnBearer.h"
 #include "isdn/element/IsdnCause.h"
 #include "isdn/element/IsdnCharge.h"
@@ -56,6 +57,42 @@ std::string TEXT_OF(IsdnCharge::Tariff const& tariff)
     return TEXT_OF(CC_PropertyTariff(CC_PropertyId::TARIFF, tariff));
 }
 } // namespace
+
+TEST(IsdnPartyTest, ANumberBecomesAnInternationalOneByItsTypeOrByHowItIsDialled)
+{
+    DialPlan const plan{"00", "0", "49"};
+    struct Row
+    {
+        char const* number;
+        QTypeOfNumber type;
+        QNumberingPlan plan;
+        char const* whole;
+    };
+    using enum QTypeOfNumber;
+    constexpr QNumberingPlan ISDN = QNumberingPlan::ISDN;
+    for (Row const& row : {
+             Row{"89123", NATIONAL, ISDN, "+4989123"},
+             Row{"89123", NATIONAL, QNumberingPlan::UNKNOWN, "+4989123"},
+             Row{"4420123", INTERNATIONAL, ISDN, "+4420123"},
+             Row{"089123", UNKNOWN, ISDN, "+4989123"},
+             Row{"004420123", UNKNOWN, ISDN, "+4420123"},
+             Row{"123", UNKNOWN, ISDN, "123"},
+             Row{"0123", SUBSCRIBER, ISDN, "0123"},
+             Row{"0123", NETWORK_SPECIFIC, ISDN, "0123"},
+             Row{"89123", NATIONAL, QNumberingPlan::PRIVATE, "89123"},
+             Row{"", NATIONAL, ISDN, ""},
+         })
+    {
+        IsdnParty party;
+        party.number = row.number;
+        party.type = row.type;
+        party.plan = row.plan;
+        EXPECT_EQ(party.normalised(plan).getText(), row.whole) << row.number;
+        EXPECT_EQ(party.normalised({}), party) << "nothing is known of how numbers are dialled";
+        EXPECT_EQ(party.normalised({"00", "", ""}).getText(),
+                  std::string(row.number) == "004420123" ? "+4420123" : party.getText());
+    }
+}
 
 TEST(IsdnPartyTest, EachOctetOfANumberComesBack)
 {

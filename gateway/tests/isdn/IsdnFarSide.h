@@ -129,7 +129,8 @@ private:
             int const cause = event.hangup.cause;
             text += " " + std::to_string(cause);
             q931_call* const ended = event.hangup.call;
-            ask([&](pri* stack) { return pri_hangup(stack, ended, event.e == PRI_EVENT_HANGUP_REQ ? cause : -1); });
+            if (event.e != PRI_EVENT_HANGUP_ACK) // else the stack has it no more
+                ask([&](pri* stack) { return pri_hangup(stack, ended, event.e == PRI_EVENT_HANGUP_REQ ? cause : -1); });
             break;
         }
         default:

@@ -72,6 +72,7 @@ struct IsdnFixture : testing::Test, CallControlFixture
     std::vector<Route> routes{{NAME, {}, "other"}}; // to numbers of four digits and more
     unsigned int calls = 0;
     Counters counters;
+    DialPlan dialPlan;
     IsdnEnvironment environment{
         watch,
         "SWITCH",
@@ -82,6 +83,7 @@ struct IsdnFixture : testing::Test, CallControlFixture
         },
         [this](std::string const&) { return ++calls; },
         [](std::string const&) { return false; },
+        dialPlan,
         counters};
     IsdnConfiguration configuration;
     IsdnLink::Options farOptions;

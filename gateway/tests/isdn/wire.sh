@@ -1,14 +1,18 @@
 # A table of wire/, row by row: what is said on one wire and what is heard on the other, between SIP and lines of which the
 # gateway is the user (b) and the network (c). All rows are calls through one gateway. wire.table is of what crosses,
-# faults.table of exchanges that do wrong; a test is called as
+# faults.table of exchanges that do wrong, prefixes.table of a gateway that knows its country,
+# charges.table of a SIP peer that tells charges; a test is called as
 #
-#     bash wire.sh GATEWAY PORT EXCHANGE wire|faults
+#     bash wire.sh GATEWAY PORT EXCHANGE wire|faults|prefixes|charges
 . "$(dirname "$0")/isdn.bash"
 
 WIRE=$(dirname "$0")/wire
 TABLE=$WIRE/$4.table
 read -r rows from_sip to_sip < <(python3 "$WIRE/wire.py" write "$TABLE" "$WORK") || fail "no table"
-write_isdn_configuration '' 'codecs = ["PCMA", "CLEARMODE"]'
+charges=tell
+[[ $4 == charges ]] && charges=take
+write_isdn_configuration '' "codecs = [\"PCMA\", \"CLEARMODE\"]
+charges = \"$charges\""
 sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt305 = 500\nt308 = 500\nt309 = 1000\nanswer = 1000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
 cat >>"$WORK/gateway.toml" <<END
 [[isdn]]
@@ -25,6 +29,12 @@ $(for from in a b c; do
     done
 done)
 END
+if [[ $4 == prefixes ]]; then
+    sed -i 's/^\[gateway\]/&\ninternational-prefix = "00"\nnational-prefix = "0"\ncountry-code = "49"/' "$WORK/gateway.toml"
+    for prefix in +498 +4948; do
+        printf '[[route]]\nfrom = "b"\nprefix = "%s"\nto = "c"\n' $prefix
+    done >>"$WORK/gateway.toml"
+fi
 for wire in b c; do
     {
         printf 'line = "%s"\ncapture = "%s"\n' "$LINE$([[ $wire == b ]] || echo .c)" "$WORK/$wire.pcap"
@@ -50,14 +60,14 @@ wait_for_port $! "$PORT_CALLER" udp || fail "the callee does not start"
 start_isdn_gateway
 expect_log 'interface c: the link is up'
 sipp_rows from_sip $((PORT_CALLER + 16)) "$from_sip"
-sipp "${ARGUMENTS[@]}" -inf "$WORK/from_sip.csv" -r 100 -l 8 "$HOST:$PORT_A" >"$WORK/from_sip.out" 2>&1 # the judge tells of which it makes nothing
+((from_sip == 0)) || sipp "${ARGUMENTS[@]}" -inf "$WORK/from_sip.csv" -r 100 -l 8 "$HOST:$PORT_A" >"$WORK/from_sip.out" 2>&1 # the judge tells of which it makes nothing
 for ((i = 0; i < 300; i++)); do
     (($(grep -c 'calling side.* released' "$WORK/gateway.err") >= rows)) && break
     sleep 0.1
 done
 python3 "$WIRE/wire.py" judge "$TABLE" "$WORK" || fail "rows"
 for wire in b c; do
-    [[ $4 == faults ]] || CAPTURE=$WORK/$wire.pcap expect_wellformed
+    [[ $4 == faults || $4$wire == chargesb ]] || CAPTURE=$WORK/$wire.pcap expect_wellformed
 done
 for ((i = 0; i < 100; i++)); do # the last calls' ends are on their way
     kill -USR1 $gateway_pid

@@ -254,6 +254,8 @@ void Exchange::begin(CallHandle const& call)
     if (subscriber.does == "silent")
         return;
     pri_proceeding(m_stack, call->handle, call->channel, 0);
+    if (subscriber.tariff != 0)
+        tellTariff(*call);
     if (subscriber.does == "busy")
         release(call, PRI_CAUSE_USER_BUSY);
     else if (subscriber.does == "reject")
@@ -318,6 +320,25 @@ void Exchange::hold(CallHandle const& call)
           });
 }
 
+/// AOC-S (EN 300 182-1): by the minute, in steps.
+void Exchange::tellTariff(Call const& call)
+{
+    pri_subcmd_aoc_s advice = {};
+    advice.num_items = 1;
+    pri_aoc_s_element& item = advice.item[0];
+    item.chargeable = PRI_AOC_CHARGED_ITEM_BASIC_COMMUNICATION;
+    item.rate_type = PRI_AOC_RATE_TYPE_DURATION;
+    pri_aoc_duration& duration = item.rate.duration;
+    std::string const& currency = call.subscriber->currency;
+    duration.currency[currency.copy(duration.currency, sizeof duration.currency - 1)] = '\0';
+    duration.amount.cost = static_cast<long>(call.subscriber->tariff);
+    duration.amount.multiplier = PRI_AOC_MULTIPLIER_HUNDREDTH;
+    duration.time.length = 1;
+    duration.time.scale = PRI_AOC_TIME_SCALE_MINUTE;
+    duration.charging_type = 1;
+    pri_aoc_s_send(m_stack, call.handle, &advice);
+}
+
 /// AOC-D, again and again (EN 300 182-1).
 void Exchange::charge(CallHandle const& call)
 {
@@ -361,7 +382,8 @@ void Exchange::onHangUp(pri_event& event)
         ++m_report.over;
     if (!isRequest)
         m_calls.erase(event.hangup.call);
-    pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
+    if (event.e != PRI_EVENT_HANGUP_ACK) // then the stack has it no more
+        pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
 }
 
 // --- calls of its own ------------------------------------------------------------------------------------------------

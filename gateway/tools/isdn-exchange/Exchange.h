@@ -83,6 +83,7 @@ private:
     void answer(CallHandle const& call);
     void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
     void hold(CallHandle const& call);
+    void tellTariff(Call const& call);
     void charge(CallHandle const& call);
     void chargeFinally(Call& call);
     void placeWaiting();

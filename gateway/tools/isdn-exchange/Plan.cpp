@@ -107,6 +107,7 @@ Plan::Subscriber READ_SUBSCRIBER(std::string const& file, toml::table const& tom
     table.read("units", one.units);
     table.read("interval", one.interval);
     table.read("currency", one.currency);
+    table.read("tariff", one.tariff);
     table.read("drops", one.drops);
     one.faults = READ_FAULTS(file, toml);
     table.checkKeys();

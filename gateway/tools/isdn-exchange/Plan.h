@@ -33,6 +33,7 @@ struct Plan
         unsigned int units = 0;      ///< charged each interval; 0: nothing is
         unsigned int interval = 100; ///< milliseconds
         std::string currency;        ///< in hundredths of it; empty: units
+        unsigned int tariff = 0;     ///< hundredths of the currency a minute, told before it rings; 0: nothing is
         unsigned int drops = 0;      ///< milliseconds from its answer until the line is lost; 0: it is not
         std::vector<Fault> faults;   ///< of the exchange's messages
     };

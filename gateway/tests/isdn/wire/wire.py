@@ -60,8 +60,18 @@ def rows_of(table):
 
 # --- scenarios and plans --------------------------------------------------------------------------------------------
 
-def send(text, body="", again=False):
-    head = text + (["Content-Type: application/sdp"] if body else [])
+ADVICE = "application/vnd.etsi.aoc+xml"
+
+
+def send(text, body="", again=False, kind="application/sdp"):
+    """`text`: the head; a line `body ...` of it is an advice of charge beside the body."""
+    advice = next((one[5:] for one in text if one.startswith("body ")), "")
+    text = [one for one in text if not one.startswith("body ")]
+    if advice:
+        aoc = f'<?xml version="1.0"?><aoc xmlns="http://uri.etsi.org/ngn/params/xml/simservs/aoc">{advice}</aoc>'.replace("]]>", "")
+        parts = f"--x\nContent-Type: {kind}\n\n{body}\n--x\nContent-Type: {ADVICE}\n\n{aoc}\n--x--"
+        body, kind = (parts, "multipart/mixed;boundary=x") if body else (aoc, ADVICE)
+    head = text + ([f"Content-Type: {kind}"] if body else [])
     return f'<send{" retrans=%s500%s" % (chr(34), chr(34)) if again else ""}><![CDATA[\n' + "\n".join(head) + \
         f"\nContent-Length: [len]\n\n{body}\n]]></send>"
 
@@ -96,10 +106,19 @@ def calls_from(row):
     if row.status():
         return steps + [receive(row.status()), send(request(row, "ACK", 1, "[peer_tag_param]", f"[branch-{len(steps) + 1}]"))]
     steps += [receive("200"), send(request(row, "ACK", 1, "[peer_tag_param]"))]
+    if row.has(row.heard, "S INFO"):
+        steps += [receive("INFO"), send(response("200 OK", False))]
     if row.has(row.heard, "S BYE"):
         return steps + [receive("BYE"), send(response("200 OK", False))]
     return steps + ['<pause milliseconds="100"/>',
                     send(request(row, "BYE", 2, "[peer_tag_param]") + row.headers("BYE"), "", True), receive("200")]
+
+
+def callees(method, sequence):
+    return [f"{method} sip:gateway@[remote_ip]:[remote_port] SIP/2.0",
+            "Via: SIP/2.0/UDP [local_ip]:[local_port];branch=[branch]",
+            "From: <sip:callee@[local_ip]:[local_port]>;tag=[call_number]callee", "To:[$caller]", "[last_Call-ID:]",
+            f"CSeq: {sequence} {method}", "Max-Forwards: 70"]
 
 
 def calls_to(row):
@@ -114,12 +133,13 @@ def calls_to(row):
                         receive("ACK")]
     media = BITS if row.has(row.said, "S bits") else SPEECH
     steps += [send(response("200 OK") + row.headers("200"), session(media), True), receive("ACK")]
+    for sequence, method in enumerate(("INFO", "BYE"), 1):
+        if row.has(row.said, f"S {method}"):
+            steps += ['<pause milliseconds="100"/>', send(callees(method, sequence) + row.headers(method), "", True),
+                      receive("200")]
     if not row.has(row.said, "S BYE"):
-        return steps + [receive("BYE"), send(response("200 OK", False))]
-    bye = ["BYE sip:gateway@[remote_ip]:[remote_port] SIP/2.0", "Via: SIP/2.0/UDP [local_ip]:[local_port];branch=[branch]",
-           "From: <sip:callee@[local_ip]:[local_port]>;tag=[call_number]callee", "To:[$caller]", "[last_Call-ID:]",
-           "CSeq: 1 BYE", "Max-Forwards: 70"]
-    return steps + ['<pause milliseconds="100"/>', send(bye + row.headers("BYE"), "", True), receive("200")]
+        steps += [receive("BYE"), send(response("200 OK", False))]
+    return steps
 
 
 def scenario(first, chosen):
@@ -237,6 +257,12 @@ def diversion(packet):
     return dict(zip(names, values), digits=bytes.fromhex(found[5].replace(":", "")).decode())
 
 
+def operation(packet):
+    """An operation of the facility element: its number (of EN 300 182-1 and others), and its argument's octets"""
+    argument = field_of(packet, "q932.ros.argument") or ""
+    return {"local": field_of(packet, "q932.ros.local") or "", "octets": argument.replace(":", "")}
+
+
 def same(text, wanted):
     try:
         return int(text, 0) == int(wanted, 0)
@@ -252,8 +278,9 @@ def is_heard_by_exchange(messages, expected):
     is_absent = element.startswith("no ")
     candidates = [packet for name, packet in messages if name == message]
     found = False
-    if element == "diversion":
-        return any(dict(wanted).items() <= diversion(packet).items() for packet in candidates)
+    if element in ("diversion", "operation"):
+        read = diversion if element == "diversion" else operation
+        return any(dict(wanted).items() <= read(packet).items() for packet in candidates)
     for packet in candidates:
         for one in packet.iter("field"):
             if not ((one.get("show") or "") + (one.get("showname") or "")).startswith(element.removeprefix("no ")):
@@ -269,7 +296,7 @@ def tell(messages):
         if isinstance(one, str):
             print("    " + one.replace("\r", "").strip().replace("\n", "\n    "))
             continue
-        print("    " + str(one[0]), diversion(one[1]))
+        print("    " + str(one[0]), diversion(one[1]), operation(one[1]))
         for field in one[1].find("proto[@name='q931']").iter("field"):
             print("        ", field.get("name"), field.get("show"))
 
@@ -277,7 +304,7 @@ def tell(messages):
 def judge(rows, folder):
     known = {row.number for row in rows}
     heard = {wire: heard_by_exchange(f"{folder}/{wire.lower()}.pcap", wire, known) for wire in "BC"} | {"S": {}}
-    for file in ("from_sip", "to_sip"):
+    for file in (one for one, ours in (("from_sip", "caller"), ("to_sip", "callee")) if any(getattr(row, ours) == "S" for row in rows)):
         heard["S"].update(heard_by_sip(f"{folder}/{file}.messages", rows))
     failures = 0
     for row in rows:
