@@ -32,7 +32,10 @@ std::string TARIFF_TEXT(std::string const& body)
     return tariff ? CC_PropertyTariff(1, *tariff).getValueString(text).c_str() : "none";
 }
 /// Written and read again.
-std::string TARIFF_AGAIN(std::string const& body) { return TARIFF_TEXT(SipTariff::WRITE(SipTariff::READ(body).value())); }
+std::string TARIFF_AGAIN(std::string const& body)
+{
+    return TARIFF_TEXT(SipTariff::WRITE(SipTariff::READ(body).value()));
+}
 } // namespace
 
 TEST(SipTariff, EachItemHasARate)

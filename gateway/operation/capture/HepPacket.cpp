@@ -22,9 +22,9 @@ enum Chunk : unsigned int
     PAYLOAD = 15,
     CORRELATION = 17
 };
-constexpr std::string_view BEGINNING = "HEP3";
-constexpr std::size_t HEAD = 6;     // of the packet, and of each chunk
-constexpr unsigned int GENERIC = 0; // the vendor of all these chunks
+constexpr std::string_view BEGINNING_OF_PACKET = "HEP3";
+constexpr std::size_t HEAD_LENGTH = 6; // of the packet, and of each chunk
+constexpr unsigned int GENERIC = 0;    // the vendor of all these chunks
 constexpr unsigned char VERSION_4 = 2;
 constexpr unsigned char VERSION_6 = 10;
 
@@ -38,7 +38,7 @@ void ADD(std::string& octets, Chunk chunk, std::string_view value)
 {
     ADD_NUMBER(octets, GENERIC, 2);
     ADD_NUMBER(octets, chunk, 2);
-    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD + value.size()), 2);
+    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD_LENGTH + value.size()), 2);
     octets += value;
 }
 
@@ -65,7 +65,7 @@ std::string HepPacket::encode(std::uint32_t agent, std::string_view password) co
 {
     bool const isVersion4 = from.sa_family == AF_INET;
     auto const now = std::chrono::duration_cast<std::chrono::microseconds>(time.time_since_epoch()).count();
-    std::string octets(BEGINNING);
+    std::string octets(BEGINNING_OF_PACKET);
     octets.reserve(256 + password.size() + correlation.size() + payload.size());
     octets.append(2, '\0'); // the length
     ADD(octets, FAMILY, isVersion4 ? VERSION_4 : VERSION_6, 1);
@@ -82,11 +82,11 @@ std::string HepPacket::encode(std::uint32_t agent, std::string_view password) co
         ADD(octets, PASSWORD, password);
     if (!correlation.empty())
         ADD(octets, CORRELATION, correlation);
-    if (octets.size() + HEAD + payload.size() > LONGEST)
+    if (octets.size() + HEAD_LENGTH + payload.size() > LONGEST)
         return {};
     ADD(octets, PAYLOAD, payload);
     std::string length;
     ADD_NUMBER(length, static_cast<std::uint32_t>(octets.size()), 2);
-    octets.replace(BEGINNING.size(), length.size(), length);
+    octets.replace(BEGINNING_OF_PACKET.size(), length.size(), length);
     return octets;
 }
