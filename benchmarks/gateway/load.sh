@@ -2,7 +2,7 @@
 # once, and what memory is left after many calls. SIPp is the peers, on the same machine: its time is not counted, and tells how fast
 # the machine was meanwhile.
 #
-#     bash benchmarks/gateway/load.sh GATEWAY PORT [PART]...        # parts: cost rate up growth; all of them without
+#     bash benchmarks/gateway/load.sh GATEWAY PORT [PART]...        # parts: cost evidence rate up growth; all of them without
 . "$(dirname "${BASH_SOURCE[0]}")/../../gateway/tests/lib.bash"
 . "$(dirname "${BASH_SOURCE[0]}")/measure.bash"
 PORT_METRICS=$((PORT + 30))
@@ -52,6 +52,47 @@ cost() {
     load 3000 100 100
     load 15000 1000 100
 }
+
+# what records, figures that are asked for once a second, and a capture server cost together, beside a gateway without these
+start_server() {
+    python3 -c 'import socket, sys
+server = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
+server.bind((sys.argv[1], int(sys.argv[2])))
+while True: server.recv(65536)' "$HOST" $((PORT + 29)) &
+    background=($!)
+    wait_for_port $! $((PORT + 29)) udp || fail "no capture server"
+}
+ask_for_figures() {
+    local i
+    for ((i = 0; i < 10; i++)); do
+        scrape 1 >"$WORK/figures.log"
+        sleep 1
+    done
+}
+restart_with() { # LINES
+    end_gateway
+    configure '' "$1"
+    [[ -n $1 ]] || sed -i '/^\[records\]/,$d' "$WORK/gateway.toml"
+    start_gateway_as_shipped
+    load 300 100 100 >/dev/null
+}
+evidence() {
+    local round without=0 all=0
+    start_server
+    for round in 1 2 3; do
+        restart_with ''
+        load 5000 500 100 >/dev/null
+        without=$((without + used))
+        restart_with $'[capture]\nserver = "'"$HOST:$((PORT + 29))"'"'
+        load 5000 500 100 ask_for_figures >/dev/null
+        all=$((all + used))
+    done
+    kill "${background[0]}"
+    background=()
+    tell "processor time of 1,000 calls at 500 a second" "$(divided $without 15000)" ms
+    tell "  with records, figures and capture" "$(divided $all 15000)" ms
+    tell "  more by" "$(awk -v a=$without -v b=$all 'BEGIN { printf "%.1f", 100 * (b - a) / a }')" '%'
+}
 rate() { load 120000 2000 100; }
 up() {
     local before
@@ -79,7 +120,7 @@ growth() {
 }
 
 parts=("${@:3}")
-((${#parts[@]} > 0)) || parts=(cost rate up growth)
+((${#parts[@]} > 0)) || parts=(cost evidence rate up growth)
 for part in "${parts[@]}"; do
     configure ''
     start_gateway_as_shipped
