@@ -13,10 +13,12 @@
 #include "properties/CC_PropertyString.h"
 #include "services/CC_ServiceBlindTransfer.h"
 #include "services/CC_ServiceBlindTransferStatus.h"
+#include "services/CC_ServicePushBack.h"
 #include "services/CC_ServiceUserInput.h"
 #include "sip/dialog/SipAnchoredSession.h"
 #include "sip/dialog/SipDirectSession.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/endpoint/SipServiceDialog.h"
 #include "sip/message/SipPropertyId.h"
 
 #include <spdlog/spdlog.h>
@@ -165,6 +167,10 @@ void SipEndpoint::takeService(CC_Service& service)
         endReferral(static_cast<CC_ServiceBlindTransferStatus&>(service).getCause());
     else if (service.isOfType(CC_ServiceUserInput::TYPE()))
         onUserInput(static_cast<CC_ServiceUserInput&>(service));
+    else if (service.isOfType(CC_ServicePushBack::TYPE()))
+        onPushBack();
+    else if (service.isOfType(SipServiceDialog::TYPE()))
+        tellDialog(static_cast<SipServiceDialog&>(service));
     else
         trace("told a service, not taken: " + std::string(service.getInfo().view()));
 }

@@ -30,6 +30,7 @@
 class CC_ServiceBlindTransfer;
 class CC_ServiceUserInput;
 class SipInterface;
+class SipServiceDialog;
 
 /// One side of one call: a SIP dialog on the one hand, a call leg on the other.
 ///
@@ -58,7 +59,8 @@ public:
                       RouteHunt const& routes, std::string const& user);
     /// The same for an INVITE that takes the place of another dialog, which ends (RFC 3891).
     int receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced);
-    bool isReplaceable() const;
+    /// Whether such an INVITE may take the place of our dialog: 0, or the status with which it is refused.
+    int checkReplaces(sip_replaces_t const& replaces) const;
     bool isInCall(unsigned long long serial) const;
     /// Clears the call for a reason of the gateway's own. Without memory it still ends, in fewer words.
     void clear(SipCause const& cause);
@@ -104,7 +106,7 @@ private:
         nta_leg_t* leg;
     };
 
-    // calling side: SipEndpoint_Calling.cpp
+    // calling side: SipEndpoint_Calling.cpp, its answers: SipEndpoint_Answers.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request);
     int refuseSession(nta_incoming_t* transaction);
     bool makeServerDialog(nta_incoming_t* transaction, sip_t const* request);
@@ -152,7 +154,7 @@ private:
     bool isOfAttempt(nta_outgoing_t* transaction, int status);
     void endAttempts();
 
-    // called side: SipEndpoint_Called.cpp
+    // called side: SipEndpoint_Called.cpp, whom it asks: SipEndpoint_Hunt.cpp, who answers: SipEndpoint_Forks.cpp
     XCode acceptOffer(CC_Call& call, String const& name, CC_PropertyContainer const& properties);
     bool sendInvite(SipParty const& called, CC_PropertyContainer const& offerProperties);
     bool inviteNumber();
@@ -236,6 +238,11 @@ private:
     static int HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     int onNotify(sip_t const* request);
     XCode takePlaceOf(SipEndpoint& replaced, sip_t const* request);
+
+    // SipEndpoint_PushBack.cpp
+    void onPushBack();
+    void stepBack();
+    void tellDialog(SipServiceDialog& service);
 
     // SipEndpoint_Timer.cpp
     int takeTimer(nta_incoming_t* transaction, sip_t const* request);
@@ -417,6 +424,8 @@ private:
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has
     bool m_hasTarget = false;      // its leg was seen
+    bool m_isPushedBack = false;   // call control has seen both sides on one interface
+    bool m_hasSteppedBack = false; // our peer has been told to call the other side's
     bool m_isReplacing = false;    // our INVITE takes a dialog's place
     nta_outgoing_t* m_refer = nullptr;
     std::vector<std::pair<char, unsigned int>> m_digits; // to be sent, each with its duration

@@ -153,100 +153,6 @@ bool SipEndpoint::inviteNumber()
     return startInvite();
 }
 
-/// False: the caller asks for TLS on every hop (RFC 5630, 5.3), which this one has not, nor have registered contacts;
-/// the call is over.
-bool SipEndpoint::findWay(CC_PropertyContainer const& offerProperties)
-{
-    m_way = m_interface.getConfiguration().way;
-    if (offerProperties.get(SipPropertyId::SECURED) == nullptr)
-        return true;
-    if (SipWay::IS_SECURED(m_way) && m_contacts.empty())
-    {
-        m_way = SipWay::SIPS;
-        return true;
-    }
-    m_dialog = SipDialogState::OVER;
-    leaveCall({QCause::BEARER_CAPABILITY_NOT_PRESENTLY_AVAILABLE, 480, {}});
-    return false;
-}
-
-/// Where a user of the interface's realm has registered. False: he has not, or there is nobody of that name, and the
-/// call is over.
-bool SipEndpoint::findContacts(std::string const& user)
-{
-    SipRegistrar const* const registrar = m_interface.getRegistrar();
-    if (registrar == nullptr)
-        return true;
-    m_contacts = registrar->find(user);
-    bool const hasPeer = m_interface.getConfiguration().hasPeer();
-    if (!m_contacts.empty() || (hasPeer && !registrar->hasUser(user)))
-        return true;
-    m_dialog = SipDialogState::OVER;
-    if (registrar->hasUser(user))
-        leaveCall({QCause::SUBSCRIBER_ABSENT, 480, {}});
-    else
-        leaveCall({QCause::UNALLOCATED_NUMBER, 404, {}});
-    return false;
-}
-
-/// False: no peer takes calls now, and the call is over.
-bool SipEndpoint::findPeer()
-{
-    if (!m_contacts.empty())
-        return true;
-    m_peers = m_interface.getPeers().choose();
-    if (!m_peers.empty())
-    {
-        m_interface.getPeers().noteCall(m_peers.front());
-        return true;
-    }
-    m_dialog = SipDialogState::OVER;
-    leaveCall({QCause::TEMPORARY_FAILURE, 503, {}});
-    return false;
-}
-
-SocketAddress const& SipEndpoint::getPeerAddress() const { return m_interface.getPeers().getAddress(m_peers.front()); }
-
-bool SipEndpoint::tryAnother(unsigned int status, sip_t const* response)
-{
-    bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
-    if (m_dialog != SipDialogState::INVITE_SENT)
-        return false;
-    if (!m_contacts.empty())
-        return tryNextContact(status);
-    if (!isOurs && status == 503 && response->sip_retry_after != nullptr)
-        m_interface.getPeers().leaveAlone(m_peers.front(), response->sip_retry_after->af_delta);
-    return (isOurs || status == 503 || status == 408) && tryNextPeer();
-}
-
-/// Another peer, when one of them does not take the call or is not there (RFC 3263, 4.3). Whether there is one; a call
-/// that has rung, or whose caller has heard something, rings nowhere else.
-bool SipEndpoint::tryNextPeer()
-{
-    m_interface.getPeers().noteFailure(m_peers.front());
-    if (m_peers.size() < 2 || m_hasRung || m_hasEarlyMedia || !m_forks.empty())
-        return false;
-    m_peers.erase(m_peers.begin());
-    m_interface.getPeers().noteCall(m_peers.front());
-    m_inviteUri = SipAddress::MAKE_URI(m_called.getUser(), getPeerAddress(), m_way);
-    m_invite.forget();
-    m_negotiation.fail();
-    return startInvite();
-}
-
-/// Another contact of the user, when one of them does not want the call or is not there (RFC 3261, 16.5: one after the
-/// other). Whether there is one; a user who has declined it has done so everywhere.
-bool SipEndpoint::tryNextContact(unsigned int status)
-{
-    if (m_contacts.size() < 2 || status >= 600)
-        return false;
-    m_contacts.erase(m_contacts.begin());
-    m_inviteUri = m_contacts.front();
-    m_invite.forget();
-    m_negotiation.fail();
-    return startInvite();
-}
-
 bool SipEndpoint::startInvite()
 {
     std::string const hops = std::to_string(m_maxForwards);
@@ -453,27 +359,6 @@ void SipEndpoint::onRejected(unsigned int status, sip_t const* response)
         leaveCall(SipCause::FROM_RESPONSE(status, response->sip_status->st_phrase, REASON_OF(response)));
 }
 
-void SipEndpoint::noteHeard()
-{
-    if (std::exchange(m_isUnheard, false))
-        m_timer.start(m_interface.getConfiguration().answerTimeout * 1000);
-}
-
-/// A peer that is not there is given up for another one. Should it come back meanwhile, its first word gets a CANCEL.
-void SipEndpoint::onCalledTimer()
-{
-    if (!std::exchange(m_isUnheard, false) || m_dialog != SipDialogState::INVITE_SENT)
-    {
-        onAnswerTimeout();
-        return;
-    }
-    trace("the peer says nothing");
-    nta_outgoing_bind(m_invite.transaction, nullptr, nullptr);
-    nta_outgoing_tcancel(m_invite.transaction, nullptr, nullptr, TAG_END());
-    if (!tryNextPeer())
-        clear({QCause::NETWORK_OUT_OF_ORDER, 503, {}});
-}
-
 /// The callee has rung for too long; or, after a CANCEL, does not end its INVITE.
 void SipEndpoint::onAnswerTimeout()
 {
@@ -505,60 +390,6 @@ void SipEndpoint::confirmDialog(sip_t const* response)
     nta_leg_rtag(m_leg, response->sip_to->a_tag);
     routeAsClient(m_leg, m_invite.transaction, response);
     m_timer.stop();
-}
-
-// Several parties may answer what a proxy has forked: the first 200 wins (RFC 3261, 13.2.2.4). Any other gets its ACK
-// and a BYE from the stack, which hands us nothing more of it.
-
-/// Null for a response that is of no dialog.
-SipEndpoint::Fork* SipEndpoint::findFork(sip_t const* response)
-{
-    if (response->sip_to == nullptr || response->sip_to->a_tag == nullptr)
-        return nullptr;
-    std::string_view const tag = response->sip_to->a_tag;
-    auto const found = std::find_if(m_forks.begin(), m_forks.end(), [&](Fork const& fork) { return fork.tag == tag; });
-    return found != m_forks.end() ? &*found : &m_forks.emplace_back(Fork{std::string(tag)});
-}
-
-/// Sends the PRACK (RFC 3262), in the party's own dialog. False for a response that is repeated or comes before its
-/// turn: it is to be passed over.
-bool SipEndpoint::acceptReliably(Fork& fork, sip_t const* response)
-{
-    auto const sequence = static_cast<unsigned int>(response->sip_rseq->rs_response);
-    if (fork.sequence != 0 && sequence != fork.sequence + 1)
-        return false;
-    if (fork.leg == nullptr)
-        fork.leg = nta_leg_tcreate(m_interface.getAgent(), HANDLE, this, SIPTAG_CALL_ID(response->sip_call_id),
-                                   SIPTAG_FROM(response->sip_from), SIPTAG_TO(response->sip_to),
-                                   SIPTAG_CSEQ(response->sip_cseq), TAG_END());
-    if (fork.leg == nullptr)
-        return false;
-    routeAsClient(fork.leg, m_invite.transaction, response);
-    noteAllow(response);
-    std::string const acknowledged = std::to_string(sequence) + " " + std::to_string(m_invite.sequence) + " INVITE";
-    trace("-> PRACK");
-    if (!m_interface.getSender().sendAlone(fork.leg, SIP_METHOD_PRACK, SIPTAG_RACK_STR(acknowledged.c_str()),
-                                           TAG_END()))
-        return false;
-    fork.sequence = sequence;
-    return true;
-}
-
-void SipEndpoint::forgetForks()
-{
-    for (Fork& fork : m_forks)
-        if (fork.leg != nullptr)
-            nta_leg_destroy(std::exchange(fork.leg, nullptr));
-}
-
-/// Tells the other side whose news comes with it, when that is not whose the last one was.
-void SipEndpoint::addFork(CC_PropertyContainer& own, Fork const* fork)
-{
-    if (fork == nullptr)
-        return;
-    auto const number = static_cast<unsigned int>(fork - m_forks.data());
-    if (number != std::exchange(m_fork, number))
-        ADD(own, CC_PropertyUnsigned(SipPropertyId::FORK, number));
 }
 
 void SipEndpoint::acknowledge(Invitation& invitation, std::string const& sessionDescription)

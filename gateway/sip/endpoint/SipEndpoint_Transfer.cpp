@@ -92,7 +92,9 @@ int SipEndpoint::onRefer(nta_incoming_t* transaction, sip_t const* request)
     nta_incoming_treply(transaction, SIP_202_ACCEPTED, SIPTAG_CONTACT_STR(getContact()), TAG_END());
     m_isReferring = true;
     notifyReferrer(100, "Trying");
-    SipEndpoint* const other = replaces != nullptr ? m_interface.findReplaced(replaces) : nullptr;
+    SipEndpoint* other = replaces != nullptr ? m_interface.findDialog(replaces) : nullptr;
+    if (other != nullptr && (other->m_dialog != SipDialogState::UP || !other->m_isInCall))
+        other = nullptr;
     if (isInConference())
         callIn(number);
     else if (other != nullptr)
@@ -313,6 +315,8 @@ int SipEndpoint::HANDLE_REFER_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tr
 int SipEndpoint::onNotify(sip_t const* request)
 {
     bool const isOfReferral = request->sip_event != nullptr && strcasecmp(request->sip_event->o_type, "refer") == 0;
+    if (isOfReferral && m_hasSteppedBack && !m_isTransferring)
+        return 200; // what becomes of it shows: the other side's peer hangs up, or all stays as it is
     if (!isOfReferral || !m_isTransferring || m_target != nullptr)
         return 481;
     unsigned int const status = STATUS_OF_FRAGMENT(SipBody::PAYLOAD_OF(request));
@@ -331,7 +335,33 @@ int SipEndpoint::onNotify(sip_t const* request)
 
 // --- another dialog takes the place of ours (RFC 3891) ---------------------------------------------------------------
 
-bool SipEndpoint::isReplaceable() const { return m_dialog == SipDialogState::UP && m_isInCall; }
+/// RFC 3891, 3. A dialog that is not up yet can be replaced if it is we who call, and if media are ours: else there are
+/// two offers, of the caller and of who takes the place, and nobody to answer them.
+int SipEndpoint::checkReplaces(sip_replaces_t const& replaces) const
+{
+    switch (m_dialog)
+    {
+    case SipDialogState::UP:
+    case SipDialogState::ANSWERED:
+        if (replaces.rp_early_only)
+            return 486;
+        return m_dialog == SipDialogState::UP && m_isInCall ? 0 : 481;
+    case SipDialogState::INVITE_SENT:
+    {
+        bool const isKnown = std::any_of(m_forks.begin(), m_forks.end(),
+                                         [&](Fork const& fork) { return fork.tag == replaces.rp_from_tag; });
+        if (!isKnown || !m_isInCall)
+            return 481;
+        return m_interface.getEnvironment().host.relaysMedia ? 0 : 488;
+    }
+    case SipDialogState::CANCELLED:
+    case SipDialogState::BYE_SENT:
+    case SipDialogState::OVER:
+        return 603;
+    default:
+        return 481;
+    }
+}
 
 int SipEndpoint::receiveReplacing(nta_incoming_t* transaction, sip_t const* request, SipEndpoint& replaced)
 {

@@ -344,25 +344,20 @@ int SipInterface::receiveInvite(nta_incoming_t* transaction, sip_t const* reques
     return endpoint->receiveInvite(transaction, request, caller, routes, m_knownUser);
 }
 
-SipEndpoint* SipInterface::findReplaced(sip_replaces_t const* replaces) const
+SipEndpoint* SipInterface::findDialog(sip_replaces_t const* replaces) const
 {
     for (SipInterface const* const interface : m_environment.interfaces)
         if (nta_leg_t* const leg = nta_leg_by_replaces(interface->getAgent(), replaces))
-            if (auto* const endpoint = dynamic_cast<SipEndpoint*>(nta_leg_magic(leg, HANDLE));
-                endpoint != nullptr && endpoint->isReplaceable())
+            if (auto* const endpoint = dynamic_cast<SipEndpoint*>(nta_leg_magic(leg, HANDLE)))
                 return endpoint;
     return nullptr;
 }
 
-/// RFC 3891, 3: 481 for a dialog that we do not have, and one that is not up yet is none; 486 for one that must be
-/// early.
 int SipInterface::receiveReplacing(nta_incoming_t* transaction, sip_t const* request)
 {
-    SipEndpoint* const replaced = findReplaced(request->sip_replaces);
-    if (replaced == nullptr)
-        return 481;
-    if (request->sip_replaces->rp_early_only)
-        return 486;
+    SipEndpoint* const replaced = findDialog(request->sip_replaces);
+    if (int const refused = replaced != nullptr ? replaced->checkReplaces(*request->sip_replaces) : 481; refused != 0)
+        return refused;
     unsigned int const callNumber = ++m_environment.host.lastCallNumber;
     ++m_environment.host.counters.placed;
     InternetAddress const source = SOURCE_OF(transaction);

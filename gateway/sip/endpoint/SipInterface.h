@@ -93,8 +93,8 @@ public:
     /// Answers a method that nobody here handles: 405 or 501 with Allow; 0 for one that is handled.
     int refuseMethod(nta_incoming_t* transaction, sip_t const* request) const;
     int answerOptions(nta_incoming_t* transaction) const;
-    /// The endpoint with that dialog, on whatever interface; null when there is none that can be replaced.
-    SipEndpoint* findReplaced(sip_replaces_t const* replaces) const;
+    /// The endpoint with that dialog, on whatever interface, in whatever state; null when there is none.
+    SipEndpoint* findDialog(sip_replaces_t const* replaces) const;
     /// A peer that answers with 503 and Retry-After is left alone for that time, and calls that nobody else takes get
     /// 503. The caller is not told the time: it would send us no call at all, also none for other peers. @{
     SipPeers& getPeers() { return m_peers; }

@@ -53,7 +53,7 @@ in_file() { python3 -c 'import sqlite3, sys; print(sqlite3.connect(sys.argv[1]).
 for ((i = 0; i < USERS; i++)); do echo "u$i:office:secret"; done >"$WORK/passwords"
 chmod 600 "$WORK/passwords"
 write_configuration
-sed -i -e "s,^name = \"a\",&\nauthenticate = true\nregistrar = true\nrealm = \"office\"\nalgorithms = [\"MD5\"]\npasswords = \"$WORK/passwords\"\nregistrations = \"$WORK/contacts\"\nallow = [\"$HOST\"]," \
+sed -i -e "s,^name = \"a\",&\nauthenticate = true\nregistrar = true\nmax-requests-per-source = 0\nrealm = \"office\"\nalgorithms = [\"MD5\"]\npasswords = \"$WORK/passwords\"\nregistrations = \"$WORK/contacts\"\nallow = [\"$HOST\"]," \
     -e "/^peer = \"$HOST:$PORT_CALLER\"/d" "$WORK/gateway.toml"
 start_gateway
 run_users many "$(for ((i = 0; i < USERS; i++)); do echo "u$i;u$i"; done)" -m $USERS -r 1000 -l 200
