@@ -73,6 +73,8 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
 
 Exchange::~Exchange()
 {
+    for (auto const& [handle, call] : m_calls) // that the line has cut off
+        countSpeech(*call);
     pri_set_userdata(m_stack, nullptr);
     ENDED_STACKS().push_back(m_stack);
 }
@@ -380,10 +382,18 @@ void Exchange::onHangUp(pri_event& event)
         chargeFinally(*call);
     if (call != nullptr && call->own != nullptr && !isRequest)
         ++m_report.over;
+    if (call != nullptr && !isRequest)
+        countSpeech(*call);
     if (!isRequest)
         m_calls.erase(event.hangup.call);
     if (event.e != PRI_EVENT_HANGUP_ACK) // then the stack has it no more
         pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
+}
+
+void Exchange::countSpeech(Call const& call)
+{
+    if (call.speech != nullptr)
+        m_report.blocks += call.speech->getNumberOfBlocks();
 }
 
 // --- calls of its own ------------------------------------------------------------------------------------------------
