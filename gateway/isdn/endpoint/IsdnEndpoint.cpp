@@ -77,6 +77,12 @@ void IsdnEndpoint::take(pri_event& event)
     case PRI_EVENT_NOTIFY:
         onNotify(event.notify.info);
         break;
+    case PRI_EVENT_HOLD:
+        onHold();
+        break;
+    case PRI_EVENT_RETRIEVE:
+        onRetrieve(event.retrieve);
+        break;
     case PRI_EVENT_FACILITY:
         m_own.clear();
         readCommands(event.facility.subcmds, m_own);

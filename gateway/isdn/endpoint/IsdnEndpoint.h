@@ -27,7 +27,7 @@ class IsdnInterface;
 /// that it was offered. What the peer leg does becomes a message, and the other way round:
 ///
 ///     SETUP ACK ADDRESS-INCOMPLETE     CALL PROC, PROGRESS PROCEEDING     ALERTING ALERTING     CONNECT CONNECTED
-///     NOTIFY of remote hold HELD       the end RELEASED and a cause
+///     HOLD, NOTIFY of remote hold HELD     the end RELEASED and a cause
 ///
 /// How the call on the wire goes on is the table of IsdnCallState.
 ///
@@ -113,6 +113,8 @@ private:
     void readCommands(pri_subcommands const* commands, CC_PropertyContainer& own);
     void readUserUser(char const* text, CC_PropertyContainer& own);
     void onNotify(int indicator);
+    void onHold();
+    void onRetrieve(pri_event_retrieve const& retrieve);
     void onDigits(char const* digits);
     void endNumber();
     void onUserInput(CC_ServiceUserInput const& input);
@@ -155,6 +157,7 @@ private:
     bool m_wasAnswered = false;
     bool m_hasToldData = false;
     bool m_isPeerHeld = false;
+    bool m_isOnHold = false; // by HOLD, so that it has no channel
     bool m_isFinished = false;
     std::string m_digits;   // called side: not sent yet
     std::string m_userUser; // that the wire has been told

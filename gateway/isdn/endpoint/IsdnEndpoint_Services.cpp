@@ -1,4 +1,5 @@
 // What goes both ways beside the call itself: digits, charges, notifications, texts.
+#include "isdn/element/IsdnCause.h"
 #include "isdn/element/IsdnCharge.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
@@ -130,6 +131,37 @@ void IsdnEndpoint::onNotify(int indicator)
         std::ignore = m_adapter.setOwn(Key::STATE, LegState::HELD);
     else if (indicator == PRI_NOTIFY_REMOTE_RETRIEVAL || indicator == PRI_NOTIFY_USER_RESUMED)
         std::ignore = m_adapter.setOwn(Key::STATE, LegState::CONNECTED);
+}
+
+/// EN 300 141-1, 9: the channel is free for another call of the far side's until its user takes this one back.
+void IsdnEndpoint::onHold()
+{
+    if (m_state != IsdnCallState::ACTIVE || !m_isInCall || m_isOnHold)
+    {
+        ask([&](pri* stack) { return pri_hold_rej(stack, m_call, PRI_CAUSE_WRONG_CALL_STATE); });
+        return;
+    }
+    m_isOnHold = true;
+    m_media.reset();
+    m_interface.getChannels().giveBack(std::exchange(m_timeslot, IsdnChannels::NONE));
+    ask([&](pri* stack) { return pri_hold_ack(stack, m_call); });
+    std::ignore = m_adapter.setOwn(Key::STATE, LegState::HELD);
+}
+
+void IsdnEndpoint::onRetrieve(pri_event_retrieve const& retrieve)
+{
+    bool const isWaiting = m_isOnHold && m_state == IsdnCallState::ACTIVE && m_isInCall;
+    if (!isWaiting || !takeRequestedChannel(retrieve.channel, retrieve.flexible != 0))
+    {
+        QCause const cause =
+            isWaiting ? QCause::NO_CIRCUIT_CHANNEL_AVAILABLE : QCause::MESSAGE_NOT_COMPATIBLE_WITH_CALL_STATE;
+        ask([&](pri* stack) { return pri_retrieve_rej(stack, m_call, IsdnCause::TO_WIRE(cause)); });
+        return;
+    }
+    m_isOnHold = false;
+    ask([&](pri* stack) { return pri_retrieve_ack(stack, m_call, getChannel()); });
+    std::ignore = m_adapter.setOwn(Key::STATE, LegState::CONNECTED);
+    openMedia();
 }
 
 void IsdnEndpoint::tellHold()

@@ -43,6 +43,10 @@ q931_call* CALL_OF(pri_event const& event)
         return event.notify.call;
     case PRI_EVENT_KEYPAD_DIGIT:
         return event.digit.call;
+    case PRI_EVENT_HOLD:
+        return event.hold.call;
+    case PRI_EVENT_RETRIEVE:
+        return event.retrieve.call;
     default:
         return nullptr;
     }

@@ -77,6 +77,14 @@ public:
     {
         ask([&](pri* stack) { return pri_notify(stack, m_call, 0, indicator); });
     }
+    void hold(q931_call* call)
+    {
+        ask([&](pri* stack) { return pri_hold(stack, call); });
+    }
+    void retrieve(q931_call* call, int channel)
+    {
+        ask([&](pri* stack) { return pri_retrieve(stack, call, channel); });
+    }
     IsdnLink& getLink() { return m_link; }
     q931_call* getCall() const { return m_call; }
     int getChannel() const { return m_channel & 0xff; }

@@ -69,10 +69,13 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_facility_enable(m_stack);
     pri_aoc_events_enable(m_stack, 1);
     pri_hangup_fix_enable(m_stack, 1);
+    pri_hold_enable(m_stack, 1);
 }
 
 Exchange::~Exchange()
 {
+    for (auto const& [handle, call] : m_calls) // that the line has cut off
+        countSpeech(*call);
     pri_set_userdata(m_stack, nullptr);
     ENDED_STACKS().push_back(m_stack);
 }
@@ -199,6 +202,18 @@ void Exchange::takeEvent(pri_event& event)
     case PRI_EVENT_ANSWER:
         onAnswer(event.answer);
         break;
+    case PRI_EVENT_HOLD_ACK:
+        if (CallHandle const call = find(event.hold_ack.call))
+        {
+            call->channel = 0;
+            countSpeech(*call);
+            call->speech.reset();
+        }
+        break;
+    case PRI_EVENT_RETRIEVE_ACK:
+        if (CallHandle const call = find(event.retrieve_ack.call))
+            takeBack(call, event.retrieve_ack.channel);
+        break;
     case PRI_EVENT_KEYPAD_DIGIT:
         ++m_report.keyed[event.digit.digits];
         break;
@@ -289,6 +304,8 @@ void Exchange::answer(CallHandle const& call)
         speak(call, subscriber.speaks, subscriber.file, subscriber.record);
     if (subscriber.holds)
         hold(call);
+    if (subscriber.parks != 0)
+        park(call, subscriber.parks);
     if (subscriber.drops != 0)
         after(subscriber.drops, call, [this](CallHandle const&) { m_line.close(); });
     if (subscriber.units != 0)
@@ -318,6 +335,31 @@ void Exchange::hold(CallHandle const& call)
                              one->isHeld ? PRI_NOTIFY_REMOTE_HOLD : PRI_NOTIFY_REMOTE_RETRIEVAL);
               hold(one);
           });
+}
+
+/// HOLD, and RETRIEVE on whatever channel is free then (EN 300 141-1, 9).
+void Exchange::park(CallHandle const& call, unsigned int milliseconds)
+{
+    after(HOLD, call,
+          [this, milliseconds](CallHandle const& one)
+          {
+              pri_hold(m_stack, one->handle);
+              after(milliseconds, one,
+                    [this](CallHandle const& held)
+                    {
+                        held->channel = hunt();
+                        pri_retrieve(m_stack, held->handle, held->channel);
+                    });
+          });
+}
+
+void Exchange::takeBack(CallHandle const& call, int channel)
+{
+    call->channel = channel;
+    if (call->own != nullptr)
+        speak(call, call->own->speaks, call->own->file, call->own->record);
+    else
+        speak(call, call->subscriber->speaks, call->subscriber->file, call->subscriber->record);
 }
 
 /// AOC-S (EN 300 182-1): by the minute, in steps.
@@ -380,10 +422,18 @@ void Exchange::onHangUp(pri_event& event)
         chargeFinally(*call);
     if (call != nullptr && call->own != nullptr && !isRequest)
         ++m_report.over;
+    if (call != nullptr && !isRequest)
+        countSpeech(*call);
     if (!isRequest)
         m_calls.erase(event.hangup.call);
     if (event.e != PRI_EVENT_HANGUP_ACK) // then the stack has it no more
         pri_hangup(m_stack, event.hangup.call, isRequest ? cause : -1);
+}
+
+void Exchange::countSpeech(Call const& call)
+{
+    if (call.speech != nullptr)
+        m_report.blocks += call.speech->getNumberOfBlocks();
 }
 
 // --- calls of its own ------------------------------------------------------------------------------------------------
@@ -477,5 +527,7 @@ void Exchange::onAnswer(pri_event_answer const& answer)
         pri_keypad_facility(m_stack, call->handle, call->own->keys.c_str());
     if (call->own->holds)
         hold(call);
+    if (call->own->parks != 0)
+        park(call, call->own->parks);
     after(call->own->length, call, [this](CallHandle const& one) { release(one, one->own->cause); });
 }

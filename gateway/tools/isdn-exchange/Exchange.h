@@ -29,6 +29,7 @@ struct Report
     unsigned int placedAnswered = 0;
     unsigned int over = 0; ///< of those placed
     unsigned int units = 0;
+    unsigned long blocks = 0;           ///< of speech that were heard in calls that are over
     std::map<int, unsigned int> causes; ///< with which calls were cleared by the far side
     std::map<std::string, unsigned int> keyed;
 };
@@ -83,9 +84,12 @@ private:
     void answer(CallHandle const& call);
     void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
     void hold(CallHandle const& call);
+    void park(CallHandle const& call, unsigned int milliseconds);
+    void takeBack(CallHandle const& call, int channel);
     void tellTariff(Call const& call);
     void charge(CallHandle const& call);
     void chargeFinally(Call& call);
+    void countSpeech(Call const& call);
     void placeWaiting();
     void place(Plan::Call const& own);
     void dialOn(CallHandle const& call);

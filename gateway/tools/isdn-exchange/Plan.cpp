@@ -104,6 +104,7 @@ Plan::Subscriber READ_SUBSCRIBER(std::string const& file, toml::table const& tom
     table.read("in-band", one.isInBand);
     table.read("foreign", one.isForeign);
     table.read("holds", one.holds);
+    table.read("parks", one.parks);
     table.read("units", one.units);
     table.read("interval", one.interval);
     table.read("currency", one.currency);
@@ -137,6 +138,7 @@ Plan::Call READ_CALL(std::string const& file, toml::table const& toml)
     table.read("overlap", one.isOverlap);
     table.read("exclusive", one.isExclusive);
     table.read("holds", one.holds);
+    table.read("parks", one.parks);
     table.read("count", one.count);
     table.read("after", one.after);
     table.read("interval", one.interval);

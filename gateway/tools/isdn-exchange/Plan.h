@@ -27,10 +27,11 @@ struct Plan
         unsigned int connectedScreening = 3;
         std::string name;
         std::string userUser;
-        bool isInBand = false;       ///< its ringing tone comes in the channel
-        bool isForeign = false;      ///< it is no ISDN telephone
-        bool holds = false;          ///< it holds the call that is up, and takes it back, again and again
-        unsigned int units = 0;      ///< charged each interval; 0: nothing is
+        bool isInBand = false;  ///< its ringing tone comes in the channel
+        bool isForeign = false; ///< it is no ISDN telephone
+        bool holds = false;     ///< it says that its user holds the call that is up, and takes it back, again and again
+        unsigned int parks = 0; ///< milliseconds for which it holds the call itself, giving its channel back; 0: never
+        unsigned int units = 0; ///< charged each interval; 0: nothing is
         unsigned int interval = 100; ///< milliseconds
         std::string currency;        ///< in hundredths of it; empty: units
         unsigned int tariff = 0;     ///< hundredths of the currency a minute, told before it rings; 0: nothing is
@@ -59,6 +60,7 @@ struct Plan
         bool isOverlap = false;
         bool isExclusive = false;
         bool holds = false; ///< as of a subscriber
+        unsigned int parks = 0;
         unsigned int count = 1;
         unsigned int after = 500;    ///< milliseconds until the first
         unsigned int interval = 100; ///< milliseconds between two

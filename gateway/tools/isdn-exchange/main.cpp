@@ -35,6 +35,7 @@ void PRINT(Report const& report)
 {
     std::printf("exchange: %u calls received, %u answered; %u placed, %u answered, %u over; %u units charged\n",
                 report.received, report.answered, report.placed, report.placedAnswered, report.over, report.units);
+    std::printf("exchange: %lu blocks heard\n", report.blocks);
     for (auto const& [cause, count] : report.causes)
         std::printf("exchange: cause %d: %u\n", cause, count);
     for (auto const& [digits, count] : report.keyed)

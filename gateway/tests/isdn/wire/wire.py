@@ -17,7 +17,8 @@ FIRST = 1001
 AT_ONCE = 8  # calls of an exchange, so that the channels suffice
 MESSAGES = {  # Q.931, table 4-2
     0x01: "ALERTING", 0x02: "CALL-PROCEEDING", 0x03: "PROGRESS", 0x05: "SETUP", 0x07: "CONNECT", 0x45: "DISCONNECT",
-    0x4D: "RELEASE", 0x5A: "RELEASE-COMPLETE", 0x62: "FACILITY", 0x6E: "NOTIFY", 0x7B: "INFORMATION"}
+    0x4D: "RELEASE", 0x5A: "RELEASE-COMPLETE", 0x24: "HOLD", 0x28: "HOLD-ACKNOWLEDGE", 0x30: "HOLD-REJECT", 0x31: "RETRIEVE",
+    0x33: "RETRIEVE-ACKNOWLEDGE", 0x37: "RETRIEVE-REJECT", 0x62: "FACILITY", 0x6E: "NOTIFY", 0x7B: "INFORMATION"}
 SPEECH = "m=audio 40000 RTP/AVP 8\na=rtpmap:8 PCMA/8000"
 BITS = "m=audio 40000 RTP/AVP 96\na=rtpmap:96 CLEARMODE/8000"
 
@@ -108,10 +109,14 @@ def calls_from(row):
     steps += [receive("200"), send(request(row, "ACK", 1, "[peer_tag_param]"))]
     if row.has(row.heard, "S INFO"):
         steps += [receive("INFO"), send(response("200 OK", False))]
+    for sequence, direction in enumerate(("sendonly", "sendrecv") if row.word("holds") else (), 2):
+        steps += [send(request(row, "INVITE", sequence, "[peer_tag_param]"), session(f"{media}\na={direction}"), True),
+                  receive("100", True), receive("200"), send(request(row, "ACK", sequence, "[peer_tag_param]")),
+                  '<pause milliseconds="100"/>']
     if row.has(row.heard, "S BYE"):
         return steps + [receive("BYE"), send(response("200 OK", False))]
     return steps + ['<pause milliseconds="100"/>',
-                    send(request(row, "BYE", 2, "[peer_tag_param]") + row.headers("BYE"), "", True), receive("200")]
+                    send(request(row, "BYE", 9, "[peer_tag_param]") + row.headers("BYE"), "", True), receive("200")]
 
 
 def callees(method, sequence):
