@@ -7,8 +7,11 @@
 #include "tests/support/PropertyTesting.h"
 
 #include <functional>
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <memory>
+#include <string>
+#include <utility>
 #include <vector>
 
 namespace
@@ -18,6 +21,8 @@ using namespace CC_PropertyId;
 class HostileProperties : public PartyTest
 {
 protected:
+    using Write = std::function<XCode(CC_CallAdapter&, CC_PropertyContainer const&)>;
+
     ~HostileProperties() override { *deeds = {}; }
 
     /// A party whose adapter was destroyed gets another one.
@@ -44,6 +49,34 @@ protected:
     {
         auto const* const property = dynamic_cast<ActingProperty const*>(properties.get(id));
         return property != nullptr ? property->getNumber() : -1;
+    }
+    using Read = XCode (CC_CallAdapter::*)(CC_PropertyContainer&, unsigned int) const;
+    static CC_PropertyContainer READ(CC_CallAdapter const& adapter, Read read)
+    {
+        CC_PropertyContainer properties;
+        std::ignore = (adapter.*read)(properties, CC_PropertyContainer::ALL_GROUPS);
+        return properties;
+    }
+    static void expectHolds(CC_PropertyContainer const& all, CC_PropertyContainer const& some, std::string const& what)
+    {
+        for (CC_Property const& property : some)
+        {
+            CC_Property const* const held = all.get(property.getId());
+            EXPECT_TRUE(held != nullptr && held->isEqual(property)) << what << ", id " << property.getId();
+        }
+    }
+    /// Without filters an adapter sees what its peer and its call hold, and of its own leg nothing that is not there.
+    static void expectTrueViews(Party const& party, std::string const& when)
+    {
+        using A = CC_CallAdapter;
+        CC_CallAdapter const& adapter = *party.adapter;
+        CC_PropertyContainer const peer = READ(adapter, &A::getPeerPropertiesUnfiltered);
+        CC_PropertyContainer const call = READ(adapter, &A::getCallPropertiesUnfiltered);
+        expectHolds(READ(adapter, &A::getOwnPropertiesUnfiltered), READ(adapter, &A::getOwnProperties), "own, " + when);
+        expectHolds(peer, READ(adapter, &A::getPeerProperties), "peer, " + when);
+        expectHolds(READ(adapter, &A::getPeerProperties), peer, "of the peer, " + when);
+        expectHolds(call, READ(adapter, &A::getCallProperties), "call, " + when);
+        expectHolds(READ(adapter, &A::getCallProperties), call, "of the call, " + when);
     }
     std::shared_ptr<ActingProperty::Deeds> const deeds = std::make_shared<ActingProperty::Deeds>();
 };
@@ -160,7 +193,6 @@ TEST_F(HostileProperties, ALoggedPropertyMayGiveUpTheLegThatStoresIt)
 TEST_F(HostileProperties, APropertyMayDestroyTheAdapterThatItIsWrittenWith)
 {
     Party anna("anna"), bert("bert");
-    using Write = std::function<XCode(CC_CallAdapter&, CC_PropertyContainer const&)>;
     Write const writes[] = {
         [](CC_CallAdapter& adapter, CC_PropertyContainer const& from)
         { return adapter.setOwnProperty(*from.get(NAME)); },
@@ -456,5 +488,106 @@ TEST_F(HostileProperties, AnAdapterDroppedByAnyOfTheClonesOfAPropertySeesNothing
                         << party->name.c_str() << ", clone " << last << ", of several: " << areSeveral;
                 }
                 expectNothingLeft({&anna, &bert});
+            }
+}
+
+TEST_F(HostileProperties, AnAdapterThatDialsAnewInsideAnyDeedOfAPropertySeesTheNewCallAlone)
+{
+    Write const writes[] = {
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperties(from); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperties(from); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperties(from); },
+    };
+    constexpr unsigned int MOST = 30;
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
+                             &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
+        for (Write const& write : writes)
+            for (bool const isThereBefore : {false, true})
+                for (bool const isSeenByTheOther : {false, true})
+                    for (unsigned int skipped = 0; skipped < MOST; ++skipped)
+                    {
+                        Party anna("anna"), bert("bert"), carl("carl");
+                        connect(anna, bert);
+                        CC_PropertyContainer const first = several(1);
+                        CC_PropertyContainer const second = several(2);
+                        if (isThereBefore)
+                        {
+                            ASSERT_EQ(write(*anna.adapter, first), XCode::OK);
+                            settle();
+                        }
+                        bool hasDialled = false;
+                        unsigned int left = skipped;
+                        Party& leaving = isSeenByTheOther ? bert : anna;
+                        std::function<void()> act = [&]
+                        {
+                            if (left-- > 0)
+                            {
+                                (*deeds).*event = act; // the next one
+                                return;
+                            }
+                            leaving.hangUp();
+                            hasDialled = leaving.dial(carl).isOk();
+                        };
+                        (*deeds).*event = act;
+                        std::ignore = write(*anna.adapter, second);
+                        bool const isOver = (*deeds).*event != nullptr; // so many there are not
+                        *deeds = {};
+                        settle();
+                        if (hasDialled)
+                        {
+                            expectTrueViews(leaving, "deed " + std::to_string(skipped));
+                            expectTrueViews(carl, "deed " + std::to_string(skipped) + ", the called one");
+                        }
+                        expectNothingLeft({&anna, &bert, &carl});
+                        if (isOver)
+                            break;
+                        ASSERT_LT(skipped + 1, MOST);
+                    }
+}
+
+TEST_F(HostileProperties, WhatIsWrittenInsideAnyDeedOfAPropertyIsSeenInTheEnd)
+{
+    constexpr unsigned int MOST = 40;
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
+                             &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
+        for (bool const isOfCall : {false, true})
+            for (unsigned int skipped = 0; skipped < MOST; ++skipped)
+            {
+                Party anna("anna"), bert("bert");
+                connect(anna, bert);
+                auto const write = isOfCall ? &CC_CallAdapter::setCallProperties : &CC_CallAdapter::setOwnProperties;
+                ASSERT_EQ((*bert.adapter.*write)(several(1)), XCode::OK);
+                settle();
+                CC_PropertyContainer const second = several(2);
+                CC_PropertyContainer late;
+                ASSERT_EQ(late.set(CC_PropertyString(DISPLAY, "late")), XCode::OK);
+                unsigned int left = skipped;
+                std::function<void()> act = [&]
+                {
+                    if (left-- > 0)
+                        (*deeds).*event = act; // the next one
+                    else
+                        EXPECT_EQ((*bert.adapter.*write)(late), XCode::OK);
+                };
+                (*deeds).*event = act;
+                EXPECT_EQ((*bert.adapter.*write)(second), XCode::OK);
+                bool const isOver = (*deeds).*event != nullptr; // so many there are not
+                *deeds = {};
+                settle();
+                expectTrueViews(anna, "deed " + std::to_string(skipped));
+                expectTrueViews(bert, "deed " + std::to_string(skipped) + ", who writes");
+                using testing::Contains;
+                EXPECT_THAT(anna.observer.getFlagSets().back(), Contains(unsigned{NAME})) << "deed " << skipped;
+                if (!isOver)
+                {
+                    EXPECT_THAT(anna.observer.getFlagSets().back(), Contains(unsigned{DISPLAY})) << "deed " << skipped;
+                }
+                expectNothingLeft({&anna, &bert});
+                if (isOver)
+                    break;
+                ASSERT_LT(skipped + 1, MOST);
             }
 }

@@ -316,8 +316,6 @@ private:
     static void GIVE_UP_RELEASED(CC_CallLeg& leg);
     void observeCall(CC_Call& call);
     void unobserveCall();
-    template <class Take>
-    void takeOverForeign(CC_PropertyView& view, Take const& take);
     void updateOwnCallLeg(CC_Flags const& changed);
     void filterOwnCallLeg(CC_Flags const& changed, CC_PropertyFilterContainer const& filters);
     void updatePeerCallLeg(CC_Flags const* changed);

@@ -21,15 +21,6 @@ public:
     }
     bool isOver() const { return !m_self.isAlive() || m_adapter.m_attempt != m_number; }
 
-    /// After properties were stored in the adapter's view: if a module's class has ended the attempt meanwhile, an idle
-    /// adapter sees nothing. FAILURE, for whoever fails then.
-    [[gnu::noinline, gnu::cold]] XCode emptyWhenIdle(CC_PropertyView& view) const
-    {
-        if (isOver() && m_self.isAlive() && m_adapter.m_ownCallLeg == nullptr)
-            view.clear();
-        return XCode::FAILURE;
-    }
-
     /// Whether a step went well and the attempt goes on; one that failed is logged with the reason.
     bool survives(XCode step, char const* reason) const
     {

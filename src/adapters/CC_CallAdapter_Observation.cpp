@@ -65,6 +65,7 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
     unobserveCall();
     if (relinked.getNewCall() != nullptr)
     {
+        m_callView.interrupt();
         updateCall();
         if (attempt.isOver())
             return;
@@ -154,23 +155,6 @@ CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 }
 } // namespace
 
-/// As `take`, which lets the view take over properties with a module's among them: they may end the attempt.
-template <class Take>
-__attribute__((noinline)) void CC_CallAdapter::takeOverForeign(CC_PropertyView& view, Take const& take)
-{
-    Attempt const attempt(*this);
-    take();
-    std::ignore = attempt.emptyWhenIdle(view); // nobody asks what became of it
-}
-
-namespace
-{
-bool IS_CALLING_NOBODY(CC_PropertyView const& view, CC_PropertyContainer const& source)
-{
-    return source.isSelfContained() && view.getProperties().isSelfContained();
-}
-} // namespace
-
 void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
 {
     CC_CallLeg const& leg = *m_ownCallLeg;
@@ -180,9 +164,7 @@ void CC_CallAdapter::updateOwnCallLeg(CC_Flags const& changed)
         CC_PropertyView::Told const told = TOLD(leg, &changed);
         if (std::exchange(m_isWritingOwn, false) && m_ownView.hasWritten(leg.getProperties(), told))
             return;
-        if (IS_CALLING_NOBODY(m_ownView, leg.getProperties()))
-            return m_ownView.assign(leg.getProperties(), told);
-        return takeOverForeign(m_ownView, [&] { m_ownView.assign(leg.getProperties(), told); });
+        return m_ownView.assign(leg.getProperties(), told);
     }
     filterOwnCallLeg(changed, *filters);
 }
@@ -194,15 +176,12 @@ __attribute__((noinline)) void CC_CallAdapter::filterOwnCallLeg(CC_Flags const& 
     Attempt const attempt(*this);
     unsigned int const refresh = ++m_refreshes;
     CC_CallLeg const& leg = *m_ownCallLeg;
-    CC_PropertyView& view = m_ownView; // to be named when this may be gone
     Copy const copy(attempt, *this, Kept::OWN_OUTPUT, leg.getProperties(), leg.getSerial(), TOLD(leg, &changed));
     if (!copy.isWhole())
         return;
     XCode const result = filters.applyFilters(copy.get());
     if (result.isOk() && !attempt.isOver() && refresh == m_refreshes)
-        view.assignMarked(copy.get(), copy.settle(), 0);
-    if (attempt.isOver())
-        std::ignore = attempt.emptyWhenIdle(view); // as above
+        m_ownView.assignMarked(copy.get(), copy.settle(), 0);
 }
 
 /// Tells the module. One class for the views of peer and call, so that what follows them is there once.
@@ -233,11 +212,7 @@ private:
 {
     CC_PropertyFilterContainer const* const filters = getOutputFilters();
     if (filters == nullptr)
-    {
-        if (IS_CALLING_NOBODY(view, source))
-            return view.follow(source, told, onDifference);
-        return takeOverForeign(view, [&] { view.follow(source, told, onDifference); });
-    }
+        return view.follow(source, told, onDifference);
     filterView(view, source, serial, told, onDifference, *filters);
 }
 
@@ -271,8 +246,6 @@ __attribute__((noinline)) void CC_CallAdapter::filterView(CC_PropertyView& view,
     std::ignore = filters.applyFilters(copy.get()); // what the filters leave is what the module sees
     if (!attempt.isOver() && refresh == m_refreshes)
         view.followMarked(copy.get(), copy.settle(), told.number, onDifference);
-    if (attempt.isOver())
-        std::ignore = attempt.emptyWhenIdle(view);
 }
 
 void CC_CallAdapter::mark(unsigned int id)
@@ -312,6 +285,7 @@ bool CC_CallAdapter::linkPeerCallLeg()
         return false;
     Attempt const attempt(*this);
     chosen->addReference();
+    m_peerView.interrupt();
     if (CC_CallLeg* const previous = std::exchange(m_peerCallLeg, chosen))
         GIVE_UP(*previous);
     if (!attempt.isOver())

@@ -51,7 +51,7 @@ XCode CC_CallAdapter::writeFiltered(CC_PropertyView& view, Target* target, Writt
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
     if (!seen.isOk() || attempt.isOver())
-        return attempt.emptyWhenIdle(view);
+        return XCode::FAILURE;
     CC_PropertyFilterContainer const* const filters = getInputFilters();
     if (filters == nullptr)
         return WRITE(*target, written);
@@ -79,7 +79,7 @@ XCode CC_CallAdapter::writeUnfiltered(CC_PropertyView& view, Target* target, Wri
 {
     Attempt const attempt(*this);
     XCode const seen = view.write(written);
-    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : attempt.emptyWhenIdle(view);
+    return seen.isOk() && !attempt.isOver() ? WRITE(*target, written) : XCode::FAILURE;
 }
 
 CC_PropertyFilterContainer* CC_CallAdapter::getInputFilters() const
@@ -130,10 +130,9 @@ XCode CC_CallAdapter::setOwnPropertyPlainly(CC_Property const& property)
 {
     // what the leg then tells us of our own write is in our view already (5 % of a call's instructions)
     Attempt const attempt(*this);
-    CC_PropertyView& view = m_ownView; // to be named when this may be gone
-    XCode const seen = view.write(property);
+    XCode const seen = m_ownView.write(property);
     if (!seen.isOk() || attempt.isOver())
-        return attempt.emptyWhenIdle(view);
+        return XCode::FAILURE;
     m_isWritingOwn = true;
     XCode const result = WRITE(*m_ownCallLeg, property);
     if (!attempt.isOver())

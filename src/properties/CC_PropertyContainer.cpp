@@ -24,8 +24,8 @@ namespace
 thread_local void* t_innermostWatch __attribute__((tls_model("initial-exec"))) = nullptr;
 } // namespace
 
-CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container)
-    : m_container(&container), m_outer(static_cast<Watch*>(t_innermostWatch))
+CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container, Use use)
+    : m_container(&container), m_outer(static_cast<Watch*>(t_innermostWatch)), m_use(use)
 {
     container.m_isWatched = true;
     t_innermostWatch = this;
@@ -33,10 +33,12 @@ CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container)
 
 CC_PropertyContainer::Watch::~Watch() { t_innermostWatch = m_outer; }
 
-void CC_PropertyContainer::tellWatches() const
+void CC_PropertyContainer::tellWatches() const { tellWatches(Watch::Use::ANY); }
+
+void CC_PropertyContainer::tellWatches(Watch::Use use) const
 {
     for (auto* watch = static_cast<Watch*>(t_innermostWatch); watch != nullptr; watch = watch->m_outer)
-        if (watch->m_container == this)
+        if (watch->m_container == this && (use == Watch::Use::ANY || watch->m_use == use))
             watch->m_container = nullptr;
 }
 

@@ -292,12 +292,19 @@ private:
             std::ignore = m_properties.append(made); // it is in no list
         return made != nullptr;
     }
-    /// Tells who has called a module's class whether the container still exists. On the stack; one thread only. Where
-    /// all are self-contained nobody watches, and nobody pays.
+    /// Tells who has called a module's class whether the container still exists, and is what it was. On the stack; one
+    /// thread only. Where all are self-contained nobody watches, and nobody pays.
     class CC_EXPORT Watch
     {
     public:
-        explicit Watch(CC_PropertyContainer const& container);
+        /// What is done to the container meanwhile: a later following makes an earlier one needless.
+        enum class Use : bool
+        {
+            ANY,
+            FOLLOWING
+        };
+        explicit Watch(CC_PropertyContainer const& container) : Watch(container, Use::ANY) {}
+        Watch(CC_PropertyContainer const& container, Use use);
         ~Watch();
         Watch(Watch const&) = delete;
         Watch& operator=(Watch const&) = delete;
@@ -307,8 +314,17 @@ private:
         friend class CC_PropertyContainer;
         CC_PropertyContainer const* m_container;
         Watch* m_outer;
+        Use m_use;
     };
     [[gnu::cold]] void tellWatches() const;
+    [[gnu::cold]] void tellWatches(Watch::Use use) const;
+    /// Ends what operations further out on the stack are doing here, as if it were destroyed: all, or those that
+    /// follow.
+    void interrupt(Watch::Use use) const
+    {
+        if (m_isWatched)
+            tellWatches(use);
+    }
 
     /// Whether nobody is called when the other's properties are stored here.
     bool takesUndisturbed(CC_PropertyContainer const& other) const { return !m_hasForeign && other.m_isSelfContained; }

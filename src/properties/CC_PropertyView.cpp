@@ -3,6 +3,7 @@
 void CC_PropertyView::clear()
 {
     m_inStepWith = nullptr;
+    interrupt();
     m_properties.clear(); // last: an ending property may destroy us
 }
 

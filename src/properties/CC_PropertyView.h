@@ -31,7 +31,10 @@ public:
     CC_PropertyContainer const& getProperties() const { return m_properties; }
     /// Whether that notification of the source is the last that was heard, or looked at with everything else.
     bool hasHeard(unsigned int number) const { return m_lastHeard == number; }
-    /// Empties the copy, which is in step with no source then.
+    /// From now on it is a copy of somebody else's, and no business of those who are just storing something here and
+    /// have called a module's class: they fail.
+    void interrupt() const { m_properties.interrupt(CC_PropertyContainer::Watch::Use::ANY); }
+    /// The same, and empties the copy, which is in step with no source then.
     void clear();
     /// What may have changed since this was asked last.
     CC_PropertyContainer::Marks takeMarks() { return m_properties.takeMarks(); }
@@ -91,6 +94,7 @@ public:
 private:
     using Container = CC_PropertyContainer;
     static constexpr unsigned int NONE = CC_Flags::NONE;
+    static constexpr auto FOLLOWING = Container::Watch::Use::FOLLOWING;
 
     /// Whether all that can differ is known, in both, and was taken by `take(former, current)`.
     template <class Take>
@@ -175,6 +179,7 @@ private:
     bool takeAll(CC_PropertyContainer const& source, Told const& told, Take const& take,
                  OnDifference const& onDifference)
     {
+        m_properties.interrupt(FOLLOWING); // who follows later knows more
         m_inStepWith = &source;
         m_lastHeard = told.number;
         m_written = NONE;
@@ -216,7 +221,7 @@ private:
     [[gnu::noinline]] void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
         m_inStepWith = nullptr;
-        CC_PropertyContainer::Watch const self(m_properties);
+        CC_PropertyContainer::Watch const self(m_properties, FOLLOWING);
         CC_PropertyContainer copy;
         copy = source;
         if (!self.isAlive() || !hasAllOfOwnKinds(copy, source))
@@ -225,12 +230,14 @@ private:
         {
             CC_Property const* const former = m_properties.get(current.getId());
             bool const isSame = former != nullptr && current.isEqual(*former);
-            if (self.isAlive() && !isSame)
-                std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
             if (!self.isAlive())
                 return;
-            if (!isSame)
-                onDifference(current.getId());
+            if (isSame)
+                continue;
+            onDifference(current.getId()); // first: who follows inside the assignment finds no difference any more
+            std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
+            if (!self.isAlive())
+                return;
         }
         removeWhatIsGone(copy, onDifference);
     }
@@ -238,7 +245,7 @@ private:
     template <class OnDifference>
     [[gnu::noinline]] void removeWhatIsGone(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
-        CC_PropertyContainer::Watch const self(m_properties); // an ending property may destroy us
+        CC_PropertyContainer::Watch const self(m_properties, FOLLOWING); // an ending property may destroy us
         unsigned int i = 0;
         while (CC_Property const* const former = self.isAlive() ? m_properties.getByIndex(i) : nullptr)
         {
@@ -248,9 +255,8 @@ private:
                 ++i;
                 continue;
             }
+            onDifference(id);
             m_properties.removeByIndex(i);
-            if (self.isAlive())
-                onDifference(id);
         }
     }
 

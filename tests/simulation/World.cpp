@@ -244,7 +244,6 @@ void World::strike(CallOut kind)
     if (!m_reactions.take(kind, due) || m_depth > 8 || hasFailed())
         return;
     bool const isOfProperty = kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END;
-    m_hasPropertyActed = m_hasPropertyActed || isOfProperty;
     bool const mayBeNews = kind == CallOut::LEG_ADDED || isOfProperty; // whose copies are made inside such news, too
     std::vector<int> const before = mayBeNews ? getActivityLevels() : std::vector<int>();
     ++m_depth;
