@@ -44,6 +44,8 @@ public:
     /// What came for it.
     void onEvent(pri_event& event);
     bool isInCall(unsigned long long serial) const;
+    /// The other sides of the two calls are connected with each other: whether they are.
+    bool joinCallOf(IsdnEndpoint& other);
     /// Clears the call for a reason of the gateway's own.
     void clear(QCause cause);
 

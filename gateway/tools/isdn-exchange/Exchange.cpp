@@ -70,6 +70,7 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_aoc_events_enable(m_stack, 1);
     pri_hangup_fix_enable(m_stack, 1);
     pri_hold_enable(m_stack, 1);
+    pri_transfer_enable(m_stack, 1);
 }
 
 Exchange::~Exchange()
@@ -204,11 +205,7 @@ void Exchange::takeEvent(pri_event& event)
         break;
     case PRI_EVENT_HOLD_ACK:
         if (CallHandle const call = find(event.hold_ack.call))
-        {
-            call->channel = 0;
-            countSpeech(*call);
-            call->speech.reset();
-        }
+            onHeld(call);
         break;
     case PRI_EVENT_RETRIEVE_ACK:
         if (CallHandle const call = find(event.retrieve_ack.call))
@@ -466,7 +463,7 @@ void Exchange::placeWaiting()
         place(*m_waiting.front());
 }
 
-void Exchange::place(Plan::Call const& own)
+Exchange::CallHandle Exchange::place(Plan::Call const& own)
 {
     ++m_report.placed;
     auto const call = std::make_shared<Call>();
@@ -477,7 +474,7 @@ void Exchange::place(Plan::Call const& own)
     {
         ++m_report.causes[PRI_CAUSE_NORMAL_CIRCUIT_CONGESTION];
         ++m_report.over;
-        return;
+        return nullptr;
     }
     call->handle = pri_new_call(m_stack);
     m_calls[call->handle] = call;
@@ -504,6 +501,21 @@ void Exchange::place(Plan::Call const& own)
         pri_sr_set_useruser(request, own.userUser.c_str());
     pri_setup(m_stack, call->handle, request);
     pri_sr_free(request);
+    return call;
+}
+
+/// Its channel is free. Who transfers calls somebody else now (EN 300 369-1).
+void Exchange::onHeld(CallHandle const& call)
+{
+    call->channel = 0;
+    countSpeech(*call);
+    call->speech.reset();
+    if (call->own == nullptr || call->own->transfersTo.empty())
+        return;
+    Plan::Call& consultation = m_consultations.emplace_back(*call->own);
+    consultation.to = std::exchange(consultation.transfersTo, {});
+    if (CallHandle const second = place(consultation))
+        second->held = call;
 }
 
 void Exchange::dialOn(CallHandle const& call)
@@ -525,6 +537,10 @@ void Exchange::onAnswer(pri_event_answer const& answer)
     speak(call, call->own->speaks, call->own->file, call->own->record);
     if (!call->own->keys.empty())
         pri_keypad_facility(m_stack, call->handle, call->own->keys.c_str());
+    if (!call->own->transfersTo.empty())
+        pri_hold(m_stack, call->handle);
+    if (call->held != nullptr)
+        pri_channel_bridge(call->held->handle, call->handle);
     if (call->own->holds)
         hold(call);
     if (call->own->parks != 0)

@@ -119,6 +119,7 @@ Plan::Call READ_CALL(std::string const& file, toml::table const& toml)
 {
     Plan::Call one;
     Table table(file, toml);
+    table.read("transfers-to", one.transfersTo);
     table.read("to", one.to);
     table.read("to-type", one.toType);
     table.read("to-plan", one.toPlan);

@@ -59,7 +59,8 @@ struct Plan
         std::string bearer = "speech"; ///< speech, audio, digital
         bool isOverlap = false;
         bool isExclusive = false;
-        bool holds = false; ///< as of a subscriber
+        std::string transfersTo; ///< whom it calls when it is answered, and then connects with who has answered
+        bool holds = false;      ///< as of a subscriber
         unsigned int parks = 0;
         unsigned int count = 1;
         unsigned int after = 500;    ///< milliseconds until the first
