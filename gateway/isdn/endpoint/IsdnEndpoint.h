@@ -166,6 +166,7 @@ private:
     TYTimer m_timer;        // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
     CC_PropertyContainer m_setup; // calling side: what the SETUP said
+    CC_PropertyContainer m_offer; // and of whom it is for
     std::unique_ptr<LegMedia> m_media;
     unsigned int m_mediaTimeslot = IsdnChannels::NONE;
     CC_CallAdapterE164 m_adapter; // last: silenced first

@@ -29,6 +29,18 @@ pri_party_id PARTY(std::string const& number, std::string const& name, unsigned 
     return party;
 }
 
+/// An NSAP address whose authority and format say IA5 (X.213).
+pri_party_subaddress SUBADDRESS(std::string const& text)
+{
+    constexpr char IA5 = 0x50;
+    pri_party_subaddress subaddress = {};
+    subaddress.valid = !text.empty();
+    std::string const octets = IA5 + text.substr(0, 19);
+    subaddress.length = static_cast<int>(octets.size());
+    std::copy(octets.begin(), octets.end(), subaddress.data);
+    return subaddress;
+}
+
 int BEARER(std::string const& name)
 {
     return name == "digital" ? PRI_TRANS_CAP_DIGITAL
@@ -484,9 +496,12 @@ Exchange::CallHandle Exchange::place(Plan::Call const& own)
     pri_sr_set_channel(request, call->channel, own.isExclusive, 0);
     pri_sr_set_bearer(request, BEARER(own.bearer), own.bearer == "digital" ? -1 : PRI_LAYER_1_ALAW);
     pri_sr_set_called(request, first.data(), static_cast<int>(own.toType << TYPE_SHIFT | own.toPlan), !own.isOverlap);
-    pri_party_id const caller = PARTY(own.from, own.name, own.type << TYPE_SHIFT | own.plan,
-                                      own.presentation << PRESENTATION_SHIFT | own.screening);
+    pri_party_id caller = PARTY(own.from, own.name, own.type << TYPE_SHIFT | own.plan,
+                                own.presentation << PRESENTATION_SHIFT | own.screening);
+    caller.subaddress = SUBADDRESS(own.subaddress);
     pri_sr_set_caller_party(request, &caller);
+    if (pri_party_subaddress const called = SUBADDRESS(own.calledSubaddress); called.valid != 0)
+        pri_sr_set_called_subaddress(request, &called);
     if (!own.redirecting.empty())
     {
         pri_party_redirecting redirecting = {};

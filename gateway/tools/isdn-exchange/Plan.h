@@ -50,6 +50,8 @@ struct Plan
         unsigned int presentation = 0;
         unsigned int screening = 0;
         std::string name;
+        std::string subaddress;       ///< of who calls, IA5; empty: none
+        std::string calledSubaddress; ///< of whom it calls
         std::string redirecting;
         unsigned int redirectingType = 2;
         unsigned int redirectingPresentation = 0;
