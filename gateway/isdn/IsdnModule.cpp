@@ -4,6 +4,7 @@
 #include "configuration/Configuration.h"
 #include "host/GatewayHost.h"
 #include "host/MetricText.h"
+#include "isdn/element/IsdnSubaddress.h"
 
 #include <spdlog/spdlog.h>
 
@@ -43,6 +44,8 @@ void IsdnModule::open(GatewayHost& host)
             if (host.onEndpointGone)
                 host.onEndpointGone();
         }});
+    if (!IsdnSubaddress::DECLARE().isOk())
+        throw std::bad_alloc();
     for (IsdnConfiguration const& configuration : m_configurations)
     {
         m_ports.push_back(std::make_unique<Port>(*m_environment, configuration));

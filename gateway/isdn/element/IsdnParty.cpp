@@ -3,6 +3,7 @@
 #include "adapters/CC_CallAdapterE164.h"
 #include "configuration/DialPlan.h"
 #include "isdn/element/IsdnProperty.h"
+#include "isdn/element/IsdnSubaddress.h"
 #include "isdn/element/IsdnText.h"
 #include "properties/CC_PropertyKeys.h"
 
@@ -51,6 +52,7 @@ IsdnParty IsdnParty::OF(pri_party_id const& id)
     }
     if (id.name.valid != 0)
         party.name = IsdnText::FROM_WIRE(id.name.str);
+    party.subaddress = IsdnSubaddress::OF(id.subaddress);
     return party;
 }
 
@@ -89,6 +91,8 @@ IsdnParty IsdnParty::OF_PEER(CC_CallAdapterE164 const& adapter)
     party.presentation = adapter.getPeerPresentationIndicator(QPresentationIndicator::ALLOWED);
     party.screening = adapter.getPeerScreeningIndicator(QScreeningIndicator::USER_PROVIDED_NOT_SCREENED);
     party.name = adapter.getPeerName().view();
+    if (auto const* const text = CC_PropertyString::FROM(adapter.getPeerProperty(IsdnSubaddress::PROPERTY)))
+        party.subaddress = text->getValue().view();
     return party;
 }
 
@@ -100,6 +104,8 @@ IsdnParty IsdnParty::OF_OFFER(CC_PropertyContainer const& properties)
     party.type = VALUE_OF<CC_PropertyTypeOfNumber>(properties.get(TYPE_OF_NUMBER), TYPE_OF_NUMBER);
     party.plan = VALUE_OF<CC_PropertyNumberingPlan>(properties.get(NUMBERING_PLAN), NUMBERING_PLAN);
     party.name = VALUE_OF<CC_PropertyString>(properties.get(NAME), NAME).view();
+    if (auto const* const text = CC_PropertyString::FROM(properties.get(IsdnSubaddress::PROPERTY)))
+        party.subaddress = text->getValue().view();
     return party;
 }
 
@@ -130,6 +136,7 @@ pri_party_id IsdnParty::getId() const
     id.name.presentation = PRESENTATION_OF(*this);
     id.name.char_set = LATIN_1;
     WRITE(IsdnText::TO_WIRE(name, LONGEST_NAME), id.name.str);
+    id.subaddress = IsdnSubaddress::TO_WIRE(subaddress);
     return id;
 }
 
@@ -142,6 +149,8 @@ void IsdnParty::addTo(CC_PropertyContainer& properties) const
     ADD(properties, CC_PropertyPresentationIndicator(PRESENTATION_INDICATOR, presentation));
     ADD(properties, CC_PropertyScreeningIndicator(SCREENING_INDICATOR, screening));
     ADD_TEXT(properties, NAME, name);
+    if (!subaddress.empty())
+        ADD_TEXT(properties, IsdnSubaddress::PROPERTY, subaddress);
 }
 
 std::string IsdnParty::getText() const

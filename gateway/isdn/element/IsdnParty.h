@@ -35,6 +35,7 @@ struct IsdnParty
     QPresentationIndicator presentation = QPresentationIndicator::ALLOWED;
     QScreeningIndicator screening = QScreeningIndicator::USER_PROVIDED_NOT_SCREENED;
     std::string name;
+    std::string subaddress{}; ///< as IsdnSubaddress has it
 
     /// From the wire. @{
     static IsdnParty OF(pri_party_id const& id);

@@ -44,6 +44,8 @@ public:
     /// What came for it.
     void onEvent(pri_event& event);
     bool isInCall(unsigned long long serial) const;
+    /// The other sides of the two calls are connected with each other: whether they are.
+    bool joinCallOf(IsdnEndpoint& other);
     /// Clears the call for a reason of the gateway's own.
     void clear(QCause cause);
 
@@ -164,6 +166,7 @@ private:
     TYTimer m_timer;        // T302, T304, an answer; clearing
     CC_PropertyContainer m_own;
     CC_PropertyContainer m_setup; // calling side: what the SETUP said
+    CC_PropertyContainer m_offer; // and of whom it is for
     std::unique_ptr<LegMedia> m_media;
     unsigned int m_mediaTimeslot = IsdnChannels::NONE;
     CC_CallAdapterE164 m_adapter; // last: silenced first

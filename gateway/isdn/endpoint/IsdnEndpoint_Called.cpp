@@ -2,6 +2,7 @@
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
+#include "isdn/element/IsdnSubaddress.h"
 #include "isdn/element/IsdnUserUser.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
 #include "properties/CC_PropertyKeys.h"
@@ -91,6 +92,8 @@ bool IsdnEndpoint::startCall(pri_sr* request, bool isComplete)
     pri_sr_set_called(request, digits.data(), m_called.getPlan(), isComplete);
     pri_party_id const caller = IsdnParty::OF_PEER(m_adapter).getId();
     pri_sr_set_caller_party(request, &caller);
+    if (pri_party_subaddress const called = IsdnSubaddress::TO_WIRE(m_called.subaddress); called.valid != 0)
+        pri_sr_set_called_subaddress(request, &called);
     if (IsdnRedirection const redirection = IsdnRedirection::OF_PEER(m_adapter); redirection.count > 0)
     {
         pri_party_redirecting const redirecting = redirection.getRedirecting();

@@ -2,6 +2,7 @@
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnProperty.h"
 #include "isdn/element/IsdnRedirection.h"
+#include "isdn/element/IsdnSubaddress.h"
 #include "isdn/endpoint/IsdnEndpoint_Ask.h"
 #include "media/tone/CauseTone.h"
 #include "properties/CC_Cause.h"
@@ -63,6 +64,8 @@ void IsdnEndpoint::readSetup(pri_event_ring const& ring)
     m_called = IsdnParty::OF_CALLED(ring.callednum, ring.calledplan);
     if (m_called.number.empty()) // EN 300 122: the number may come as keypad digits
         m_called.number = ring.keypad_digits;
+    if (std::string const subaddress = IsdnSubaddress::OF(ring.called_subaddress); !subaddress.empty())
+        ADD_TEXT(m_offer, IsdnSubaddress::PROPERTY, subaddress);
     IsdnParty const calling = IsdnParty::OF(ring.calling).normalised(m_interface.getEnvironment().dialPlan);
     m_calling = calling.getText();
     calling.addTo(m_setup);
@@ -148,7 +151,8 @@ void IsdnEndpoint::placeCall(MG_IContext* datapathContext)
              .sendingComplete = m_isNumberComplete,
              .informationTransferCapability = m_bearer.capability,
              .datapathContext = datapathContext,
-             .extraOwnProperties = &m_setup});
+             .extraOwnProperties = &m_setup,
+             .extraOfferProperties = &m_offer});
     if (!result.isOk())
         clear(QCause::NETWORK_OUT_OF_ORDER);
 }

@@ -148,6 +148,12 @@ void IsdnEndpoint::onHold()
     std::ignore = m_adapter.setOwn(Key::STATE, LegState::HELD);
 }
 
+bool IsdnEndpoint::joinCallOf(IsdnEndpoint& other)
+{
+    bool const areUp = m_isInCall && other.m_isInCall && m_state == IsdnCallState::ACTIVE;
+    return areUp && m_adapter.transfer(other.m_adapter, true).isOk();
+}
+
 void IsdnEndpoint::onRetrieve(pri_event_retrieve const& retrieve)
 {
     bool const isWaiting = m_isOnHold && m_state == IsdnCallState::ACTIVE && m_isInCall;

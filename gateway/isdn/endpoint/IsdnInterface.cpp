@@ -121,6 +121,8 @@ void IsdnInterface::onLinkEvent(pri_event& event)
         onRestart(event.restart.channel);
         return;
     }
+    if (event.e == PRI_EVENT_FACILITY)
+        onFacility(event.facility);
     q931_call* const call = CALL_OF(event);
     auto const found = m_calls.find(call);
     if (event.e == PRI_EVENT_RING)
@@ -165,6 +167,34 @@ void IsdnInterface::refuseNew(pri_event_ring const& ring, QCause cause)
 void IsdnInterface::refuse(q931_call* call, QCause cause)
 {
     m_link.ask([&](pri* stack) { return pri_hangup(stack, call, IsdnCause::TO_WIRE(cause)); });
+}
+
+/// Explicit call transfer (EN 300 369-1): the far side's user has two calls, one of them on hold, and connects the two
+/// others. Both calls are cleared then.
+void IsdnInterface::onFacility(pri_event_facility const& facility)
+{
+    for (int i = 0; facility.subcmds != nullptr && i < facility.subcmds->counter_subcmd; ++i)
+    {
+        pri_subcommand const& command = facility.subcmds->subcmd[i];
+        if (command.cmd != PRI_SUBCMD_TRANSFER_CALL)
+            continue;
+        pri_subcmd_transfer const transfer = command.u.transfer;
+        q931_call* const asked = facility.subcall;
+        bool const isJoined = join(transfer.call_1, transfer.call_2);
+        m_link.ask([&](pri* stack) { return pri_transfer_rsp(stack, asked, transfer.invoke_id, isJoined); });
+        for (q931_call* const call : {transfer.call_1, transfer.call_2})
+            if (auto const found = m_calls.find(call); isJoined && found != m_calls.end())
+                found->second->clear(QCause::NORMAL_CALL_CLEARING);
+        return; // the stack's event is another one by now
+    }
+}
+
+bool IsdnInterface::join(q931_call* one, q931_call* other)
+{
+    auto const first = m_calls.find(one);
+    auto const second = m_calls.find(other);
+    return first != m_calls.end() && second != m_calls.end() && first != second &&
+           first->second->joinCallOf(*second->second);
 }
 
 /// The stack acknowledges it (Q.931, 5.5.2).

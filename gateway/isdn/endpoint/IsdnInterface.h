@@ -69,6 +69,8 @@ private:
 
     void onRing(pri_event_ring& ring);
     void onRestart(int channel);
+    void onFacility(pri_event_facility const& facility);
+    bool join(q931_call* one, q931_call* other);
     void refuseNew(pri_event_ring const& ring, QCause cause);
     void refuse(q931_call* call, QCause cause);
     IsdnEndpoint& makeEndpoint(unsigned int callNumber);

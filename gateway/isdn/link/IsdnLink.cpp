@@ -72,6 +72,7 @@ bool IsdnLink::makeStack()
     pri_aoc_events_enable(m_stack, 1);
     pri_hangup_fix_enable(m_stack, 1); // Q.931, 5.3.2
     pri_hold_enable(m_stack, 1);
+    pri_transfer_enable(m_stack, 1);
     setTimers();
     return true;
 }

@@ -5,6 +5,7 @@
 #include "isdn/element/IsdnParty.h"
 #include "isdn/element/IsdnProgress.h"
 #include "isdn/element/IsdnRedirection.h"
+#include "isdn/element/IsdnSubaddress.h"
 #include "isdn/element/IsdnText.h"
 #include "isdn/element/IsdnUserUser.h"
 #include "properties/CC_PropertyContainer.h"
@@ -92,6 +93,28 @@ TEST(IsdnPartyTest, ANumberBecomesAnInternationalOneByItsTypeOrByHowItIsDialled)
         EXPECT_EQ(party.normalised({"00", "", ""}).getText(),
                   std::string(row.number) == "004420123" ? "+4420123" : party.getText());
     }
+}
+
+TEST(IsdnSubaddressTest, EachComesBackAndWhatIsNoneIsNone)
+{
+    for (std::string const text : {"00504142", "2812", "20fe00"})
+    {
+        EXPECT_NE(IsdnSubaddress::TO_WIRE(text).valid, 0) << text;
+        EXPECT_EQ(IsdnSubaddress::OF(IsdnSubaddress::TO_WIRE(text)), text);
+    }
+    EXPECT_EQ(IsdnSubaddress::TO_WIRE("28fe").odd_even_indicator, 1);
+    std::string const longest = "00" + std::string(40, '1');
+    EXPECT_EQ(IsdnSubaddress::OF(IsdnSubaddress::TO_WIRE(longest)), longest);
+    for (std::string const& text : {std::string(), std::string("00"), std::string("005"), std::string("00xy"),
+                                    std::string("-012"), std::string("1011"), longest + "11"})
+        EXPECT_EQ(IsdnSubaddress::TO_WIRE(text).valid, 0) << text;
+    pri_party_subaddress wrong = {};
+    EXPECT_EQ(IsdnSubaddress::OF(wrong), "");
+    wrong.valid = 1;
+    wrong.length = -5;
+    EXPECT_EQ(IsdnSubaddress::OF(wrong), "00");
+    wrong.length = 1000;
+    EXPECT_EQ(IsdnSubaddress::OF(wrong).size(), 42u);
 }
 
 TEST(IsdnPartyTest, EachOctetOfANumberComesBack)

@@ -84,6 +84,31 @@ TEST_F(IsdnHoldTest, WhereNoChannelIsLeftTheCallStaysOnHold)
     expectNothingLeft();
 }
 
+TEST_F(IsdnHoldTest, TheTwoOthersAreConnectedWhenTheFarSideTransfersItsCalls)
+{
+    open();
+    side->ask([](pri* stack) { return pri_transfer_enable(stack, 1), 0; });
+    callUp();
+    q931_call* const first = side->getCall();
+    hold();
+    FakeModule second("second");
+    routes.front().to = "second";
+    side->take();
+    side->call("4989124");
+    ASSERT_TRUE(watch.runUntil([&] { return second.getCall() != nullptr; }));
+    std::ignore = second.become(FakeModule::State::CONNECTED);
+    ASSERT_TRUE(waitFor("ANSWER"));
+    q931_call* const other2 = side->getCall();
+    EXPECT_EQ(side->ask([&](pri*) { return pri_channel_bridge(first, other2); }), 0);
+    EXPECT_TRUE(watch.runUntil([&] { return other.getCall() == second.getCall(); }, std::chrono::seconds(3)));
+    EXPECT_EQ(other.getPeerState(), "CONNECTED");
+    EXPECT_EQ(second.getPeerState(), "CONNECTED");
+    expectNothingLeft();
+    EXPECT_EQ(std::count(side->told.begin(), side->told.end(), "HANGUP_REQ 16"), 2);
+    other.hangUp();
+    second.hangUp();
+}
+
 TEST_F(IsdnHoldTest, ACallThatIsNotUpIsNotHeld)
 {
     open();

@@ -29,6 +29,18 @@ pri_party_id PARTY(std::string const& number, std::string const& name, unsigned 
     return party;
 }
 
+/// An NSAP address whose authority and format say IA5 (X.213).
+pri_party_subaddress SUBADDRESS(std::string const& text)
+{
+    constexpr char IA5 = 0x50;
+    pri_party_subaddress subaddress = {};
+    subaddress.valid = !text.empty();
+    std::string const octets = IA5 + text.substr(0, 19);
+    subaddress.length = static_cast<int>(octets.size());
+    std::copy(octets.begin(), octets.end(), subaddress.data);
+    return subaddress;
+}
+
 int BEARER(std::string const& name)
 {
     return name == "digital" ? PRI_TRANS_CAP_DIGITAL
@@ -70,6 +82,7 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_aoc_events_enable(m_stack, 1);
     pri_hangup_fix_enable(m_stack, 1);
     pri_hold_enable(m_stack, 1);
+    pri_transfer_enable(m_stack, 1);
 }
 
 Exchange::~Exchange()
@@ -204,11 +217,7 @@ void Exchange::takeEvent(pri_event& event)
         break;
     case PRI_EVENT_HOLD_ACK:
         if (CallHandle const call = find(event.hold_ack.call))
-        {
-            call->channel = 0;
-            countSpeech(*call);
-            call->speech.reset();
-        }
+            onHeld(call);
         break;
     case PRI_EVENT_RETRIEVE_ACK:
         if (CallHandle const call = find(event.retrieve_ack.call))
@@ -466,7 +475,7 @@ void Exchange::placeWaiting()
         place(*m_waiting.front());
 }
 
-void Exchange::place(Plan::Call const& own)
+Exchange::CallHandle Exchange::place(Plan::Call const& own)
 {
     ++m_report.placed;
     auto const call = std::make_shared<Call>();
@@ -477,7 +486,7 @@ void Exchange::place(Plan::Call const& own)
     {
         ++m_report.causes[PRI_CAUSE_NORMAL_CIRCUIT_CONGESTION];
         ++m_report.over;
-        return;
+        return nullptr;
     }
     call->handle = pri_new_call(m_stack);
     m_calls[call->handle] = call;
@@ -487,9 +496,12 @@ void Exchange::place(Plan::Call const& own)
     pri_sr_set_channel(request, call->channel, own.isExclusive, 0);
     pri_sr_set_bearer(request, BEARER(own.bearer), own.bearer == "digital" ? -1 : PRI_LAYER_1_ALAW);
     pri_sr_set_called(request, first.data(), static_cast<int>(own.toType << TYPE_SHIFT | own.toPlan), !own.isOverlap);
-    pri_party_id const caller = PARTY(own.from, own.name, own.type << TYPE_SHIFT | own.plan,
-                                      own.presentation << PRESENTATION_SHIFT | own.screening);
+    pri_party_id caller = PARTY(own.from, own.name, own.type << TYPE_SHIFT | own.plan,
+                                own.presentation << PRESENTATION_SHIFT | own.screening);
+    caller.subaddress = SUBADDRESS(own.subaddress);
     pri_sr_set_caller_party(request, &caller);
+    if (pri_party_subaddress const called = SUBADDRESS(own.calledSubaddress); called.valid != 0)
+        pri_sr_set_called_subaddress(request, &called);
     if (!own.redirecting.empty())
     {
         pri_party_redirecting redirecting = {};
@@ -504,6 +516,21 @@ void Exchange::place(Plan::Call const& own)
         pri_sr_set_useruser(request, own.userUser.c_str());
     pri_setup(m_stack, call->handle, request);
     pri_sr_free(request);
+    return call;
+}
+
+/// Its channel is free. Who transfers calls somebody else now (EN 300 369-1).
+void Exchange::onHeld(CallHandle const& call)
+{
+    call->channel = 0;
+    countSpeech(*call);
+    call->speech.reset();
+    if (call->own == nullptr || call->own->transfersTo.empty())
+        return;
+    Plan::Call& consultation = m_consultations.emplace_back(*call->own);
+    consultation.to = std::exchange(consultation.transfersTo, {});
+    if (CallHandle const second = place(consultation))
+        second->held = call;
 }
 
 void Exchange::dialOn(CallHandle const& call)
@@ -525,6 +552,10 @@ void Exchange::onAnswer(pri_event_answer const& answer)
     speak(call, call->own->speaks, call->own->file, call->own->record);
     if (!call->own->keys.empty())
         pri_keypad_facility(m_stack, call->handle, call->own->keys.c_str());
+    if (!call->own->transfersTo.empty())
+        pri_hold(m_stack, call->handle);
+    if (call->held != nullptr)
+        pri_channel_bridge(call->held->handle, call->handle);
     if (call->own->holds)
         hold(call);
     if (call->own->parks != 0)

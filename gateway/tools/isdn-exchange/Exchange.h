@@ -61,6 +61,7 @@ private:
         std::size_t dialled = 0;
         Plan::Subscriber const* subscriber = nullptr;
         Plan::Call const* own = nullptr;
+        std::shared_ptr<Call> held{}; // that it is to be connected with
         bool isUp = false;
         bool isHeld = false;
         bool isAcknowledged = false;
@@ -91,7 +92,8 @@ private:
     void chargeFinally(Call& call);
     void countSpeech(Call const& call);
     void placeWaiting();
-    void place(Plan::Call const& own);
+    CallHandle place(Plan::Call const& own);
+    void onHeld(CallHandle const& call);
     void dialOn(CallHandle const& call);
     int hunt() const;
     void release(CallHandle const& call, int cause);
@@ -107,6 +109,7 @@ private:
     long long m_nextTick = 0;
     std::multimap<long long, std::function<void()>> m_timers;
     std::deque<Plan::Call const*> m_waiting; // that are due
+    std::deque<Plan::Call> m_consultations;
     std::map<q931_call*, CallHandle> m_calls;
     std::minstd_rand m_random; // the same in each run
 };

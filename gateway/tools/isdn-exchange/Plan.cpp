@@ -119,6 +119,7 @@ Plan::Call READ_CALL(std::string const& file, toml::table const& toml)
 {
     Plan::Call one;
     Table table(file, toml);
+    table.read("transfers-to", one.transfersTo);
     table.read("to", one.to);
     table.read("to-type", one.toType);
     table.read("to-plan", one.toPlan);
@@ -128,6 +129,8 @@ Plan::Call READ_CALL(std::string const& file, toml::table const& toml)
     table.read("presentation", one.presentation);
     table.read("screening", one.screening);
     table.read("name", one.name);
+    table.read("subaddress", one.subaddress);
+    table.read("called-subaddress", one.calledSubaddress);
     table.read("redirecting", one.redirecting);
     table.read("redirecting-type", one.redirectingType);
     table.read("redirecting-presentation", one.redirectingPresentation);

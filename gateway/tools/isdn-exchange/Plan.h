@@ -50,6 +50,8 @@ struct Plan
         unsigned int presentation = 0;
         unsigned int screening = 0;
         std::string name;
+        std::string subaddress;       ///< of who calls, IA5; empty: none
+        std::string calledSubaddress; ///< of whom it calls
         std::string redirecting;
         unsigned int redirectingType = 2;
         unsigned int redirectingPresentation = 0;
@@ -59,7 +61,8 @@ struct Plan
         std::string bearer = "speech"; ///< speech, audio, digital
         bool isOverlap = false;
         bool isExclusive = false;
-        bool holds = false; ///< as of a subscriber
+        std::string transfersTo; ///< whom it calls when it is answered, and then connects with who has answered
+        bool holds = false;      ///< as of a subscriber
         unsigned int parks = 0;
         unsigned int count = 1;
         unsigned int after = 500;    ///< milliseconds until the first
