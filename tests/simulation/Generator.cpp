@@ -117,6 +117,8 @@ public:
                 strikeARelease(operations);
             else if (m_isHostile && m_random.isOneIn(80))
                 resetInside(operations);
+            else if (m_isHostile && m_random.isOneIn(80))
+                dialInsideAProperty(operations);
             else if (m_random.isOneIn(80))
                 leaveToTheCall(operations);
             else if (m_random.isOneIn(40))
@@ -176,17 +178,41 @@ private:
         static constexpr CallOut PLACES[] = {CallOut::LEG_CHANGED, CallOut::LEG_REMOVED,  CallOut::CALL_CHANGED,
                                              CallOut::LOG_LINE,    CallOut::INPUT_FILTER, CallOut::ADAPTER_DROP};
         auto const line = static_cast<std::uint8_t>(m_random.below(4));
+        Operation const dial = dialBy(line);
+        CallOut const place = m_random.isOneIn(2) ? CallOut::LEG_CHANGED : PLACES[m_random.below(std::size(PLACES))];
+        operations.push_back(dial);
+        operations.push_back({Code::OBSERVE, {1, 2, 2, line}}); // the legs of its call
+        operations.push_back(
+            {Code::WHEN, {static_cast<std::uint8_t>(place), static_cast<std::uint8_t>(m_random.below(3)), 1}});
+        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
+        operations.push_back(dial);
+        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
+    }
+    /// A line drops and dials anew inside what a property of a module's class does when it is written.
+    void dialInsideAProperty(Operations& operations)
+    {
+        static constexpr CallOut PLACES[] = {CallOut::PROPERTY_CLONE, CallOut::PROPERTY_ASSIGN,
+                                             CallOut::PROPERTY_COMPARE, CallOut::PROPERTY_END};
+        static constexpr Code WRITES[] = {Code::SET_OWN, Code::SET_PEER, Code::SET_CALL};
+        constexpr std::uint8_t ACTING = 40; // row 30
+        auto const line = static_cast<std::uint8_t>(m_random.below(4));
+        Code const write = WRITES[m_random.below(std::size(WRITES))];
+        CallOut const place = PLACES[m_random.below(std::size(PLACES))];
+        operations.push_back(dialBy(line));
+        if (place != CallOut::PROPERTY_CLONE || m_random.isOneIn(2))
+            operations.push_back({write, {line, ACTING, 0}});
+        operations.push_back(
+            {Code::WHEN, {static_cast<std::uint8_t>(place), static_cast<std::uint8_t>(m_random.below(6)), 1}});
+        operations.push_back({Code::DROP, {line}});
+        operations.push_back(dialBy(line));
+        operations.push_back({write, {line, ACTING, 1}});
+        operations.push_back({Code::SETTLE});
+    }
+    Operation dialBy(std::uint8_t line)
+    {
         Operation dial = filled(Code::DIAL);
         dial.arguments[0] = line;
-        operations.push_back(dial);
-        operations.push_back(filled(Code::OBSERVE));
-        operations.back().arguments[1] = static_cast<std::uint8_t>(m_random.below(3));
-        operations.push_back({Code::WHEN,
-                              {static_cast<std::uint8_t>(PLACES[m_random.below(std::size(PLACES))]),
-                               static_cast<std::uint8_t>(m_random.below(3)), 2}});
-        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
-        operations.push_back(dial);
-        operations.push_back({m_random.isOneIn(2) ? Code::SETUP : Code::CLEANUP, {line}});
+        return dial;
     }
     /// A live leg that nobody holds but its call, which then looks after itself.
     void leaveToTheCall(Operations& operations)
