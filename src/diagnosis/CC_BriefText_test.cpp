@@ -92,6 +92,35 @@ TEST(CC_BriefText, WhatIsTooLongEndsInAnEllipsis)
               std::string(32, 'a') + "...");
 }
 
+TEST(CC_BriefText, TextsOfEveryLengthComeBackWhole)
+{
+    std::string text;
+    for (unsigned int length = 0; length <= Brief::MOST_TEXT; ++length)
+    {
+        CC_PropertyString const property(CC_PropertyId::NAME, text.c_str());
+        EXPECT_EQ(RECORDED(property), text);
+        text += static_cast<char>('a' + length % 26);
+    }
+}
+
+TEST(CC_BriefText, OfATextNothingIsRecordedThatWasInItsPlaceBefore)
+{
+    std::string text;
+    for (unsigned int length = 0; length <= Brief::MOST_TEXT; ++length, text += 'x')
+    {
+        CC_PropertyString const fresh(CC_PropertyId::NAME, text.c_str());
+        CC_PropertyString used(CC_PropertyId::NAME, "ABCDEFGHIJKLMNO");
+        used.setValue(text.c_str());
+        String shortened("ABCDEFGHIJKLMNO");
+        shortened.deleteRegion(0, 15);
+        shortened += text;
+        CC_PropertyString const copied(CC_PropertyId::NAME, shortened);
+        CC_PropertyBrief const expected(&fresh);
+        EXPECT_EQ(CC_PropertyBrief(&used).getOctets(), expected.getOctets()) << length;
+        EXPECT_EQ(CC_PropertyBrief(&copied).getOctets(), expected.getOctets()) << length;
+    }
+}
+
 TEST(CC_BriefText, CodecsAreNamedInOrder)
 {
     VoipCodecListSet codecs;

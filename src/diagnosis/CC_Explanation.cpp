@@ -12,6 +12,7 @@
 #include <algorithm>
 #include <unordered_map>
 #include <unordered_set>
+#include <utility>
 
 namespace
 {
@@ -132,16 +133,16 @@ void Survey::add(std::vector<Observer>& observers, Entry const& entry, CountOwn 
     if (registrations == 0)
         return;
     Known const& known = m_known.at(entry.m_observer);
-    Observer observer{Observer::FOREIGN, registrations, registrations, 0, {}, entry.m_observer};
+    Observer& observer =
+        observers.emplace_back(Observer{Observer::FOREIGN, registrations, registrations, 0, {}, entry.m_observer});
     if (known.adapter == nullptr && known.call == nullptr)
-        return observers.push_back(observer);
+        return;
     observer.surplus -= countOwn(known);
     observer.kind = known.adapter != nullptr ? Observer::ADAPTER : Observer::CALL;
     if (known.adapter != nullptr)
         observer.adapter = NAME_OF(*known.adapter);
     else
         observer.call = known.call->getSerial();
-    observers.push_back(observer);
 }
 
 /// Of a leg: one for the adapter that drives it, and one for each call that has given it its leg observers.
@@ -170,10 +171,11 @@ CC_Explanation::Leg Survey::of(CC_CallLeg const& leg) const
     result.isMoving = CC_Inside::IS_MOVING(leg);
     result.isBusy = result.isMoving;
     int unknown = result.references;
-    auto const add = [&](Holder const& holder)
+    result.holders.reserve(found.calls.size() + found.own.size() + found.peer.size() + 2); // of moves and unknown ones
+    auto const add = [&](Holder&& holder)
     {
         unknown -= holder.references;
-        result.holders.push_back(holder);
+        result.holders.push_back(std::move(holder));
     };
     auto const addAdapter = [&](Holder::Kind kind, CC_CallAdapter const& adapter)
     {
@@ -198,6 +200,7 @@ CC_Explanation::Leg Survey::of(CC_CallLeg const& leg) const
         add({Holder::MOVE, references, 0, {}, 0});
     if (unknown != 0)
         result.holders.push_back({Holder::NOBODY_KNOWN, unknown, 0, {}, 0});
+    result.observers.reserve(CC_Inside::OBSERVERS(leg).getNumberOfEntries());
     CC_Inside::OBSERVERS(leg).forEachEntry(
         [&](auto const& entry)
         { this->add(result.observers, entry, [&](Known const& known) { return OWN_REGISTRATIONS(leg, known); }); });
@@ -217,18 +220,21 @@ CC_Explanation::Call Survey::of(CC_Call const& call) const
     result.isCleanUpPending = CC_Inside::IS_CLEAN_UP_PENDING(call);
     result.hasCleanUp = CC_Inside::HAS_CLEAN_UP(call);
     result.holds = CC_Inside::HOLDS(call);
+    result.legs.reserve(call.getNumberOfCallLegs());
     for (unsigned int i = 0; i < call.getNumberOfCallLegs(); ++i)
         result.legs.push_back(of(*call.getCallLeg(i)));
     auto const isRegistered = [&](Known const& known, bool (*isObserver)(CC_CallAdapter const&)) {
         return known.adapter != nullptr && CC_Inside::OBSERVED_CALL(*known.adapter) == &call &&
                isObserver(*known.adapter);
     };
+    result.observers.reserve(CC_Inside::OBSERVERS(call).getNumberOfEntries());
     CC_Inside::OBSERVERS(call).forEachEntry(
         [&](auto const& entry)
         {
             add(result.observers, entry,
                 [&](Known const& known) { return isRegistered(known, CC_Inside::IS_CALL_OBSERVER) ? 1 : 0; });
         });
+    result.legObservers.reserve(CC_Inside::LEG_OBSERVERS(call).getNumberOfEntries());
     CC_Inside::LEG_OBSERVERS(call).forEachEntry(
         [&](auto const& entry)
         {
@@ -255,6 +261,7 @@ std::vector<CC_Explanation::Call> EXPLAIN_CALLS(IsAsked const& isAsked)
         });
     survey.look();
     std::vector<CC_Explanation::Call> calls;
+    calls.reserve(asked.size());
     std::reverse(asked.begin(), asked.end()); // in the order of their making
     for (CC_Call const* const call : asked)
     {

@@ -15,7 +15,7 @@ class CC_Call;
 /// What it tells is a copy of the moment that it was made. Making one calls nobody, changes nothing and touches nothing
 /// that is not known to be alive: an observer that is neither an adapter nor a call is told by its address. It looks at
 /// every call and adapter, and the loop waits meanwhile: with 100,000 calls up a tenth of a second for one of them,
-/// some seconds for all. Belongs to the call-control loop's thread. Throws std::bad_alloc when memory is out.
+/// a second or two for all. Belongs to the call-control loop's thread. Throws std::bad_alloc when memory is out.
 ///
 /// References that nobody is known for are a module's (CC_CallLeg::addReference, CC_CallLeg::Reference). Asked from
 /// inside a notification, those of operations under way are among them (`isBusy`).

@@ -184,8 +184,8 @@ private:
         std::memcpy(&event.record, m_ring.data() + offset, SIZE_OF_PADDING);
         std::uint64_t const size = event.record.size;
         std::uint64_t const most = std::min<std::uint64_t>(header.capacity - offset, header.head - position);
-        if (event.record.stamp != static_cast<std::uint32_t>(position / ALIGNMENT) || size % ALIGNMENT != 0 ||
-            size == 0 || size > most || offset + size > m_ring.size())
+        if (event.record.stamp != static_cast<std::uint32_t>(position) || size % ALIGNMENT != 0 || size == 0 ||
+            size > most || offset + size > m_ring.size())
             return 0;
         bool const followsAChange = std::exchange(m_isBehindAChange, false);
         if (event.record.kind == Kind::PADDING)

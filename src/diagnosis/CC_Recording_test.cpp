@@ -71,7 +71,7 @@ TEST_F(CC_Recording_Test, SaysWhichVersionItCannotRead)
     Header other = header();
     other.version = 7;
     set(other);
-    EXPECT_EQ(READ(image).getComplaint(), "it has version 7, this reads version 2");
+    EXPECT_EQ(READ(image).getComplaint(), "it has version 7, this reads version 3");
     EXPECT_TRUE(READ(image).getEvents().empty());
     other.byteOrder = 0x04030201;
     set(other);

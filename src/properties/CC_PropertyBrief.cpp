@@ -52,11 +52,25 @@ std::size_t LENGTH_OF(std::string_view text)
     return std::min<std::size_t>(text.size(), std::numeric_limits<std::uint16_t>::max());
 }
 
-[[gnu::always_inline]] inline char* PUT(char* place, std::uint8_t of, std::string_view text)
+char* PUT(char* place, std::uint8_t of, std::string_view text)
 {
     std::size_t const kept = KEPT_OF(text);
     place = PUT_HEAD(place, of, static_cast<unsigned int>(kept), LENGTH_OF(text));
     return PUT_TEXT(place, {text.data(), kept});
+}
+
+/// Most texts are short, and a String has room for these in itself: so all of that is copied, whatever there is of it,
+/// and what is behind the text's last word counts no more.
+[[gnu::always_inline]] inline char* PUT_STRING(char* place, std::uint8_t of, String const& text)
+{
+    constexpr std::size_t ROOM = 16;
+    std::size_t const size = text.length();
+    if (size >= ROOM) [[unlikely]]
+        return PUT(place, of, text.view());
+    place = PUT_HEAD(place, of, static_cast<unsigned int>(size), size);
+    std::memcpy(place, text.c_str(), ROOM);
+    std::memset(place + size, 0, CC_RecordFormat::WORDS_OF(1));
+    return place + CC_RecordFormat::WORDS_OF(size);
 }
 
 char* PUT(char* place, std::uint8_t of, std::uint32_t first, std::uint32_t second, std::string_view text = {})
@@ -79,10 +93,10 @@ char* PUT_NOTHING(char* place) { return PUT_HEAD(place, Brief::NOTHING, 0); }
 
 // Of most classes the value is a number or a text; records of charge, tariff and quality are too large for either.
 template <class Property>
-char* DESCRIBE(char* place, Property const& property)
+[[gnu::always_inline]] inline char* DESCRIBE(char* place, Property const& property)
 {
-    if constexpr (requires { std::string_view(property.getValue()); })
-        return PUT(place, PLACE<Property>, std::string_view(property.getValue()));
+    if constexpr (requires { property.getValue().view(); })
+        return PUT_STRING(place, PLACE<Property>, property.getValue());
     else if constexpr (requires { static_cast<unsigned long long>(property.getValue()); })
         return PUT(place, PLACE<Property>, static_cast<unsigned long long>(property.getValue()));
     else
@@ -170,6 +184,23 @@ char* DESCRIBE_BOTH(char* place, CC_Property const* first, CC_Property const* se
     return second != nullptr ? DESCRIBE(place, static_cast<Property const&>(*second)) : place;
 }
 
+/// Whether it is a text of the library's own class: what most values are.
+bool IS_TEXT(CC_Property const& property) { return &typeid(property) == &typeid(CC_PropertyString); }
+
+/// Whether memory sufficed.
+bool ASSIGN(CC_PropertyString& stored, CC_PropertyString const& property)
+{
+    try
+    {
+        stored.setValue(property.getValue());
+        return true;
+    }
+    catch (std::bad_alloc const&)
+    {
+        return false;
+    }
+}
+
 constexpr std::array<Describe, CC_PropertyClasses::SIZE> DESCRIPTIONS = []
 {
     std::array<Describe, CC_PropertyClasses::SIZE> result{};
@@ -196,6 +227,24 @@ CC_PropertyBrief::CC_PropertyBrief(CC_Property const* property)
 XCode CC_PropertyBrief::REPLACE(CC_PropertyContainer& in, CC_Property* stored, CC_Property const& property,
                                 CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg)
 {
+    if (stored == nullptr || !IS_TEXT(property) || !IS_TEXT(*stored))
+        return REPLACE_OF_ANY_CLASS(in, stored, property, kind, call, leg);
+    auto& former = static_cast<CC_PropertyString&>(*stored);
+    auto const& text = static_cast<CC_PropertyString const&>(property);
+    CC_RecordWriter& recorder = CC_RecordWriter::INSTANCE();
+    char* const values = recorder.beginChange(kind, call, leg, text.getId());
+    recorder.fill(DESCRIBE(DESCRIBE(values, former), text));
+    if (!ASSIGN(former, text))
+        return XCode::NO_ELEMENT;
+    recorder.endChange();
+    return XCode::OK;
+}
+
+__attribute__((noinline)) XCode CC_PropertyBrief::REPLACE_OF_ANY_CLASS(CC_PropertyContainer& in, CC_Property* stored,
+                                                                       CC_Property const& property,
+                                                                       CC_RecordFormat::Kind kind,
+                                                                       unsigned long long call, unsigned long long leg)
+{
     CC_PropertyKind const* const known = CC_PropertyKind::OF(property);
     bool const isUndisturbed =
         known != nullptr && known->isSelfContained && (stored == nullptr || &typeid(*stored) == &typeid(property));
@@ -204,10 +253,10 @@ XCode CC_PropertyBrief::REPLACE(CC_PropertyContainer& in, CC_Property* stored, C
     // nobody is called, so both values go straight into the record
     CC_RecordWriter& recorder = CC_RecordWriter::INSTANCE();
     char* const values = recorder.beginChange(kind, call, leg, property.getId());
-    char* const behind = DESCRIPTIONS[known->place](values, stored, &property);
+    recorder.fill(DESCRIPTIONS[known->place](values, stored, &property));
     if (!(stored != nullptr ? known->assign(*stored, property) : in.appendCopy(property)))
         return XCode::NO_ELEMENT;
-    recorder.endChange(behind);
+    recorder.endChange();
     return XCode::OK;
 }
 
@@ -226,6 +275,7 @@ XCode CC_PropertyBrief::REPLACE_OF_ANY_KIND(CC_PropertyContainer& in, CC_Propert
     char* place = recorder->beginChange(kind, call, leg, id);
     for (std::string_view const octets : {before.getOctets(), now.getOctets()})
         place = CC_RecordWriter::APPEND(place, octets);
-    recorder->endChange(place);
+    recorder->fill(place);
+    recorder->endChange();
     return XCode::OK;
 }

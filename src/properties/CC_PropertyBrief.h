@@ -30,6 +30,8 @@ public:
                          CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg);
 
 private:
+    static XCode REPLACE_OF_ANY_CLASS(CC_PropertyContainer& in, CC_Property* stored, CC_Property const& property,
+                                      CC_RecordFormat::Kind kind, unsigned long long call, unsigned long long leg);
     static XCode REPLACE_OF_ANY_KIND(CC_PropertyContainer& in, CC_Property const& property, CC_RecordFormat::Kind kind,
                                      unsigned long long call, unsigned long long leg);
 

@@ -19,7 +19,7 @@ namespace CC_RecordFormat
 inline constexpr char MAGIC[8] = {'c', 'c', 'r', 'e', 'c', 'o', 'r', 'd'};
 /// Of this layout and of what the numbers in it mean (Kind, Writer, CC_PropertyClasses). Adding at the end of these
 /// keeps it.
-inline constexpr std::uint32_t VERSION = 2;
+inline constexpr std::uint32_t VERSION = 3;
 /// Reads as another number on a machine of another byte order.
 inline constexpr std::uint32_t BYTE_ORDER_MARK = 0x01020304;
 /// Of records and of everything that a position points to.
@@ -104,7 +104,7 @@ enum class CleanUp : std::uint8_t
 /// What every event begins with.
 struct Record
 {
-    std::uint32_t stamp;      ///< the position in units of ALIGNMENT, low part
+    std::uint32_t stamp;      ///< the position, low part
     std::uint16_t size;       ///< with all that follows and belongs to it, a multiple of ALIGNMENT
     Kind kind;                ///< what happened
     Writer writer;            ///< of a change

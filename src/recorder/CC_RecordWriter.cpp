@@ -70,6 +70,27 @@ Record& CC_RecordWriter::at(std::uint64_t position) const
     return *reinterpret_cast<Record*>(m_ring + position % m_capacity);
 }
 
+/// Moment and end of what was begun. Static, and the clock comes as late as can be: so nothing outlives the call.
+void CC_RecordWriter::FINISH()
+{
+    TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
+    s_instance.getRecord().turn = loop != nullptr ? static_cast<std::uint32_t>(loop->getNumberOfTurns()) : 0;
+    long long const now = loop != nullptr ? loop->getTime() : 0;
+    s_instance.getRecord().nanoseconds = now;
+    s_instance.goOn();
+}
+
+void CC_RecordWriter::finishInBatch()
+{
+    Record const& record = getRecord();
+    m_behindChange = m_at + record.size;
+    if (record.kind == Kind::ALSO_CHANGED)
+        return goOn();
+    m_changedLeg = record.leg;
+    m_changedBy = m_writing;
+    FINISH();
+}
+
 /// The filter that made the value different, if one did.
 char* CC_RecordWriter::appendFilter(CC_FilterNotes const& notes, unsigned int propertyId, char* place)
 {
@@ -99,7 +120,7 @@ void CC_RecordWriter::makeRoom()
         m_tail += at(m_tail).size;
     while (m_tail < head && at(m_tail).kind == Kind::ALSO_CHANGED)
         m_tail += at(m_tail).size; // what it belongs to has gone
-    m_changedLeg = 0;
+    m_behindChange = nullptr;
     PUBLISH(m_header->tail, m_tail);
     if (padding != 0)
         pad(padding);

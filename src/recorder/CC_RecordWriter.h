@@ -45,44 +45,51 @@ public:
 
     char* begin(Kind kind, unsigned long long call, unsigned long long leg, unsigned int detail)
     {
-        auto& record = *reinterpret_cast<CC_RecordFormat::Record*>(m_at);
+        auto& record = getRecord();
         record.stamp = getStamp();
         record.kind = kind;
         record.writer = m_writing->writer;
         record.call = call;
         record.leg = leg;
         record.detail = detail;
-        m_changedLeg = 0;
         return m_at + sizeof record;
     }
     /// A change with who writes just now; the old and the new value follow. Of several of a Batch the later ones take
     /// less room.
-    char* beginChange(Kind kind, unsigned long long call, unsigned long long leg, unsigned int propertyId)
+    [[gnu::always_inline]] char* beginChange(Kind kind, unsigned long long call, unsigned long long leg,
+                                             unsigned int propertyId)
     {
-        if (m_isInBatch && m_changedLeg == leg && m_changedBy == m_writing && m_writing->notes == nullptr)
+        if (m_isInBatch && belongsToTheLast(leg))
             return beginAlsoChanged(propertyId);
         char* const place = begin(kind, call, leg, propertyId);
         Writing const& writing = *m_writing;
-        m_changedLeg = leg;
-        m_changedBy = &writing;
-        new (place) CC_RecordFormat::Change{writing.by, 0, 0, {}};
-        char* const values = place + sizeof(CC_RecordFormat::Change);
+        auto& change = *reinterpret_cast<CC_RecordFormat::Change*>(place);
+        change.by = writing.by;
+        std::memset(&change.filterPlace, 0, sizeof change - offsetof(CC_RecordFormat::Change, filterPlace));
+        char* const values = place + sizeof change;
         return writing.notes == nullptr ? values : appendFilter(*writing.notes, propertyId, values);
     }
     void end(char* behind)
     {
         fill(behind);
-        setMoment(); // last: nothing has to outlive the call of a clock
-        goOn();
+        FINISH();
     }
-    /// What beginChange began.
-    void endChange(char* behind)
+    /// What beginChange began. @{
+    void fill(char* behind)
     {
-        fill(behind);
-        if (reinterpret_cast<CC_RecordFormat::Record*>(m_at)->kind != Kind::ALSO_CHANGED)
-            setMoment();
-        goOn();
+        std::memset(behind, 0, CC_RecordFormat::ALIGNMENT); // of which the last group keeps what it does not need
+        std::size_t const size = (static_cast<std::size_t>(behind - m_at) + CC_RecordFormat::ALIGNMENT - 1) /
+                                 CC_RecordFormat::ALIGNMENT * CC_RecordFormat::ALIGNMENT;
+        getRecord().size = static_cast<std::uint16_t>(size);
     }
+    void endChange()
+    {
+        if (m_isInBatch)
+            finishInBatch();
+        else
+            FINISH();
+    }
+    /// @}
 
     /// Where the next octets come. Short texts without the detour through the C library, which costs more than these.
     static char* APPEND(char* place, std::string_view text)
@@ -134,9 +141,12 @@ private:
 
     static constexpr std::size_t LARGEST_RECORD = sizeof(CC_RecordFormat::Record) + MOST_PAYLOAD + 8;
 
+    /// Not before everything that was stored until now. Not as an atomic: who reads it is another process, or this
+    /// one's successor, and a 32-bit processor would need a loop.
     static void PUBLISH(std::uint64_t& position, std::uint64_t value)
     {
-        std::atomic_ref(position).store(value, std::memory_order_release);
+        std::atomic_thread_fence(std::memory_order_release);
+        const_cast<std::uint64_t volatile&>(position) = value;
     }
     /// Both ends of so many octets, which together are all when these are no more than twice as many.
     template <std::size_t SIZE>
@@ -160,35 +170,29 @@ private:
             *to = text[0];
     }
 
+    CC_RecordFormat::Record& getRecord() const { return *reinterpret_cast<CC_RecordFormat::Record*>(m_at); }
     std::uint64_t getHead() const { return reinterpret_cast<std::uintptr_t>(m_at) + m_toPosition; }
-    std::uint32_t getStamp() const { return static_cast<std::uint32_t>(getHead() / CC_RecordFormat::ALIGNMENT); }
-    /// To whole groups.
-    void fill(char* behind)
-    {
-        std::memset(behind, 0, CC_RecordFormat::ALIGNMENT); // of which the last group keeps what it does not need
-        std::size_t const size = (static_cast<std::size_t>(behind - m_at) + CC_RecordFormat::ALIGNMENT - 1) /
-                                 CC_RecordFormat::ALIGNMENT * CC_RecordFormat::ALIGNMENT;
-        reinterpret_cast<CC_RecordFormat::Record*>(m_at)->size = static_cast<std::uint16_t>(size);
-    }
+    std::uint32_t getStamp() const { return static_cast<std::uint32_t>(getHead()); }
+    static void FINISH();
+    void finishInBatch();
     void goOn()
     {
-        m_at += reinterpret_cast<CC_RecordFormat::Record*>(m_at)->size;
-        PUBLISH(m_header->head, getHead());
-        if (m_at > m_lastPlace) [[unlikely]]
+        char* const next = m_at + getRecord().size;
+        m_at = next;
+        PUBLISH(m_header->head, reinterpret_cast<std::uintptr_t>(next) + m_toPosition);
+        if (next > m_lastPlace) [[unlikely]]
             makeRoom(); // for the next one, now that nothing of this one is needed any more
-    }
-    void setMoment()
-    {
-        TYEventLoop* const loop = CC_Environment::CC_EVENT_LOOP();
-        auto* const record = reinterpret_cast<CC_RecordFormat::Record*>(m_at);
-        record->turn = loop != nullptr ? static_cast<std::uint32_t>(loop->getNumberOfTurns()) : 0;
-        record->nanoseconds = loop != nullptr ? loop->getTime() : 0;
     }
     void startAt(std::uint64_t head, std::size_t left);
     void beginBatch()
     {
         m_isInBatch = true;
-        m_changedLeg = 0;
+        m_behindChange = nullptr;
+    }
+    /// Whether a change of that leg would be of the same writer as the one before, and that is the last record.
+    bool belongsToTheLast(unsigned long long leg) const
+    {
+        return m_at == m_behindChange && m_changedLeg == leg && m_changedBy == m_writing && m_writing->notes == nullptr;
     }
     char* beginAlsoChanged(unsigned int propertyId)
     {
@@ -208,8 +212,9 @@ private:
     std::uint64_t m_toPosition = 0;      // from an address, modulo 2^64
     Writing const* m_writing = &OUTSIDE; // never null
     CC_RecordFormat::Header* m_header = nullptr;
-    // of a change that another may follow: nothing has been recorded since
-    unsigned long long m_changedLeg = 0; // 0: there is none
+    // of the last change of a batch
+    char* m_behindChange = nullptr; // null: there is none that another may follow
+    unsigned long long m_changedLeg = 0;
     Writing const* m_changedBy = nullptr;
     bool m_isInBatch = false;
     char* m_ring = nullptr;
