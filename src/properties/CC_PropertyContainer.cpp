@@ -22,10 +22,11 @@ bool IS_MADE_A_COPY(CC_Property& stored, CC_Property const& property)
 namespace
 {
 thread_local void* t_innermostWatch __attribute__((tls_model("initial-exec"))) = nullptr;
+thread_local void* t_innermostFollowing __attribute__((tls_model("initial-exec"))) = nullptr;
 } // namespace
 
-CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container, Use use)
-    : m_container(&container), m_outer(static_cast<Watch*>(t_innermostWatch)), m_use(use)
+CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container)
+    : m_container(&container), m_outer(static_cast<Watch*>(t_innermostWatch))
 {
     container.m_isWatched = true;
     t_innermostWatch = this;
@@ -33,13 +34,26 @@ CC_PropertyContainer::Watch::Watch(CC_PropertyContainer const& container, Use us
 
 CC_PropertyContainer::Watch::~Watch() { t_innermostWatch = m_outer; }
 
-void CC_PropertyContainer::tellWatches() const { tellWatches(Watch::Use::ANY); }
-
-void CC_PropertyContainer::tellWatches(Watch::Use use) const
+void CC_PropertyContainer::tellWatches() const
 {
     for (auto* watch = static_cast<Watch*>(t_innermostWatch); watch != nullptr; watch = watch->m_outer)
-        if (watch->m_container == this && (use == Watch::Use::ANY || watch->m_use == use))
+        if (watch->m_container == this)
             watch->m_container = nullptr;
+}
+
+CC_PropertyContainer::Following::Following(CC_PropertyContainer const& container)
+    : m_watch(container), m_outer(static_cast<Following*>(t_innermostFollowing))
+{
+    t_innermostFollowing = this;
+}
+
+CC_PropertyContainer::Following::~Following() { t_innermostFollowing = m_outer; }
+
+void CC_PropertyContainer::tellFollowing() const
+{
+    for (auto* former = static_cast<Following*>(t_innermostFollowing); former != nullptr; former = former->m_outer)
+        if (former->m_watch.m_container == this)
+            former->m_watch.m_container = nullptr;
 }
 
 /// A walk that goes on whatever the properties that it visits do to the container meanwhile.

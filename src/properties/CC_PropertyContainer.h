@@ -91,11 +91,7 @@ public:
     CC_PropertyContainer() = default;
     /// As the assignment: what memory refuses is missing.
     CC_PropertyContainer(CC_PropertyContainer const& other) { *this = other; }
-    ~CC_PropertyContainer()
-    {
-        if (m_isWatched)
-            tellWatches();
-    }
+    ~CC_PropertyContainer() { interrupt(); }
     /// Replaces all properties by copies of the other's, whatever their ids. What memory refuses is missing; nothing
     /// tells so. As far as both begin with the same ids and classes of the library, and no others follow, the values
     /// are taken over where they stand.
@@ -297,14 +293,7 @@ private:
     class CC_EXPORT Watch
     {
     public:
-        /// What is done to the container meanwhile: a later following makes an earlier one needless.
-        enum class Use : bool
-        {
-            ANY,
-            FOLLOWING
-        };
-        explicit Watch(CC_PropertyContainer const& container) : Watch(container, Use::ANY) {}
-        Watch(CC_PropertyContainer const& container, Use use);
+        explicit Watch(CC_PropertyContainer const& container);
         ~Watch();
         Watch(Watch const&) = delete;
         Watch& operator=(Watch const&) = delete;
@@ -314,17 +303,36 @@ private:
         friend class CC_PropertyContainer;
         CC_PropertyContainer const* m_container;
         Watch* m_outer;
-        Use m_use;
     };
     [[gnu::cold]] void tellWatches() const;
-    [[gnu::cold]] void tellWatches(Watch::Use use) const;
-    /// Ends what operations further out on the stack are doing here, as if it were destroyed: all, or those that
-    /// follow.
-    void interrupt(Watch::Use use) const
+    /// The same for who makes the container a copy of another one: it has ended, too, when somebody else began that.
+    class CC_EXPORT Following
+    {
+    public:
+        explicit Following(CC_PropertyContainer const& container);
+        ~Following();
+        Following(Following const&) = delete;
+        Following& operator=(Following const&) = delete;
+        bool isAlive() const { return m_watch.isAlive(); }
+
+    private:
+        friend class CC_PropertyContainer;
+        Watch m_watch;
+        Following* m_outer;
+    };
+    [[gnu::cold]] void tellFollowing() const;
+    /// Ends what operations further out on the stack are doing here, as if it were destroyed. @{
+    void interrupt() const
     {
         if (m_isWatched)
-            tellWatches(use);
+            tellWatches();
     }
+    void interruptFollowing() const
+    {
+        if (m_isWatched)
+            tellFollowing();
+    }
+    /// @}
 
     /// Whether nobody is called when the other's properties are stored here.
     bool takesUndisturbed(CC_PropertyContainer const& other) const { return !m_hasForeign && other.m_isSelfContained; }

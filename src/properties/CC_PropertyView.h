@@ -33,7 +33,7 @@ public:
     bool hasHeard(unsigned int number) const { return m_lastHeard == number; }
     /// From now on it is a copy of somebody else's, and no business of those who are just storing something here and
     /// have called a module's class: they fail.
-    void interrupt() const { m_properties.interrupt(CC_PropertyContainer::Watch::Use::ANY); }
+    void interrupt() const { m_properties.interrupt(); }
     /// The same, and empties the copy, which is in step with no source then.
     void clear();
     /// What may have changed since this was asked last.
@@ -94,7 +94,6 @@ public:
 private:
     using Container = CC_PropertyContainer;
     static constexpr unsigned int NONE = CC_Flags::NONE;
-    static constexpr auto FOLLOWING = Container::Watch::Use::FOLLOWING;
 
     /// Whether all that can differ is known, in both, and was taken by `take(former, current)`.
     template <class Take>
@@ -179,7 +178,7 @@ private:
     bool takeAll(CC_PropertyContainer const& source, Told const& told, Take const& take,
                  OnDifference const& onDifference)
     {
-        m_properties.interrupt(FOLLOWING); // who follows later knows more
+        m_properties.interruptFollowing(); // who follows later knows more
         m_inStepWith = &source;
         m_lastHeard = told.number;
         m_written = NONE;
@@ -221,7 +220,7 @@ private:
     [[gnu::noinline]] void followCopy(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
         m_inStepWith = nullptr;
-        CC_PropertyContainer::Watch const self(m_properties, FOLLOWING);
+        CC_PropertyContainer::Following const self(m_properties);
         CC_PropertyContainer copy;
         copy = source;
         if (!self.isAlive() || !hasAllOfOwnKinds(copy, source))
@@ -245,7 +244,7 @@ private:
     template <class OnDifference>
     [[gnu::noinline]] void removeWhatIsGone(CC_PropertyContainer const& source, OnDifference const& onDifference)
     {
-        CC_PropertyContainer::Watch const self(m_properties, FOLLOWING); // an ending property may destroy us
+        CC_PropertyContainer::Following const self(m_properties); // an ending property may destroy us
         unsigned int i = 0;
         while (CC_Property const* const former = self.isAlive() ? m_properties.getByIndex(i) : nullptr)
         {
