@@ -9,6 +9,7 @@
 #include "sip/message/SipDigits.h"
 #include "sip/message/SipDiversion.h"
 #include "sip/message/SipIdentity.h"
+#include "sip/message/SipTariff.h"
 #include "sip/message/SipText.h"
 #include "sip/stack/Sofia.h"
 
@@ -118,6 +119,11 @@ void READ_CHARGE(std::string const& text)
     std::string const written = charge ? SipCharge::WRITE(*charge) : std::string();
     std::optional<SipCharge::Charge> const again = charge ? SipCharge::READ(written) : std::nullopt;
     if (charge && (!again || SipCharge::WRITE(*again) != written))
+        std::abort();
+    std::optional<SipTariff::Tariff> const tariff = SipTariff::READ(text);
+    std::string const rates = tariff ? SipTariff::WRITE(*tariff) : std::string();
+    std::optional<SipTariff::Tariff> const rated = tariff ? SipTariff::READ(rates) : std::nullopt;
+    if (tariff && (!rated || SipTariff::WRITE(*rated) != rates))
         std::abort();
 }
 } // namespace
