@@ -148,6 +148,7 @@ private:
         configuration.name = NAME;
         configuration.listen = {"127.0.0.1", FREE_PORT()};
         configuration.peer = peer;
+        configuration.maxRequestsPerSource = 0; // it is pinged whenever it is to settle
         return configuration;
     }
 
