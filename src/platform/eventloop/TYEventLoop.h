@@ -54,7 +54,9 @@ public:
     ///
     ///     loop.beginBusy();
     ///     ... // what the host has to do, which posts
-    ///     loop.endBusy(); // then it waits @{
+    ///     loop.endBusy(); // then it waits
+    ///
+    /// @{
     void beginBusy() { m_isBusy = true; }
     void endBusy();
     /// @}
