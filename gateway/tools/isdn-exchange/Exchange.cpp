@@ -478,7 +478,7 @@ void Exchange::placeWaiting()
 Exchange::CallHandle Exchange::place(Plan::Call const& own)
 {
     ++m_report.placed;
-    auto const call = std::make_shared<Call>();
+    auto call = std::make_shared<Call>();
     call->channel = hunt();
     call->own = &own;
     call->number = own.to;
