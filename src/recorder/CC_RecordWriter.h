@@ -145,7 +145,9 @@ private:
     /// one's successor, and a 32-bit processor would need a loop.
     static void PUBLISH(std::uint64_t& position, std::uint64_t value)
     {
+#ifndef __SANITIZE_THREAD__ // which knows no fences; no other thread of this process reads it
         std::atomic_thread_fence(std::memory_order_release);
+#endif
         const_cast<std::uint64_t volatile&>(position) = value;
     }
     /// Both ends of so many octets, which together are all when these are no more than twice as many.
