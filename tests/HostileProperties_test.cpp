@@ -50,8 +50,8 @@ protected:
         auto const* const property = dynamic_cast<ActingProperty const*>(properties.get(id));
         return property != nullptr ? property->getNumber() : -1;
     }
-    using Read = XCode (CC_CallAdapter::*)(CC_PropertyContainer&, unsigned int) const;
-    static CC_PropertyContainer READ(CC_CallAdapter const& adapter, Read read)
+    using Getter = XCode (CC_CallAdapter::*)(CC_PropertyContainer&, unsigned int) const;
+    static CC_PropertyContainer READ(CC_CallAdapter const& adapter, Getter read)
     {
         CC_PropertyContainer properties;
         std::ignore = (adapter.*read)(properties, CC_PropertyContainer::ALL_GROUPS);
