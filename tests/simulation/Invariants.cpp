@@ -116,7 +116,25 @@ CC_PropertyContainer VIEW(Line const& line, Read read)
     return view;
 }
 
-/// Without filters a line sees what its own leg, its peer and its call hold, and nothing of what it had before.
+/// Without filters a line sees what its own leg and its call hold, and nothing of what it had before. With those on the
+/// way in it sees what it has written, and the leg and the call hold what these have made of it.
+void CHECK_OWN_VIEWS(World& world, CC_CallLeg const& own, Line const& line, std::string const& name)
+{
+    if (world.m_hadInputFilters)
+        return;
+    if (!HOLDS(own.getProperties(), VIEW(line, &CC_CallAdapter::getOwnProperties),
+               CC_PropertyId::STATE)) // which the leg may refuse
+        world.fail(name + " sees of itself what its leg does not hold");
+    if (own.getCall() == nullptr)
+        return;
+    CC_PropertyContainer const ofCall = VIEW(line, &CC_CallAdapter::getCallProperties);
+    if (!HOLDS(own.getCall()->getProperties(), ofCall))
+        world.fail(name + " sees of its call what that does not hold");
+    if (!HOLDS(ofCall, own.getCall()->getProperties()))
+        world.fail(name + " does not see what its call holds");
+}
+
+/// The same of its peer as well.
 void CHECK_VIEWS(World& world, unsigned int number, Line const& line)
 {
     CC_CallLeg const* const own = OWN_LEG(*line.adapter);
@@ -124,14 +142,7 @@ void CHECK_VIEWS(World& world, unsigned int number, Line const& line)
     if (!CAN_BE_COMPARED || own == nullptr || world.m_hadOutputFilters || world.m_wasShortOfMemory)
         return;
     std::string const name = "line " + std::to_string(number);
-    if (!HOLDS(own->getProperties(), VIEW(line, &CC_CallAdapter::getOwnProperties),
-               CC_PropertyId::STATE)) // which the leg may refuse
-        world.fail(name + " sees of itself what its leg does not hold");
-    CC_PropertyContainer const ofCall = VIEW(line, &CC_CallAdapter::getCallProperties);
-    if (own->getCall() != nullptr && !HOLDS(own->getCall()->getProperties(), ofCall))
-        world.fail(name + " sees of its call what that does not hold");
-    if (own->getCall() != nullptr && !HOLDS(ofCall, own->getCall()->getProperties()))
-        world.fail(name + " does not see what its call holds");
+    CHECK_OWN_VIEWS(world, *own, line, name);
     if (peer == nullptr || line.hasWrittenToPeer || peer->mayChangeUntold())
         return;
     CC_PropertyContainer const ofPeer = VIEW(line, &CC_CallAdapter::getPeerProperties);
