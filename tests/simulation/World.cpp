@@ -158,7 +158,6 @@ void World::makeModule(unsigned int index)
         made.endpoint->setInputFilterContainer(nullptr);
         made.endpoint->setOutputFilterContainer(nullptr);
     }
-    m_hadInputFilters = m_hadInputFilters || made.endpoint->getInputFilterContainer() != nullptr;
     m_hadOutputFilters = m_hadOutputFilters || made.endpoint->getOutputFilterContainer() != nullptr;
     for (unsigned int i = 0; i < LINES_OF_A_MODULE; ++i)
         makeAdapter(made.index * LINES_OF_A_MODULE + i,

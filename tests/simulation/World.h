@@ -123,8 +123,7 @@ public:
     bool m_hasLostContext = false;   // a context was destroyed, maybe with calls
     int m_lostPools = 0;             // destroyed with calls, whose reload lock stays
     bool m_wasShortOfMemory = false;
-    bool m_hadInputFilters = false;  // somebody's, at some time
-    bool m_hadOutputFilters = false; // the same
+    bool m_hadOutputFilters = false; // somebody's, at some time
     /// An adapter may have chosen its peer by a State that is not the leg's: one that changed while the leg's joining
     /// was told, before the observers of the call's legs hear of that leg; or one that a line wrote into its view of an
     /// ended peer, or of one behind filters.
