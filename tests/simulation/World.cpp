@@ -189,8 +189,8 @@ void World::destroyModule(unsigned int index)
                 return; // somebody made another meanwhile
     }
     Memory::Library const library;
+    std::unique_ptr<Endpoint> const endpoint = std::move(leaving.endpoint); // nobody makes an adapter for it any more
     std::unique_ptr<Provider>(std::move(leaving.provider)).reset();
-    std::unique_ptr<Endpoint>(std::move(leaving.endpoint)).reset();
 }
 
 void World::makeAdapter(unsigned int number, unsigned int kind)
