@@ -253,7 +253,7 @@ void World::strike(CallOut kind)
     m_mayPeersBeStale = m_mayPeersBeStale || (mayBeNews && before != getActivityLevels());
 }
 
-/// Of all legs in calls.
+/// Of all legs in calls, and of the guests': their calls may have lost the context that lists them.
 std::vector<int> World::getActivityLevels() const
 {
     std::vector<int> levels;
@@ -261,6 +261,8 @@ std::vector<int> World::getActivityLevels() const
         for (unsigned int j = 0; CC_Call const* const call = CallControl::GET_CALL(CONTEXT_NAME(i), j); ++j)
             for (unsigned int k = 0; k < call->getNumberOfCallLegs(); ++k)
                 levels.push_back(call->getCallLeg(k)->getActivityLevel());
+    for (CC_CallLeg const* const leg : m_legs)
+        levels.push_back(leg != nullptr ? leg->getActivityLevel() : 0);
     return levels;
 }
 
