@@ -88,10 +88,19 @@ auto FIND(Elements const& elements, IsIt const& isIt)
     return found != elements.end() ? &*found : nullptr;
 }
 
+/// A payload type that a description names twice is what it is said to be first.
+bool HAS_TYPE(SipStream const& stream, unsigned char type)
+{
+    auto const isIt = [type](auto const& known) { return known.type == type; };
+    return FIND(stream.formats, isIt) != nullptr || FIND(stream.events, isIt) != nullptr;
+}
+
 void READ_FORMAT(SipStream& stream, sdp_rtpmap_t const& format)
 {
     auto const type = static_cast<unsigned char>(format.rm_pt);
     auto const rate = static_cast<unsigned int>(format.rm_rate);
+    if (HAS_TYPE(stream, type))
+        return;
     if (format.rm_encoding != nullptr && SipText::IS_ONE_OF(format.rm_encoding, {"telephone-event"}))
     {
         if (FIND(stream.events, [rate](SipStream::Events const& known) { return known.rate == rate; }) == nullptr)
