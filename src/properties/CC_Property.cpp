@@ -53,6 +53,8 @@ unsigned int CC_Property::getTypeId() const { return TYPE_ID(); }
 
 char const* CC_Property::getTypeName() const { return "Property"; }
 
+bool CC_Property::ASK_IS_OF_TYPE(CC_Property const& property, unsigned int typeId) { return property.isOfType(typeId); }
+
 XCode CC_Property::setValueString(String& error, String const&) { return REFUSE(error, "Invalid value"); }
 
 InfoContainer& CC_Property::getInfo(InfoContainer& info, unsigned int maxLevel, unsigned int level,

@@ -134,6 +134,10 @@ protected:
     /// Sets `error`, as far as memory allows, and returns FAILURE.
     static XCode REFUSE(String& error, char const* message);
 
+    /// `property.isOfType(typeId)`, asked inside the library: g++ 12 that followed the call would name a function of
+    /// the class that it has made no copy of, and the program would not link.
+    static bool ASK_IS_OF_TYPE(CC_Property const& property, unsigned int typeId);
+
     /// Tells the innermost ASSIGN to this object, if there is one, that its `assign` lacks memory.
     void reportFailedAssignment() const noexcept;
 

@@ -114,7 +114,7 @@ private:
     {
         if (typeid(other) == typeid(Derived)) // as above
             return static_cast<Derived const*>(&other);
-        return other.isOfType(TYPE_ID()) ? dynamic_cast<Derived const*>(&other) : nullptr;
+        return CC_Property::ASK_IS_OF_TYPE(other, TYPE_ID()) ? dynamic_cast<Derived const*>(&other) : nullptr;
     }
 
     /// Whether memory sufficed. The whole object is copied, even when the values are the same: a class may hold more
