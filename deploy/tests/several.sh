@@ -1,11 +1,13 @@
 # Three gateways behind the packaged proxy, as deploy/ has them, with calls all the while. One is killed: its own calls end, and
-# no others. One is drained and started anew, and one is added: no call is lost. Prometheus has the figures of them all.
+# no others. One is drained and started anew, and one is added: no call is lost. Prometheus has the figures of them all, and one
+# database the records of their calls.
 #
 #     bash several.sh GATEWAY PORT GATEWAYCTL [CALLS-PER-SECOND [SECONDS]]
 #
 # with the executables, the first of 32 ports, and for how long calls go on between these events.
 . "$(dirname "${BASH_SOURCE[0]}")/../../gateway/tests/lib.bash"
 . "$HERE/certificates.bash"
+. "$HERE/postgresql.bash"
 CTL=$3
 RATE=${4:-30}
 SECONDS_EACH=${5:-0.5}
@@ -48,7 +50,8 @@ start() { # NUMBER, after the file of that number or, for the fourth, the first
     [[ -f $DEPLOY/gateways/gateway-$1.toml ]] || source=1
     sed "s/\.2$source:/.2$1:/" "$DEPLOY/gateways/gateway-$source.toml" |
         here -e "s#/var/lib/callcontrol-gateway\|/run/callcontrol-gateway\|/var/log/callcontrol-gateway#$folder#" \
-            -e "s/127\.0\.0\.1:9160/$(metrics_of "$1")/" >"$folder/gateway.toml"
+            -e "s/127\.0\.0\.1:9160/$(metrics_of "$1")/" -e "s/^# postgresql = .*/postgresql = \"$POSTGRESQL\"/; s/^# spool/spool/" \
+            >"$folder/gateway.toml"
     "$GATEWAY" --config "$folder/gateway.toml" --log-level warning >>"$folder/out" 2>>"$WORK/gateway-$1.log" &
     gateways[$1]=$!
     background+=($!)
@@ -110,7 +113,7 @@ start_balancer() {
     kamailio -DD -E -f "$DEPLOY/kamailio/kamailio.cfg" -Y "$WORK" -m 256 -M 4 -A "TRUNK=udp:$BALANCER_TRUNK" -A "OFFICE=udp:$BALANCER_OFFICE" \
         -A "LIST=\"$WORK/dispatcher.list\"" -A "CONTROL=\"unix:$WORK/kamailio_ctl\"" -A PROBE=1 -A SILENCE=$SILENCE >"$WORK/kamailio.log" 2>&1 &
     kamailio_pid=$!
-    trap 'kill -TERM $kamailio_pid 2>/dev/null; wait $kamailio_pid; cleanup' EXIT # its processes end with it
+    trap 'kill -TERM $kamailio_pid 2>/dev/null; wait $kamailio_pid; end_server; cleanup' EXIT # its processes end with it
 }
 start_prometheus() {
     mkdir "$WORK/prometheus"
@@ -122,6 +125,9 @@ start_prometheus() {
     background+=($!)
 }
 
+make_server
+start_server
+trap 'end_server; cleanup' EXIT
 make_certificate ca ca
 make_certificate gateway ca "IP:$HOST"
 make_certificate prometheus ca
@@ -188,6 +194,7 @@ for n in 1 2 4; do
     ask $n shutdown || fail "gateway $n does not end"
     ended $n
 done
-python3 "$TESTS/lost.py" "$WORK/calls" "$killed" "$added" "$settled" "$(trunk_of 1)" "$(trunk_of 3)" "$(trunk_of 4)" $LATE ||
-    fail "calls were lost, or not shared out"
+sql "select leg->>'id' from call_record, jsonb_array_elements(record->'legs') leg where record->>'answeredAfter' is not null" >"$WORK/recorded"
+python3 "$TESTS/lost.py" "$WORK/calls" "$WORK/recorded" "$killed" "$added" "$settled" "$(trunk_of 1)" "$(trunk_of 3)" "$(trunk_of 4)" $LATE ||
+    fail "calls were lost, not shared out, or not recorded"
 finish

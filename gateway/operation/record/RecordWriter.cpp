@@ -1,5 +1,7 @@
 #include "operation/record/RecordWriter.h"
 
+#include <spdlog/spdlog.h>
+
 #include <algorithm>
 #include <chrono>
 #include <new>
@@ -79,6 +81,7 @@ void RecordWriter::run()
         if (std::exchange(m_isReopening, false))
             m_target->reopen();
         bool const isBrought = bring(lock);
+        noteStuck(!isBrought);
         bool const isDelivered = deliver(lock); // also what was spooled just now
         if (m_isEnding)
             return;
@@ -118,6 +121,16 @@ bool RecordWriter::bring(std::unique_lock<std::mutex>& lock)
         if (!bringSome(lock))
             return false;
     return true;
+}
+
+void RecordWriter::noteStuck(bool isStuck)
+{
+    if (isStuck == std::exchange(m_isStuck, isStuck))
+        return;
+    if (isStuck)
+        spdlog::error("records: the disk takes none, they wait in memory, {} at most", m_kept);
+    else
+        spdlog::info("records: the disk takes them again");
 }
 
 /// They stay in their place meanwhile, so that they count as waiting.

@@ -56,6 +56,7 @@ private:
     bool bring(std::unique_lock<std::mutex>& lock);
     bool bringSome(std::unique_lock<std::mutex>& lock);
     std::size_t take(RecordLines const& lines);
+    void noteStuck(bool isStuck);
     bool deliver(std::unique_lock<std::mutex>& lock);
 
     std::unique_ptr<RecordTarget> m_target; // the thread's
@@ -67,5 +68,6 @@ private:
     unsigned long long m_lost = 0;
     bool m_isReopening = false;
     bool m_isEnding = false;
+    bool m_isStuck = false; // the thread's
     std::thread m_thread;
 };

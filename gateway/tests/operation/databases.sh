@@ -2,34 +2,14 @@
 # calls up, whose successor writes what was known of them.
 . "$(dirname "$0")/../lib.bash"
 . "$(dirname "$0")/../plain_call.bash"
+. "$(dirname "$0")/../postgresql.bash"
 CTL=$3
 export CALLCONTROL_GATEWAY_SOCKET=$WORK/control
-SERVER=$(find /usr/lib/postgresql -name pg_ctl | sort -V | tail -n 1)
-SERVER=${SERVER%/*}
-DATA=$WORK/server
-PASSWORD=sesame-of-the-test
+trap 'end_server; cleanup' EXIT
 
-# as_server COMMAND...: it does not run as root
-as_server() {
-    if (($(id -u) == 0)); then
-        (cd "$WORK" && setpriv --reuid postgres --regid postgres --clear-groups -- "$@")
-    else
-        "$@"
-    fi
-}
-# server VERB [ARGUMENT]...
-server() { as_server "$SERVER/pg_ctl" -D "$DATA" -w -t 60 "$@" >>"$WORK/server.log" 2>&1 || fail "server: $*"; }
-start_server() { server -l "$DATA/log" -o "-c listen_addresses=$HOST -p $((PORT + 30)) -k '' -c fsync=off" start; }
-stop_server() { server -m "${1:-fast}" stop; }
-cleanup_server() {
-    [[ -f $DATA/postmaster.pid ]] && stop_server immediate
-    cleanup
-}
-trap cleanup_server EXIT
 # the calls that a database has, in order, those that were interrupted with a "!"
 in_server() {
-    PGPASSWORD=$PASSWORD psql -h $HOST -p $((PORT + 30)) -U gateway -d postgres -Atc \
-        "select string_agg(call || case when record->'interrupted' = 'true' then '!' else '' end, ' ' order by process, call) from call_record"
+    sql "select string_agg(call || case when record->'interrupted' = 'true' then '!' else '' end, ' ' order by process, call) from call_record"
 }
 in_sqlite() {
     python3 -c 'import sqlite3, sys
@@ -58,11 +38,7 @@ expect_spooled() {
 lasting() { call_up; pause 20000; }
 forgotten() { expect_invite; respond_with "$SDP_OF_CALLEE" retrans "200 OK"; expect_request ACK; pause 20000; }
 
-echo "$PASSWORD" >"$WORK/password"
-mkdir "$DATA"
-(($(id -u) == 0)) && chown postgres "$DATA" && chmod 711 "$WORK" && chmod 644 "$WORK/password"
-as_server "$SERVER/initdb" -D "$DATA" --no-sync -U gateway --pwfile="$WORK/password" -A scram-sha-256 -E UTF8 --locale=C >"$WORK/initdb.log" 2>&1 ||
-    fail "no server"
+make_server
 write_configuration
 cat >>"$WORK/gateway.toml" <<END
 [control]
@@ -70,7 +46,7 @@ socket = "$WORK/control"
 [records]
 file = "$WORK/calls.jsonl"
 sqlite = "$WORK/calls.sqlite"
-postgresql = "host=$HOST port=$((PORT + 30)) user=gateway password=$PASSWORD dbname=postgres"
+postgresql = "$POSTGRESQL"
 spool = "$WORK/spool"
 END
 
@@ -117,5 +93,5 @@ for place in server sqlite file; do expect_records $place "1 2 3 4! 1"; done
 python3 "$HERE/operation/records.py" "$HERE/../operation/record/call-record.schema.json" "$WORK/calls.jsonl" \
     'r[3]["interrupted"] and r[3]["endedAfter"] is None and r[3]["answeredAfter"] is not None' \
     'r[3]["legs"][1]["dialled"] == "4989123"' 'r[4]["process"] > r[3]["process"]' >"$WORK/records.log" 2>&1 || fail "records"
-grep -l "$PASSWORD" "$WORK"/gateway.err* "$WORK"/gateway.out "$WORK"/spool/* && fail "the password is told"
+grep -l "$POSTGRESQL_PASSWORD" "$WORK"/gateway.err* "$WORK"/gateway.out "$WORK"/spool/* && fail "the password is told"
 finish
