@@ -10,6 +10,7 @@
 #include <fcntl.h>
 #include <new>
 #include <sys/mman.h>
+#include <sys/time.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -17,7 +18,8 @@ namespace Simulation
 {
 namespace
 {
-constexpr unsigned int LONGEST_RUN = 20; // seconds; an honest one takes milliseconds
+constexpr unsigned int LONGEST_RUN = 20;   // seconds of a processor; an honest one takes milliseconds
+constexpr unsigned int LONGEST_WAIT = 600; // seconds, where others have the processors meanwhile
 
 void BE_SILENT()
 {
@@ -46,11 +48,20 @@ Report& SHARED_REPORT()
     return *report;
 }
 
+void LIMIT_TIME()
+{
+    itimerval const limit = {{0, 0}, {LONGEST_RUN, 0}};
+    setitimer(ITIMER_PROF, &limit, nullptr);
+    alarm(LONGEST_WAIT);
+}
+
 Ended ENDED(int status)
 {
-    if (WIFSIGNALED(status))
-        return {true,
-                WTERMSIG(status) == SIGALRM ? "it hangs" : std::string("it crashes: ") + strsignal(WTERMSIG(status))};
+    int const signal = WIFSIGNALED(status) ? WTERMSIG(status) : 0;
+    if (signal == SIGPROF || signal == SIGALRM)
+        return {true, "it hangs"};
+    if (signal != 0)
+        return {true, std::string("it crashes: ") + strsignal(signal)};
     if (WEXITSTATUS(status) == 0)
         return {};
     char const* const failure = SHARED_REPORT().failure;
@@ -69,7 +80,7 @@ Ended ATTEMPT(Operations const& operations, bool isSilent)
     {
         if (isSilent)
             BE_SILENT();
-        alarm(LONGEST_RUN);
+        LIMIT_TIME();
         Outcome const outcome = RUN(operations, &report.progress);
         report.setFailure(outcome.failure);
         _exit(outcome.hasFailed() ? 1 : 0);

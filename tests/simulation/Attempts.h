@@ -32,8 +32,11 @@ struct Ended
     bool isCrash = false; // the run did not end by itself
 };
 
-/// Runs the operations in a forked process, silently if `isSilent`. One that takes longer than a few seconds hangs.
+/// Runs the operations in a forked process, silently if `isSilent`. One that takes a few seconds of a processor hangs.
 Ended ATTEMPT(Operations const& operations, bool isSilent);
+
+/// Ends this process, as one that hangs, after some seconds of a processor's time; each call begins them anew.
+void LIMIT_TIME();
 
 /// What the status of a process that ran attempts means.
 Ended ENDED(int status);
