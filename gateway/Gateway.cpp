@@ -55,10 +55,10 @@ catch (CallRecords::Failure const& error)
     throw ConfigurationError(configuration.file, "records." + error.key, error.what());
 }
 
-std::unique_ptr<Capture> OPEN_CAPTURE(Configuration const& configuration)
+std::unique_ptr<HepCapture> OPEN_CAPTURE(Configuration const& configuration, TYEventLoop& loop)
 try
 {
-    return configuration.capture.isOn() ? std::make_unique<Capture>(configuration.capture) : nullptr;
+    return configuration.capture.isOn() ? std::make_unique<HepCapture>(configuration.capture, loop) : nullptr;
 }
 catch (std::runtime_error const& error)
 {
@@ -101,7 +101,7 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
     , m_loop(findLoop(modules))
     , m_recording(configuration)
     , m_records(OPEN_RECORDS(configuration))
-    , m_capture(OPEN_CAPTURE(configuration))
+    , m_capture(OPEN_CAPTURE(configuration, m_callControlLoop))
     , m_callControl(m_callControlLoop, m_datapathLoop, CONTEXT_NAME(configuration), m_media.get())
     , m_host{m_loop,
              m_callControl.getContextName(),

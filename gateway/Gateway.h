@@ -10,7 +10,7 @@
 #include "operation/Recording.h"
 #include "operation/ServiceNotifier.h"
 #include "operation/StateDump.h"
-#include "operation/capture/Capture.h"
+#include "operation/capture/HepCapture.h"
 #include "operation/control/ControlCommands.h"
 #include "operation/control/ControlServer.h"
 #include "operation/http/HttpServer.h"
@@ -104,7 +104,7 @@ private:
     CallMetrics m_callMetrics;
     CallTracer m_tracer;
     CallWatch m_watch;                  // calls may last until call control ends
-    std::unique_ptr<Capture> m_capture; // null where it is not configured
+    std::unique_ptr<HepCapture> m_capture; // null where it is not configured
     CallControlHost m_callControl;
     GatewayHost m_host;
     FreeMemory m_freeMemory;

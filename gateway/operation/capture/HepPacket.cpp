@@ -34,19 +34,23 @@ void ADD_NUMBER(std::string& octets, std::uint32_t value, unsigned int length)
         octets += static_cast<char>(value >> (8 * i) & 0xff);
 }
 
-void ADD(std::string& octets, Chunk chunk, std::string_view value)
+void ADD_HEAD(std::string& octets, Chunk chunk, std::size_t length)
 {
     ADD_NUMBER(octets, GENERIC, 2);
     ADD_NUMBER(octets, chunk, 2);
-    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD_LENGTH + value.size()), 2);
+    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD_LENGTH + length), 2);
+}
+
+void ADD(std::string& octets, Chunk chunk, std::string_view value)
+{
+    ADD_HEAD(octets, chunk, value.size());
     octets += value;
 }
 
 void ADD(std::string& octets, Chunk chunk, std::uint32_t value, unsigned int length)
 {
-    std::string text;
-    ADD_NUMBER(text, value, length);
-    ADD(octets, chunk, text);
+    ADD_HEAD(octets, chunk, length);
+    ADD_NUMBER(octets, value, length);
 }
 
 std::string_view HOST_OF(sockaddr const& address)
@@ -61,32 +65,35 @@ std::string_view HOST_OF(sockaddr const& address)
 std::uint32_t PORT_OF(sockaddr const& address) { return ntohs(reinterpret_cast<sockaddr_in const&>(address).sin_port); }
 } // namespace
 
-std::string HepPacket::encode(std::uint32_t agent, std::string_view password) const
+void HepPacket::ENCODE(std::string& octets, CapturedMessage const& message, std::uint32_t agent,
+                       std::string_view password)
 {
-    bool const isVersion4 = from.sa_family == AF_INET;
-    auto const now = std::chrono::duration_cast<std::chrono::microseconds>(time.time_since_epoch()).count();
-    std::string octets(BEGINNING_OF_PACKET);
-    octets.reserve(256 + password.size() + correlation.size() + payload.size());
+    bool const isVersion4 = message.from.sa_family == AF_INET;
+    auto const now = std::chrono::duration_cast<std::chrono::microseconds>(message.time.time_since_epoch()).count();
+    octets = BEGINNING_OF_PACKET;
+    octets.reserve(256 + password.size() + message.correlation.size() + message.payload.size());
     octets.append(2, '\0'); // the length
     ADD(octets, FAMILY, isVersion4 ? VERSION_4 : VERSION_6, 1);
-    ADD(octets, TRANSPORT, transport, 1);
-    ADD(octets, isVersion4 ? FROM_VERSION_4 : FROM_VERSION_6, HOST_OF(from));
-    ADD(octets, isVersion4 ? TO_VERSION_4 : TO_VERSION_6, HOST_OF(to));
-    ADD(octets, FROM_PORT, PORT_OF(from), 2);
-    ADD(octets, TO_PORT, PORT_OF(to), 2);
+    ADD(octets, TRANSPORT, message.transport, 1);
+    ADD(octets, isVersion4 ? FROM_VERSION_4 : FROM_VERSION_6, HOST_OF(message.from));
+    ADD(octets, isVersion4 ? TO_VERSION_4 : TO_VERSION_6, HOST_OF(message.to));
+    ADD(octets, FROM_PORT, PORT_OF(message.from), 2);
+    ADD(octets, TO_PORT, PORT_OF(message.to), 2);
     ADD(octets, SECONDS, static_cast<std::uint32_t>(now / 1000000), 4);
     ADD(octets, MICROSECONDS, static_cast<std::uint32_t>(now % 1000000), 4);
-    ADD(octets, PROTOCOL, protocol, 1);
+    ADD(octets, PROTOCOL, message.protocol, 1);
     ADD(octets, AGENT, agent, 4);
     if (!password.empty())
         ADD(octets, PASSWORD, password);
-    if (!correlation.empty())
-        ADD(octets, CORRELATION, correlation);
-    if (octets.size() + HEAD_LENGTH + payload.size() > LONGEST)
-        return {};
-    ADD(octets, PAYLOAD, payload);
+    if (!message.correlation.empty())
+        ADD(octets, CORRELATION, message.correlation);
+    if (octets.size() + HEAD_LENGTH + message.payload.size() > LONGEST)
+    {
+        octets.clear();
+        return;
+    }
+    ADD(octets, PAYLOAD, message.payload);
     std::string length;
     ADD_NUMBER(length, static_cast<std::uint32_t>(octets.size()), 2);
     octets.replace(BEGINNING_OF_PACKET.size(), length.size(), length);
-    return octets;
 }

@@ -4,7 +4,7 @@
 #include "callcontrol/version.h"
 #include "host/SignallingLoop.h"
 #include "operation/Log.h"
-#include "operation/capture/Capture.h"
+#include "host/Capture.h"
 #include "operation/metric/ProcessMetrics.h"
 #include "operation/record/CallRecords.h"
 #include "operation/record/CallWatch.h"

@@ -2,7 +2,7 @@
 
 #include "callcontrol/CallControl.h"
 #include "calls/CC_Call.h"
-#include "operation/capture/Capture.h"
+#include "host/Capture.h"
 #include "properties/CC_Cause.h"
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyBoolean.h"

@@ -1,6 +1,6 @@
 #include "sip/stack/SipCapture.h"
 
-#include "operation/capture/Capture.h"
+#include "host/Capture.h"
 #include "sip/stack/StackFunction.h"
 
 #include <array>
@@ -36,7 +36,7 @@ try
     unsigned char const transport = tport_is_udp(port) ? IPPROTO_UDP : IPPROTO_TCP;
     std::string const text = TEXT_OF(message);
     s_capture->show(
-        {HepPacket::SIP, transport, isOurs ? own : far, isOurs ? far : own, std::chrono::system_clock::now(), text});
+        {CapturedMessage::SIP, transport, isOurs ? own : far, isOurs ? far : own, std::chrono::system_clock::now(), text});
 }
 catch (std::bad_alloc const&)
 {

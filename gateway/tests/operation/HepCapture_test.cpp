@@ -1,7 +1,10 @@
-#include "operation/capture/Capture.h"
+#include "operation/capture/HepCapture.h"
 
 #include "media/context/MediaReport.h"
 #include "media/rtp/DatagramAddress.h"
+#include "operation/capture/HepPacket.h"
+#include "testing/DrivenClock.h"
+#include "testing/DrivenLoop.h"
 
 #include <gtest/gtest.h>
 
@@ -14,10 +17,10 @@
 namespace
 {
 /// A capture server on a free port.
-class CaptureTest : public testing::Test
+class HepCaptureTest : public testing::Test
 {
 protected:
-    CaptureTest() : m_socket(socket(AF_INET, SOCK_DGRAM | SOCK_NONBLOCK, 0))
+    HepCaptureTest() : m_socket(socket(AF_INET, SOCK_DGRAM | SOCK_NONBLOCK, 0))
     {
         DatagramAddress address(MediaAddress::OF("127.0.0.1", 1));
         address.setPort(0);
@@ -25,7 +28,7 @@ protected:
         getsockname(m_socket, &address.any, &address.length);
         options.server = {"127.0.0.1", address.getPort()};
     }
-    ~CaptureTest() override { close(m_socket); }
+    ~HepCaptureTest() override { close(m_socket); }
 
     /// Empty: nothing has come.
     std::string take() const
@@ -39,12 +42,21 @@ protected:
         close(m_socket);
         m_socket = -1;
     }
-    static HepPacket message(std::string_view text)
+    static CapturedMessage message(std::string_view text)
     {
         static DatagramAddress const s_address(MediaAddress::OF("192.0.2.1", 5060));
-        return {HepPacket::SIP, IPPROTO_UDP, s_address.any, s_address.any, {}, text};
+        return {CapturedMessage::SIP, IPPROTO_UDP, s_address.any, s_address.any, {}, text};
     }
 
+    /// Until those that leave together have left.
+    void letPass()
+    {
+        clock.advance(10);
+        loop.turn();
+    }
+
+    DrivenClock clock;
+    DrivenLoop loop;
     CaptureOptions options;
 
 private:
@@ -52,41 +64,75 @@ private:
 };
 } // namespace
 
-TEST_F(CaptureTest, AMessageReachesTheServerAsItIs)
+TEST_F(HepCaptureTest, MessagesReachTheServerAsTheyAreAndInTheirOrder)
 {
-    Capture capture(options);
+    HepCapture capture(options, loop);
+    capture.show(message("ACK sip:x SIP/2.0\r\n\r\n"));
     capture.show(message("BYE sip:x SIP/2.0\r\n\r\n"));
+    EXPECT_EQ(take(), "");
+    letPass();
+    EXPECT_TRUE(take().ends_with("ACK sip:x SIP/2.0\r\n\r\n"));
     EXPECT_TRUE(take().ends_with("BYE sip:x SIP/2.0\r\n\r\n"));
-    EXPECT_EQ(capture.getCounters().sent, 1u);
+    EXPECT_EQ(capture.getCounters().sent, 2u);
     EXPECT_EQ(capture.getCounters().lost, 0u);
+    capture.show(message("INVITE"));
+    letPass();
+    EXPECT_TRUE(take().ends_with("INVITE")) << "the next ones wait anew";
 }
 
-TEST_F(CaptureTest, WhatIsLongerThanADatagramIsCounted)
+TEST_F(HepCaptureTest, ManyDoNotWaitForTheTime)
 {
-    Capture capture(options);
+    HepCapture capture(options, loop);
+    for (int i = 0; i < 65; ++i)
+        capture.show(message(std::to_string(i)));
+    EXPECT_EQ(capture.getCounters().sent, 64u);
+    letPass();
+    EXPECT_EQ(capture.getCounters().sent, 65u);
+    for (int i = 0; i < 65; ++i)
+        EXPECT_TRUE(take().ends_with(std::to_string(i)));
+}
+
+TEST_F(HepCaptureTest, WhatWaitsWhenItEndsIsTold)
+{
+    {
+        HepCapture capture(options, loop);
+        capture.show(message("BYE"));
+    }
+    EXPECT_TRUE(take().ends_with("BYE"));
+    EXPECT_FALSE(loop.turn()) << "and no time runs any more";
+}
+
+TEST_F(HepCaptureTest, WhatIsLongerThanADatagramIsCounted)
+{
+    HepCapture capture(options, loop);
     capture.show(message(std::string(HepPacket::LONGEST, 'x')));
-    EXPECT_EQ(take(), "");
+    capture.show(message("BYE"));
+    letPass();
+    EXPECT_TRUE(take().ends_with("BYE"));
+    EXPECT_EQ(capture.getCounters().sent, 1u);
     EXPECT_EQ(capture.getCounters().lost, 1u);
 }
 
-TEST_F(CaptureTest, AServerThatIsNotThereCostsItsPacketsAndNothingElse)
+TEST_F(HepCaptureTest, AServerThatIsNotThereCostsItsPacketsAndNothingElse)
 {
-    Capture capture(options);
+    HepCapture capture(options, loop);
     closeServer();
     for (int i = 0; i < 4; ++i)
         capture.show(message("BYE"));
+    letPass();
     EXPECT_EQ(capture.getCounters().lost, 2u); // the system tells it with every other packet
     EXPECT_EQ(capture.getCounters().sent, 2u);
 }
 
-TEST_F(CaptureTest, ASenderReportIsToldWithItsBlockAndTheCallItIsOf)
+TEST_F(HepCaptureTest, ASenderReportIsToldWithItsBlockAndTheCallItIsOf)
 {
-    Capture capture(options);
+    HepCapture capture(options, loop);
     MediaReport report{{}, MediaAddress::OF("192.0.2.1", 4001), MediaAddress::OF("192.0.2.2", 5001)};
     report.packet.sender = 7;
     report.packet.senderInfo = RtcpSenderInfo{(3900000000ULL << 32) | 0x80000000, 160, 2, 320};
     report.packet.report = RtcpReport{9, 25, 10, 65600, 33, 44, 55};
     capture.show(report, "a@b");
+    letPass();
     std::string const octets = take();
     EXPECT_NE(octets.find("a@b"), std::string::npos);
     EXPECT_TRUE(octets.ends_with(
@@ -95,10 +141,11 @@ TEST_F(CaptureTest, ASenderReportIsToldWithItsBlockAndTheCallItIsOf)
         R"("fraction_lost":25,"packets_lost":10,"highest_seq_no":65600,"ia_jitter":33,"lsr":44,"dlsr":55}]})"));
 }
 
-TEST_F(CaptureTest, AReportOfWhoDoesNotSendHasNoSenderInformation)
+TEST_F(HepCaptureTest, AReportOfWhoDoesNotSendHasNoSenderInformation)
 {
-    Capture capture(options);
+    HepCapture capture(options, loop);
     MediaReport const report{{}, MediaAddress::OF("192.0.2.1", 4001), MediaAddress::OF("192.0.2.2", 5001)};
     capture.show(report, "");
+    letPass();
     EXPECT_TRUE(take().ends_with(R"({"ssrc":0,"type":201,"report_count":0,"report_blocks":[]})"));
 }
