@@ -346,6 +346,34 @@ TEST_F(HostileProperties, AnEndingPropertyMayDestroyTheAdapterThatDropsIt)
     }
 }
 
+TEST_F(HostileProperties, AnEndingPropertyMayWriteToThePeerThatTheAdapterIsLeaving)
+{
+    using Written = XCode (CC_CallAdapter::*)(CC_PropertyContainer const&);
+    for (Written const write : {&CC_CallAdapter::setPeerProperties, &CC_CallAdapter::setPeerPropertiesUnfiltered})
+        for (unsigned int skipped = 0; skipped < 8; ++skipped)
+        {
+            Party anna("anna"), bert("bert");
+            connect(anna, bert);
+            ASSERT_EQ(anna.adapter->setCallProperty(acting(1)), XCode::OK);
+            settle();
+            unsigned int left = skipped;
+            std::function<void()> act;
+            act = [&]
+            {
+                if (left-- > 0)
+                    deeds->onEnd = act;
+                else
+                    std::ignore = ((*anna.adapter).*write)(several(2)); // in no call any more, or still with its peer
+            };
+            deeds->onEnd = act;
+            anna.hangUp();
+            *deeds = {};
+            EXPECT_EQ(READ(*anna.adapter, &CC_CallAdapter::getPeerProperties).getNumberOfProperties(), 0u);
+            bert.hangUp();
+            expectNothingLeft({&anna, &bert});
+        }
+}
+
 TEST_F(HostileProperties, AnEndingPropertyMayDialAnewWithoutLosingTheNewCallsProperties)
 {
     for (unsigned int skipped = 0; skipped < 8; ++skipped)

@@ -189,7 +189,7 @@ bool HAS_STATE(CC_PropertyContainer const& properties) { return properties.get(C
 template <class Written>
 XCode CC_CallAdapter::writePeer(Written const& written, bool isFiltered)
 {
-    if (m_peerCallLeg == nullptr)
+    if (m_peerCallLeg == nullptr || m_ownCallLeg == nullptr) // which goes first: what ends with it writes nothing
         return XCode::ABSENT;
     CC_CallLeg::Reference const keepPeer(*m_peerCallLeg);
     if (HAS_STATE(written))
