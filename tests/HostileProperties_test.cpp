@@ -632,3 +632,40 @@ TEST_F(HostileProperties, WhatIsWrittenAnewInsideAnyDeedOfTheSamePropertyIsSeenA
                     ASSERT_LT(skipped + 1, MOST);
                 }
 }
+
+TEST_F(HostileProperties, WhatIsWrittenToACallInsideAnyDeedWhileALegJoinsItIsSeen)
+{
+    constexpr unsigned int MOST = 40;
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
+                             &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
+        for (bool const isByWhoIsMoved : {false, true})
+            for (unsigned int skipped = 0; skipped < MOST; ++skipped)
+            {
+                Party anna("anna"), bert("bert"), carl("carl"), dora("dora");
+                connect(anna, bert);
+                connect(carl, dora);
+                ASSERT_EQ(bert.adapter->setCallProperty(acting(1)), XCode::OK);
+                ASSERT_EQ(dora.adapter->setCallProperties(several(1)), XCode::OK);
+                settle();
+                unsigned int left = skipped;
+                std::function<void()> act = [&]
+                {
+                    if (left-- > 0)
+                        (*deeds).*event = act; // the next one
+                    else
+                        std::ignore =
+                            (isByWhoIsMoved ? dora : bert).adapter->setCallProperty(CC_PropertyString(DISPLAY, "late"));
+                };
+                (*deeds).*event = act;
+                EXPECT_EQ(anna.adapter->transfer(*carl.adapter, true), XCode::OK);
+                bool const isOver = (*deeds).*event != nullptr; // so many there are not
+                *deeds = {};
+                settle();
+                expectTrueViews(bert, "deed " + std::to_string(skipped));
+                expectTrueViews(dora, "deed " + std::to_string(skipped) + ", who is moved");
+                expectNothingLeft({&anna, &bert, &carl, &dora});
+                if (isOver)
+                    break;
+                ASSERT_LT(skipped + 1, MOST);
+            }
+}

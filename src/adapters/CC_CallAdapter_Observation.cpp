@@ -66,10 +66,10 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
     if (relinked.getNewCall() != nullptr)
     {
         m_callView.interrupt();
+        observeCall(*relinked.getNewCall()); // first: what filters and properties write to it meanwhile is told us
         updateCall();
         if (attempt.isOver())
             return;
-        observeCall(*relinked.getNewCall());
     }
     linkPeerCallLeg();
 }
