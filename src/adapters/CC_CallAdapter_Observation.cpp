@@ -151,7 +151,7 @@ namespace
 /// `changed`: the ids of which the leg tells; null when it is not telling.
 CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 {
-    return {leg.mayChangeUntold() ? nullptr : changed, leg.getNumberOfNotifications()};
+    return {leg.mayChangeUntold() || !leg.isTellingTheLast() ? nullptr : changed, leg.getNumberOfNotifications()};
 }
 } // namespace
 
