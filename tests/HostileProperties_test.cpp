@@ -23,6 +23,15 @@ class HostileProperties : public PartyTest
 protected:
     using Write = std::function<XCode(CC_CallAdapter&, CC_PropertyContainer const&)>;
 
+    static inline Write const EACH_WAY_TO_WRITE[] = {
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperty(*from.get(NAME)); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperties(from); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperties(from); },
+        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperties(from); },
+    };
+
     ~HostileProperties() override { *deeds = {}; }
 
     /// A party whose adapter was destroyed gets another one.
@@ -521,18 +530,10 @@ TEST_F(HostileProperties, AnAdapterDroppedByAnyOfTheClonesOfAPropertySeesNothing
 
 TEST_F(HostileProperties, AnAdapterThatDialsAnewInsideAnyDeedOfAPropertySeesTheNewCallAlone)
 {
-    Write const writes[] = {
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperty(*from.get(NAME)); },
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperty(*from.get(NAME)); },
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperty(*from.get(NAME)); },
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setOwnProperties(from); },
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setPeerProperties(from); },
-        [](CC_CallAdapter& by, CC_PropertyContainer const& from) { return by.setCallProperties(from); },
-    };
     constexpr unsigned int MOST = 30;
     for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
                              &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
-        for (Write const& write : writes)
+        for (Write const& write : EACH_WAY_TO_WRITE)
             for (bool const isThereBefore : {false, true})
                 for (bool const isSeenByTheOther : {false, true})
                     for (unsigned int skipped = 0; skipped < MOST; ++skipped)
@@ -614,6 +615,83 @@ TEST_F(HostileProperties, WhatIsWrittenInsideAnyDeedOfAPropertyIsSeenInTheEnd)
                     EXPECT_THAT(anna.observer.getFlagSets().back(), Contains(unsigned{DISPLAY})) << "deed " << skipped;
                 }
                 expectNothingLeft({&anna, &bert});
+                if (isOver)
+                    break;
+                ASSERT_LT(skipped + 1, MOST);
+            }
+}
+
+TEST_F(HostileProperties, WhatIsWrittenAnewInsideAnyDeedOfTheSamePropertyIsSeenAsItIsHeld)
+{
+    constexpr unsigned int MOST = 40;
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
+                             &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
+        for (Write const& write : EACH_WAY_TO_WRITE)
+            for (bool const isThereBefore : {false, true})
+                for (unsigned int skipped = 0; skipped < MOST; ++skipped)
+                {
+                    Party anna("anna"), bert("bert");
+                    connect(anna, bert);
+                    CC_PropertyContainer const values[] = {several(1), several(2), several(3)};
+                    if (isThereBefore)
+                    {
+                        ASSERT_EQ(write(*bert.adapter, values[0]), XCode::OK);
+                        settle();
+                    }
+                    unsigned int left = skipped;
+                    std::function<void()> act = [&]
+                    {
+                        if (left-- > 0)
+                            (*deeds).*event = act; // the next one
+                        else
+                            EXPECT_EQ(write(*bert.adapter, values[2]), XCode::OK);
+                    };
+                    (*deeds).*event = act;
+                    EXPECT_EQ(write(*bert.adapter, values[1]), XCode::OK);
+                    bool const isOver = (*deeds).*event != nullptr; // so many there are not
+                    *deeds = {};
+                    settle();
+                    std::string const when = "deed " + std::to_string(skipped);
+                    expectTrueViews(anna, when);
+                    expectTrueViews(bert, when + ", who writes");
+                    expectNothingLeft({&anna, &bert});
+                    if (isOver)
+                        break;
+                    ASSERT_LT(skipped + 1, MOST);
+                }
+}
+
+TEST_F(HostileProperties, WhatIsWrittenToACallInsideAnyDeedWhileALegJoinsItIsSeen)
+{
+    constexpr unsigned int MOST = 40;
+    for (auto const event : {&ActingProperty::Deeds::onClone, &ActingProperty::Deeds::onAssign,
+                             &ActingProperty::Deeds::onIsEqual, &ActingProperty::Deeds::onEnd})
+        for (bool const isByWhoIsMoved : {false, true})
+            for (unsigned int skipped = 0; skipped < MOST; ++skipped)
+            {
+                Party anna("anna"), bert("bert"), carl("carl"), dora("dora");
+                connect(anna, bert);
+                connect(carl, dora);
+                ASSERT_EQ(bert.adapter->setCallProperty(acting(1)), XCode::OK);
+                ASSERT_EQ(dora.adapter->setCallProperties(several(1)), XCode::OK);
+                settle();
+                unsigned int left = skipped;
+                std::function<void()> act = [&]
+                {
+                    if (left-- > 0)
+                        (*deeds).*event = act; // the next one
+                    else
+                        std::ignore =
+                            (isByWhoIsMoved ? dora : bert).adapter->setCallProperty(CC_PropertyString(DISPLAY, "late"));
+                };
+                (*deeds).*event = act;
+                EXPECT_EQ(anna.adapter->transfer(*carl.adapter, true), XCode::OK);
+                bool const isOver = (*deeds).*event != nullptr; // so many there are not
+                *deeds = {};
+                settle();
+                expectTrueViews(bert, "deed " + std::to_string(skipped));
+                expectTrueViews(dora, "deed " + std::to_string(skipped) + ", who is moved");
+                expectNothingLeft({&anna, &bert, &carl, &dora});
                 if (isOver)
                     break;
                 ASSERT_LT(skipped + 1, MOST);

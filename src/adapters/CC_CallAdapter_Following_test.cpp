@@ -213,6 +213,47 @@ TEST_F(CC_CallAdapter_Following_Test, AChangeThatComesBeforeTheAdapterHearsOfThe
     theCall().removeCallObserver(&guest);
 }
 
+TEST_F(CC_CallAdapter_Following_Test, AChangeInsideTheNewsThroughWhichTheLegJoinsIsSeenToo)
+{
+    /// Brings a leg into a call when it changes, and changes it again as soon as it is there.
+    struct Guest : CC_CallObserver, CC_CallLegObserver
+    {
+        explicit Guest(CC_Call& joined) : call(joined) {}
+        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
+        void onCallLegObservationEnded(CC_Event<CC_CallLeg> const&) override {}
+        void onCallLegCallRelinked(CC_Event<CC_CallLeg> const&) override {}
+        void onCallLegSynchronousService(CC_Event<CC_CallLeg> const&) override {}
+        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
+        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
+        {
+            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
+            EXPECT_TRUE(leg->setProperty(CC_PropertyString(NAME, "inside")).isOk());
+        }
+        void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event) override
+        {
+            if (event.getSource()->getCall() == nullptr)
+                EXPECT_TRUE(call.addCallLeg(*event.getSource()).isOk());
+        }
+        CC_Call& call;
+    };
+    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
+    ASSERT_TRUE(a.dial().isOk());
+    auto* const leg = new CC_CallLeg;
+    for (unsigned int const id : {NAME, DISPLAY})
+        ASSERT_TRUE(leg->setProperty(CC_PropertyString(id, "before")).isOk());
+    ASSERT_TRUE(leg->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::CONNECTED)).isOk());
+    Guest guest(theCall());
+    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter
+    ASSERT_TRUE(leg->addCallLegObserver(&guest).isOk());
+    ASSERT_TRUE(leg->setProperty(CC_PropertyString(DISPLAY, "outside")).isOk());
+    EXPECT_EQ(a.peer(NAME) + " " + a.peer(DISPLAY), "inside outside");
+    leg->removeCallLegObserver(&guest);
+    theCall().removeCallObserver(&guest);
+    theCall().removeCallLeg(*leg);
+    leg->removeReference();
+}
+
 TEST_F(CC_CallAdapter_Following_Test, WhatChangedBehindAFailingFilterIsSeenWithoutIt)
 {
     connect();

@@ -66,10 +66,10 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
     if (relinked.getNewCall() != nullptr)
     {
         m_callView.interrupt();
+        observeCall(*relinked.getNewCall()); // first: what filters and properties write to it meanwhile is told us
         updateCall();
         if (attempt.isOver())
             return;
-        observeCall(*relinked.getNewCall());
     }
     linkPeerCallLeg();
 }
@@ -151,7 +151,7 @@ namespace
 /// `changed`: the ids of which the leg tells; null when it is not telling.
 CC_PropertyView::Told TOLD(CC_CallLeg const& leg, CC_Flags const* changed)
 {
-    return {leg.mayChangeUntold() ? nullptr : changed, leg.getNumberOfNotifications()};
+    return {leg.mayChangeUntold() || !leg.isTellingTheLast() ? nullptr : changed, leg.getNumberOfNotifications()};
 }
 } // namespace
 

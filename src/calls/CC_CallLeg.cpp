@@ -355,8 +355,9 @@ void CC_CallLeg::markChanged(unsigned int id, CC_Flags& flags)
 /// Hands the flags over: a copy could lack memory, and the call must hear of a State.
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
-    ++m_numberOfNotifications;
+    unsigned int const outer = std::exchange(m_told, ++m_numberOfNotifications);
     CC_RecordWriter::ON() == nullptr ? tell(flags) : tellRecorded(flags);
+    m_told = outer;
 }
 
 void CC_CallLeg::tell(CC_Flags& flags)

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <tuple>
+#include <utility>
 
 namespace
 {
@@ -207,16 +208,24 @@ XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& prop
         return CC_Property::ASSIGN(*stored, property); // and nothing else: an assign may destroy us
     CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
     if (kind == nullptr)
-        return appendForeign(property);
+        return appendForeign(property, Watch(*this));
     if (!appendCopy(property))
         return XCode::NO_ELEMENT;
     m_isSelfContained = m_isSelfContained && kind->isSelfContained;
     return XCode::OK;
 }
 
-XCode CC_PropertyContainer::appendForeign(CC_Property const& property)
+XCode CC_PropertyContainer::set(CC_Property const& property, Following const& self)
 {
-    Watch const self(*this);
+    if (find(property.getId()) != nullptr || CC_PropertyKind::OF(property) != nullptr)
+        return set(property);
+    markAll();
+    return appendForeign(property, self.m_watch);
+}
+
+/// `self`: whether that is still to be done when the property has been cloned.
+XCode CC_PropertyContainer::appendForeign(CC_Property const& property, Watch const& self)
+{
     CC_Property* const copy = property.clone();
     if (copy == nullptr)
         return XCode::NO_ELEMENT;
@@ -288,6 +297,21 @@ XCode CC_PropertyContainer::setEach(CC_PropertyContainer const& other, unsigned 
     for (Walk source(other); !source.isAtEnd() && self.isAlive(); source.goOn())
         setOne(*source);
     return result;
+}
+
+void CC_PropertyContainer::swap(CC_PropertyContainer& other)
+{
+    unsigned int const taken = other.m_properties.getCount();
+    while (!m_properties.isEmpty())
+        m_properties.moveTo(other.m_properties, *m_properties.begin());
+    for (unsigned int i = 0; i < taken; ++i)
+        other.m_properties.moveTo(m_properties, *other.m_properties.begin());
+    markAll();
+    other.markAll();
+    std::swap(m_isSelfContained, other.m_isSelfContained);
+    bool const hasForeign = m_hasForeign;
+    m_hasForeign = other.m_hasForeign;
+    other.m_hasForeign = hasForeign;
 }
 
 void CC_PropertyContainer::take(CC_PropertyContainer& other)

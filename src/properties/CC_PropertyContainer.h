@@ -344,6 +344,10 @@ private:
     /// As `set`, for who has looked the property up, but marks nothing: `stored` is what was found by its id, null
     /// included.
     XCode replace(CC_Property* stored, CC_Property const& property);
+    /// As `set`, for who follows: where that was begun by somebody else inside a clone, what is stored by then stays.
+    XCode set(CC_Property const& property, Following const& self);
+    /// Both have what the other had; nobody is called.
+    void swap(CC_PropertyContainer& other);
     /// As `set`, but takes the properties themselves; those of no group stay behind. REQUIRES: this container is empty.
     void take(CC_PropertyContainer& other);
 
@@ -365,7 +369,7 @@ private:
     /// Makes it a copy of the other; how many at the beginning are the objects that they were before. REQUIRES: as
     /// above.
     unsigned int takeOver(CC_PropertyContainer const& other);
-    [[gnu::noinline]] XCode appendForeign(CC_Property const& property);
+    [[gnu::noinline]] XCode appendForeign(CC_Property const& property, Watch const& self);
     [[gnu::noinline]] void clearOfAnyKind();
     [[gnu::noinline]] XCode setDisturbed(CC_PropertyContainer const& other, unsigned int mask);
     void removeFrom(Position position);

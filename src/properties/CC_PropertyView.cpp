@@ -36,9 +36,23 @@ void CC_PropertyView::assign(CC_PropertyContainer const& source, Told const& tol
     m_lastHeard = told.number;
     m_written = NONE;
     m_inStepWith = nullptr;
-    m_properties = source; // a module's class may destroy us meanwhile
-    if (isUndisturbed && m_properties.getNumberOfProperties() == source.getNumberOfProperties())
+    m_properties.interruptFollowing(); // who assigns later knows more
+    if (!isUndisturbed)
+        return assignCopy(source);
+    m_properties = source;
+    if (m_properties.getNumberOfProperties() == source.getNumberOfProperties())
         m_inStepWith = &source;
+}
+
+/// A module's class may do anything when it is cloned or ended: assign as well, which is then the later time, or
+/// destroy us.
+void CC_PropertyView::assignCopy(CC_PropertyContainer const& source)
+{
+    CC_PropertyContainer::Following const self(m_properties);
+    CC_PropertyContainer copy;
+    std::ignore = copy.copy(source); // what memory refuses is missing
+    if (self.isAlive())
+        m_properties.swap(copy); // what was there before ends last
 }
 
 void CC_PropertyView::assignMarked(CC_PropertyContainer const& copy, CC_PropertyContainer::Marks marks,

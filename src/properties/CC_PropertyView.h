@@ -234,7 +234,7 @@ private:
             if (isSame)
                 continue;
             onDifference(current.getId()); // first: who follows inside the assignment finds no difference any more
-            std::ignore = m_properties.set(current); // what memory refuses differs the next time as well
+            std::ignore = m_properties.set(current, self); // what memory refuses differs the next time as well
             if (!self.isAlive())
                 return;
         }
@@ -259,6 +259,7 @@ private:
         }
     }
 
+    void assignCopy(CC_PropertyContainer const& source);
     static bool hasAllOfOwnKinds(CC_PropertyContainer const& copy, CC_PropertyContainer const& source);
 
     CC_PropertyContainer m_properties;

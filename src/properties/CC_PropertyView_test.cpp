@@ -346,3 +346,50 @@ TEST_F(CC_PropertyViewOfAModulesClass_Test, EndingItMayClearTheView)
     view.assign(source, TELL(nullptr));
     EXPECT_EQ(seen(), "");
 }
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, AssignedAgainInsideAnyCloneItIsACopyOfWhatWasThereThen)
+{
+    for (unsigned int skipped = 0; skipped < 3; ++skipped)
+    {
+        act(2);
+        unsigned int left = skipped;
+        std::function<void()> assignAnew = [&]
+        {
+            if (left-- > 0)
+            {
+                deeds->onClone = assignAnew; // the next one
+                return;
+            }
+            act(3);
+            view.assign(source, TELL(nullptr));
+        };
+        deeds->onClone = assignAnew;
+        view.assign(source, TELL(nullptr));
+        *deeds = {};
+        EXPECT_EQ(seen(), TEXT_OF(source)) << "clone " << skipped;
+    }
+}
+
+TEST_F(CC_PropertyViewOfAModulesClass_Test, FollowingAgainInsideAnyCloneItSeesWhatIsThereThen)
+{
+    for (unsigned int skipped = 0; skipped < 3; ++skipped)
+    {
+        view.clear();
+        act(2);
+        unsigned int left = skipped;
+        std::function<void()> followAnew = [&]
+        {
+            if (left-- > 0)
+            {
+                deeds->onClone = followAnew; // the next one
+                return;
+            }
+            act(3);
+            followAll();
+        };
+        deeds->onClone = followAnew;
+        followAll();
+        *deeds = {};
+        EXPECT_EQ(seen(), TEXT_OF(source)) << "clone " << skipped;
+    }
+}

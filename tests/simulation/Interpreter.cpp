@@ -75,14 +75,19 @@ std::size_t Interpreter::carryOut(std::size_t place, std::size_t end)
     m_world.m_areLegsDisturbed = m_world.m_areLegsDisturbed || MAY_MOVE_OTHER_LEGS(operation.code);
     bool const isToFail = std::exchange(m_isToFail, false);
     if (isToFail && operation.code == Code::DUMP)
-        Memory::FAIL_NTH(0); // dumps throw
+        failAllocation(0); // dumps throw
     perform(operation);
+    m_world.noteMemory();
     if (isToFail)
-    {
-        m_world.m_wasShortOfMemory = m_world.m_wasShortOfMemory || Memory::HAS_FAILED();
-        Memory::FAIL_NTH(0);
-    }
+        failAllocation(0);
     return place + 1;
+}
+
+/// Maybe inside an operation that lacks memory itself, or will.
+void Interpreter::failAllocation(unsigned int n)
+{
+    m_world.noteMemory();
+    Memory::FAIL_NTH(n);
 }
 
 // The one table of what operations do: long, and nothing but that.
@@ -246,9 +251,8 @@ void Interpreter::perform(Operation const& operation)
     case Code::STOP_OBSERVING:
         observe(operation, -1);
         break;
-    case Code::FAIL_ALLOCATION: // maybe inside an operation that lacks memory itself
-        m_world.m_wasShortOfMemory = m_world.m_wasShortOfMemory || Memory::HAS_FAILED();
-        Memory::FAIL_NTH(1 + operation[0]);
+    case Code::FAIL_ALLOCATION:
+        failAllocation(1 + operation[0]);
         m_isToFail = true;
         break;
     case Code::OTHER_THREAD:

@@ -28,6 +28,7 @@ private:
     void carryOutAll(std::size_t begin, std::size_t end);
     std::size_t announce(std::size_t place, std::size_t end);
     void perform(Operation const& operation);
+    void failAllocation(unsigned int n);
 
     void turn(unsigned int turns);
     XCode dial(Operation const& operation);

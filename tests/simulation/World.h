@@ -85,6 +85,8 @@ public:
     void makeAdapter(unsigned int line, unsigned int kind);
     void giveUpLeg(unsigned int index);
     bool isBlank(CC_Call const& call) const;
+    /// An operation may have run out of memory.
+    void noteMemory() { m_wasShortOfMemory = m_wasShortOfMemory || Memory::HAS_FAILED(); }
     /// A guest leg was sent into the call (null: into none), and the library said that this is done, or will be.
     void noteMove(unsigned int leg, CC_Call* to);
     /// Ends everything of the run, so that nothing may be left.
