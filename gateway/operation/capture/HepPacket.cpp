@@ -28,30 +28,43 @@ constexpr unsigned int GENERIC = 0;    // the vendor of all these chunks
 constexpr unsigned char VERSION_4 = 2;
 constexpr unsigned char VERSION_6 = 10;
 
-void ADD_NUMBER(std::string& octets, std::uint32_t value, unsigned int length)
+/// Writes into room that suffices.
+class Writer
 {
-    for (unsigned int i = length; i-- > 0;)
-        octets += static_cast<char>(value >> (8 * i) & 0xff);
-}
+public:
+    explicit Writer(char* place) : m_place(place) {}
 
-void ADD_HEAD(std::string& octets, Chunk chunk, std::size_t length)
-{
-    ADD_NUMBER(octets, GENERIC, 2);
-    ADD_NUMBER(octets, chunk, 2);
-    ADD_NUMBER(octets, static_cast<std::uint32_t>(HEAD_LENGTH + length), 2);
-}
+    void addNumber(std::uint32_t value, unsigned int length)
+    {
+        for (unsigned int i = length; i-- > 0;)
+            *m_place++ = static_cast<char>(value >> (8 * i) & 0xff);
+    }
+    void add(std::string_view text)
+    {
+        text.copy(m_place, text.size());
+        m_place += text.size();
+    }
+    void add(Chunk chunk, std::string_view value)
+    {
+        addHead(chunk, value.size());
+        add(value);
+    }
+    void add(Chunk chunk, std::uint32_t value, unsigned int length)
+    {
+        addHead(chunk, length);
+        addNumber(value, length);
+    }
 
-void ADD(std::string& octets, Chunk chunk, std::string_view value)
-{
-    ADD_HEAD(octets, chunk, value.size());
-    octets += value;
-}
+private:
+    void addHead(Chunk chunk, std::size_t length)
+    {
+        addNumber(GENERIC, 2);
+        addNumber(chunk, 2);
+        addNumber(static_cast<std::uint32_t>(HEAD_LENGTH + length), 2);
+    }
 
-void ADD(std::string& octets, Chunk chunk, std::uint32_t value, unsigned int length)
-{
-    ADD_HEAD(octets, chunk, length);
-    ADD_NUMBER(octets, value, length);
-}
+    char* m_place;
+};
 
 std::string_view HOST_OF(sockaddr const& address)
 {
@@ -63,6 +76,17 @@ std::string_view HOST_OF(sockaddr const& address)
 
 /// At the same place in both versions.
 std::uint32_t PORT_OF(sockaddr const& address) { return ntohs(reinterpret_cast<sockaddr_in const&>(address).sin_port); }
+
+std::size_t SIZE_OF(std::string_view text) { return text.empty() ? 0 : HEAD_LENGTH + text.size(); }
+
+/// Of everything; the chunks of numbers have 1 + 1 + 2 + 2 + 4 + 4 + 1 + 4 octets.
+std::size_t SIZE_OF(CapturedMessage const& message, std::string_view password)
+{
+    std::size_t const numbers = 8 * HEAD_LENGTH + 19;
+    std::size_t const hosts = 2 * (HEAD_LENGTH + HOST_OF(message.from).size());
+    return HEAD_LENGTH + numbers + hosts + SIZE_OF(password) + SIZE_OF(message.correlation) + HEAD_LENGTH +
+           message.payload.size();
+}
 } // namespace
 
 void HepPacket::ENCODE(std::string& octets, CapturedMessage const& message, std::uint32_t agent,
@@ -70,30 +94,26 @@ void HepPacket::ENCODE(std::string& octets, CapturedMessage const& message, std:
 {
     bool const isVersion4 = message.from.sa_family == AF_INET;
     auto const now = std::chrono::duration_cast<std::chrono::microseconds>(message.time.time_since_epoch()).count();
-    octets = BEGINNING_OF_PACKET;
-    octets.reserve(256 + password.size() + message.correlation.size() + message.payload.size());
-    octets.append(2, '\0'); // the length
-    ADD(octets, FAMILY, isVersion4 ? VERSION_4 : VERSION_6, 1);
-    ADD(octets, TRANSPORT, message.transport, 1);
-    ADD(octets, isVersion4 ? FROM_VERSION_4 : FROM_VERSION_6, HOST_OF(message.from));
-    ADD(octets, isVersion4 ? TO_VERSION_4 : TO_VERSION_6, HOST_OF(message.to));
-    ADD(octets, FROM_PORT, PORT_OF(message.from), 2);
-    ADD(octets, TO_PORT, PORT_OF(message.to), 2);
-    ADD(octets, SECONDS, static_cast<std::uint32_t>(now / 1000000), 4);
-    ADD(octets, MICROSECONDS, static_cast<std::uint32_t>(now % 1000000), 4);
-    ADD(octets, PROTOCOL, message.protocol, 1);
-    ADD(octets, AGENT, agent, 4);
-    if (!password.empty())
-        ADD(octets, PASSWORD, password);
-    if (!message.correlation.empty())
-        ADD(octets, CORRELATION, message.correlation);
-    if (octets.size() + HEAD_LENGTH + message.payload.size() > LONGEST)
-    {
-        octets.clear();
+    std::size_t const size = SIZE_OF(message, password);
+    octets.resize(size <= LONGEST ? size : 0);
+    if (octets.empty())
         return;
-    }
-    ADD(octets, PAYLOAD, message.payload);
-    std::string length;
-    ADD_NUMBER(length, static_cast<std::uint32_t>(octets.size()), 2);
-    octets.replace(BEGINNING_OF_PACKET.size(), length.size(), length);
+    Writer writer(octets.data());
+    writer.add(BEGINNING_OF_PACKET);
+    writer.addNumber(static_cast<std::uint32_t>(size), 2);
+    writer.add(FAMILY, isVersion4 ? VERSION_4 : VERSION_6, 1);
+    writer.add(TRANSPORT, message.transport, 1);
+    writer.add(isVersion4 ? FROM_VERSION_4 : FROM_VERSION_6, HOST_OF(message.from));
+    writer.add(isVersion4 ? TO_VERSION_4 : TO_VERSION_6, HOST_OF(message.to));
+    writer.add(FROM_PORT, PORT_OF(message.from), 2);
+    writer.add(TO_PORT, PORT_OF(message.to), 2);
+    writer.add(SECONDS, static_cast<std::uint32_t>(now / 1000000), 4);
+    writer.add(MICROSECONDS, static_cast<std::uint32_t>(now % 1000000), 4);
+    writer.add(PROTOCOL, message.protocol, 1);
+    writer.add(AGENT, agent, 4);
+    if (!password.empty())
+        writer.add(PASSWORD, password);
+    if (!message.correlation.empty())
+        writer.add(CORRELATION, message.correlation);
+    writer.add(PAYLOAD, message.payload);
 }
