@@ -56,9 +56,9 @@ relay $((PORT + 7)) "$PORT_B" open
 relay $((PORT + 14)) "$PORT_B" guessing $GUESSER
 
 # an address that is for others
-attack 1 svmap -p $((PORT + 6)) -P $((PORT + 8)) $ATTACKER
+attack 3 svmap -p $((PORT + 6)) -P $((PORT + 8)) $ATTACKER
 grep -q "$((PORT + 6))" "$WORK/attack.log" && fail "svmap has found it: $(cat "$WORK/attack.log")"
-timeout 1 sipsak -s "sip:100@$ATTACKER:$((PORT + 6))" >"$WORK/attack.log" 2>&1 && fail "sipsak got an answer"
+timeout 3 sipsak -s "sip:100@$ATTACKER:$((PORT + 6))" >"$WORK/attack.log" 2>&1 && fail "sipsak got an answer"
 read -r in out <"$WORK/closed.octets"
 ((in > 300 && out == 0)) || fail "$out octets for $in at an address that is for others"
 
@@ -69,16 +69,17 @@ attack 3 svwar -p $((PORT + 7)) -P $((PORT + 9)) -m INVITE --force -e alice,bob,
 grep -q 'alice' "$WORK/attack.log" && ! grep -q 'dave' "$WORK/attack.log" && fail "svwar tells users from others: $(cat "$WORK/attack.log")"
 # a flood of what nobody has asked for
 attack 10 python3 - $ATTACKER $((PORT + 7)) <<'END'
-import socket, sys
+import socket, sys, time
 s = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
 s.bind(("127.0.0.77", 0))
 for method in ("OPTIONS", "INVITE", "CANCEL", "REGISTER"):
     for i in range(200):
         s.sendto(f"{method} sip:1@h SIP/2.0\r\nVia: SIP/2.0/UDP 127.0.0.77;rport;branch=z9hG4bK{method}{i}\r\nFrom: <sip:1@h>;tag=1\r\n"
                  f"To: <sip:1@h>\r\nCall-ID: {method}{i}\r\nCSeq: 1 {method}\r\n\r\n".encode(), (sys.argv[1], int(sys.argv[2])))
+        if i % 10 == 9: time.sleep(0.01) # or what is in between loses some
 END
 registering || fail "a phone that knows its password is not served: $(cat "$WORK/sipsak.log")"
-expect_octets open 100000
+expect_octets open 60000
 
 # and what the password is
 timeout 30 svcrack -p $((PORT + 14)) -P $((PORT + 15)) -u bob -r 1-40 -z 2 $GUESSER >"$WORK/attack.log" 2>&1 & # as long as it tries

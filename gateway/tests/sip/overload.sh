@@ -3,7 +3,7 @@
 
 caller() {
     call_up
-    pause 700
+    pause 2500
     send_bye
     expect 200
 }
