@@ -213,6 +213,46 @@ TEST_F(CC_CallAdapter_Following_Test, AChangeThatComesBeforeTheAdapterHearsOfThe
     theCall().removeCallObserver(&guest);
 }
 
+TEST_F(CC_CallAdapter_Following_Test, AChangeOfAJoiningLegThatLooksLikeTheFormerPeerIsSeenToo)
+{
+    /// Makes way for a leg that joins, and changes that as well.
+    struct Guest : CC_CallObserver
+    {
+        explicit Guest(CC_CallLeg& peer) : former(peer) {}
+        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
+        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
+        {
+            EXPECT_TRUE(former.setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::RELEASED)).isOk());
+            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
+            EXPECT_TRUE(leg->setProperty(CC_PropertyString(NAME, "by the guest")).isOk());
+        }
+        CC_CallLeg& former;
+    };
+    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
+    ASSERT_TRUE(a.dial().isOk());
+    CC_CallLeg* const legs[] = {new CC_CallLeg, new CC_CallLeg};
+    for (CC_CallLeg* const leg : legs)
+    {
+        ASSERT_TRUE(leg->setProperty(CC_PropertyString(NAME, "alike")).isOk());
+        ASSERT_TRUE(leg->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::CONNECTED)).isOk());
+    }
+    ASSERT_TRUE(theCall().addCallLeg(*legs[0]).isOk());
+    settle();
+    Guest guest(*legs[0]);
+    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter
+    ASSERT_TRUE(theCall().addCallLeg(*legs[1]).isOk());
+    settle();
+    EXPECT_EQ(a.peer(NAME), "by the guest");
+    theCall().removeCallObserver(&guest);
+    for (CC_CallLeg* const leg : legs)
+    {
+        theCall().removeCallLeg(*leg);
+        leg->removeReference();
+    }
+}
+
 TEST_F(CC_CallAdapter_Following_Test, AChangeInsideTheNewsThroughWhichTheLegJoinsIsSeenToo)
 {
     /// Brings a leg into a call when it changes, and changes it again as soon as it is there.

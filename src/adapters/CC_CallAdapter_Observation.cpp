@@ -290,6 +290,9 @@ bool CC_CallAdapter::linkPeerCallLeg()
         GIVE_UP(*previous);
     if (!attempt.isOver())
         updatePeerCallLeg(nullptr);
+    bool const isOnItsWay = !attempt.isOver() && m_peerCallLeg != nullptr && m_peerCallLeg->m_move != nullptr;
+    if (isOnItsWay && m_peerChangeEvent != nullptr)
+        std::ignore = m_peerChangeEvent->setIfNotPending(); // to catch up, also where it looked like the former one
     return true;
 }
 
