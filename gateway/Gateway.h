@@ -103,7 +103,7 @@ private:
     std::unique_ptr<CallRecords> m_records; // null where it is not configured
     CallMetrics m_callMetrics;
     CallTracer m_tracer;
-    CallWatch m_watch;                  // calls may last until call control ends
+    CallWatch m_watch;                     // calls may last until call control ends
     std::unique_ptr<HepCapture> m_capture; // null where it is not configured
     CallControlHost m_callControl;
     GatewayHost m_host;

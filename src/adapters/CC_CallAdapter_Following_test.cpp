@@ -273,7 +273,9 @@ TEST_F(CC_CallAdapter_Following_Test, AChangeInsideTheNewsThroughWhichTheLegJoin
         void onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event) override
         {
             if (event.getSource()->getCall() == nullptr)
+            {
                 EXPECT_TRUE(call.addCallLeg(*event.getSource()).isOk());
+            }
         }
         CC_Call& call;
     };

@@ -2,9 +2,9 @@
 
 #include "callcontrol/CC_CallPool.h"
 #include "callcontrol/version.h"
+#include "host/Capture.h"
 #include "host/SignallingLoop.h"
 #include "operation/Log.h"
-#include "host/Capture.h"
 #include "operation/metric/ProcessMetrics.h"
 #include "operation/record/CallRecords.h"
 #include "operation/record/CallWatch.h"

@@ -35,8 +35,8 @@ try
     sockaddr const& own = *tport_get_address(tport_parent(port))->ai_addr;
     unsigned char const transport = tport_is_udp(port) ? IPPROTO_UDP : IPPROTO_TCP;
     std::string const text = TEXT_OF(message);
-    s_capture->show(
-        {CapturedMessage::SIP, transport, isOurs ? own : far, isOurs ? far : own, std::chrono::system_clock::now(), text});
+    s_capture->show({CapturedMessage::SIP, transport, isOurs ? own : far, isOurs ? far : own,
+                     std::chrono::system_clock::now(), text});
 }
 catch (std::bad_alloc const&)
 {
