@@ -26,6 +26,15 @@ namespace
 unsigned int s_infoDepth = 0;
 unsigned long long s_lastSerial = 0;
 
+/// A leg's news that is under way, on the stack of who tells it.
+struct Telling
+{
+    CC_CallLeg const& leg;
+    unsigned int number;
+    Telling const* outer;
+};
+Telling const* s_telling = nullptr;
+
 /// Whether somebody logs it.
 bool LOG_PROPERTY(String const& legName, CC_Property const& property)
 {
@@ -355,9 +364,18 @@ void CC_CallLeg::markChanged(unsigned int id, CC_Flags& flags)
 /// Hands the flags over: a copy could lack memory, and the call must hear of a State.
 void CC_CallLeg::notifyPropertyChange(CC_Flags& flags)
 {
-    unsigned int const outer = std::exchange(m_told, ++m_numberOfNotifications);
+    Telling const telling{*this, ++m_numberOfNotifications, s_telling};
+    s_telling = &telling;
     CC_RecordWriter::ON() == nullptr ? tell(flags) : tellRecorded(flags);
-    m_told = outer;
+    s_telling = telling.outer;
+}
+
+bool CC_CallLeg::isTellingTheLast() const
+{
+    Telling const* telling = s_telling;
+    while (telling != nullptr && &telling->leg != this)
+        telling = telling->outer;
+    return telling != nullptr && telling->number == m_numberOfNotifications;
 }
 
 void CC_CallLeg::tell(CC_Flags& flags)

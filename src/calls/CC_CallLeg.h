@@ -86,7 +86,7 @@ public:
     unsigned int getNumberOfNotifications() const { return m_numberOfNotifications; }
     /// Whether that is the one under way. Otherwise another was told inside it, of which who observes the leg only
     /// since then has not heard.
-    bool isTellingTheLast() const { return m_told == m_numberOfNotifications; }
+    bool isTellingTheLast() const;
 
     /// Stores the property unless it equals the stored one, and tells nobody; `changed` says whether it was stored.
     /// OK; REFUSED for a State that is IDLE or of another class (a leg never goes back to IDLE), or when memory is out.
@@ -171,7 +171,6 @@ private:
     bool m_isStateFixed = false;           // at RELEASED, for good
     int m_state;                           // of the State property, unless it may have changed past us
     unsigned int m_numberOfNotifications = 0;
-    unsigned int m_told = 0;           // the innermost notification that is under way, as they are counted
     unsigned long long m_lastWalk = 0; // the last of a call's walks over its legs that took this one out
     unsigned long long const m_serial;
     CC_Moment const m_start;

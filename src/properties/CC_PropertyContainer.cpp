@@ -208,7 +208,7 @@ XCode CC_PropertyContainer::replace(CC_Property* stored, CC_Property const& prop
         return CC_Property::ASSIGN(*stored, property); // and nothing else: an assign may destroy us
     CC_PropertyKind const* const kind = CC_PropertyKind::OF(property);
     if (kind == nullptr)
-        return appendForeign(property, Watch(*this));
+        return appendForeign(property);
     if (!appendCopy(property))
         return XCode::NO_ELEMENT;
     m_isSelfContained = m_isSelfContained && kind->isSelfContained;
@@ -222,6 +222,8 @@ XCode CC_PropertyContainer::set(CC_Property const& property, Following const& se
     markAll();
     return appendForeign(property, self.m_watch);
 }
+
+XCode CC_PropertyContainer::appendForeign(CC_Property const& property) { return appendForeign(property, Watch(*this)); }
 
 /// `self`: whether that is still to be done when the property has been cloned.
 XCode CC_PropertyContainer::appendForeign(CC_Property const& property, Watch const& self)

@@ -369,7 +369,8 @@ private:
     /// Makes it a copy of the other; how many at the beginning are the objects that they were before. REQUIRES: as
     /// above.
     unsigned int takeOver(CC_PropertyContainer const& other);
-    [[gnu::noinline]] XCode appendForeign(CC_Property const& property, Watch const& self);
+    [[gnu::noinline]] XCode appendForeign(CC_Property const& property);
+    XCode appendForeign(CC_Property const& property, Watch const& self);
     [[gnu::noinline]] void clearOfAnyKind();
     [[gnu::noinline]] XCode setDisturbed(CC_PropertyContainer const& other, unsigned int mask);
     void removeFrom(Position position);
