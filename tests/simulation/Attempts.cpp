@@ -10,6 +10,7 @@
 #include <fcntl.h>
 #include <new>
 #include <sys/mman.h>
+#include <sys/time.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -17,7 +18,8 @@ namespace Simulation
 {
 namespace
 {
-constexpr unsigned int LONGEST_RUN = 20; // seconds; an honest one takes milliseconds
+constexpr unsigned int LONGEST_RUN = 20; // seconds of the processor; an honest one takes milliseconds
+constexpr unsigned int LONGEST_WAIT = 60;
 
 void BE_SILENT()
 {
@@ -46,11 +48,19 @@ Report& SHARED_REPORT()
     return *report;
 }
 
+void LIMIT_TIME()
+{
+    itimerval const ofTheProcessor{{}, {LONGEST_RUN, 0}};
+    setitimer(ITIMER_PROF, &ofTheProcessor, nullptr);
+    alarm(LONGEST_WAIT);
+}
+
 Ended ENDED(int status)
 {
+    if (WIFSIGNALED(status) && (WTERMSIG(status) == SIGPROF || WTERMSIG(status) == SIGALRM))
+        return {true, "it hangs"};
     if (WIFSIGNALED(status))
-        return {true,
-                WTERMSIG(status) == SIGALRM ? "it hangs" : std::string("it crashes: ") + strsignal(WTERMSIG(status))};
+        return {true, std::string("it crashes: ") + strsignal(WTERMSIG(status))};
     if (WEXITSTATUS(status) == 0)
         return {};
     char const* const failure = SHARED_REPORT().failure;
@@ -69,7 +79,7 @@ Ended ATTEMPT(Operations const& operations, bool isSilent)
     {
         if (isSilent)
             BE_SILENT();
-        alarm(LONGEST_RUN);
+        LIMIT_TIME();
         Outcome const outcome = RUN(operations, &report.progress);
         report.setFailure(outcome.failure);
         _exit(outcome.hasFailed() ? 1 : 0);

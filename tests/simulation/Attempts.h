@@ -24,6 +24,10 @@ struct Report
 /// In memory that a forked process shares; lives as long as the process.
 Report& SHARED_REPORT();
 
+/// From now on this process ends when some runs would have long ended: by the time of the processor, which is not the
+/// machine's when that is busy, and by the clock for who waits for ever.
+void LIMIT_TIME();
+
 /// How a run ended that was made in a process of its own.
 struct Ended
 {

@@ -87,7 +87,7 @@ bool READ(int count, char** texts, Arguments& arguments)
     {
         report.seed = seed;
         if (seed % 64 == 0 || seed == arguments.seed)
-            alarm(20);
+            LIMIT_TIME();
         Outcome const outcome = RUN(GENERATE(seed), &report.progress);
         report.operations += outcome.operations;
         ++report.runs;
