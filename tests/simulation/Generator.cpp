@@ -119,6 +119,12 @@ public:
                 resetInside(operations);
             else if (m_isHostile && m_random.isOneIn(80))
                 dialInsideAProperty(operations);
+            else if (m_isHostile && m_random.isOneIn(80))
+                changeOnTheWayIn(operations);
+            else if (m_isHostile && m_random.isOneIn(80))
+                comeTooLate(operations);
+            else if (m_isHostile && operations.front()[5] != 0 && m_random.isOneIn(80))
+                dropInsideAFilter(operations);
             else if (m_random.isOneIn(80))
                 leaveToTheCall(operations);
             else if (m_random.isOneIn(40))
@@ -206,6 +212,84 @@ private:
         operations.push_back({Code::DROP, {line}});
         operations.push_back(dialBy(line));
         operations.push_back({write, {line, ACTING, 1}});
+        operations.push_back({Code::SETTLE});
+    }
+    /// A leg changes after it has joined a call and before all hear of it who are going to.
+    void changeOnTheWayIn(Operations& operations)
+    {
+        constexpr std::uint8_t STATE = 3;
+        constexpr std::uint8_t CONNECTED = 8;
+        auto const leg = static_cast<std::uint8_t>(m_random.below(3));
+        auto const line = static_cast<std::uint8_t>(m_random.below(4));
+        auto const guest = static_cast<std::uint8_t>(m_random.below(6));
+        operations.push_back(dialBy(line));
+        operations.push_back({Code::TURN});
+        operations.push_back({Code::NEW_LEG, {leg, 1, CONNECTED}});
+        operations.push_back({Code::OBSERVE, {guest, 0, 2, line}}); // its call
+        operations.push_back({Code::OBSERVE, {static_cast<std::uint8_t>(m_random.below(6)), 2, 0, leg}});
+        operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::LEG_ADDED), 0, 0}});
+        operations.push_back({Code::SET_LEG, {leg, STATE, static_cast<std::uint8_t>(m_random.below(6))}});
+        if (m_random.isOneIn(2))
+        {
+            operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::LEG_RELINKED), 0, 0}});
+            operations.push_back({Code::SET_LEG, {leg, static_cast<std::uint8_t>(m_random.below(3)), m_last}});
+        }
+        operations.push_back({Code::ADD_LEG, {leg, 2, line}});
+        operations.push_back({Code::SETTLE});
+    }
+    /// A leg is to come into a call that is given back meanwhile, or back into one that ends, or leaves one.
+    void comeTooLate(Operations& operations)
+    {
+        constexpr std::uint8_t THAT_TELLS_OF_ITS_END = 7;
+        auto const leg = static_cast<std::uint8_t>(m_random.below(4));
+        auto const guest = static_cast<std::uint8_t>(2 * m_random.below(3)); // who observes legs one by one
+        auto const call = static_cast<std::uint8_t>(m_random.below(3));
+        operations.push_back({Code::NEW_LEG, {leg, 1, static_cast<std::uint8_t>(m_random.below(9))}});
+        if (m_random.isOneIn(2))
+        {
+            operations.push_back({Code::NEW_CALL, {leg}});
+            operations.push_back({Code::OBSERVE, {guest, 0, 3, leg}});
+            operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::CALL_ENDED), 0, 0}});
+            operations.push_back({Code::ADD_LEG, {leg, THAT_TELLS_OF_ITS_END}});
+            operations.push_back({Code::NEW_CALL, {leg, 1}}); // which ends it
+            return;
+        }
+        auto const inContext = static_cast<std::uint8_t>(3 * call);
+        bool const isLeaving = m_random.isOneIn(2);
+        operations.push_back({Code::ACQUIRE, {0}});
+        operations.push_back({Code::ACQUIRE, {0}});
+        if (isLeaving)
+        {
+            operations.push_back({Code::ADD_LEG, {leg, 0, inContext}});
+            operations.push_back({Code::OBSERVE, {guest, 0, 0, inContext}});
+            operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::LEG_REMOVED), 0, 0}});
+        }
+        else
+        {
+            operations.push_back({Code::OBSERVE, {guest, 2, 0, leg}});
+            operations.push_back({Code::WHEN, {static_cast<std::uint8_t>(CallOut::LEG_RELINKED), 0, 1}});
+            operations.push_back({Code::MOVE_LEG, {leg, 0, inContext}});
+        }
+        operations.push_back({Code::RELEASE, {0, call}});
+        operations.push_back({Code::ADD_LEG, {leg, 0, static_cast<std::uint8_t>(3 * m_random.below(3))}});
+    }
+    /// A line goes while a filter looks at what it is to see, or at what it writes.
+    void dropInsideAFilter(Operations& operations)
+    {
+        static constexpr Code ENDS[] = {Code::DROP, Code::CLEANUP, Code::DESTROY_ADAPTER};
+        auto const line = static_cast<std::uint8_t>(m_random.below(4));
+        auto const module = static_cast<std::uint8_t>(line / 2);
+        auto const isOutput = static_cast<std::uint8_t>(m_random.below(2));
+        CallOut const place = isOutput != 0 ? CallOut::OUTPUT_FILTER : CallOut::INPUT_FILTER;
+        operations.push_back({Code::USE_FILTERS, {module, isOutput, 1}});
+        operations.push_back({Code::CHANGE_FILTERS, {module, isOutput}});
+        operations.push_back(dialBy(line));
+        operations.push_back(
+            {Code::WHEN, {static_cast<std::uint8_t>(place), static_cast<std::uint8_t>(m_random.below(4)), 1}});
+        operations.push_back({m_random.isOneIn(2) ? Code::EMPTY_CALL : Code::OBSERVE, {2, line}});
+        operations.push_back({ENDS[m_random.below(std::size(ENDS))], {line}});
+        operations.push_back({Code::SET_OWN, {line, 0, 1}});
+        operations.push_back({Code::SET_ON_CALL, {2, line}});
         operations.push_back({Code::SETTLE});
     }
     Operation dialBy(std::uint8_t line)

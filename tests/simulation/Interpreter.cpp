@@ -165,11 +165,7 @@ void Interpreter::perform(Operation const& operation)
         acquire(operation);
         break;
     case Code::RELEASE:
-        if (unsigned int const count = CallControl::GET_NUMBER_OF_CALLS(context); count != 0)
-        {
-            Memory::Library const library;
-            CallControl::RELEASE_CALL(context, CallControl::GET_CALL(context, operation[1] % count));
-        }
+        release(operation);
         break;
     case Code::DROP_CALLS:
         if (CC_CallPool* const pool = CallControl::GET_CALL_POOL(context))
@@ -343,6 +339,23 @@ void Interpreter::settle()
     Memory::Library const library;
     if (m_world.m_loop.settle(MANY) == MANY)
         m_world.fail("the loop does not come to rest");
+}
+
+/// Who asks a call to take a leg, and finds that it has been given back meanwhile, has nothing to expect of it.
+void Interpreter::release(Operation const& operation)
+{
+    char const* const context = World::CONTEXT_NAME(operation[0]);
+    unsigned int const count = CallControl::GET_NUMBER_OF_CALLS(context);
+    if (count == 0)
+        return;
+    CallWatch released(*CallControl::GET_CALL(context, operation[1] % count));
+    {
+        Memory::Library const library;
+        CallControl::RELEASE_CALL(context, released.get());
+    }
+    CC_Call* const held = released.get();
+    if (held != nullptr && held->getNumberOfCallLegs() == 0 && CC_Call::Hold(held).isReleased())
+        m_world.m_released.watch(held);
 }
 
 // --- a line ----------------------------------------------------------------------------------------------------------

@@ -62,6 +62,7 @@ private:
     void dump(Operation const& operation);
     void setOptions(Operation const& operation);
     void settle();
+    void release(Operation const& operation);
 
     World& m_world;
     Operations const& m_operations;

@@ -183,13 +183,20 @@ void Interpreter::emptyCall(Operation const& operation)
         call->defer();
 }
 
-/// It belongs to nobody: its end is that of its legs.
+/// It belongs to nobody: its end is that of its legs, unless its maker ends it before, of which the model knows
+/// nothing.
 void Interpreter::newCall(Operation const& operation)
 {
     CC_CallLeg* const leg = m_world.leg(operation[0]);
+    if (operation[1] % 4 == 1 && m_world.m_strikes != 0 && m_world.m_made.get() != nullptr)
+    {
+        Memory::Library const library;
+        return m_world.m_made.get()->destroy();
+    }
     if (leg == nullptr || leg->getState() < 0)
         return;
     auto* const call = new CC_Call;
+    m_world.m_made.watch(call);
     Memory::Library const library;
     if (!call->addCallLeg(*leg).isOk())
         call->destroy();

@@ -38,7 +38,7 @@ void Interpreter::useFilters(Operation const& operation)
     Module& module = m_world.module(operation[0]);
     if (module.endpoint == nullptr)
         return;
-    m_world.m_hadOutputFilters = m_world.m_hadOutputFilters || operation[1] % 2 != 0;
+    (operation[1] % 2 == 0 ? m_world.m_hadInputFilters : m_world.m_hadOutputFilters) = true;
     if (operation[1] % 2 == 0)
         module.endpoint->setInputFilterContainer(operation[2] % 2 != 0 ? &module.inputFilters : nullptr);
     else

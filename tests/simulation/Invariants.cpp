@@ -96,27 +96,56 @@ bool IS_EQUAL(CC_Property const& one, CC_Property const& other)
     return kind != nullptr ? kind->isEqual(one, other) : Values::READ(one) == Values::READ(other);
 }
 
-/// Whether one container has all of the other.
-bool HOLDS(CC_PropertyContainer const& all, CC_PropertyContainer const& some)
+/// Whether one container has all of the other, or all but one id.
+bool HOLDS(CC_PropertyContainer const& all, CC_PropertyContainer const& some, unsigned int butOne = 0)
 {
     return std::all_of(some.begin(), some.end(),
                        [&](CC_Property const& one)
                        {
                            CC_Property const* const held = all.get(one.getId());
-                           return held != nullptr && IS_EQUAL(*held, one);
+                           return one.getId() == butOne || (held != nullptr && IS_EQUAL(*held, one));
                        });
 }
 
-/// Without filters a line sees of its peer what the peer's leg holds, and nothing of what it had before.
-void CHECK_VIEW_OF_PEER(World& world, unsigned int number, Line const& line)
+using Read = XCode (CC_CallAdapter::*)(CC_PropertyContainer&, unsigned int) const;
+
+CC_PropertyContainer VIEW(Line const& line, Read read)
 {
+    CC_PropertyContainer view;
+    std::ignore = (*line.adapter.*read)(view, ~0U);
+    return view;
+}
+
+/// Without filters a line sees what its own leg and its call hold, and nothing of what it had before. With those on the
+/// way in it sees what it has written, and the leg and the call hold what these have made of it.
+void CHECK_OWN_VIEWS(World& world, CC_CallLeg const& own, Line const& line, std::string const& name)
+{
+    if (world.m_hadInputFilters)
+        return;
+    if (!HOLDS(own.getProperties(), VIEW(line, &CC_CallAdapter::getOwnProperties),
+               CC_PropertyId::STATE)) // which the leg may refuse
+        world.fail(name + " sees of itself what its leg does not hold");
+    if (own.getCall() == nullptr)
+        return;
+    CC_PropertyContainer const ofCall = VIEW(line, &CC_CallAdapter::getCallProperties);
+    if (!HOLDS(own.getCall()->getProperties(), ofCall))
+        world.fail(name + " sees of its call what that does not hold");
+    if (!HOLDS(ofCall, own.getCall()->getProperties()))
+        world.fail(name + " does not see what its call holds");
+}
+
+/// The same of its peer as well.
+void CHECK_VIEWS(World& world, unsigned int number, Line const& line)
+{
+    CC_CallLeg const* const own = OWN_LEG(*line.adapter);
     CC_CallLeg const* const peer = PEER_LEG(*line.adapter);
-    if (!CAN_BE_COMPARED || peer == nullptr || world.m_hadOutputFilters || line.hasWrittenToPeer ||
-        peer->mayChangeUntold() || world.m_wasShortOfMemory)
+    if (!CAN_BE_COMPARED || own == nullptr || world.m_hadOutputFilters || world.m_wasShortOfMemory)
         return;
     std::string const name = "line " + std::to_string(number);
-    CC_PropertyContainer ofPeer;
-    std::ignore = line.adapter->getPeerProperties(ofPeer, ~0U);
+    CHECK_OWN_VIEWS(world, *own, line, name);
+    if (peer == nullptr || line.hasWrittenToPeer || peer->mayChangeUntold())
+        return;
+    CC_PropertyContainer const ofPeer = VIEW(line, &CC_CallAdapter::getPeerProperties);
     if (!HOLDS(ofPeer, peer->getProperties()))
         world.fail(name + " does not see what its peer holds");
     if (!HOLDS(peer->getProperties(), ofPeer))
@@ -210,7 +239,7 @@ void CHECK_AT_REST(World& world)
                   [&](unsigned int number, Line const& line)
                   {
                       CHECK_PEER(world, number, line);
-                      CHECK_VIEW_OF_PEER(world, number, line);
+                      CHECK_VIEWS(world, number, line);
                   });
 }
 

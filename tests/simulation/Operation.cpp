@@ -74,7 +74,7 @@ constexpr Row ROWS[] = {
     {"set-datapath", "of line %0, media context %1"},
     {"offer", "module %0 is offered call %1/%2 with properties %3"},
     {"answer-held", "module %0 answers the offer that it holds, line %1, way %2"},
-    {"new-call", "without a pool, with guest leg %0"},
+    {"new-call", "without a pool, with guest leg %0, or the end of the last one (way %1)"},
     {"change-untold", "line or guest leg %0, property %1, value %2, way %3"},
     {"accessor", "line %0, accessor %1, value %2"},
     {"keep-blocks", "%0"},

@@ -99,6 +99,9 @@ void Guest::onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event)
 
 void Guest::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
 {
+    CC_Call const* const joined = CC_EvCallLegCallRelinked::FROM(event).getNewCall();
+    if (joined != nullptr && joined == m_world.m_released.get())
+        m_world.fail("a leg goes into a call that was given back");
     hear(hearsThroughCalls() ? nullptr : event.getSource(), CallOut::LEG_RELINKED);
 }
 

@@ -158,6 +158,7 @@ void World::makeModule(unsigned int index)
         made.endpoint->setInputFilterContainer(nullptr);
         made.endpoint->setOutputFilterContainer(nullptr);
     }
+    m_hadInputFilters = m_hadInputFilters || made.endpoint->getInputFilterContainer() != nullptr;
     m_hadOutputFilters = m_hadOutputFilters || made.endpoint->getOutputFilterContainer() != nullptr;
     for (unsigned int i = 0; i < LINES_OF_A_MODULE; ++i)
         makeAdapter(made.index * LINES_OF_A_MODULE + i,
@@ -244,25 +245,41 @@ void World::strike(CallOut kind)
     if (!m_reactions.take(kind, due) || m_depth > 8 || hasFailed())
         return;
     bool const isOfProperty = kind >= CallOut::PROPERTY_CLONE && kind <= CallOut::PROPERTY_END;
-    bool const mayBeNews = kind == CallOut::LEG_ADDED || isOfProperty; // whose copies are made inside such news, too
-    std::vector<int> const before = mayBeNews ? getActivityLevels() : std::vector<int>();
+    bool const isJoining = kind == CallOut::LEG_ADDED;
+    bool const mayBeNews = isJoining || isOfProperty; // whose copies are made inside such news, too
+    Levels const before = mayBeNews ? getActivityLevels() : Levels();
     ++m_depth;
     ++m_strikes;
     m_carryOut(due.begin, due.end);
     --m_depth;
-    m_mayPeersBeStale = m_mayPeersBeStale || (mayBeNews && before != getActivityLevels());
+    if (!mayBeNews || m_mayPeersBeStale)
+        return;
+    Levels const after = getActivityLevels();
+    m_mayPeersBeStale = isJoining ? HAVE_RISEN(before, after) : before != after;
+}
+
+/// Whether a leg is more active than it was, or was not there. That one is less, those who chose it find out.
+bool World::HAVE_RISEN(Levels const& before, Levels const& after)
+{
+    auto const hasRisen = [&](Levels::value_type const& now)
+    {
+        return std::none_of(before.begin(), before.end(),
+                            [&](Levels::value_type const& then)
+                            { return then.first == now.first && then.second >= now.second; });
+    };
+    return std::any_of(after.begin(), after.end(), hasRisen);
 }
 
 /// Of all legs in calls, and of the guests': their calls may have lost the context that lists them.
-std::vector<int> World::getActivityLevels() const
+World::Levels World::getActivityLevels() const
 {
-    std::vector<int> levels;
+    Levels levels;
     for (unsigned int i = 0; i < NUMBER_OF_CONTEXTS; ++i)
         for (unsigned int j = 0; CC_Call const* const call = CallControl::GET_CALL(CONTEXT_NAME(i), j); ++j)
             for (unsigned int k = 0; k < call->getNumberOfCallLegs(); ++k)
-                levels.push_back(call->getCallLeg(k)->getActivityLevel());
+                levels.emplace_back(call->getCallLeg(k), call->getCallLeg(k)->getActivityLevel());
     for (CC_CallLeg const* const leg : m_legs)
-        levels.push_back(leg != nullptr ? leg->getActivityLevel() : 0);
+        levels.emplace_back(leg, leg != nullptr ? leg->getActivityLevel() : 0);
     return levels;
 }
 
@@ -297,6 +314,8 @@ void World::takeDown()
         leaving->held.watch(nullptr);
     for (Sent& sent : m_sent)
         sent.to.watch(nullptr);
+    m_made.watch(nullptr);
+    m_released.watch(nullptr);
     for (auto const& leaving : m_modules)
         for (Line& line : leaving->lines)
             line.adapter.reset();

@@ -14,6 +14,7 @@
 #include <functional>
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace Simulation
@@ -118,6 +119,8 @@ public:
     std::array<Sent, NUMBER_OF_LEGS> m_sent;
     bool m_areLegsDisturbed = false; // somebody else moved legs, too
     CC_Call* m_telling = nullptr;    // the call that tells of its end
+    CallWatch m_made;                // by a guest, without a context
+    CallWatch m_released;            // given back without a leg while somebody held it; it takes none any more
 
     unsigned int m_depth = 0;        // of call-outs with a reaction
     unsigned int m_strikes = 0;      // reactions so far
@@ -125,7 +128,8 @@ public:
     bool m_hasLostContext = false;   // a context was destroyed, maybe with calls
     int m_lostPools = 0;             // destroyed with calls, whose reload lock stays
     bool m_wasShortOfMemory = false;
-    bool m_hadOutputFilters = false; // somebody's, at some time
+    bool m_hadInputFilters = false;  // somebody's, at some time
+    bool m_hadOutputFilters = false; // the same
     /// An adapter may have chosen its peer by a State that is not the leg's: one that changed while the leg's joining
     /// was told, before the observers of the call's legs hear of that leg; or one that a line wrote into its view of an
     /// ended peer, or of one behind filters.
@@ -137,7 +141,9 @@ public:
 
 private:
     void strike(CallOut kind);
-    std::vector<int> getActivityLevels() const;
+    using Levels = std::vector<std::pair<CC_CallLeg const*, int>>;
+    static bool HAVE_RISEN(Levels const& before, Levels const& after);
+    Levels getActivityLevels() const;
     void releaseWhatMayStay();
 
     static World* s_current;
