@@ -66,8 +66,13 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
     if (relinked.getNewCall() != nullptr)
     {
         m_callView.interrupt();
-        observeCall(*relinked.getNewCall()); // first: what filters and properties write to it meanwhile is told us
+        unsigned int const told = CC_Call::GET_NUMBER_OF_CHANGES();
         updateCall();
+        if (attempt.isOver())
+            return;
+        observeCall(*relinked.getNewCall());
+        if (told != CC_Call::GET_NUMBER_OF_CHANGES())
+            updateCall(); // what filters and properties wrote to it meanwhile was not told us
         if (attempt.isOver())
             return;
     }

@@ -2,6 +2,9 @@
 #include "testing/RecordingMonitor.h"
 #include "tests/support/TestLine.h"
 
+#include <algorithm>
+#include <utility>
+
 namespace
 {
 using namespace CC_PropertyId;
@@ -66,6 +69,27 @@ TEST_F(CC_CallAdapter_Transfer_Test, ATransferConnectsTheTwoPeersAndLeavesBothOw
     settle();
     EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS(""), 2u) << "the other call survives with its one leg";
     EXPECT_EQ(IN(*m_second), "c");
+}
+
+TEST_F(CC_CallAdapter_Transfer_Test, AMovedLinesCallIsLookedAtBeforeItIsObservedAndAgainIfItChangedMeanwhile)
+{
+    unsigned int depth = 0, deepest = 0;
+    bool hasWritten = false;
+    d.filterOutput(
+        [&](CC_PropertyContainer&)
+        {
+            deepest = std::max(deepest, ++depth);
+            if (d.adapter.getCall() == m_first && !std::exchange(hasWritten, true))
+            {
+                EXPECT_EQ(m_first->setProperty(CC_PropertyString(DISPLAY, "late")), XCode::OK);
+            }
+            --depth;
+            return XCode::OK;
+        });
+    EXPECT_EQ(a.adapter.transfer(c.adapter, true), XCode::OK);
+    EXPECT_TRUE(hasWritten);
+    EXPECT_EQ(deepest, 1u) << "the call tells it nothing yet";
+    EXPECT_EQ(d.call(DISPLAY), "late");
 }
 
 TEST_F(CC_CallAdapter_Transfer_Test, AfterATransferTheOthersDropAndTheTwoPeersGoOn)

@@ -24,6 +24,7 @@ namespace
 {
 unsigned int s_infoDepth = 0;
 unsigned long long s_lastSerial = 0;
+unsigned int s_numberOfChanges = 0;
 
 void LOG_PROPERTY(String const& callName, CC_Property const& property)
 {
@@ -155,9 +156,12 @@ __attribute__((noinline)) XCode CC_Call::replaceRecorded(CC_Property const& prop
                                      CC_RecordFormat::Kind::CALL_CHANGED, m_serial, 0);
 }
 
+unsigned int CC_Call::GET_NUMBER_OF_CHANGES() { return s_numberOfChanges; }
+
 /// Hands the flags over.
 void CC_Call::tellChange(CC_Flags& flags)
 {
+    ++s_numberOfChanges;
     CC_Writing const byWhoeverIsTold(CC_RecordFormat::Writer::OUTSIDE);
     m_callObservers.broadcastEvent(CC_EvCallPropertyChanged(*this, std::move(flags)),
                                    &CC_CallObserver::onCallPropertyChanged);

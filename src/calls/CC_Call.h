@@ -146,6 +146,9 @@ public:
     /// The number of calls alive.
     static unsigned int s_numberOfInstances;
 
+    /// How often changed properties were told so far, by all calls together.
+    static unsigned int GET_NUMBER_OF_CHANGES();
+
     /// How many legs an operation that takes out "all" takes at most: far beyond any honest use, it ends what an
     /// observer that always brings one back would keep going for ever.
     static constexpr unsigned int MOST_MOVES = 100000;

@@ -7,6 +7,7 @@ goes to standard output as it stands in docs/testing.md.
 usage: mutants.py [PATTERN]     only those whose file or line contains the pattern, or of these numbers: 3,17
 """
 import os
+import re
 import shutil
 import subprocess
 import sys
@@ -87,7 +88,7 @@ def simulate():
 
 
 def shorten(text, length):
-    text = text.replace("|", "\\|")
+    text = re.sub(r"&(\w+;)", r"& \1", text.replace("|", "\\|")) # which is no character's name
     return text if len(text) <= length else text[: length - 3] + "..."
 
 
