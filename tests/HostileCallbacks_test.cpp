@@ -192,6 +192,66 @@ TEST_F(HostileCallbacks, ACallAcquiredWhileTheLockIsBeingTakenLeavesNoSecondLock
     EXPECT_EQ(reboot.getNumberOfLocks(), 0);
 }
 
+TEST_F(HostileCallbacks, ACallAcquiredWhileTheLockIsBeingTakenMayEndWhileTheSecondIsGivenBack)
+{
+    FakeRebootMgmt reboot;
+    CC_Call* inside = nullptr;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        inside = CallControl::ACQUIRE_CALL("SWITCH");
+    };
+    reboot.m_onRelease = [&]
+    {
+        reboot.m_onRelease = nullptr;
+        CallControl::RELEASE_CALL("SWITCH", inside);
+    };
+    CC_Call* const call = CallControl::ACQUIRE_CALL("SWITCH");
+    ASSERT_NE(call, nullptr);
+    EXPECT_EQ(CallControl::GET_NUMBER_OF_CALLS("SWITCH"), 1u);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1) << "that of the call that is there";
+    CallControl::RELEASE_CALL("SWITCH", call);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+}
+
+TEST_F(HostileCallbacks, WhileTheSecondLockIsGivenBackTheCallItselfMayEnd)
+{
+    FakeRebootMgmt reboot;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        std::ignore = CallControl::ACQUIRE_CALL("SWITCH");
+    };
+    reboot.m_onRelease = [&]
+    {
+        reboot.m_onRelease = nullptr;
+        while (CC_Call* const call = CallControl::GET_CALL("SWITCH", 0))
+            CallControl::RELEASE_CALL("SWITCH", call);
+    };
+    EXPECT_EQ(CallControl::ACQUIRE_CALL("SWITCH"), nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 0);
+    settle();
+    EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
+}
+
+TEST_F(HostileCallbacks, WhileTheSecondLockIsGivenBackTheContextMayBeDestroyed)
+{
+    FakeRebootMgmt reboot;
+    CC_Call* inside = nullptr;
+    reboot.m_onAdd = [&]
+    {
+        reboot.m_onAdd = nullptr;
+        inside = CallControl::ACQUIRE_CALL("SWITCH");
+    };
+    reboot.m_onRelease = [] { CallControl::DESTROY_CONTEXT("SWITCH"); };
+    EXPECT_EQ(CallControl::ACQUIRE_CALL("SWITCH"), nullptr);
+    EXPECT_EQ(reboot.getNumberOfLocks(), 1) << "a call outlives its pool, and the lock stays with it";
+    ASSERT_NE(inside, nullptr);
+    inside->defer();
+    settle();
+    EXPECT_EQ(CC_Call::s_numberOfInstances, 0u);
+}
+
 TEST_F(HostileCallbacks, ACallAcquiredAtTheEndOfTheLastOneLeavesNoSecondLock)
 {
     FakeRebootMgmt reboot;

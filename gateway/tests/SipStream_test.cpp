@@ -43,8 +43,8 @@ TEST(SipStreamRead, APayloadTypeNamedTwiceHasOneMeaning)
 {
     SipStream const stream = STREAM("m=audio 4000 RTP/AVP 9 0 9 100 100\r\na=rtpmap:9 PCMA/8000\r\n"
                                     "a=rtpmap:100 telephone-event/8000\r\na=rtpmap:100 opus/48000/2\r\n");
-    EXPECT_EQ(stream.formats, (std::vector<SipStream::Format>{{Codec::PCMA, 9}, {Codec::PCMU, 0}}));
-    EXPECT_EQ(stream.events, (std::vector<SipStream::Events>{{8000, 100}}));
+    EXPECT_EQ(stream.formats, (std::vector<SipStream::Format>{{Codec::PCMA, 9}, {Codec::PCMU, 0}, {Codec::OPUS, 100}}));
+    EXPECT_EQ(stream.events, std::vector<SipStream::Events>());
 }
 
 TEST(SipStreamRead, IsTheFirstVoiceThatIsNotRefused)

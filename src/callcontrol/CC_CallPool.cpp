@@ -70,22 +70,24 @@ CC_Call* CC_CallPool::acquireCall(MG_IContext* mgContext)
     if (call == nullptr)
         return nullptr;
     CC_Call::Hold const keepCall(call);
-    if (m_calls.isEmpty())
-    {
+    bool const isFirst = m_calls.isEmpty();
+    if (isFirst)
         addReloadGracefulLock(); // the reboot management may destroy us
-        if (self.isAlive() && !m_calls.isEmpty())
-            releaseReloadGracefulLock(); // a call that came inside has taken the pool's
-    }
+    // a call that came inside has one of its own
+    bool const hasTwoLocks = isFirst && self.isAlive() && !m_calls.isEmpty();
     if (!self.isAlive() || !list(*call))
     {
         call->destroy();
-        if (self.isAlive() && m_calls.isEmpty())
+        if (self.isAlive() && (hasTwoLocks || m_calls.isEmpty()))
             releaseReloadGracefulLock();
         return nullptr;
     }
     s_statistics.onCallAdded();
     RECORD(CC_RecordFormat::Kind::CALL_ACQUIRED, call->getSerial());
-    giveContext(*call, mgContext); // the media layer may, too, or release the call
+    if (hasTwoLocks)
+        releaseReloadGracefulLock(); // not before ours is there: the call that has the other may end in here
+    if (self.isAlive() && !keepCall.isReleased())
+        giveContext(*call, mgContext); // the media layer may do all that, too
     if (self.isAlive() && !keepCall.isReleased())
         return call;
     call->defer(); // nobody else would look at it
