@@ -5,6 +5,8 @@
 #include "recorder/CC_RecordWriter.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <cstring>
 #include <new>
 #include <utility>
 
@@ -23,13 +25,17 @@ __attribute__((noinline)) void CC_CallAdapter::Event::record(CC_Flags const& fla
 {
     CC_RecordWriter& recorder = CC_RecordWriter::INSTANCE();
     using CC_RecordFormat::ToldIds;
+    static_assert(sizeof(ToldIds) == sizeof(CC_Flags::Entry) &&
+                  offsetof(ToldIds, bits) == offsetof(CC_Flags::Entry, bits));
     unsigned int const count = flags.getCount();
-    char* place =
+    char* const place =
         recorder.begin(CC_RecordFormat::Kind::TOLD, m_adapter.getCallSerial(), m_adapter.getLegSerial(), count);
-    unsigned int const words = std::min(count, CC_RecordFormat::MOST_TOLD);
-    for (unsigned int i = 0; i < words; ++i, place += sizeof(ToldIds))
-        new (place) ToldIds{flags.getEntry(i).wordIndex, flags.getEntry(i).bits};
-    recorder.end(place);
+    std::size_t const size = std::min(count, CC_RecordFormat::MOST_TOLD) * sizeof(ToldIds);
+    if (size == sizeof(ToldIds)) [[likely]]
+        std::memcpy(place, &flags.getEntry(0), sizeof(ToldIds));
+    else
+        std::memcpy(place, &flags.getEntry(0), size);
+    recorder.end(place + size);
 }
 
 void CC_CallAdapter::Event::handle()
