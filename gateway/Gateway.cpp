@@ -188,8 +188,8 @@ void Gateway::openMetrics()
             contents.pages["/"] = [this] { return HttpAnswer{200, m_page.getText(), StatusPage::CONTENT_TYPE}; };
         if (m_configuration.metrics.hasPage && m_control != nullptr)
         {
-            contents.files = CallPage::FILES();
-            contents.relay = &m_relay.emplace(m_configuration.control.path);
+            contents.files = CallPage::FILES(!m_configuration.metrics.token.empty());
+            contents.relay = &m_relay.emplace(m_configuration.control.path, m_configuration.metrics.token);
         }
         m_pages = std::make_unique<HttpServer>(m_configuration.metrics.listen, m_loop, std::move(contents));
     }

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cctype>
 #include <cerrno>
 #include <charconv>
 #include <cstring>
@@ -122,13 +123,25 @@ void READ_RECORDS(ConfigurationSection const& section, RecordOptions& records)
         section.refuse("spool", "is missing: a database may not be there");
 }
 
+/// Long enough that nobody guesses it, and of what a header takes as it is (RFC 6750, 2.1).
+bool IS_TOKEN(std::string_view text)
+{
+    return text.size() >= 16 && text.size() <= 256 &&
+           std::all_of(text.begin(), text.end(),
+                       [](unsigned char c)
+                       { return std::isalnum(c) != 0 || c == '-' || c == '.' || c == '_' || c == '~'; });
+}
+
 /// Whoever connects is told all: a figure is no secret on the host, and beyond it is what somebody else shows.
 void READ_METRICS(ConfigurationSection const& section, MetricOptions& metrics)
 {
-    section.allow({"listen", "page"});
+    section.allow({"listen", "page", "token"});
     if (section.getKeys().empty())
         return;
     metrics.hasPage = section.flag("page");
+    metrics.token = section.text("token", {});
+    if (!metrics.token.empty() && !IS_TOKEN(metrics.token))
+        section.refuse("token", "must be of 16 to 256 letters, digits, \"-\", \".\", \"_\" and \"~\"");
     metrics.listen = section.address("listen");
     if (!AddressRange::CONTAINS({AddressRange::PARSE("127.0.0.0/8"), AddressRange::PARSE("::1")},
                                 AddressRange::PARSE(metrics.listen.host).getFirst()))

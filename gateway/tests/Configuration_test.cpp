@@ -150,6 +150,12 @@ TEST(Configuration, SaysWhereFiguresAreToBeHad)
     EXPECT_TRUE(
         Configuration::PARSE(interfaces + "[metrics]\nlisten = \"[::1]:9100\"\npage = true\n", "f").metrics.hasPage);
     EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\npage = true\n"), "f: metrics.listen: is missing");
+    std::string const page = interfaces + "[metrics]\nlisten = \"[::1]:9100\"\npage = true\n";
+    EXPECT_EQ(Configuration::PARSE(page, "f").metrics.token, "") << "nobody changes anything from there";
+    EXPECT_EQ(Configuration::PARSE(page + "token = \"0123456789-ab.d_~\"\n", "f").metrics.token, "0123456789-ab.d_~");
+    for (char const* const token : {"0123456789abcde", "0123456789 abcdef", "0123456789abcdef\u00e4"})
+        EXPECT_EQ(COMPLAINT(page + "token = \"" + token + "\"\n"),
+                  "f: metrics.token: must be of 16 to 256 letters, digits, \"-\", \".\", \"_\" and \"~\"");
     EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nport = 1\n"), "f: metrics.port: is not a key");
     EXPECT_EQ(COMPLAINT(interfaces + "[metrics]\nlisten = \"127.0.0.1\"\n"),
               "f: metrics.listen: expected an address and a port, as in \"192.0.2.1:5060\"");

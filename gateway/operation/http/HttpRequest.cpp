@@ -22,6 +22,7 @@ struct HttpStatus
 };
 constexpr HttpStatus STATUSES[] = {{200, "OK"},
                                    {400, "Bad Request"},
+                                   {401, "Unauthorized"},
                                    {404, "Not Found"},
                                    {405, "Method Not Allowed"},
                                    {421, "Misdirected Request"},
@@ -51,18 +52,17 @@ bool IS_METHOD(std::string_view word)
                                         [](unsigned char c) { return std::isupper(c) != 0 || c == '-' || c == '_'; });
 }
 
-/// The field that every request of this version has; nothing where there is none.
-std::optional<std::string_view> FIND_HOST(std::string_view lines)
+/// The value of a field by its name in small letters and a colon; nothing where there is none.
+std::optional<std::string_view> FIND_FIELD(std::string_view lines, std::string_view name)
 {
-    constexpr std::string_view NAME = "host:";
     for (std::string_view line = TAKE(lines, END_OF_LINE); !line.empty(); line = TAKE(lines, END_OF_LINE))
     {
-        bool const isHost =
-            std::equal(NAME.begin(), NAME.end(), line.begin(), line.begin() + std::min(line.size(), NAME.size()),
+        bool const isIt =
+            std::equal(name.begin(), name.end(), line.begin(), line.begin() + std::min(line.size(), name.size()),
                        [](char one, unsigned char other) { return one == std::tolower(other); });
-        if (!isHost)
+        if (!isIt)
             continue;
-        line.remove_prefix(NAME.size());
+        line.remove_prefix(name.size());
         line.remove_prefix(std::min(line.find_first_not_of(" \t"), line.size()));
         return line.substr(0, line.find_last_not_of(" \t") + 1);
     }
@@ -84,12 +84,24 @@ unsigned int REFUSAL_OF(std::string_view method, std::string_view target, std::s
         return 400;
     if (version != "HTTP/1.0" && version != "HTTP/1.1")
         return 505;
-    std::optional<std::string_view> const host = FIND_HOST(fields);
+    std::optional<std::string_view> const host = FIND_FIELD(fields, "host:");
     if (version == "HTTP/1.1" && !host)
         return 400;
     if (host && !IS_LOOPBACK(*host))
         return 421;
-    return method == "GET" || method == "HEAD" ? 0 : 405;
+    return method == "GET" || method == "HEAD" || method == "POST" ? 0 : 405;
+}
+
+std::string TOKEN_OF(std::string_view fields)
+{
+    constexpr std::string_view SCHEME = "Bearer ";
+    std::string_view const credentials = FIND_FIELD(fields, "authorization:").value_or("");
+    return credentials.starts_with(SCHEME) ? std::string(credentials.substr(SCHEME.size())) : std::string();
+}
+
+char const* MORE_OF(unsigned int status)
+{
+    return status == 405 ? "Allow: GET, HEAD\r\n" : status == 401 ? "WWW-Authenticate: Bearer\r\n" : "";
 }
 } // namespace
 
@@ -100,14 +112,19 @@ HttpRequest HttpRequest::PARSE(std::string_view head)
     std::string_view const target = TAKE(line, " ");
     std::string_view query = target;
     std::string_view const path = TAKE(query, "?");
-    return {REFUSAL_OF(method, target, line, head), method == "HEAD", std::string(path), std::string(query)};
+    return {REFUSAL_OF(method, target, line, head),
+            method == "HEAD",
+            method == "POST",
+            std::string(path),
+            std::string(query),
+            TOKEN_OF(head)};
 }
 
 std::string HttpAnswer::getText(bool isHead) const
 {
     return fmt::format("HTTP/1.1 {} {}\r\nContent-Type: {}\r\nContent-Length: {}\r\n{}{}Connection: close\r\n\r\n{}",
-                       status, REASON_OF(status), type, content.size(), status == 405 ? "Allow: GET, HEAD\r\n" : "",
-                       FOR_BROWSERS, isHead ? std::string() : content);
+                       status, REASON_OF(status), type, content.size(), MORE_OF(status), FOR_BROWSERS,
+                       isHead ? std::string() : content);
 }
 
 HttpAnswer HttpAnswer::REFUSING(unsigned int status) { return {status, fmt::format("{}\n", REASON_OF(status))}; }

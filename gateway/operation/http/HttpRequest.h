@@ -8,8 +8,10 @@ struct HttpRequest
 {
     unsigned int refusal = 0; ///< the status of the answer to what is no request, or none for us; 0: all right
     bool isHead = false;      ///< the answer without its contents
+    bool isPost = false;      ///< something is to be changed
     std::string path;         ///< without what follows a "?"
     std::string query;        ///< that
+    std::string token;        ///< which is to prove that he may (RFC 6750, 2.1)
 
     /// Of everything up to and with the empty line.
     static HttpRequest PARSE(std::string_view head);

@@ -242,9 +242,12 @@ void HttpServer::begin(Client& client)
 {
     if (client.request.refusal != 0)
         return answer(client, HttpAnswer::REFUSING(client.request.refusal));
-    if (auto const file = m_contents.files.find(client.request.path); file != m_contents.files.end())
-        return answer(client, file->second);
+    auto const file = m_contents.files.find(client.request.path);
     bool const isMade = m_contents.pages.contains(client.request.path);
+    if (client.request.isPost && (isMade || file != m_contents.files.end() || m_contents.relay == nullptr))
+        return answer(client, HttpAnswer::REFUSING(405));
+    if (file != m_contents.files.end())
+        return answer(client, file->second);
     if (!isMade)
     {
         unsigned int refusal = 404;

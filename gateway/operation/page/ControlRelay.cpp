@@ -13,6 +13,7 @@ namespace
 constexpr std::string_view PREFIX = "/control/";
 constexpr std::array<std::string_view, 10> GIVEN_OUT = {"call",     "calls", "history", "interfaces", "peers",
                                                         "recorded", "stats", "status",  "top",        "registrations"};
+constexpr std::array<std::string_view, 3> CHANGING = {"block", "drop", "unblock"};
 constexpr std::string_view OK = R"({"status":"ok"})";
 constexpr std::string_view END = "\n\n"; // of an answer, after one line at least
 
@@ -42,6 +43,21 @@ bool IS_WORD(std::string_view word)
            std::all_of(word.begin(), word.end(), [](unsigned char c) { return c > ' ' && c != 0x7f; });
 }
 
+template <std::size_t SIZE>
+bool HAS(std::array<std::string_view, SIZE> const& verbs, std::string_view verb)
+{
+    return std::find(verbs.begin(), verbs.end(), verb) != verbs.end();
+}
+
+/// The time that it takes tells nobody how much of it was right.
+bool IS_SAME_SECRET(std::string_view one, std::string_view other)
+{
+    unsigned char difference = 0;
+    for (std::size_t i = 0; i < std::min(one.size(), other.size()); ++i)
+        difference = static_cast<unsigned char>(difference | (one[i] ^ other[i]));
+    return one.size() == other.size() && difference == 0;
+}
+
 std::string_view TAKE_UP_TO(std::string_view& text, char separator)
 {
     std::string_view const piece = text.substr(0, text.find(separator));
@@ -57,7 +73,7 @@ std::string ControlRelay::LINE_OF(HttpRequest const& request)
         return {};
     path.remove_prefix(PREFIX.size());
     std::string line(TAKE_UP_TO(path, '/'));
-    if (std::find(GIVEN_OUT.begin(), GIVEN_OUT.end(), line) == GIVEN_OUT.end())
+    if (!(request.isPost ? HAS(CHANGING, line) : HAS(GIVEN_OUT, line)))
         return {};
     while (!path.empty())
     {
@@ -81,7 +97,11 @@ std::string ControlRelay::LINE_OF(HttpRequest const& request)
 /// The socket is of this host, so what is asked has gone when this returns, or never goes.
 int ControlRelay::open(HttpRequest const& request, unsigned int& refusal)
 {
-    std::string const line = LINE_OF(request);
+    if (request.isPost && !IS_SAME_SECRET(request.token, m_token))
+        refusal = 401;
+    if (request.isPost && m_token.empty())
+        refusal = 405;
+    std::string const line = refusal == 401 || refusal == 405 ? std::string() : LINE_OF(request);
     if (line.empty())
         return -1;
     refusal = 503;

@@ -159,8 +159,21 @@ function replace(parts) {
     if (focused >= 0) document.querySelectorAll("[tabindex]")[focused]?.focus();
 }
 
+const selectedCall = () => /^#call=([0-9]+)$/.exec(location.hash)?.[1];
+
+// Only where the gateway has a token is there a form for it.
+async function clear(event) {
+    event.preventDefault();
+    const told = document.getElementById("cleared");
+    const answer = await fetch(`/control/drop/${selectedCall()}/16`,
+        { method: "POST", headers: { Authorization: "Bearer " + document.getElementById("token").value } });
+    told.textContent = answer.ok ? "cleared" : answer.status === 401 ? "this is not the token" : (await answer.text());
+    await show();
+}
+
 async function show() {
-    const serial = /^#call=([0-9]+)$/.exec(location.hash)?.[1];
+    const serial = selectedCall();
+    document.body.toggleAttribute("data-call", serial !== undefined);
     try {
         await (serial ? showOne(serial) : showAll());
         main.classList.remove("bad");
@@ -197,8 +210,8 @@ const keys = {
     d: changeTheme,
 };
 document.addEventListener("keydown", (event) => {
-    if (event.target === search) {
-        if (event.key === "Escape" || event.key === "Enter") search.blur();
+    if (event.target.tagName === "INPUT") {
+        if (event.key === "Escape" || (event.key === "Enter" && event.target === search)) event.target.blur();
         return;
     }
     if (event.ctrlKey || event.altKey || event.metaKey || !(event.key in keys)) return;
@@ -213,9 +226,11 @@ window.addEventListener("hashchange", () => {
     shownHistory = null;
     scores = new Map();
     selected = 0;
+    document.getElementById("cleared").textContent = "";
     readSearch();
     show();
 });
+document.getElementById("clear").addEventListener("submit", clear);
 document.getElementById("theme").addEventListener("click", changeTheme);
 if (localStorage.getItem("theme")) document.documentElement.dataset.theme = localStorage.getItem("theme");
 readSearch();

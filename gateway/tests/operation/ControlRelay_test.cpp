@@ -30,6 +30,44 @@ TEST(ControlRelay, NothingThatChangesSomethingIsGivenOut)
     EXPECT_EQ(LINE_OF("/controls/calls"), "");
 }
 
+TEST(ControlRelay, WhoKnowsTheTokenClearsCallsAndBlocksInterfacesAndNothingElse)
+{
+    HttpRequest request;
+    request.isPost = true;
+    for (char const* const verb : {"drop/1/16", "block/trunk", "unblock/trunk"})
+    {
+        request.path = std::string("/control/") + verb;
+        EXPECT_NE(ControlRelay::LINE_OF(request), "") << verb;
+    }
+    EXPECT_EQ(ControlRelay::LINE_OF(request), "unblock trunk --json\n");
+    for (char const* const verb : {"drain", "resume", "reload", "shutdown", "trace/on/1", "calls", "call/7"})
+    {
+        request.path = std::string("/control/") + verb;
+        EXPECT_EQ(ControlRelay::LINE_OF(request), "") << verb;
+    }
+}
+
+TEST(ControlRelay, WithoutTheTokenNothingIsChanged)
+{
+    auto const refusalOf = [](ControlRelay relay, std::string const& path, std::string const& token)
+    {
+        HttpRequest request;
+        request.isPost = true;
+        request.path = path;
+        request.token = token;
+        unsigned int refusal = 404;
+        EXPECT_EQ(relay.open(request, refusal), -1);
+        return refusal;
+    };
+    EXPECT_EQ(refusalOf(ControlRelay("/nowhere"), "/control/drop/1/16", ""), 405u) << "there is none";
+    EXPECT_EQ(refusalOf(ControlRelay("/nowhere"), "/control/drop/1/16", "guessed"), 405u);
+    ControlRelay const guarded("/nowhere", "0123456789abcdef");
+    for (char const* const token : {"", "0123456789abcde", "0123456789abcdeg", "0123456789abcdef0"})
+        EXPECT_EQ(refusalOf(guarded, "/control/drop/1/16", token), 401u) << token;
+    EXPECT_EQ(refusalOf(guarded, "/control/shutdown", "0123456789abcdef"), 404u);
+    EXPECT_EQ(refusalOf(guarded, "/control/drop/1/16", "0123456789abcdef"), 503u) << "the socket is not there";
+}
+
 TEST(ControlRelay, NoArgumentBecomesTwoOrAnOptionOrAnotherLine)
 {
     EXPECT_EQ(LINE_OF("/control/call/7%208"), "");

@@ -315,6 +315,8 @@ TEST_F(HttpServerTest, RefusesWhatItDoesNotHave)
     std::pair<std::string, std::string> const cases[] = {
         {"GET /else HTTP/1.0\r\n\r\n", "404 Not Found"},
         {"POST /page HTTP/1.0\r\n\r\n", "405 Method Not Allowed"},
+        {"POST /else HTTP/1.0\r\n\r\n", "405 Method Not Allowed"},
+        {"PUT /page HTTP/1.0\r\n\r\n", "405 Method Not Allowed"},
         {"GET /page HTTP/1.1\r\nx: y\r\n\r\n", "400 Bad Request"},
         {"GET /page\r\n\r\n", "400 Bad Request"},
         {"get /page HTTP/1.0\r\n\r\n", "400 Bad Request"},

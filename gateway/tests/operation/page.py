@@ -1,4 +1,4 @@
-"""What an operator sees of calls in a browser: page.py PORT-OF-PAGE PORT-OF-BROWSER FOLDER GATEWAYCTL SOCKET up|over"""
+"""What an operator sees of calls in a browser: page.py PORT-OF-PAGE PORT-OF-BROWSER FOLDER GATEWAYCTL SOCKET up|clear|over"""
 import json
 import subprocess
 import sys
@@ -68,6 +68,17 @@ try:
         browser.take_picture(f"{folder}.png")
         browser.press("Escape")
         browser.wait_for("location.hash === '' && document.querySelector('tr[data-call]')")
+        assert browser.evaluate("document.getElementById('clear').getClientRects().length") == 0, "nothing to clear here"
+    elif case == "clear":
+        browser.open(f"http://127.0.0.1:{page}/calls#call=1")
+        browser.wait_for("document.getElementById('clear').getClientRects().length > 0")
+        for token, told in [("guessed", "this is not the token"), ("not-known-to-all", "cleared")]:
+            browser.evaluate("document.getElementById('token').focus(); document.getElementById('token').value = ''")
+            for key in token:
+                browser.press(key)
+            browser.evaluate("document.querySelector('#clear button').click()")
+            browser.wait_for(f"document.getElementById('cleared').innerText === '{told}'")
+        browser.wait_for("document.getElementById('state').innerText === 'call 1, over'")
     else:
         browser.wait_for("document.getElementById('state').innerText === 'serving, 0 up'")
         up, known = browser.evaluate(ROWS)

@@ -11,6 +11,7 @@ socket = "$WORK/control"
 [metrics]
 listen = "$HOST:$PORT_PAGE"
 page = true
+token = "not-known-to-all"
 [media]
 mode = "relay"
 first-port = $((PORT + 8))
@@ -18,7 +19,7 @@ last-port = $((PORT + 15))
 END
 start_gateway
 # the system's Python, which has the package that speaks to browsers
-look() { # NUMBER up|over GATEWAYCTL
+look() { # NUMBER up|clear|over GATEWAYCTL
     /usr/bin/python3 "$HERE/operation/page.py" $PORT_PAGE $((PORT + 38)) "$WORK/browser-$1" "$3" "$WORK/control" "$2" >"$WORK/page.log" 2>&1 ||
         fail "what is seen of a call that is $2"
 }
@@ -33,8 +34,17 @@ for path in drop/1/16 shutdown call/1%20--json calls?older=1%0Adrain 'call/%2D%2
     status=$(curl -s -o "$WORK/refused.log" -w '%{http_code}' --path-as-is "http://$HOST:$PORT_PAGE/control/$path")
     [[ $status == 404 ]] || fail "$path: $status"
 done
+post() { # TOKEN PATH
+    curl -s -o "$WORK/posted.log" -w '%{http_code}' -X POST -H "Authorization: Bearer $1" "http://$HOST:$PORT_PAGE/control/$2"
+}
+[[ $(post "" drop/1/16) == 401 ]] || fail "without a token"
+[[ $(post not-known-to-alL drop/1/16) == 401 ]] || fail "with another token"
+[[ $(post not-known-to-all shutdown) == 404 ]] || fail "the end, with the token"
+[[ $(post not-known-to-all drop/77/16) == 404 ]] || fail "a call that is not there"
+grep -qF 'no call 77 is up' "$WORK/posted.log" || fail "no reason"
+[[ $(post not-known-to-all block/a) == 200 && $(post not-known-to-all unblock/a) == 200 ]] || fail "an interface"
 [[ $(curl -s "http://$HOST:$PORT_PAGE/control/status") == *'"state":"serving"'* ]] || fail "no state"
-tell_phone "$PORT_CALLER" hangup
+look 3 clear "$3"
 expect_causes 1 16
 look 2 over "$3"
 stop_phones
