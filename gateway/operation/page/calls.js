@@ -10,6 +10,7 @@ const main = document.getElementById("main");
 const search = document.getElementById("search");
 let selected = 0;
 let isPaused = false;
+let looks = 0; // that were begun
 let shownHistory = null; // leg and property
 let shown = ""; // what the page has been made of
 let scores = new Map(); // of the call that is looked at: by leg, what each look has told
@@ -45,8 +46,7 @@ function row(call, cells) {
     return element;
 }
 
-async function showAll() {
-    const [status, up, recorded] = await Promise.all([ask("status"), ask("top?rows=200"), ask("recorded")]);
+function showAll([status, up, recorded]) {
     document.getElementById("state").textContent = `${status[0].state}, ${status[0].calls} up`;
     const upRows = up.map((call) => [call.call, call.age.toFixed(1), call.state, call.parties, call.opinion ?? "", call.lost ?? ""])
         .filter((cells) => isWanted(cells.join(" ")));
@@ -135,8 +135,7 @@ function past(events) {
     return [make("h2", { id: "history" }, `${shownHistory.property} of leg ${shownHistory.leg}`), table(["time", "turn", "before", "after", "written by"], rows)];
 }
 
-async function showOne(serial) {
-    const lines = await ask("call/" + encodeURIComponent(serial));
+function showOne(serial, lines) {
     const explained = lines.find((line) => line.legs !== undefined);
     const events = lines.filter((line) => line.event !== undefined);
     document.getElementById("state").textContent = `call ${serial}, ${explained ? `${explained.state}, ${seconds(explained.age)} s` : "over"}`;
@@ -174,10 +173,15 @@ async function clear(event) {
 async function show() {
     const serial = selectedCall();
     document.body.toggleAttribute("data-call", serial !== undefined);
+    const look = ++looks;
     try {
-        await (serial ? showOne(serial) : showAll());
+        const answers = await Promise.all((serial ? [`call/${serial}`] : ["status", "top?rows=200", "recorded"]).map(ask));
+        if (look !== looks) return; // somebody has looked elsewhere meanwhile
+        if (serial) showOne(serial, answers[0]);
+        else showAll(answers);
         main.classList.remove("bad");
     } catch (error) {
+        if (look !== looks) return;
         shown = "";
         main.classList.add("bad");
         main.textContent = error.message;
