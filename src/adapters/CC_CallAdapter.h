@@ -331,6 +331,7 @@ private:
     void catchUp();
     bool hasToCatchUp() const;
     void onPeerPropertyChanged(CC_Flags const& flags);
+    void onOtherRelinked(CC_CallLeg const& leg);
     void onOtherPropertyChanged(CC_CallLeg const& leg, CC_Flags const& flags);
 
     static TYInstances<CC_CallAdapter> s_instances;

@@ -253,6 +253,45 @@ TEST_F(CC_CallAdapter_Following_Test, AChangeOfAJoiningLegThatLooksLikeTheFormer
     }
 }
 
+TEST_F(CC_CallAdapter_Following_Test, ALegThatRisesWhileItJoinsTakesOver)
+{
+    /// Raises a leg that joins.
+    struct Guest : CC_CallObserver
+    {
+        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
+        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
+        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
+        {
+            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
+            EXPECT_TRUE(leg->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::CONNECTED)).isOk());
+        }
+    };
+    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
+    ASSERT_TRUE(a.dial().isOk());
+    CC_CallLeg* const legs[] = {new CC_CallLeg, new CC_CallLeg};
+    char const* const names[] = {"the first", "the second"};
+    for (int i = 0; i < 2; ++i)
+    {
+        ASSERT_TRUE(legs[i]->setProperty(CC_PropertyString(NAME, names[i])).isOk());
+        ASSERT_TRUE(legs[i]->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::TRYING)).isOk());
+    }
+    ASSERT_TRUE(theCall().addCallLeg(*legs[0]).isOk());
+    settle();
+    EXPECT_EQ(a.peer(NAME), "the first");
+    Guest guest;
+    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter, for which it was no peer
+    ASSERT_TRUE(theCall().addCallLeg(*legs[1]).isOk());
+    settle();
+    EXPECT_EQ(a.peer(NAME), "the second");
+    theCall().removeCallObserver(&guest);
+    for (CC_CallLeg* const leg : legs)
+    {
+        theCall().removeCallLeg(*leg);
+        leg->removeReference();
+    }
+}
+
 TEST_F(CC_CallAdapter_Following_Test, AChangeInsideTheNewsThroughWhichTheLegJoinsIsSeenToo)
 {
     /// Brings a leg into a call when it changes, and changes it again as soon as it is there.

@@ -59,8 +59,10 @@ void CC_CallAdapter::onCallLegObservationEnded(CC_Event<CC_CallLeg> const& event
 void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
 {
     auto const& relinked = CC_EvCallLegCallRelinked::FROM(event);
-    if (m_ownCallLeg == nullptr || relinked.getSource() != m_ownCallLeg)
+    if (m_ownCallLeg == nullptr)
         return;
+    if (relinked.getSource() != m_ownCallLeg)
+        return onOtherRelinked(*relinked.getSource());
     Attempt const attempt(*this);
     unobserveCall();
     if (relinked.getNewCall() != nullptr)
@@ -77,6 +79,15 @@ void CC_CallAdapter::onCallLegCallRelinked(CC_Event<CC_CallLeg> const& event)
             return;
     }
     linkPeerCallLeg();
+}
+
+/// From now on we hear of a leg that has joined. It may have risen above the peer since we were told that it comes.
+void CC_CallAdapter::onOtherRelinked(CC_CallLeg const& leg)
+{
+    bool const isMissed = &leg != m_peerCallLeg && leg.getCall() != nullptr && leg.getCall() == getCall() &&
+                          (m_peerCallLeg == nullptr || leg.getActivityLevel() > m_peerCallLeg->getActivityLevel());
+    if (isMissed)
+        linkPeerCallLeg();
 }
 
 void CC_CallAdapter::onCallLegPropertyChanged(CC_Event<CC_CallLeg> const& event)
