@@ -85,16 +85,18 @@ double secondsPerCall(CallControlFixture& fixture, unsigned int calls)
     return (secondsOfThisThread() - begin) / calls;
 }
 
-TEST(Scale, TenThousandCallsCostNoMoreThanTwiceAsMuchEachAsAHundred)
+TEST(Scale, TenThousandCallsCostNoMoreThanFourTimesAsMuchEachAsAHundred)
 {
     // Memory once had is kept, so that what is measured is calls and not the system handing out pages; and the least of
-    // several runs each, since what the machine does besides only adds.
+    // several runs each, since what the machine does besides only adds. A hundred calls fit into the processor's cache,
+    // ten thousand do not, and if others want it too that alone doubles the time; what grew with the number of calls
+    // would make it a hundred times as much. Instructions are counted elsewhere.
     mallopt(M_TRIM_THRESHOLD, 1 << 30);
     TYRecycled::KEEP_BLOCKS(TYRecycled::DEFAULT_BLOCKS); // as in a gateway
     CallControlFixture fixture;
     double few = 1;
     double many = 1;
-    for (int i = 0; i < 5 || (i < 200 && many > 2 * few); ++i)
+    for (int i = 0; i < 5 || (i < 50 && many > 4 * few); ++i)
     {
         for (int j = 0; j < 10; ++j)
             few = std::min(few, secondsPerCall(fixture, 100));
@@ -103,6 +105,6 @@ TEST(Scale, TenThousandCallsCostNoMoreThanTwiceAsMuchEachAsAHundred)
     RecordProperty("microsecondsPerCallOf100", std::to_string(few * 1e6));
     RecordProperty("microsecondsPerCallOf10000", std::to_string(many * 1e6));
     TYRecycled::KEEP_BLOCKS(0);
-    EXPECT_LE(many, 2 * few) << few * 1e6 << " and " << many * 1e6 << " microseconds";
+    EXPECT_LE(many, 4 * few) << few * 1e6 << " and " << many * 1e6 << " microseconds";
 }
 } // namespace
