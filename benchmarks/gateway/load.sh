@@ -8,11 +8,17 @@
 PORT_METRICS=$((PORT + 30))
 SIPP_TIMEOUT=900s
 LOG_LEVEL=info
+BUFFER=4194304     # octets of SIPp's sockets; with its own choice they lose what comes while it does not run
 EVERYTHING_OVER=40 # seconds after which no transaction is left
 
 # of_screen WORDS: the last figure of such a line of the caller's last screen
 of_screen() { grep -F "$1" "$WORK/caller.out" | tail -n 1 | grep -oE '[0-9]+' | tail -n 1; }
 metric() { scrape 1 | awk -v name="callcontrol_gateway_$1" '$1 == name { print $2 }'; }
+
+# datagrams that came faster than the gateway took them, so far
+lost_by_gateway() {
+    awk -v ports="$(printf '%04X %04X' $PORT_A $PORT_B)" '{ split($2, address, ":") } index(ports, address[2]) { sum += $NF } END { print sum + 0 }' /proc/net/udp
+}
 
 # note_children: processor time of what has run here and is over, in microseconds; not for a subshell, where that is nothing
 note_children() {
@@ -22,15 +28,16 @@ note_children() {
 
 # load CALLS PER-SECOND MILLISECONDS [COMMAND]...: that many calls of that length, however they end, and meanwhile the command
 load() {
-    local before started background_pid=0
+    local before started lost background_pid=0
     HELD=$3
-    start_callee callee -m "$1" -l 1000000
+    start_callee callee -m "$1" -l 1000000 -buff_size $BUFFER
     note_children
+    lost=$(lost_by_gateway)
     of_peers=$children
     before=$(processor)
     started=$EPOCHREALTIME
     (($# < 4)) || { "${@:4}" & background_pid=$!; }
-    run_caller caller 4989123 -m "$1" -r "$2" -l 1000000
+    run_caller caller 4989123 -m "$1" -r "$2" -l 1000000 -buff_size $BUFFER
     seconds=$(awk -v a="$started" -v b="$EPOCHREALTIME" -v held="$3" 'BEGIN { print b - a - held / 1000 }')
     used=$(($(processor) - before))
     failed=$(of_screen "Failed call")
@@ -43,6 +50,7 @@ load() {
     tell "$1 calls at $2 a second: failed" "$failed" ''
     tell "  a second that SIPp came to" "$(divided "$1" "$seconds")" ''
     tell "  repeated by SIPp's calling side" "$(awk '/ (INVITE|BYE) -+>/ { sum += $4 } END { print sum + 0 }' "$WORK/caller.out")" ''
+    tell "  datagrams that found the gateway's sockets full" $(($(lost_by_gateway) - lost)) ''
     tell "  processor time of 1,000 calls" "$(divided "$used" "$1")" ms
     tell "  of SIPp's both sides, for comparison" "$(divided "$of_peers" "$1")" ms
 }

@@ -1,5 +1,6 @@
 #include "diagnosis/CC_JsonLine.h"
 
+#include <algorithm>
 #include <array>
 #include <cstdio>
 
@@ -43,13 +44,19 @@ void APPEND_ESCAPED(std::string& out, char c)
     else
         out += c;
 }
-} // namespace
+bool IS_PLAIN(char c) { return OCTET(c) >= 0x20 && OCTET(c) < 0x7f && c != '"' && c != '\\'; }
 
-std::string CC_JsonLine::QUOTED(std::string_view text)
+void APPEND_QUOTED(std::string& out, std::string_view text)
 {
-    std::string out = "\"";
+    out += '"';
     while (!text.empty())
     {
+        auto const plain =
+            static_cast<std::size_t>(std::find_if_not(text.begin(), text.end(), IS_PLAIN) - text.begin());
+        out += text.substr(0, plain);
+        text.remove_prefix(plain);
+        if (text.empty())
+            break;
         std::size_t const length = LENGTH_OF_FIRST(text);
         if (length == 1)
             APPEND_ESCAPED(out, text[0]);
@@ -57,10 +64,32 @@ std::string CC_JsonLine::QUOTED(std::string_view text)
             out += length == 0 ? REPLACEMENT : text.substr(0, length);
         text.remove_prefix(length == 0 ? 1 : length);
     }
-    return out + '"';
+    out += '"';
 }
 
-CC_JsonLine& CC_JsonLine::add(std::string_view name, std::string_view text) { return addJson(name, QUOTED(text)); }
+void APPEND_NAME(std::string& out, std::string_view name)
+{
+    if (out.size() > 1)
+        out += ',';
+    APPEND_QUOTED(out, name);
+    out += ':';
+}
+} // namespace
+
+std::string CC_JsonLine::QUOTED(std::string_view text)
+{
+    std::string out;
+    out.reserve(text.size() + 2);
+    APPEND_QUOTED(out, text);
+    return out;
+}
+
+CC_JsonLine& CC_JsonLine::add(std::string_view name, std::string_view text)
+{
+    APPEND_NAME(m_text, name);
+    APPEND_QUOTED(m_text, text);
+    return *this;
+}
 
 CC_JsonLine& CC_JsonLine::add(std::string_view name, unsigned long long number)
 {
@@ -69,9 +98,7 @@ CC_JsonLine& CC_JsonLine::add(std::string_view name, unsigned long long number)
 
 CC_JsonLine& CC_JsonLine::addJson(std::string_view name, std::string_view json)
 {
-    if (m_text.size() > 1)
-        m_text += ',';
-    (m_text += QUOTED(name)) += ':';
+    APPEND_NAME(m_text, name);
     m_text += json;
     return *this;
 }
