@@ -105,12 +105,14 @@ rate() { load 120000 2000 100; }
 up() {
     local before
     before=$(memory)
-    load 20000 400 75000 tell_of_calls "$before"
+    load 20000 400 110000 tell_of_calls "$before"
 }
 tell_of_calls() { # MEMORY-BEFORE
-    sleep 60
+    sleep 52 # all are up, and of those of the last 32 seconds the transactions last
     tell "calls up at the same time" "$(metric pool_most_calls)" ''
-    tell "  memory of a call, with those transactions that last" "$(divided $((($(memory) - $1) * 1024)) 20000)" octets
+    tell "  memory of a call, six tenths of which have transactions" "$(divided $((($(memory) - $1) * 1024)) 20000)" octets
+    sleep $EVERYTHING_OVER
+    tell "  when the transactions are over" "$(divided $((($(memory) - $1) * 1024)) 20000)" octets
 }
 memory_after() {
     sleep $EVERYTHING_OVER
