@@ -25,14 +25,29 @@ SipWay::Way WAY_OF(std::string const& transport)
     return transport == "tcp" ? SipWay::TCP : SipWay::UDP;
 }
 
+/// Where the name says how a peer is reached, its requests in a dialog come back as well as they can: by UDP, else TCP.
+void CHECK_NAMED(ConfigurationSection const& section, SipConfiguration const& interface)
+{
+    std::vector<SipPeer> const peers = interface.getPeers();
+    if (std::none_of(peers.begin(), peers.end(),
+                     [](SipPeer const& peer) { return peer.address.isName() && peer.address.port == 0; }))
+        section.refuse("transport", "'named' is for peers that have a name without a port");
+    if (interface.listensOnTls)
+        section.refuse("transports", "may not have 'tls' where the name chooses: what it secures would be left to it");
+}
+
 /// Without `transports` an interface listens on what it speaks to its peer.
 void READ_TRANSPORTS(ConfigurationSection const& section, SipConfiguration& interface)
 {
-    interface.way = WAY_OF(section.oneOf("transport", "udp", {"udp", "tcp", "tls", "sips"}));
+    std::string const transportToPeer = section.oneOf("transport", "udp", {"udp", "tcp", "tls", "sips", "named"});
+    interface.way = WAY_OF(transportToPeer);
+    interface.isWayNamed = transportToPeer == "named";
     bool const isSecured = SipWay::IS_SECURED(interface.way);
     char const* const towardsPeer = isSecured ? "tls" : interface.way == SipWay::TCP ? "tcp" : "udp";
     interface.listensOnUdp = false;
-    for (std::string const& transport : section.texts("transports", {towardsPeer}))
+    std::vector<std::string> const ownTransports =
+        interface.isWayNamed ? std::vector<std::string>{"udp", "tcp"} : std::vector<std::string>{towardsPeer};
+    for (std::string const& transport : section.texts("transports", ownTransports))
         if (transport == "udp")
             interface.listensOnUdp = true;
         else if (transport == "tcp")
@@ -41,6 +56,11 @@ void READ_TRANSPORTS(ConfigurationSection const& section, SipConfiguration& inte
             interface.listensOnTls = true;
         else
             section.refuse("transports", "must be some of udp, tcp, tls");
+    if (interface.isWayNamed)
+    {
+        CHECK_NAMED(section, interface);
+        interface.way = interface.listensOnUdp ? SipWay::UDP : SipWay::TCP;
+    }
     if (!(isSecured                      ? interface.listensOnTls
           : interface.way == SipWay::TCP ? interface.listensOnTcp
                                          : interface.listensOnUdp))

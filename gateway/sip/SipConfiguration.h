@@ -61,6 +61,7 @@ struct SipConfiguration
     unsigned int probeDown = 2;     ///< probes in a row without an answer, until it does not
     unsigned int failoverAfter = 0; ///< milliseconds without an answer, until another peer is tried; 0: t1x64
     SipWay::Way way = SipWay::UDP;  ///< towards the peer
+    bool isWayNamed = false;        ///< by the peer's name, if that has no port; else it is `way`
     bool listensOnUdp = true;       ///< one of the three at least
     bool listensOnTcp = false;
     bool listensOnTls = false;
@@ -119,6 +120,12 @@ struct SipConfiguration
     SocketAddress getAddress(SipWay::Way by) const
     {
         return SipWay::IS_SECURED(by) ? SocketAddress{getAddress().host, tlsPort} : getAddress();
+    }
+
+    /// How a request outside of dialogs gets to that peer.
+    SipWay::Way getWayTo(SocketAddress const& of) const
+    {
+        return isWayNamed && of.isName() && of.port == 0 ? SipWay::AS_NAMED : way;
     }
 
     bool hasPeer() const { return !peer.host.empty(); }

@@ -17,10 +17,11 @@ namespace
 std::string DESCRIBE(std::string_view name, SipAuthentication const& authentication)
 {
     SipAuthentication::Counters const& counters = authentication.getCounters();
-    return fmt::format("interface {}: {} requests of known users, {} asked who, {} wrong, {} stale, {} replayed; {} "
+    return fmt::format("interface {}: {} requests of known users, {} asked who, {} wrong, {} stale, {} replayed, {} "
+                       "for another URI; {} "
                        "addresses banned, {} requests of theirs ignored\n",
                        name, counters.accepted, counters.asked, counters.wrong, counters.stale, counters.replayed,
-                       authentication.getNumberOfBanned(), counters.ignored);
+                       counters.moved, authentication.getNumberOfBanned(), counters.ignored);
 }
 } // namespace
 

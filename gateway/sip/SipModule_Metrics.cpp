@@ -31,7 +31,8 @@ void ADD_LOGINS(MetricText& text, std::string_view name, SipAuthentication::Coun
 {
     std::pair<std::string_view, unsigned long long> const results[] = {
         {"known", counters.accepted}, {"asked", counters.asked},       {"wrong", counters.wrong},
-        {"stale", counters.stale},    {"replayed", counters.replayed}, {"ignored", counters.ignored}};
+        {"stale", counters.stale},    {"replayed", counters.replayed}, {"moved", counters.moved},
+        {"ignored", counters.ignored}};
     for (auto const& [result, number] : results)
         text.add(number, {{"interface", name}, {"result", result}});
 }

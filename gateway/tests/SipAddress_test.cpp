@@ -30,6 +30,7 @@ TEST(SipAddress, UrisNameUserAddressAndTransport)
     EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5061}, SipWay::TLS), "sip:49@192.0.2.1:5061;transport=tls");
     EXPECT_EQ(SipAddress::MAKE_URI("49", {"192.0.2.1", 5061}, SipWay::SIPS), "sips:49@192.0.2.1:5061");
     EXPECT_EQ(SipAddress::MAKE_URI("49", {"sip.example", 0}, SipWay::UDP), "sip:49@sip.example;transport=udp");
+    EXPECT_EQ(SipAddress::MAKE_URI("49", {"sip.example", 0}, SipWay::AS_NAMED), "sip:49@sip.example");
 }
 
 TEST(SipAddress, DisplayNamesAreQuoted)

@@ -92,6 +92,39 @@ TEST_F(SipAuthenticationTest, WhatWasSentOnceIsNotTakenTwice)
     EXPECT_EQ(authentication.getCounters().replayed, 1u);
 }
 
+TEST_F(SipAuthenticationTest, CredentialsForOneNumberCallNoOther)
+{
+    struct
+    {
+        char const* shown; // in the credentials
+        char const* asked; // in the request
+        SipAuthentication::Verdict verdict;
+    } const cases[] = {
+        {"sip:4989@host", "sip:4989@host", SipAuthentication::ACCEPTED},
+        {"sip:4989@office.example", "sip:4989@192.0.2.1:5070;transport=tcp", SipAuthentication::ACCEPTED}, // routed on
+        {"sip:+49-89@host;user=phone", "tel:+4989", SipAuthentication::ACCEPTED},
+        {"sips:%34989@host", "sip:4989@host", SipAuthentication::ACCEPTED},
+        {"urn:service:SOS", "urn:service:sos", SipAuthentication::ACCEPTED},
+        {"sip:host", "sip:other", SipAuthentication::ACCEPTED}, // a REGISTER
+        {"sip:4989@host", "sip:4988@host", SipAuthentication::REFUSE},
+        {"sip:host", "sip:4989@host", SipAuthentication::REFUSE},
+        {"sip:4989@host", "sip:host", SipAuthentication::REFUSE},
+        {"sip:4989@host", "tel:+4989", SipAuthentication::REFUSE},
+        {"", "sip:host", SipAuthentication::REFUSE},
+        {"/", "sip:host", SipAuthentication::REFUSE},
+    };
+    for (auto const& [shown, asked, verdict] : cases)
+    {
+        SipChallenge const challenge = ask();
+        std::string const secret = SipDigest::SECRET(challenge.algorithm, "alice", challenge.realm, "secret");
+        std::string const header = challenge.answer({"alice", secret}, "INVITE", shown, "", 1);
+        SipMessage const invite = SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n" + header, asked);
+        EXPECT_EQ(authentication.check(invite.get(), SOURCE).verdict, verdict) << shown << " for " << asked;
+    }
+    EXPECT_EQ(authentication.getCounters().moved, 6u);
+    EXPECT_EQ(authentication.getNumberOfBanned(), 0u); // nobody has guessed
+}
+
 TEST_F(SipAuthenticationTest, ANonceWithoutACountServesOnce)
 {
     SipChallenge challenge = ask();

@@ -137,6 +137,18 @@ TEST(SipConfiguration, WithoutListOfTransportsAnInterfaceListensOnWhatItSpeaksTo
     EXPECT_FALSE(a.listensOnUdp);
 }
 
+TEST(SipConfiguration, APeersNameMaySayHowItIsReached)
+{
+    std::string const named = "[[sip]]\nname = \"a\"\nlisten = \"127.0.0.1:5060\"\nallow = [\"127.0.0.1\"]\n"
+                              "peer = \"sip.example\"\ntransport = \"named\"\n";
+    SipConfiguration const a = READ(named).at(0);
+    EXPECT_TRUE(a.listensOnUdp && a.listensOnTcp && !a.listensOnTls);
+    EXPECT_EQ(a.getWayTo(a.peer), SipWay::AS_NAMED);
+    EXPECT_EQ(a.getWayTo({"sip.example", 5060}), SipWay::UDP); // a port has no service to ask for
+    EXPECT_EQ(a.getWayTo({"192.0.2.1", 5060}), SipWay::UDP);
+    EXPECT_EQ(READ(named + "transports = [\"tcp\"]\n").at(0).way, SipWay::TCP);
+}
+
 TEST(SipConfiguration, ALongerTimeOfTransactionsFollowsFromALongerFirstRetransmission)
 {
     EXPECT_EQ(READ(std::string(LEAST) + "t1 = 1000\n").at(0).t1x64, 64000u);
@@ -221,6 +233,7 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "peers = [\"127.0.0.1:2\"]", "f: sip[0].peers: expected tables, [[peers]]"},
         {whole + "probe = 3601", "f: sip[0].probe: must be from 0 to 3600"},
         {whole + "transport = \"tls\"", "f: sip[0].tls-certificate: is missing"},
+        {whole + "transport = \"named\"", "f: sip[0].transport: 'named' is for peers that have a name without a port"},
         {whole + "transport = \"tls\"\ntls-certificate = \"c\"", "f: sip[0].tls-key: is missing"},
         {whole + "transports = [\"udp\", \"tls\"]\ntls-certificate = \"c\"\ntls-key = \"k\"",
          "f: sip[0].tls-authorities: is needed to verify certificates"},

@@ -1,7 +1,9 @@
 #include "sip/access/SipAuthentication.h"
 
 #include "sip/access/SipChallenge.h"
+#include "sip/message/SipParty.h"
 #include "sip/message/SipText.h"
+#include "sip/stack/SipHandles.h"
 
 #include <algorithm>
 #include <arpa/inet.h>
@@ -55,6 +57,9 @@ SipAuthentication::Decision SipAuthentication::check(sip_t const* request, Inter
     case REPLAYED:
         ++m_counters.replayed;
         return {ASK, {}, makeChallenge(source, false), true};
+    case MOVED:
+        ++m_counters.moved;
+        return {REFUSE, {}, {}, true};
     case NOTHING:
         ++m_counters.asked;
         break;
@@ -68,6 +73,8 @@ SipAuthentication::Finding SipAuthentication::examine(sip_t const* request, Inte
         return NOTHING;
     if (!m_nonces.isOurs(shown.nonce, source)) // that of a process before, or at another address: nothing is tried
         return STALE;
+    if (!IS_MEANT(request, shown))
+        return MOVED;
     if (!isRight(request, shown))
         return WRONG;
     switch (m_nonces.use(shown.nonce, COUNT_OF(shown.quality, shown.count)))
@@ -104,6 +111,17 @@ bool SipAuthentication::read(sip_t const* request, Shown& shown) const
         return shown.quality.empty() || SipText::IS_ONE_OF(shown.quality, {"auth", "auth-int"});
     }
     return false;
+}
+
+/// Whether the credentials were made for what the request asks for (RFC 7616, 3.4.6): who is called, or that nobody is.
+/// That is all of the URI that no proxy on the way has to change: host, port and parameters are another one's once it
+/// was routed, and a number is the same as sip and as tel URI, with separators or without.
+bool SipAuthentication::IS_MEANT(sip_t const* request, Shown const& shown)
+{
+    SipHome const home(su_home_create());
+    url_t const* const meant = url_make(home.get(), shown.uri.c_str());
+    return meant != nullptr && meant->url_scheme != nullptr &&
+           SipParty::OF_URI(*meant).getUser() == SipParty::OF_URI(*request->sip_request->rq_url).getUser();
 }
 
 /// The same work for whoever is not in the file.

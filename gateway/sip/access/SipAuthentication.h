@@ -23,12 +23,14 @@ public:
         unsigned long long wrong = 0;    ///< passwords and users
         unsigned long long stale = 0;    ///< nonces, expired or not ours
         unsigned long long replayed = 0; ///< nonces, with a count that was used
+        unsigned long long moved = 0;    ///< credentials that were shown for somebody else to be called
         unsigned long long ignored = 0;  ///< messages of those who are banned
     };
     enum Verdict
     {
         ACCEPTED, ///< `user` is who it is
         ASK,      ///< 401 with `challenge`
+        REFUSE,   ///< 400
         IGNORE
     };
     struct Decision
@@ -67,11 +69,13 @@ private:
         NOTHING,
         WRONG,
         STALE,
-        REPLAYED
+        REPLAYED,
+        MOVED
     };
 
     Finding examine(sip_t const* request, InternetAddress const& source, Shown& shown);
     bool read(sip_t const* request, Shown& shown) const;
+    static bool IS_MEANT(sip_t const* request, Shown const& shown);
     bool isRight(sip_t const* request, Shown const& shown) const;
     void onWrong(InternetAddress const& source);
     std::string makeChallenge(InternetAddress const& source, bool isStale) const;

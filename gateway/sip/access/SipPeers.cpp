@@ -134,7 +134,8 @@ void SipPeers::onTimer()
 
 void SipPeers::probe(Peer& peer)
 {
-    std::string const uri = SipAddress::MAKE_URI({}, peer.configured.address, m_configuration.way);
+    std::string const uri =
+        SipAddress::MAKE_URI({}, peer.configured.address, m_configuration.getWayTo(peer.configured.address));
     std::string const to = SipAddress::MAKE_NAME_ADDR({}, uri);
     peer.probe = m_sender.send(m_leg.get(), HANDLE_RESPONSE, asMagic(), SIP_METHOD_OPTIONS,
                                URL_STRING_MAKE(uri.c_str()), SIPTAG_TO_STR(to.c_str()),

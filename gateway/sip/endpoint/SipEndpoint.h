@@ -166,6 +166,7 @@ private:
     bool tryNextPeer();
     void noteHeard();
     SocketAddress const& getPeerAddress() const;
+    std::string makePeerUri(std::string_view user) const;
     bool startInvite();
     static int HANDLE_INVITE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void onProvisional(unsigned int status, sip_t const* response);

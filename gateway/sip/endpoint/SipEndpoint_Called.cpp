@@ -134,10 +134,10 @@ bool SipEndpoint::inviteNumber()
     SipParty const& called = m_called;
     SipIdentity const caller{SipParty::OF_PEER(m_adapter), SipParty::SECOND_OF_PEER(m_adapter)};
     bool const isService = m_contacts.empty() && SipService::IS_ONE(called.number);
-    m_inviteRoute = isService ? "<" + SipAddress::MAKE_URI({}, getPeerAddress(), m_way) + ";lr>" : std::string();
+    m_inviteRoute = isService ? "<" + makePeerUri({}) + ";lr>" : std::string();
     std::string const uri = isService ? called.number
                             : m_contacts.empty()
-                                ? SipAddress::MAKE_URI(called.getUser(), getPeerAddress(), m_way)
+                                ? makePeerUri(called.getUser())
                                 : SipAddress::MAKE_URI(called.getUser(), configuration.getAddress(), SipWay::UDP);
     std::string const to = SipAddress::MAKE_NAME_ADDR(called.name, uri);
     char const* const tag = m_leg != nullptr ? nta_leg_get_tag(m_leg) : nullptr;

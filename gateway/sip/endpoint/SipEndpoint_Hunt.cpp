@@ -60,6 +60,14 @@ bool SipEndpoint::findPeer()
 
 SocketAddress const& SipEndpoint::getPeerAddress() const { return m_interface.getPeers().getAddress(m_peers.front()); }
 
+/// At the peer that is being tried.
+std::string SipEndpoint::makePeerUri(std::string_view user) const
+{
+    SocketAddress const& peer = getPeerAddress();
+    return SipAddress::MAKE_URI(user, peer,
+                                m_way == SipWay::SIPS ? m_way : m_interface.getConfiguration().getWayTo(peer));
+}
+
 bool SipEndpoint::tryAnother(unsigned int status, sip_t const* response)
 {
     bool const isOurs = response == nullptr || nta_sip_is_internal(response); // the stack's word for a peer's silence
@@ -81,7 +89,7 @@ bool SipEndpoint::tryNextPeer()
         return false;
     m_peers.erase(m_peers.begin());
     m_interface.getPeers().noteCall(m_peers.front());
-    m_inviteUri = SipAddress::MAKE_URI(m_called.getUser(), getPeerAddress(), m_way);
+    m_inviteUri = makePeerUri(m_called.getUser());
     m_invite.forget();
     m_negotiation.fail();
     return startInvite();

@@ -255,6 +255,8 @@ try
     if (decision.verdict == SipAuthentication::ASK && mayAnswer(message, sip, source, decision.challenge.size()))
         nta_msg_treply(m_agent.get(), message, SIP_401_UNAUTHORIZED, SIPTAG_HEADER_STR(decision.challenge.c_str()),
                        TAG_END());
+    else if (decision.verdict == SipAuthentication::REFUSE) // who knows a nonce is no made-up address
+        nta_msg_treply(m_agent.get(), message, 400, "Credentials For Another URI", TAG_END());
     else if (decision.verdict == SipAuthentication::IGNORE)
         nta_msg_discard(m_agent.get(), message);
     m_knownUser = decision.user;

@@ -2,7 +2,6 @@
 
 #include "sip/message/SipAddress.h"
 #include "sip/message/SipPrivacy.h"
-#include "sip/message/SipService.h"
 
 namespace
 {
@@ -78,10 +77,7 @@ void SipIdentity::normalise(DialPlan const& plan)
 
 SipParty SipIdentity::READ_CALLED(sip_t const* invite)
 {
-    std::string const service = SipService::READ(*invite->sip_request->rq_url);
-    SipParty called = service.empty()
-                          ? SipParty::OF_USER(SipNameAddr::OF(nullptr, *invite->sip_request->rq_url, nullptr).user)
-                          : SipParty::OF_USER(service);
+    SipParty called = SipParty::OF_URI(*invite->sip_request->rq_url);
     called.name = READ_NAME_OF_TO(invite);
     return called;
 }

@@ -7,6 +7,7 @@
 #include "properties/CC_PropertyScreeningIndicator.h"
 #include "properties/CC_PropertyTypeOfNumber.h"
 #include "sip/message/SipProperty.h"
+#include "sip/message/SipService.h"
 #include "sip/message/SipText.h"
 
 using namespace SipProperty;
@@ -82,6 +83,12 @@ SipParty SipParty::OF_USER(std::string_view user)
     party.type = QTypeOfNumber::INTERNATIONAL;
     party.plan = QNumberingPlan::ISDN;
     return party;
+}
+
+SipParty SipParty::OF_URI(url_t const& uri)
+{
+    std::string const service = SipService::READ(uri);
+    return OF_USER(service.empty() ? SipNameAddr::OF(nullptr, uri, nullptr).user : service);
 }
 
 std::string SipParty::getUser() const

@@ -29,6 +29,8 @@ struct SipParty
     /// Number and name of an address; no number for one that stands for "anonymous" or "not known".
     static SipParty OF(SipNameAddr const& address);
     static SipParty OF_USER(std::string_view user);
+    /// Whom a request with that URI is for: a number, or the service of an emergency call in its place.
+    static SipParty OF_URI(url_t const& uri);
     /// "+4989123" for an international number, any other as it is.
     std::string getUser() const;
     bool isRestricted() const { return presentation == QPresentationIndicator::RESTRICTED; }

@@ -8,7 +8,8 @@ struct SipWay
         UDP,
         TCP,
         TLS,
-        SIPS
+        SIPS,
+        AS_NAMED ///< to a peer alone: what the name server says of its name (RFC 3263, 4.1); no dialog is of it
     };
     static constexpr unsigned int NUMBER = SIPS + 1;
 

@@ -26,7 +26,7 @@ std::string ADDRESS_OF_RECORD(SipConfiguration const& configuration)
 /// Where a domain is named that is not the peer's own address, the peer is on the way there.
 std::string ROUTE_TO(SipConfiguration const& configuration)
 {
-    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.way);
+    std::string const uri = SipAddress::MAKE_URI({}, configuration.peer, configuration.getWayTo(configuration.peer));
     return configuration.domain == configuration.peer.text() ? std::string() : "<" + uri + ";lr>";
 }
 
