@@ -70,11 +70,12 @@ bool IsdnModule::clearCall(unsigned long long serial, QCause cause)
     return isHere;
 }
 
+/// A line whose far side has not heard all yet counts as one: the ends of its last calls may wait behind the window.
 std::size_t IsdnModule::getNumberOfEndpoints() const
 {
     std::size_t number = 0;
     for (auto const& port : m_ports)
-        number += port->interface.getNumberOfEndpoints();
+        number += port->interface.getNumberOfEndpoints() + (port->interface.getLink().isQuiet() ? 0 : 1);
     return number;
 }
 

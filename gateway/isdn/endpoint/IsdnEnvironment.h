@@ -24,6 +24,7 @@ struct IsdnEnvironment
     std::function<bool(std::string const& interface)> isBlocked;
     DialPlan const& dialPlan; ///< how numbers are dialled here
     Counters& counters;
-    bool relaysMedia = false;               ///< there is a media layer
-    std::function<void()> onEndpointGone{}; ///< told when an endpoint was destroyed; may be empty
+    bool relaysMedia = false; ///< there is a media layer
+    /// Told when an endpoint was destroyed, and when the far side has its last word; may be empty.
+    std::function<void()> onEndpointGone{};
 };

@@ -258,3 +258,9 @@ void IsdnInterface::cleanUp()
     if (m_environment.onEndpointGone)
         m_environment.onEndpointGone();
 }
+
+void IsdnInterface::onLinkQuiet()
+{
+    if (m_endpoints.empty() && m_environment.onEndpointGone)
+        m_environment.onEndpointGone();
+}

@@ -44,6 +44,7 @@ public:
     IsdnConfiguration const& getConfiguration() const { return m_configuration; }
     IsdnEnvironment& getEnvironment() const { return m_environment; }
     IsdnLink& getLink() { return m_link; }
+    IsdnLink const& getLink() const { return m_link; }
     IsdnChannels& getChannels() { return m_channels; }
     std::size_t getNumberOfEndpoints() const { return m_endpoints.size(); }
 
@@ -65,6 +66,7 @@ private:
     // --- IsdnLinkObserver
     void onLinkChange(bool isUp) override;
     void onNewLine() override { clearCalls(QCause::DESTINATION_OUT_OF_ORDER); }
+    void onLinkQuiet() override;
     void onLinkEvent(pri_event& event) override;
 
     void onRing(pri_event_ring& ring);

@@ -130,6 +130,7 @@ int IsdnLink::READ(pri* stack, void* buffer, int length)
     if (got == 0)
         return 0;
     link->m_hasRead = true;
+    link->m_window.onReceived({octets, got});
     std::memset(octets + got, 0, room - got + CHECK_SUM); // the stack reads past the end of an element without octets
     return static_cast<int>(got + CHECK_SUM);
 }
@@ -138,7 +139,12 @@ int IsdnLink::WRITE(pri* stack, void* buffer, int length)
 {
     auto* const link = static_cast<IsdnLink*>(pri_get_userdata(stack));
     if (link != nullptr && length > static_cast<int>(CHECK_SUM))
-        link->m_line.send({static_cast<unsigned char const*>(buffer), static_cast<std::size_t>(length) - CHECK_SUM});
+    {
+        std::span const frame(static_cast<unsigned char const*>(buffer), static_cast<std::size_t>(length) - CHECK_SUM);
+        link->m_line.send(frame);
+        link->m_window.onSent(frame);
+        link->m_wasQuiet = link->m_wasQuiet && link->isQuiet();
+    }
     return length; // what the line did not take is lost as on any line, and sent again
 }
 
@@ -153,6 +159,7 @@ void IsdnLink::onReadable()
     startTimer();
     if (!m_line.isOpen())
         closeLine();
+    tellIfQuiet();
 }
 
 /// The far end has gone. What that means for the link its timers will say.
@@ -172,6 +179,13 @@ void IsdnLink::runTimers()
     while (pri_event* const event = pri_schedule_run(m_stack))
         take(*event);
     startTimer();
+    tellIfQuiet();
+}
+
+void IsdnLink::tellIfQuiet()
+{
+    if (isQuiet() && !std::exchange(m_wasQuiet, true))
+        m_observer.onLinkQuiet();
 }
 
 void IsdnLink::startTimer()

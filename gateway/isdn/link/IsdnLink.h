@@ -3,6 +3,7 @@
 #include "host/SignallingLoop.h"
 #include "isdn/line/IsdnLine.h"
 #include "isdn/link/IsdnTimers.h"
+#include "isdn/link/IsdnWindow.h"
 #include "isdn/link/LibPri.h"
 #include "platform/eventloop/TYTimer.h"
 
@@ -17,6 +18,8 @@ public:
     /// Another line has taken the place of one that was lost: no B channel of before leads anywhere, and who is at the
     /// far end may know nothing of the calls. The stack may not even have noticed.
     virtual void onNewLine() {}
+    /// The far side has acknowledged all that was sent, or is gone.
+    virtual void onLinkQuiet() {}
     /// What the far side said, or a timer. The event is the stack's and holds until that is asked for anything.
     virtual void onLinkEvent(pri_event& event) = 0;
 
@@ -54,6 +57,8 @@ public:
     void open();
     /// Whether the far side can be reached.
     bool isUp() const { return m_isUp && m_line.isOpen(); }
+    /// Whether the far side has all that it was told, or cannot be told.
+    bool isQuiet() const { return !isUp() || m_window.isClear(); }
     bool isNetwork() const { return m_options.isNetwork; }
     IsdnTimers const& getTimers() const { return m_options.timers; }
     IsdnLine& getLine() const { return m_line; }
@@ -85,6 +90,7 @@ private:
     void runTimers();
     void startTimer();
     void take(pri_event& event);
+    void tellIfQuiet();
 
     IsdnLine& m_line;
     Options m_options;
@@ -94,6 +100,8 @@ private:
     bool m_isUp = false;
     bool m_isWatched = false; // the line
     bool m_hasRead = false;   // the stack says nothing of a frame that is no event
+    IsdnWindow m_window;
+    bool m_wasQuiet = true;
     TYTimer m_timer;
     TYTimer m_reopening;
 };

@@ -22,6 +22,7 @@ struct Side final : IsdnLinkObserver
         link.open();
     }
     void onLinkChange(bool isUp) override { told.push_back(isUp ? "up" : "down"); }
+    void onLinkQuiet() override { ++numberOfRests; }
     void onLinkEvent(pri_event& event) override
     {
         std::string text = pri_event2str(event.e) + std::string(" ");
@@ -63,6 +64,7 @@ struct Side final : IsdnLinkObserver
     Lines told;
     q931_call* call = nullptr;
     int channel = 0;
+    unsigned int numberOfRests = 0;
     IsdnLink link;
 };
 
@@ -159,6 +161,66 @@ TEST_F(IsdnLinkTest, ACallIsDialledDigitByDigitChargedAndCleared)
     EXPECT_TRUE(watch.runUntil([&] { return a->told.back().starts_with("HANGUP"); }));
     EXPECT_EQ(a->told,
               (Lines{"up", "SETUP_ACK ", "PROCEEDING ", "RINGING ", "ANSWER ", "FACILITY AOC-D 3", "HANGUP 17"}));
+}
+
+TEST_F(IsdnLinkTest, TheFarSideHasHeardAllWhenTheLinkIsQuiet)
+{
+    bringUp();
+    answer();
+    ASSERT_TRUE(watch.runUntil([&] { return a->link.isQuiet(); }));
+    unsigned int const before = a->numberOfRests;
+    constexpr int NUMBER = 200; // more than a window takes, and than there are numbers of frames
+    for (int i = 0; i < NUMBER; ++i)
+        a->link.ask([&](pri* stack) { return pri_keypad_facility(stack, a->call, "1"); });
+    EXPECT_FALSE(a->link.isQuiet());
+    ASSERT_TRUE(watch.runUntil([&] { return a->link.isQuiet(); }));
+    EXPECT_EQ(std::count(b->told.begin(), b->told.end(), "KEYPAD_DIGIT "), NUMBER);
+    EXPECT_EQ(a->numberOfRests, before + 1);
+}
+
+TEST_F(IsdnLinkTest, ALinkIsQuietWhenNobodyHearsAnyMore)
+{
+    user.timers.t200 = 20;
+    bringUp();
+    answer();
+    ASSERT_TRUE(watch.runUntil([&] { return a->link.isQuiet(); }));
+    unsigned int const before = a->numberOfRests;
+    watch.forget(far->getDescriptor());
+    a->link.ask([&](pri* stack) { return pri_keypad_facility(stack, a->call, "1"); });
+    EXPECT_FALSE(a->link.isQuiet());
+    EXPECT_TRUE(watch.runUntil([&] { return a->numberOfRests > before; })) << "after T200, so often as N200 says";
+    EXPECT_FALSE(a->link.isUp());
+}
+
+TEST(IsdnWindowTest, WhatIsSentAgainIsCountedOnce)
+{
+    using Octets = std::vector<unsigned char>;
+    auto const information = [](unsigned int number) {
+        return Octets{0, 1, static_cast<unsigned char>(2 * number), 0};
+    };
+    auto const ready = [](unsigned int number) { return Octets{0, 1, 1, static_cast<unsigned char>(2 * number)}; };
+    IsdnWindow window;
+    for (unsigned int number = 0; number < 300; ++number)
+    {
+        window.onSent(information(number % 128));
+        EXPECT_FALSE(window.isClear()) << number;
+        if (number % 3 != 2)
+            continue;
+        window.onSent(information((number - 1) % 128)); // again
+        window.onReceived(ready(number % 128));
+        EXPECT_FALSE(window.isClear()) << number;
+        window.onReceived(ready((number + 1) % 128));
+        EXPECT_TRUE(window.isClear()) << number;
+    }
+    window.onSent(information(44));
+    window.onSent(Octets{0, 1, 0x7f}); // SABME
+    EXPECT_TRUE(window.isClear());
+    window.onSent(information(0));
+    window.onReceived(Octets{0, 1, 0, 2});
+    EXPECT_TRUE(window.isClear()) << "an I frame acknowledges as well";
+    window.onReceived(Octets{0, 1});
+    window.onSent(Octets{});
+    EXPECT_TRUE(window.isClear()) << "what is no frame says nothing";
 }
 
 TEST_F(IsdnLinkTest, WhoGoesTakesTheLinkDown)

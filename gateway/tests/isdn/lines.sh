@@ -1,5 +1,5 @@
 # All channels of several lines are up at the same time, in one process, with speech both ways: half of the lines call, the
-# other half is called. Told are processor time, memory, descriptors and how late the loop was. By hand with more of them:
+# other half is called. At the end the far sides hear that each call is over. Told are processor time, memory, descriptors and how late the loop was. By hand with more of them:
 #
 #     bash lines.sh GATEWAY PORT EXCHANGE [LINES [SECONDS]]
 . "$(dirname "$0")/isdn.bash"
@@ -66,11 +66,10 @@ kill -TERM $gateway_pid
 status=0
 wait $gateway_pid || status=$?
 gateway_pid=0
-sleep 0.3
 stop_exchange
 kill -TERM $exchange_c
 wait $exchange_c
-grep -qE "$calls placed, $calls answered" "$WORK/exchange.out" || fail "not all calls were up: $(cat "$WORK/exchange.out")"
+grep -qE "$calls placed, $calls answered, $calls over" "$WORK/exchange.out" || fail "not all calls were up, and are over: $(cat "$WORK/exchange.out")"
 for side in exchange exchange_c; do # 50 blocks a second in each call, if the exchanges get that much of the processors
     blocks=$(sed -n 's/^exchange: \([0-9]*\) blocks heard/\1/p' "$WORK/$side.out")
     ((blocks > calls * seconds * 10)) || fail "only $blocks blocks were heard: $(cat "$WORK/$side.out")"

@@ -129,9 +129,10 @@ def callees(method, sequence):
 def calls_to(row):
     steps = []
     if row.has(row.said, "S 183"):
-        steps += [send(response("183 Session Progress"), session(SPEECH)), '<pause milliseconds="100"/>']
+        steps += [send(response("183 Session Progress"), session(SPEECH)), '<pause milliseconds="800"/>']
     elif not row.status():
-        steps += [send(response("180 Ringing") + row.headers("180")), '<pause milliseconds="100"/>']
+        milliseconds = 800 if row.headers("180") else 100  # it is what the row is about
+        steps += [send(response("180 Ringing") + row.headers("180")), f'<pause milliseconds="{milliseconds}"/>']
     if row.status():
         said = next(one for one in row.said if one.startswith(f"S {row.status()}"))
         return steps + [send(response(f"{row.status()} No") + [header for header in [said[6:].strip()] if header], "", True),
