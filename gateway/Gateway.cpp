@@ -113,7 +113,6 @@ Gateway::Gateway(Configuration const& configuration, Modules modules, unsigned i
              configuration.relaysMedia,
              false,
              [this] { stopIfIdle(); }}
-    , m_freeMemory(m_callControlLoop)
     , m_service(m_callControlLoop)
     , m_clearTimer(
           m_callControlLoop, EventPrio::NORMAL, [](void* gateway) { static_cast<Gateway*>(gateway)->onClearTimer(); },

@@ -3,7 +3,6 @@
 #include "configuration/Configuration.h"
 #include "host/CallControlHost.h"
 #include "host/EpollLoop.h"
-#include "host/FreeMemory.h"
 #include "host/GatewayHost.h"
 #include "host/SignallingModule.h"
 #include "media/context/MediaLayer.h"
@@ -107,7 +106,6 @@ private:
     std::unique_ptr<HepCapture> m_capture; // null where it is not configured
     CallControlHost m_callControl;
     GatewayHost m_host;
-    FreeMemory m_freeMemory;
     ServiceNotifier m_service;
     TYTimer m_clearTimer;
     bool m_isClearing = false;
