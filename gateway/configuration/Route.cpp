@@ -31,6 +31,8 @@ void READ_LIMITS(ConfigurationSection const& section, Route& route)
         section.refuse("emergency", "for which number? number or prefix is needed");
     if (route.isLimited())
         section.refuse("emergency", "and a limit of calls exclude each other");
+    if (section.has("user"))
+        section.refuse("emergency", "and user exclude each other");
 }
 
 WeekHours READ_HOURS(ConfigurationSection const& section)

@@ -30,9 +30,9 @@ struct StackCounters
 void ADD_LOGINS(MetricText& text, std::string_view name, SipAuthentication::Counters const& counters)
 {
     std::pair<std::string_view, unsigned long long> const results[] = {
-        {"known", counters.accepted}, {"asked", counters.asked},       {"wrong", counters.wrong},
-        {"stale", counters.stale},    {"replayed", counters.replayed}, {"moved", counters.moved},
-        {"ignored", counters.ignored}};
+        {"known", counters.accepted},  {"asked", counters.asked},        {"wrong", counters.wrong},
+        {"stale", counters.stale},     {"replayed", counters.replayed},  {"moved", counters.moved},
+        {"ignored", counters.ignored}, {"emergency", counters.emergency}};
     for (auto const& [result, number] : results)
         text.add(number, {{"interface", name}, {"result", result}});
 }

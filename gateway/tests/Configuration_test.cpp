@@ -106,6 +106,8 @@ TEST(Configuration, SaysForWhomWhenAndHowARouteIsTaken)
     EXPECT_EQ(configuration.routes[1].prefix, "112");
     EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"1\"\nnumber = \"2\"\n"),
               "f: route[0].number: and prefix exclude each other");
+    EXPECT_EQ(COMPLAINT(interfaces + route + "number = \"112\"\nemergency = true\nuser = \"alice\"\n"),
+              "f: route[0].emergency: and user exclude each other");
     EXPECT_EQ(COMPLAINT(interfaces + route + "prefix = \"12\"\nstrip = 3\n"), "f: route[0].strip: must be from 0 to 2");
     EXPECT_EQ(COMPLAINT(interfaces + route + "days = [\"monday\"]\n"),
               "f: route[0].days: days are mon, tue, wed, thu, fri, sat, sun");

@@ -44,13 +44,28 @@ protected:
 };
 } // namespace
 
-TEST_F(SipAuthenticationTest, WhoIsBannedIsAskedAllTheSameForAnEmergencyNumber)
+TEST_F(SipAuthenticationTest, NobodyIsAskedForAnEmergencyNumber)
 {
-    for (unsigned int i = 0; i < 5; ++i)
+    auto const call = [this](std::string const& header)
+    {
+        SipMessage const invite = SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n" + header);
+        return authentication.check(invite.get(), SOURCE, true);
+    };
+    std::string const right = ANSWER(ask(), "alice", "secret");
+    for (unsigned int i = 0; i < SipBans::PATIENCE; ++i)
+        EXPECT_EQ(call(ANSWER(ask(), "alice", "wrong")).verdict, SipAuthentication::ACCEPTED);
+    EXPECT_EQ(authentication.getNumberOfBanned(), 0u); // nor does he learn whether he has guessed right
+    EXPECT_EQ(call(right).user, "alice");
+    EXPECT_EQ(call(right).user, ""); // replayed
+    EXPECT_EQ(call("").verdict, SipAuthentication::ACCEPTED);
+
+    std::string const later = ANSWER(ask(), "alice", "secret");
+    for (unsigned int i = 0; i < SipBans::PATIENCE; ++i)
         std::ignore = check(ANSWER(ask(), "alice", "wrong"));
-    SipMessage const invite = SipMessage::INVITE("From: <sip:4420@host>;tag=a\r\n");
-    EXPECT_EQ(authentication.check(invite.get(), SOURCE).verdict, SipAuthentication::IGNORE);
-    EXPECT_EQ(authentication.check(invite.get(), SOURCE, true).verdict, SipAuthentication::ASK);
+    EXPECT_EQ(check("").verdict, SipAuthentication::IGNORE);
+    EXPECT_EQ(call(later).verdict, SipAuthentication::ACCEPTED);
+    EXPECT_EQ(call(later).user, ""); // who is banned is nobody
+    EXPECT_EQ(authentication.getCounters().emergency, SipBans::PATIENCE + 4u);
 }
 
 TEST_F(SipAuthenticationTest, WhoKnowsThePasswordIsKnown)

@@ -109,7 +109,7 @@ TEST_F(SipBindingsTest, AFileKeepsThem)
         set("sip:two", 120);
         store.write("alice", {{"sip:gone", "1", 1, 1000, 5000}});
         store.write("alice", bindings.find("alice")); // in its place
-        store.write("o'bob;--", {{"sip:b", "2", 4294967295u, 0, SipBindings::NOW() + 60}});
+        store.write("o'bob;--", {{"sip:b", "2", 4294967295u, 0, SipBindings::NOW() + 60, "sip:nat", "<sip:edge;lr>"}});
         EXPECT_EQ(store.getNumberOfFailures(), 0u);
     }
     struct stat status = {};
@@ -124,6 +124,8 @@ TEST_F(SipBindingsTest, AFileKeepsThem)
     EXPECT_EQ(kept.find("alice")[0].uri, "sip:two");
     EXPECT_EQ(kept.find("alice")[1].preference, 500u);
     EXPECT_EQ(kept.find("o'bob;--").at(0).sequence, 4294967295u);
+    EXPECT_EQ(kept.find("o'bob;--").at(0).called, "sip:nat");
+    EXPECT_EQ(kept.find("o'bob;--").at(0).route, "<sip:edge;lr>");
     SipBindingStore const other(folder.getFile(), "b",
                                 [](std::string const&, SipBinding const&) { ADD_FAILURE() << "another interface's"; });
 }

@@ -37,7 +37,9 @@ SipAuthentication::SipAuthentication(std::string name, std::string realm, std::v
 SipAuthentication::Decision SipAuthentication::check(sip_t const* request, InternetAddress const& source,
                                                      bool isEmergency)
 {
-    if (!isEmergency && m_bans.isBanned(source))
+    if (isEmergency)
+        return checkEmergency(request, source);
+    if (m_bans.isBanned(source))
     {
         ++m_counters.ignored;
         return {IGNORE, {}, {}};
@@ -65,6 +67,14 @@ SipAuthentication::Decision SipAuthentication::check(sip_t const* request, Inter
         break;
     }
     return {ASK, {}, makeChallenge(source, false)};
+}
+
+SipAuthentication::Decision SipAuthentication::checkEmergency(sip_t const* request, InternetAddress const& source)
+{
+    Shown shown{};
+    bool const isKnown = !m_bans.isBanned(source) && examine(request, source, shown) == RIGHT;
+    ++(isKnown ? m_counters.accepted : m_counters.emergency);
+    return {ACCEPTED, isKnown ? shown.user : std::string(), {}, isKnown};
 }
 
 SipAuthentication::Finding SipAuthentication::examine(sip_t const* request, InternetAddress const& source, Shown& shown)

@@ -19,12 +19,13 @@ public:
     struct Counters
     {
         unsigned long long accepted = 0;
-        unsigned long long asked = 0;    ///< who has shown nothing
-        unsigned long long wrong = 0;    ///< passwords and users
-        unsigned long long stale = 0;    ///< nonces, expired or not ours
-        unsigned long long replayed = 0; ///< nonces, with a count that was used
-        unsigned long long moved = 0;    ///< credentials that were shown for somebody else to be called
-        unsigned long long ignored = 0;  ///< messages of those who are banned
+        unsigned long long asked = 0;     ///< who has shown nothing
+        unsigned long long wrong = 0;     ///< passwords and users
+        unsigned long long stale = 0;     ///< nonces, expired or not ours
+        unsigned long long replayed = 0;  ///< nonces, with a count that was used
+        unsigned long long moved = 0;     ///< credentials that were shown for somebody else to be called
+        unsigned long long ignored = 0;   ///< messages of those who are banned
+        unsigned long long emergency = 0; ///< calls that were taken of somebody who is not known
     };
     enum Verdict
     {
@@ -45,7 +46,8 @@ public:
     SipAuthentication(std::string name, std::string realm, std::vector<SipDigest::Algorithm> algorithms,
                       std::shared_ptr<SipPasswords const> passwords);
 
-    /// `isEmergency`: a ban is no reason not to ask.
+    /// `isEmergency`: who shows nothing, or nothing that is right, is accepted all the same, as nobody that is known.
+    /// What he shows counts for nothing, so that nobody guesses passwords that way.
     Decision check(sip_t const* request, InternetAddress const& source, bool isEmergency = false);
     Counters const& getCounters() const { return m_counters; }
     std::size_t getNumberOfBanned() const { return m_bans.getNumberOfBanned(); }
@@ -73,6 +75,7 @@ private:
         MOVED
     };
 
+    Decision checkEmergency(sip_t const* request, InternetAddress const& source);
     Finding examine(sip_t const* request, InternetAddress const& source, Shown& shown);
     bool read(sip_t const* request, Shown& shown) const;
     static bool IS_MEANT(sip_t const* request, Shown const& shown);

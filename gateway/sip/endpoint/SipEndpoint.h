@@ -19,6 +19,7 @@
 #include "sip/message/SipQuality.h"
 #include "sip/message/SipRedirection.h"
 #include "sip/message/SipWay.h"
+#include "sip/registrar/SipRegistrar.h"
 
 #include <memory>
 #include <new>
@@ -404,9 +405,9 @@ private:
     SipSessionTimer m_sessionTimer;
     TYTimer m_refreshTimer;
     TYTimer m_lengthTimer;
-    std::string m_ownSession;            // what our peer has of us
-    bool m_isRefresh = false;            // ours
-    std::vector<std::string> m_contacts; // of a registered user: the one that is being tried, and those after it
+    std::string m_ownSession;           // what our peer has of us
+    bool m_isRefresh = false;           // ours
+    std::vector<SipContact> m_contacts; // of a registered user: the one that is being tried, and those after it
     SipPeers::Order m_peers;  // without contacts: whom the call is offered to, the one that is being tried first
     bool m_isUnheard = false; // that one has said nothing yet
     std::string m_inviteUri;  // for an INVITE that is to be sent again

@@ -149,7 +149,9 @@ bool SipEndpoint::inviteNumber()
     if (configuration.isTrusted || !diversion.isRestricted())
         m_inviteHeaders += diversion.getHeaders(configuration.getAddress(), uri);
     m_inviteHeaders += m_headersForTarget + getCarried(SipCarriedHeaders::REQUEST);
-    m_inviteUri = m_contacts.empty() ? uri : m_contacts.front();
+    m_inviteUri = m_contacts.empty() ? uri : m_contacts.front().uri;
+    if (!m_contacts.empty())
+        m_inviteRoute = m_contacts.front().route;
     return startInvite();
 }
 
@@ -160,7 +162,8 @@ bool SipEndpoint::startInvite()
     bool const takesCharges = m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE;
     m_hasOffer = !m_ownSession.empty();
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
-    trace("-> INVITE " + m_inviteUri + (m_hasOffer ? " with a session description" : ""));
+    trace("-> INVITE " + m_inviteUri + (m_inviteRoute.empty() ? "" : " by " + m_inviteRoute) +
+          (m_hasOffer ? " with a session description" : ""));
     m_invite.transaction = m_interface.getSender().send(
         m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),

@@ -102,7 +102,8 @@ bool SipEndpoint::tryNextContact(unsigned int status)
     if (m_contacts.size() < 2 || status >= 600)
         return false;
     m_contacts.erase(m_contacts.begin());
-    m_inviteUri = m_contacts.front();
+    m_inviteUri = m_contacts.front().uri;
+    m_inviteRoute = m_contacts.front().route;
     m_invite.forget();
     m_negotiation.fail();
     return startInvite();

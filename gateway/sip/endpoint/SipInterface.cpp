@@ -32,6 +32,7 @@ constexpr char const* ALLOW = "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK,
 constexpr char const* ALLOW_OF_REGISTRAR =
     "INVITE, ACK, CANCEL, BYE, OPTIONS, UPDATE, PRACK, REFER, NOTIFY, INFO, REGISTER";
 constexpr char const* SUPPORTED = "100rel, replaces, timer";
+constexpr char const* SUPPORTED_BY_REGISTRAR = "100rel, replaces, timer, path";
 constexpr char const* RETRY_AFTER_SECONDS = "5";
 
 /// Where the transaction's request came from.
@@ -77,7 +78,7 @@ SipInterface::SipInterface(SipEnvironment& environment, SipConfiguration const& 
     , m_mediaAddress(MediaAddress::OF(configuration.mediaAddress, 0).host)
     , m_home(su_home_create())
     , m_allow(sip_allow_make(m_home.get(), configuration.isRegistrar ? ALLOW_OF_REGISTRAR : ALLOW))
-    , m_supported(sip_supported_make(m_home.get(), SUPPORTED))
+    , m_supported(sip_supported_make(m_home.get(), configuration.isRegistrar ? SUPPORTED_BY_REGISTRAR : SUPPORTED))
     , m_guard(configuration)
     , m_requestRate(configuration.name, configuration.maxRequestsPerSource)
     , m_tls(configuration.listensOnTls ? std::make_unique<SipTls>(configuration.name, configuration.tls) : nullptr)

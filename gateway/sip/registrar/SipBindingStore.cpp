@@ -66,8 +66,10 @@ SipBindingStore::SipBindingStore(std::string const& file, std::string interface,
                         execute("CREATE TABLE IF NOT EXISTS binding (interface TEXT NOT NULL, user TEXT NOT NULL, "
                                 "uri TEXT NOT NULL, call_id TEXT NOT NULL, sequence INTEGER NOT NULL, "
                                 "preference INTEGER NOT NULL, until INTEGER NOT NULL, place INTEGER NOT NULL, "
-                                "called TEXT NOT NULL DEFAULT '', PRIMARY KEY (interface, user, uri))");
+                                "called TEXT NOT NULL DEFAULT '', route TEXT NOT NULL DEFAULT '', "
+                                "PRIMARY KEY (interface, user, uri))");
     execute("ALTER TABLE binding ADD COLUMN called TEXT NOT NULL DEFAULT ''"); // refused where it has that already
+    execute("ALTER TABLE binding ADD COLUMN route TEXT NOT NULL DEFAULT ''");  // likewise
     umask(before);
     if (!isGood)
     {
@@ -103,7 +105,7 @@ void SipBindingStore::write(std::string const& user, std::vector<SipBinding> bin
 void SipBindingStore::load(std::function<void(std::string const&, SipBinding const&)> const& restore)
 {
     Statement const rows =
-        PREPARE(m_database, "SELECT user, uri, call_id, sequence, preference, until, called FROM binding "
+        PREPARE(m_database, "SELECT user, uri, call_id, sequence, preference, until, called, route FROM binding "
                             "WHERE interface = ? AND until > ? ORDER BY user, place");
     BIND(rows, 1, m_interface);
     sqlite3_bind_int64(rows.get(), 2, SipBindings::NOW());
@@ -111,7 +113,7 @@ void SipBindingStore::load(std::function<void(std::string const&, SipBinding con
         restore(TEXT(rows, 0),
                 {TEXT(rows, 1), TEXT(rows, 2), static_cast<std::uint32_t>(sqlite3_column_int64(rows.get(), 3)),
                  static_cast<unsigned int>(sqlite3_column_int64(rows.get(), 4)), sqlite3_column_int64(rows.get(), 5),
-                 TEXT(rows, 6)});
+                 TEXT(rows, 6), TEXT(rows, 7)});
 }
 
 void SipBindingStore::run()
@@ -158,7 +160,7 @@ bool SipBindingStore::writeUser(std::string const& user, std::vector<SipBinding>
     {
         Statement const row =
             PREPARE(m_database, "INSERT INTO binding (interface, user, uri, call_id, sequence, "
-                                "preference, until, place, called) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?)");
+                                "preference, until, place, called, route) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?)");
         BIND(row, 1, m_interface);
         BIND(row, 2, user);
         BIND(row, 3, bindings[i].uri);
@@ -168,6 +170,7 @@ bool SipBindingStore::writeUser(std::string const& user, std::vector<SipBinding>
         sqlite3_bind_int64(row.get(), 7, bindings[i].until);
         sqlite3_bind_int64(row.get(), 8, static_cast<sqlite3_int64>(i));
         BIND(row, 9, bindings[i].called);
+        BIND(row, 10, bindings[i].route);
         isGood = sqlite3_step(row.get()) == SQLITE_DONE;
     }
     return isGood;

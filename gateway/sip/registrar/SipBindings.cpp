@@ -27,8 +27,8 @@ SipBindings::Result SipBindings::update(std::string const& user, std::vector<Wis
         if (found != bindings.end())
             bindings.erase(found);
         if (wish.seconds != 0)
-            bindings.insert(bindings.begin(),
-                            {wish.uri, callId, sequence, wish.preference, NOW() + wish.seconds, wish.called});
+            bindings.insert(bindings.begin(), {wish.uri, callId, sequence, wish.preference, NOW() + wish.seconds,
+                                               wish.called, wish.route});
     }
     if (bindings.size() > m_mostOfUser)
         return TOO_MANY;

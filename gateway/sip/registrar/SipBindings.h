@@ -16,6 +16,7 @@ struct SipBinding
     unsigned int preference = 1000; ///< thousandths: the contact's q
     long long until = 0;            ///< seconds of the time of day
     std::string called{};           ///< where he is called instead; empty: at the URI
+    std::string route{};            ///< through whom, as a Route; empty: nobody
 };
 
 /// Which contacts the users of a registrar have, as REGISTER changes them (RFC 3261, 10.3), in memory. One thread.
@@ -28,7 +29,8 @@ public:
         std::string uri;
         unsigned int preference = 1000;
         unsigned int seconds = 0; ///< 0: to be forgotten
-        std::string called{};     ///< as SipBinding's
+        std::string called{};     ///< as SipBinding's, and so is the next
+        std::string route{};
     };
     enum Result
     {

@@ -3,6 +3,7 @@
 #include "sip/dialog/SipTarget.h"
 #include "sip/message/SipAddress.h"
 #include "sip/registrar/SipBindingStore.h"
+#include "sip/registrar/SipPath.h"
 #include "sip/stack/SipGuard.h"
 #include "sip/stack/SipHandles.h"
 
@@ -54,12 +55,13 @@ bool SipRegistrar::hasUser(std::string_view user) const
     return m_configuration.passwords->hasUser(user, m_configuration.realm);
 }
 
-std::vector<std::string> SipRegistrar::find(std::string_view user) const
+std::vector<SipContact> SipRegistrar::find(std::string_view user) const
 {
-    std::vector<std::string> uris;
+    std::vector<SipContact> contacts;
     for (SipBinding& binding : m_bindings.find(user))
-        uris.push_back(std::move(binding.called.empty() ? binding.uri : binding.called));
-    return uris;
+        contacts.push_back(
+            {std::move(binding.called.empty() ? binding.uri : binding.called), std::move(binding.route)});
+    return contacts;
 }
 
 int SipRegistrar::receive(nta_incoming_t* transaction, sip_t const* request, std::string const& user)
@@ -77,6 +79,9 @@ int SipRegistrar::take(nta_incoming_t* transaction, sip_t const* request, std::s
     std::string const callId = request->sip_call_id->i_id;
     std::uint32_t const sequence = request->sip_cseq->cs_seq;
     sip_contact_t const* const contact = request->sip_contact;
+    std::optional<std::string> const route = SipPath::READ(request);
+    if (!route)
+        return 400;
     SipBindings::Result result = SipBindings::OK;
     if (contact != nullptr && IS_EVERYTHING(contact))
     {
@@ -89,7 +94,7 @@ int SipRegistrar::take(nta_incoming_t* transaction, sip_t const* request, std::s
     else if (contact != nullptr)
     {
         std::vector<SipBindings::Wish> wishes;
-        if (int const refused = readWishes(transaction, request, wishes); refused != 0)
+        if (int const refused = readWishes(transaction, request, *route, wishes); refused != 0)
             return refused;
         result = m_bindings.update(user, wishes, callId, sequence);
     }
@@ -97,22 +102,26 @@ int SipRegistrar::take(nta_incoming_t* transaction, sip_t const* request, std::s
         return result == SipBindings::TOO_MANY ? 403 : 500;
     if (contact != nullptr && m_store != nullptr)
         m_store->write(user, m_bindings.find(user));
-    answer(transaction, user);
+    answer(transaction, user, SipPath::GET_HEADER(request, *route));
     return 200;
 }
 
 /// 0, or the status with which the whole request is refused.
-int SipRegistrar::readWishes(nta_incoming_t* transaction, sip_t const* request,
+int SipRegistrar::readWishes(nta_incoming_t* transaction, sip_t const* request, std::string const& route,
                              std::vector<SipBindings::Wish>& wishes) const
 {
+    if (!route.empty() && !isServed(*request->sip_path->r_url))
+        return 403;
     SipHome const home(su_home_create());
-    SipHeldMessage const message(m_configuration.isBehindNat ? nta_incoming_getrequest(transaction) : nullptr);
+    bool const isMoved = m_configuration.isBehindNat && route.empty(); // else a proxy was the last on the way
+    SipHeldMessage const message(isMoved ? nta_incoming_getrequest(transaction) : nullptr);
     for (sip_contact_t const* contact = request->sip_contact; contact != nullptr; contact = contact->m_next)
     {
         if (IS_EVERYTHING(contact))
             return 400;
         char const* const uri = url_as_string(home.get(), contact->m_url);
-        if (uri == nullptr || std::string_view(uri).size() > LONGEST_URI || !isServed(*contact->m_url))
+        bool const isReached = route.empty() && !isMoved ? isServed(*contact->m_url) : isOther(*contact->m_url);
+        if (uri == nullptr || std::string_view(uri).size() > LONGEST_URI || !isReached)
             return 403;
         unsigned long const seconds = SECONDS_OF(request, contact);
         if (seconds != 0 && seconds < m_configuration.leastRegistration)
@@ -125,21 +134,25 @@ int SipRegistrar::readWishes(nta_incoming_t* transaction, sip_t const* request,
         wishes.push_back(
             {uri, PREFERENCE_OF(contact->m_q),
              static_cast<unsigned int>(std::min<unsigned long>(seconds, m_configuration.longestRegistration)),
-             m_configuration.isBehindNat ? SipTarget::AT_SOURCE(*contact->m_url, message.get()) : std::string()});
+             isMoved ? SipTarget::AT_SOURCE(*contact->m_url, message.get()) : std::string(), route});
     }
     return 0;
+}
+
+/// An address of a phone's, and not our own: we would call ourselves.
+bool SipRegistrar::isOther(url_t const& uri) const
+{
+    if (uri.url_type != url_sip || uri.url_host == nullptr || uri.url_headers != nullptr)
+        return false;
+    SocketAddress const& self = m_configuration.getAddress();
+    return uri.url_host != self.host || std::to_string(self.port) != url_port(&uri);
 }
 
 /// Nobody is to be called at an address that may not call us.
 bool SipRegistrar::isServed(url_t const& uri) const
 {
-    if (uri.url_type != url_sip || uri.url_host == nullptr || uri.url_headers != nullptr)
+    if (!isOther(uri))
         return false;
-    SocketAddress const& self = m_configuration.getAddress();
-    if (uri.url_host == self.host && std::to_string(self.port) == url_port(&uri))
-        return false; // we would call ourselves
-    if (m_configuration.isBehindNat)
-        return true; // he is called where he is, and is served there
     try
     {
         std::string host = uri.url_host;
@@ -153,9 +166,9 @@ bool SipRegistrar::isServed(url_t const& uri) const
     }
 }
 
-void SipRegistrar::answer(nta_incoming_t* transaction, std::string const& user) const
+void SipRegistrar::answer(nta_incoming_t* transaction, std::string const& user, std::string const& pathHeader) const
 {
-    std::string lines;
+    std::string lines = pathHeader;
     for (SipBinding const& binding : m_bindings.find(user))
         lines += fmt::format("Contact: <{}>;expires={};q={}.{:03}\r\n", binding.uri, binding.until - SipBindings::NOW(),
                              binding.preference / 1000, binding.preference % 1000);

@@ -12,6 +12,13 @@
 
 class SipBindingStore;
 
+/// Where a user is called: the URI, and through whom, as a Route; empty: nobody.
+struct SipContact
+{
+    std::string uri;
+    std::string route;
+};
+
 /// Where the users of an interface's realm have registered (RFC 3261, 10.3).
 ///
 /// A user registers himself and nobody else, at addresses that the interface serves. Belongs to the thread of the
@@ -35,8 +42,8 @@ public:
     int receive(nta_incoming_t* transaction, sip_t const* request, std::string const& user);
     /// Whether there is such a user, registered or not.
     bool hasUser(std::string_view user) const;
-    /// URIs, the one first that is to be tried first; empty for one who is not registered.
-    std::vector<std::string> find(std::string_view user) const;
+    /// Where he is called, that first which is to be tried first; empty for one who is not registered.
+    std::vector<SipContact> find(std::string_view user) const;
     /// Tells of each contact with its user.
     template <class Visitor>
     void visit(Visitor const& visitor) const
@@ -49,9 +56,11 @@ public:
 
 private:
     int take(nta_incoming_t* transaction, sip_t const* request, std::string const& user);
-    int readWishes(nta_incoming_t* transaction, sip_t const* request, std::vector<SipBindings::Wish>& wishes) const;
+    int readWishes(nta_incoming_t* transaction, sip_t const* request, std::string const& route,
+                   std::vector<SipBindings::Wish>& wishes) const;
     bool isServed(url_t const& uri) const;
-    void answer(nta_incoming_t* transaction, std::string const& user) const;
+    bool isOther(url_t const& uri) const;
+    void answer(nta_incoming_t* transaction, std::string const& user, std::string const& pathHeader) const;
 
     SipConfiguration const& m_configuration;
     std::vector<AddressRange> m_served;

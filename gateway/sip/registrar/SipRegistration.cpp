@@ -100,10 +100,10 @@ void SipRegistration::send(unsigned int seconds)
     forgetRequest();
     ++m_sent;
     m_challenges = 0;
-    m_request =
-        m_sender.send(m_leg.get(), HANDLE_RESPONSE, asMagic(), SIP_METHOD_REGISTER, URL_STRING_MAKE(m_uri.c_str()),
-                      TAG_IF(!m_route.empty(), SIPTAG_ROUTE_STR(m_route.c_str())), SIPTAG_CONTACT_STR(contact.c_str()),
-                      SIPTAG_EXPIRES_STR(expires.c_str()), SIPTAG_MAX_FORWARDS_STR("70"), TAG_END());
+    m_request = m_sender.send(
+        m_leg.get(), HANDLE_RESPONSE, asMagic(), SIP_METHOD_REGISTER, URL_STRING_MAKE(m_uri.c_str()),
+        TAG_IF(!m_route.empty(), SIPTAG_ROUTE_STR(m_route.c_str())), SIPTAG_CONTACT_STR(contact.c_str()),
+        SIPTAG_EXPIRES_STR(expires.c_str()), SIPTAG_SUPPORTED_STR("path"), SIPTAG_MAX_FORWARDS_STR("70"), TAG_END());
     if (m_request == nullptr)
         take(503, nullptr);
 }

@@ -1,5 +1,6 @@
 # An interface asks who calls: SIPp and a phone that know the password get through, nobody else; what was sent once is not
-# taken twice, nor for another number, and who guesses is not answered any more. RFC 3261, 22; RFC 7616.
+# taken twice, nor for another number, and who guesses is not answered any more, but for an
+# emergency number, for which nobody is asked. RFC 3261, 22; RFC 7616.
 . "$(dirname "$0")/../lib.bash"
 . "$HERE/plain_call.bash"
 . "$HERE/phones.bash"
@@ -34,6 +35,7 @@ printf 'alice:office:{MD5}%s\n4420:office:secret\n' "$ALICE_HASH" >"$WORK/passwo
 chmod 600 "$WORK/passwords"
 write_configuration
 sed -i "s,^name = \"a\",&\nauthenticate = true\nrealm = \"office\"\nalgorithms = [\"MD5\"]\npasswords = \"$WORK/passwords\"," "$WORK/gateway.toml"
+printf '\n[[route]]\nfrom = "a"\nnumber = "112"\nto = "b"\nemergency = true\n' >>"$WORK/gateway.toml"
 start_gateway
 run_caller unasked x || fail "OPTIONS of a stranger"
 start_callee callee
@@ -62,8 +64,14 @@ for ((i = 0; i < 5; i++)); do
 done
 expect_log "interface a: $HOST has failed to say who it is, and is not served for 60 s"
 SIPP_TIMEOUT=1s run_caller unasked x && fail "who is banned was answered"
+
+# but for an emergency
+start_callee callee
+expect_caller caller 112
+expect_callee
+expect_log "is an emergency call to '112'"
 kill -USR1 $gateway_pid
 expect_trace '^interface a: 2 requests of known users, [0-9]+ asked who, 5 wrong, 0 stale, 0 replayed, 1 for another URI; 1 addresses banned, [1-9][0-9]* requests of theirs ignored$'
 grep -qE "secret|sesame|$ALICE_HASH" "$WORK"/gateway.{out,err} && fail "a password in the log"
-stop_gateway "2 calls placed, 2 answered, 2 cleared, 0 failed"
+stop_gateway "3 calls placed, 3 answered, 3 cleared, 0 failed"
 finish
