@@ -119,6 +119,7 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
         onTimer(); // no digit is to be waited for any more
     tellCharge(flags);
     tellHold();
+    tellTransfer();
 }
 
 void IsdnEndpoint::notifyPeerSynchronousService(CC_CallAdapter&, CC_Service& service)

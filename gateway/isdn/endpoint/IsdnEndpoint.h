@@ -122,6 +122,7 @@ private:
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
     void tellHold();
+    void tellTransfer();
     void addCodecs(CC_PropertyContainer& own) const;
     void openMedia();
     void onDigit(char digit, unsigned int milliseconds) override;
@@ -150,6 +151,7 @@ private:
     bool m_isChannelConfirmed = false; // by the far side
     IsdnBearer m_bearer;
     IsdnParty m_called;
+    IsdnParty m_toldParty; // who the other side is, as the wire has it
     std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
     QCause m_failure = QCause::NONE; // calling side: of which a tone tells the far side first

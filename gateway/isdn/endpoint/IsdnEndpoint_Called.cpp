@@ -90,7 +90,8 @@ bool IsdnEndpoint::startCall(pri_sr* request, bool isComplete)
     pri_sr_set_channel(request, static_cast<int>(m_timeslot), 0, !isIsdn);
     pri_sr_set_bearer(request, m_bearer.getCapability(), m_bearer.getLayer1());
     pri_sr_set_called(request, digits.data(), m_called.getPlan(), isComplete);
-    pri_party_id const caller = IsdnParty::OF_PEER(m_adapter).getId();
+    m_toldParty = IsdnParty::OF_PEER(m_adapter);
+    pri_party_id const caller = m_toldParty.getId();
     pri_sr_set_caller_party(request, &caller);
     if (pri_party_subaddress const called = IsdnSubaddress::TO_WIRE(m_called.subaddress); called.valid != 0)
         pri_sr_set_called_subaddress(request, &called);

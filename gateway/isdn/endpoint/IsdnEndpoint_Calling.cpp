@@ -237,7 +237,8 @@ void IsdnEndpoint::tellConnected()
     m_wasAnswered = true;
     ++m_interface.getEnvironment().counters.answered;
     pri_party_connected_line connected = {};
-    connected.id = IsdnParty::OF_PEER(m_adapter).getId();
+    m_toldParty = IsdnParty::OF_PEER(m_adapter);
+    connected.id = m_toldParty.getId();
     bool const isIsdn = m_adapter.getPeer(Key::ENDPOINT_IS_ISDN, false);
     sendUserUser();
     ask(

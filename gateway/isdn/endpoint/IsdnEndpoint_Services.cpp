@@ -179,6 +179,18 @@ void IsdnEndpoint::tellHold()
         { return pri_notify(stack, m_call, 0, isHeld ? PRI_NOTIFY_REMOTE_HOLD : PRI_NOTIFY_REMOTE_RETRIEVAL); });
 }
 
+/// EN 300 369-1: somebody else has the call now (EctInform).
+void IsdnEndpoint::tellTransfer()
+{
+    IsdnParty party = IsdnParty::OF_PEER(m_adapter);
+    if (m_state != IsdnCallState::ACTIVE || party.getDigits().empty() || party == m_toldParty)
+        return;
+    m_toldParty = std::move(party);
+    pri_party_connected_line connected = {};
+    connected.id = m_toldParty.getId();
+    ask([&](pri* stack) { return pri_connected_line_update(stack, m_call, &connected); });
+}
+
 void IsdnEndpoint::onDigits(char const* digits)
 {
     std::string const keyed = DIGITS_OF(digits);

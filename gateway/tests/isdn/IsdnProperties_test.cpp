@@ -238,6 +238,36 @@ TEST_F(IsdnPropertiesTest, WhoAnswersIsToldBothWays)
     EXPECT_EQ(answering, "4930999");
 }
 
+TEST_F(IsdnPropertiesTest, WhoHasTheCallNowIsToldBothWays)
+{
+    open();
+    callToWire({});
+    side->answer();
+    ASSERT_TRUE(waitForPeer("CONNECTED"));
+    std::string told;
+    side->onEvent = [&](pri_event const& event)
+    {
+        for (int i = 0; event.e == PRI_EVENT_FACILITY && i < event.facility.subcmds->counter_subcmd; ++i)
+            if (event.facility.subcmds->subcmd[i].cmd == PRI_SUBCMD_CONNECTED_LINE)
+                told += std::string(" ") + event.facility.subcmds->subcmd[i].u.connected_line.id.number.str;
+    };
+    std::ignore = other.say(CC_PropertyId::E164_NUMBER, "4930777");
+    ASSERT_TRUE(watch.runUntil([&] { return !told.empty(); }));
+    std::ignore = other.become(FakeModule::State::HELD);
+    ASSERT_TRUE(waitFor("NOTIFY " + std::to_string(PRI_NOTIFY_REMOTE_HOLD)));
+    EXPECT_EQ(told, " 4930777") << "once";
+
+    pri_party_connected_line connected = {};
+    connected.id.number.valid = 1;
+    connected.id.number.plan = PRI_INTERNATIONAL_ISDN;
+    std::strcpy(connected.id.number.str, "4989777");
+    side->ask([&](pri* stack) { return pri_connected_line_update(stack, side->getCall(), &connected); });
+    EXPECT_TRUE(watch.runUntil([&] { return peer(CC_PropertyId::E164_NUMBER) == "4989777"; }));
+    EXPECT_EQ(other.m_adapter->getPeerTypeOfNumber(), QTypeOfNumber::INTERNATIONAL);
+    other.hangUp();
+    expectNothingLeft();
+}
+
 TEST_F(IsdnChargingTest, ChargesAreToldDuringTheCallAndAtItsEnd)
 {
     open();

@@ -307,12 +307,15 @@ void Exchange::answer(CallHandle const& call)
     connected.id = PARTY(subscriber.connected.empty() ? subscriber.number : subscriber.connected, subscriber.name,
                          subscriber.connectedType << TYPE_SHIFT | PRI_NPI_E163_E164,
                          subscriber.connectedPresentation << PRESENTATION_SHIFT | subscriber.connectedScreening);
+    connected.id.subaddress = SUBADDRESS(subscriber.connectedSubaddress);
     pri_connected_line_update(m_stack, call->handle, &connected);
     pri_answer(m_stack, call->handle, call->channel, subscriber.isForeign);
     if (call->speech == nullptr)
         speak(call, subscriber.speaks, subscriber.file, subscriber.record);
     if (subscriber.holds)
         hold(call);
+    if (!subscriber.becomes.empty())
+        after(HOLD, call, [this](CallHandle const& one) { handOver(*one); });
     if (subscriber.parks != 0)
         park(call, subscriber.parks);
     if (subscriber.drops != 0)
@@ -344,6 +347,15 @@ void Exchange::hold(CallHandle const& call)
                              one->isHeld ? PRI_NOTIFY_REMOTE_HOLD : PRI_NOTIFY_REMOTE_RETRIEVAL);
               hold(one);
           });
+}
+
+/// Another one has the call (EN 300 369-1): once it is up, the stack tells that with EctInform.
+void Exchange::handOver(Call const& call)
+{
+    pri_party_connected_line connected = {};
+    connected.id = PARTY(call.subscriber->becomes, {}, call.subscriber->connectedType << TYPE_SHIFT | PRI_NPI_E163_E164,
+                         call.subscriber->connectedScreening);
+    pri_connected_line_update(m_stack, call.handle, &connected);
 }
 
 /// HOLD, and RETRIEVE on whatever channel is free then (EN 300 141-1, 9).

@@ -85,6 +85,7 @@ private:
     void answer(CallHandle const& call);
     void speak(CallHandle const& call, std::string const& what, std::string const& file, std::string const& record);
     void hold(CallHandle const& call);
+    void handOver(Call const& call);
     void park(CallHandle const& call, unsigned int milliseconds);
     void takeBack(CallHandle const& call, int channel);
     void tellTariff(Call const& call);

@@ -99,6 +99,8 @@ Plan::Subscriber READ_SUBSCRIBER(std::string const& file, toml::table const& tom
     table.read("connected-type", one.connectedType);
     table.read("connected-presentation", one.connectedPresentation);
     table.read("connected-screening", one.connectedScreening);
+    table.read("connected-subaddress", one.connectedSubaddress);
+    table.read("becomes", one.becomes);
     table.read("name", one.name);
     table.read("user-user", one.userUser);
     table.read("in-band", one.isInBand);

@@ -25,6 +25,8 @@ struct Plan
         unsigned int connectedType = 2; ///< 0 to 7
         unsigned int connectedPresentation = 0;
         unsigned int connectedScreening = 3;
+        std::string connectedSubaddress; ///< IA5; empty: none
+        std::string becomes; ///< who has the call soon after it was answered; empty: it stays with who has answered
         std::string name;
         std::string userUser;
         bool isInBand = false;  ///< its ringing tone comes in the channel
