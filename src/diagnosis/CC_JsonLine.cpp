@@ -1,11 +1,13 @@
 #include "diagnosis/CC_JsonLine.h"
 
-#include <algorithm>
 #include <array>
+#include <cstdint>
 #include <cstdio>
+#include <cstring>
 
 namespace
 {
+constexpr std::size_t ROOM = 480;
 constexpr std::string_view REPLACEMENT = "\xef\xbf\xbd"; // U+FFFD
 
 unsigned char OCTET(char c) { return static_cast<unsigned char>(c); }
@@ -44,15 +46,39 @@ void APPEND_ESCAPED(std::string& out, char c)
     else
         out += c;
 }
+
 bool IS_PLAIN(char c) { return OCTET(c) >= 0x20 && OCTET(c) < 0x7f && c != '"' && c != '\\'; }
+
+/// The same of eight characters at once, which most texts are looked at by: false also for some that are plain.
+bool ARE_PLAIN(char const* eight)
+{
+    constexpr std::uint64_t ONES = 0x0101010101010101;
+    constexpr std::uint64_t HIGHEST = 0x80 * ONES;
+    std::uint64_t word = 0;
+    std::memcpy(&word, eight, sizeof word);
+    auto const hasZero = [](std::uint64_t octets) { return (octets - ONES) & ~octets; };
+    std::uint64_t const isLow = (word - 0x20 * ONES) & ~word;
+    std::uint64_t const isHigh = word | (word + ONES); // 0x7f and above
+    return ((isLow | isHigh | hasZero(word ^ '"' * ONES) | hasZero(word ^ '\\' * ONES)) & HIGHEST) == 0;
+}
+
+/// How many plain characters the text begins with.
+std::size_t PLAIN_LENGTH(std::string_view text)
+{
+    std::size_t length = 0;
+    while (length + 8 <= text.size() && ARE_PLAIN(text.data() + length))
+        length += 8;
+    while (length < text.size() && IS_PLAIN(text[length]))
+        ++length;
+    return length;
+}
 
 void APPEND_QUOTED(std::string& out, std::string_view text)
 {
     out += '"';
     while (!text.empty())
     {
-        auto const plain =
-            static_cast<std::size_t>(std::find_if_not(text.begin(), text.end(), IS_PLAIN) - text.begin());
+        std::size_t const plain = PLAIN_LENGTH(text);
         out += text.substr(0, plain);
         text.remove_prefix(plain);
         if (text.empty())
@@ -71,6 +97,8 @@ void APPEND_NAME(std::string& out, std::string_view name)
 {
     if (out.size() > 1)
         out += ',';
+    else
+        out.reserve(ROOM); // of most lines
     APPEND_QUOTED(out, name);
     out += ':';
 }

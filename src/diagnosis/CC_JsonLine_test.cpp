@@ -27,3 +27,20 @@ TEST(CC_JsonLine, WhatIsNoUtf8IsReplaced)
     EXPECT_EQ(CC_JsonLine::QUOTED("\xe0\x80\xaf"), "\"\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd\"") << "a slash in disguise";
     EXPECT_EQ(CC_JsonLine::QUOTED("a\xe2\x82"), "\"a\xef\xbf\xbd\xef\xbf\xbd\"") << "cut off";
 }
+
+TEST(CC_JsonLine, AnOctetIsWrittenTheSameWayWhereverItStandsInALongText)
+{
+    for (int octet = 0; octet < 256; ++octet)
+    {
+        std::string const alone(1, static_cast<char>(octet));
+        std::string const quoted = CC_JsonLine::QUOTED(alone);
+        std::string const expected = quoted.substr(1, quoted.size() - 2);
+        for (std::size_t place = 0; place < 20; ++place)
+        {
+            std::string const before(place, 'a');
+            std::string const behind(20 - place, '~');
+            EXPECT_EQ(CC_JsonLine::QUOTED(before + alone + behind), '"' + before + expected + behind + '"')
+                << octet << " at " << place;
+        }
+    }
+}
