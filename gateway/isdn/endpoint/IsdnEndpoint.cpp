@@ -105,11 +105,17 @@ void IsdnEndpoint::followCall(CC_Flags const& flags)
     if (isPeerReleased())
     {
         tellCharge(flags); // the last one goes with the end
-        QCause const cause = m_adapter.getPeer(Key::CAUSE) ? m_adapter.getPeer(Key::CAUSE)->getCause() : QCause::NONE;
+        if (m_heldRelease != QCause::NONE)
+        {
+            leaveCall(m_heldRelease);
+            return;
+        }
+        QCause const cause = getPeerCause();
         if (tryNextRoute(cause) || tellByTone(cause))
             return;
         endWire(cause);
-        leaveCall(cause);
+        if (m_state != IsdnCallState::CLEARING || !isPeerWaiting())
+            leaveCall(cause);
         return;
     }
     openMedia(); // the call may be another one
@@ -134,8 +140,18 @@ IsdnEndpoint::LegState::State IsdnEndpoint::getPeerState() const
     return state ? state->getState() : m_hadPeer ? LegState::RELEASED : LegState::TRYING;
 }
 
-/// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
-bool IsdnEndpoint::isPeerReleased() const { return getPeerState() == LegState::RELEASED; }
+/// A peer that left without a State of its own counts as released, and one that waits for the call's end; a call to
+/// which nobody has come yet does not.
+bool IsdnEndpoint::isPeerReleased() const { return getPeerState() == LegState::RELEASED || isPeerWaiting(); }
+
+/// It has hung up, hears nothing any more, and is there for what the far side's last message tells.
+bool IsdnEndpoint::isPeerWaiting() const { return getPeerState() == LegState::DISCONNECTING && !hasPeerData(); }
+
+QCause IsdnEndpoint::getPeerCause() const
+{
+    auto const cause = m_adapter.getPeer(Key::CAUSE);
+    return cause ? cause->getCause() : QCause::NONE;
+}
 
 bool IsdnEndpoint::hasPeerData() const { return m_adapter.getPeer(Key::PROVIDES_DATA, false); }
 
@@ -157,9 +173,11 @@ void IsdnEndpoint::onDisconnect(pri_event_hangup const& hangup)
     readUserUser(hangup.useruserinfo, m_own);
     if (m_isInCall && !m_own.isEmpty())
         std::ignore = m_adapter.setOwnProperties(m_own);
-    ask([&](pri* stack) { return pri_hangup(stack, m_call, IsdnCause::TO_WIRE(cause)); });
-    lookForEnd();
-    leaveCall(cause);
+    m_heldRelease = cause;
+    if (awaitsFinalCharge())
+        holdRelease(cause);
+    else
+        leaveCall(cause);
 }
 
 /// `isGivenUp`: the stack has the call no more; else it waits for us.
@@ -167,7 +185,7 @@ void IsdnEndpoint::onReleased(pri_event_hangup const& hangup, bool isGivenUp)
 {
     if (advance(IsdnCallState::RELEASED_IN) == IsdnCallState::IGNORE)
         return;
-    QCause const cause = IsdnCause::FROM_WIRE(hangup.cause);
+    QCause const cause = m_isInCall && isPeerWaiting() ? getPeerCause() : IsdnCause::FROM_WIRE(hangup.cause);
     m_own.clear();
     readCommands(hangup.subcmds, m_own);
     readUserUser(hangup.useruserinfo, m_own);
@@ -232,6 +250,7 @@ void IsdnEndpoint::lookForEnd()
 void IsdnEndpoint::leaveCall(QCause cause)
 {
     m_failure = QCause::NONE;
+    sendHeldRelease();
     if (m_state != IsdnCallState::CLEARING)
         m_timer.stop();
     if (!std::exchange(m_isInCall, false))

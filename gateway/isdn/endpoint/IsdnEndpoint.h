@@ -121,6 +121,9 @@ private:
     void endNumber();
     void onUserInput(CC_ServiceUserInput const& input);
     void tellCharge(CC_Flags const& flags);
+    bool awaitsFinalCharge() const;
+    void holdRelease(QCause cause);
+    void sendHeldRelease();
     void tellHold();
     void tellTransfer();
     void addCodecs(CC_PropertyContainer& own) const;
@@ -133,6 +136,8 @@ private:
     void finishIfDone();
     IsdnCallState::Action advance(IsdnCallState::Event event);
     bool isPeerReleased() const;
+    bool isPeerWaiting() const;
+    QCause getPeerCause() const;
     LegState::State getPeerState() const;
     bool hasPeerData() const;
     int getChannel() const { return m_channelFlags | static_cast<int>(m_timeslot); }
@@ -154,8 +159,9 @@ private:
     IsdnParty m_toldParty; // who the other side is, as the wire has it
     std::string m_calling; // calling side: the number
     bool m_isNumberComplete = false;
-    QCause m_failure = QCause::NONE; // calling side: of which a tone tells the far side first
-    RouteHunt m_routes;              // calling side
+    QCause m_heldRelease = QCause::NONE; // with which it is sent once the final charge is known
+    QCause m_failure = QCause::NONE;     // calling side: of which a tone tells the far side first
+    RouteHunt m_routes;                  // calling side
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;

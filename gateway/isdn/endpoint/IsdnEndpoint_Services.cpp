@@ -19,7 +19,8 @@ using namespace IsdnProperty;
 namespace
 {
 constexpr std::string_view DIGITS = "0123456789*#ABCD";
-constexpr unsigned int DIGIT_TIME = 100; // milliseconds
+constexpr unsigned int DIGIT_TIME = 100;       // milliseconds
+constexpr unsigned int CHARGE_PATIENCE = 1000; // milliseconds that a RELEASE waits for what the call has cost
 
 std::string DIGITS_OF(std::string_view text)
 {
@@ -52,8 +53,14 @@ void IsdnEndpoint::onTimer()
         clear(QCause::RECOVERY_ON_TIMER_EXPIRY);
         break;
     case IsdnCallState::CLEARING:
+        if (m_heldRelease != QCause::NONE)
+        {
+            leaveCall(m_heldRelease);
+            break;
+        }
         lookForEnd();
-        finishIfDone();
+        if (m_state == IsdnCallState::OVER)
+            leaveCall(getPeerCause());
         break;
     default:
         clear(m_state == IsdnCallState::CALL_DELIVERED ? QCause::NO_ANSWER_FROM_USER : QCause::NO_USER_RESPONDING);
@@ -242,7 +249,7 @@ void IsdnEndpoint::tellCharge(CC_Flags const& flags)
 {
     bool const isNetwork = m_interface.getConfiguration().isNetwork;
     bool const hasCall = m_call != nullptr && m_state > IsdnCallState::CALL_INITIATED;
-    if (!isNetwork || !hasCall || m_state == IsdnCallState::CLEARING)
+    if (!isNetwork || !hasCall || (m_state == IsdnCallState::CLEARING && m_heldRelease == QCause::NONE))
         return;
     auto const* const tariff = m_adapter.getPeerTariff();
     if (flags.get(CC_PropertyId::TARIFF) && tariff != nullptr)
@@ -261,6 +268,35 @@ void IsdnEndpoint::tellCharge(CC_Flags const& flags)
     }
     pri_subcmd_aoc_d const advice = IsdnCharge::TO_D(*charge);
     ask([&](pri* stack) { return pri_aoc_d_send(stack, m_call, &advice); });
+}
+
+/// The far side hangs up, and what the call has cost in all is to come: from a peer that has told of costs before.
+bool IsdnEndpoint::awaitsFinalCharge() const
+{
+    auto const* const charge = m_adapter.getPeerCharge();
+    bool const isTotal = charge != nullptr && IsdnCharge::IS_TOTAL(*charge);
+    return m_interface.getConfiguration().isNetwork && m_isInCall && !isPeerReleased() && !isTotal &&
+           (charge != nullptr || m_adapter.getPeerTariff() != nullptr);
+}
+
+/// Until the other side has cleared, or for a while, our leg stays in the call, and says that it only waits.
+void IsdnEndpoint::holdRelease(QCause cause)
+{
+    m_own.clear();
+    ADD(m_own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, false));
+    ADD(m_own, CC_PropertyCause(CC_PropertyId::CAUSE, cause, 0));
+    ADD(m_own, CC_PropertyCallLegState(CC_PropertyId::STATE, LegState::DISCONNECTING));
+    m_timer.start(CHARGE_PATIENCE);
+    std::ignore = m_adapter.setOwnProperties(m_own); // without memory the other side hears of it when we leave
+}
+
+void IsdnEndpoint::sendHeldRelease()
+{
+    QCause const cause = std::exchange(m_heldRelease, QCause::NONE);
+    if (cause == QCause::NONE || m_call == nullptr)
+        return;
+    ask([&](pri* stack) { return pri_hangup(stack, m_call, IsdnCause::TO_WIRE(cause)); });
+    lookForEnd();
 }
 
 // --- media -----------------------------------------------------------------------------------------------------------

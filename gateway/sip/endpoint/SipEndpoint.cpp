@@ -8,6 +8,7 @@
 #include "properties/CC_PropertyBoolean.h"
 #include "properties/CC_PropertyCallLegState.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKeys.h"
 #include "properties/CC_PropertyParametrizedString.h"
 #include "properties/CC_PropertyQoS.h"
 #include "properties/CC_PropertyString.h"
@@ -76,7 +77,9 @@ void SipEndpoint::ON_TIMER(void* endpoint)
     self.handle(
         [&]
         {
-            if (self.m_dialog == SipDialogState::UP)
+            if (self.m_heldBye != nullptr)
+                self.leaveCall(SipCause(self.m_heldBye->cause));
+            else if (self.m_dialog == SipDialogState::UP)
                 self.onUpTimer();
             else
                 self.m_isCalling ? self.onCallingTimer() : self.onCalledTimer();
@@ -87,6 +90,7 @@ SipEndpoint::~SipEndpoint()
 {
     m_adapter.cleanup();
     m_target.reset();
+    answerHeldBye();
     for (nta_outgoing_t* const request : {m_refer, m_info, m_bye})
         if (request != nullptr)
         {
@@ -175,11 +179,21 @@ void SipEndpoint::takeService(CC_Service& service)
         trace("told a service, not taken: " + std::string(service.getInfo().view()));
 }
 
-/// A peer that left without a State of its own counts as released; a call to which nobody has come yet does not.
+/// A peer that left without a State of its own counts as released, and one that waits for the call's end, to whom there
+/// is nothing to listen any more; a call to which nobody has come yet does not.
 bool SipEndpoint::isPeerReleased() const
 {
     auto const* const state = getPeer<CC_PropertyCallLegState>(CC_PropertyId::STATE);
-    return state != nullptr ? state->getState() == CC_PropertyCallLegState::RELEASED : m_hadPeer;
+    if (state == nullptr)
+        return m_hadPeer;
+    return state->getState() == CC_PropertyCallLegState::RELEASED || isPeerWaiting();
+}
+
+bool SipEndpoint::isPeerWaiting() const
+{
+    auto const* const state = getPeer<CC_PropertyCallLegState>(CC_PropertyId::STATE);
+    return state != nullptr && state->getState() == CC_PropertyCallLegState::DISCONNECTING &&
+           !m_adapter.getPeer(Key::PROVIDES_DATA, false);
 }
 
 void SipEndpoint::onPeerReleased()
@@ -190,10 +204,16 @@ void SipEndpoint::onPeerReleased()
         SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty()));
     if (m_isReferring)
         endReferral(QCause::SUBSCRIBER_ABSENT); // nobody is there to be transferred
+    if (m_heldBye != nullptr)
+    {
+        leaveCall(SipCause(m_heldBye->cause));
+        return;
+    }
     if (goElsewhere(cause) || tryNextRoute(cause) || tellByTone(cause))
         return;
     endDialog(cause);
-    leaveCall(cause);
+    if (!awaitsBill())
+        leaveCall(cause);
 }
 
 bool SipEndpoint::isInCall(unsigned long long serial) const
@@ -228,6 +248,7 @@ void SipEndpoint::endWithoutWords()
 void SipEndpoint::leaveCall(SipCause const& cause)
 {
     endAttempts();
+    answerHeldBye();
     if (!std::exchange(m_isInCall, false))
     {
         finishIfDone();

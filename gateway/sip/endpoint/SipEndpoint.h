@@ -107,6 +107,13 @@ private:
         nta_leg_t* leg;
     };
 
+    /// A BYE that is to be answered, and why it came.
+    struct HeldBye
+    {
+        nta_incoming_t* transaction;
+        SipCause cause;
+    };
+
     // calling side: SipEndpoint_Calling.cpp, its answers: SipEndpoint_Answers.cpp
     int takeInvite(nta_incoming_t* transaction, sip_t const* request);
     int refuseSession(nta_incoming_t* transaction);
@@ -277,6 +284,11 @@ private:
     void followCharge(CC_Flags const& flags);
     std::string getFinalCharge() const;
     void sendCharge();
+    bool awaitsFinalCharge() const;
+    int holdBye(nta_incoming_t* transaction, SipCause const& cause);
+    void answerHeldBye();
+    bool awaitsBill() const;
+    void takeBill(sip_t const* response);
 
     // a call that goes elsewhere: SipEndpoint_Redirection.cpp
     void tellRedirection(sip_t const* response);
@@ -316,7 +328,7 @@ private:
     void takeService(CC_Service& service);
     bool sayWhy(SipCause const& cause);
     static void ON_TIMER(void* endpoint);
-    int onBye(sip_t const* request);
+    int onBye(nta_incoming_t* transaction, sip_t const* request);
     void sendBye(SipCause const& cause);
     static int HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* transaction, sip_t const* response);
     void endDialog(SipCause const& cause);
@@ -342,6 +354,7 @@ private:
         return dynamic_cast<Property const*>(m_adapter.getPeerProperty(id));
     }
     bool isPeerReleased() const;
+    bool isPeerWaiting() const;
 
     bool isTraced() const { return m_ladder != nullptr; }
     void trace(std::string text) const;
@@ -434,6 +447,7 @@ private:
     std::string m_charge;                                // to be told
     std::string m_tariff;                                // that was told
     bool m_takesTariff = false;                          // in the answers to its INVITE
+    std::unique_ptr<HeldBye> m_heldBye;                  // whose answer waits for the final charge
     nta_outgoing_t* m_info = nullptr;
     bool m_isHeldByOffer = false;
     bool m_isHeld = false;

@@ -1,7 +1,8 @@
-// What the call costs (3GPP TS 24.647): the property Charge on the leg, told in INFO while the call is up and in BYE,
-// and the property Tariff, told in the answers to INVITE and in INFO.
+// What the call costs (3GPP TS 24.647): the property Charge on the leg, told in INFO while the call is up, in BYE and
+// in its answer, and the property Tariff, told in the answers to INVITE and in INFO.
 #include "properties/CC_Flags.h"
 #include "properties/CC_PropertyId.h"
+#include "properties/CC_PropertyKeys.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipAdvice.h"
@@ -14,6 +15,11 @@
 
 #include <tuple>
 #include <utility>
+
+namespace
+{
+constexpr unsigned int CHARGE_PATIENCE = 1000; // milliseconds that a BYE's answer waits for what the call has cost
+} // namespace
 
 /// Whether answers to that INVITE may have more than a session description in them.
 void SipEndpoint::noteAccept(sip_t const* request)
@@ -122,6 +128,59 @@ std::string SipEndpoint::getFinalCharge() const
 {
     auto const* const charge = tellsCharges() && m_isInCall ? m_adapter.getPeerCharge() : nullptr;
     return charge != nullptr && SipCharge::IS_TOTAL(*charge) ? SipCharge::WRITE(*charge) : std::string();
+}
+
+/// Our peer hangs up, and what the call has cost in all is to come: from a peer that has told of costs before.
+bool SipEndpoint::awaitsFinalCharge() const
+{
+    return tellsCharges() && m_isInCall && !m_isTransferring && !isPeerReleased() && getFinalCharge().empty() &&
+           (m_adapter.getPeerCharge() != nullptr || m_adapter.getPeerTariff() != nullptr);
+}
+
+/// Until the other side has cleared, or for a while, our leg stays in the call, and says that it only waits.
+int SipEndpoint::holdBye(nta_incoming_t* transaction, SipCause const& cause)
+{
+    auto held = std::make_unique<HeldBye>(HeldBye{transaction, cause});
+    CC_PropertyContainer own;
+    SipProperty::ADD(own, CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, false));
+    SipProperty::ADD(own, CC_PropertyCallLegState(CC_PropertyId::STATE, CC_PropertyCallLegState::DISCONNECTING));
+    std::ignore = own.set(cause.getProperty()); // else it is told when we leave
+    trace("did  State=DISCONNECTING, until the charge is known");
+    m_heldBye = std::move(held);
+    m_timer.start(CHARGE_PATIENCE);
+    std::ignore = m_adapter.setOwnProperties(own); // without memory the other side hears of it when we leave
+    return 0;
+}
+
+/// With the charge, if it has come.
+void SipEndpoint::answerHeldBye()
+{
+    if (m_heldBye == nullptr)
+        return;
+    nta_incoming_t* const transaction = std::exchange(m_heldBye, {})->transaction;
+    std::string charge;
+    handle([&] { charge = getFinalCharge(); });
+    handle([&] { trace("-> 200 to BYE" + std::string(charge.empty() ? "" : " with a charge")); });
+    nta_incoming_treply(transaction, SIP_200_OK, TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipAdvice::TYPE)),
+                        TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
+    nta_incoming_destroy(transaction);
+}
+
+/// The other side waits for what the answer to our BYE tells.
+bool SipEndpoint::awaitsBill() const
+{
+    return m_bye != nullptr && m_interface.getConfiguration().charges == SipConfiguration::Charges::TAKE &&
+           isPeerWaiting();
+}
+
+/// Null: it was not answered.
+void SipEndpoint::takeBill(sip_t const* response)
+{
+    if (!m_isInCall)
+        return;
+    if (response != nullptr)
+        takeCharge(response);
+    leaveCall(SipCause::FROM_PROPERTY(dynamic_cast<CC_PropertyCause const*>(m_adapter.getPeerCauseProperty())));
 }
 
 /// What is overtaken by a newer charge is not sent.

@@ -24,7 +24,7 @@ int SipEndpoint::onRequest(nta_incoming_t* transaction, sip_t const* request)
     switch (method)
     {
     case sip_method_bye:
-        return onBye(request);
+        return onBye(transaction, request);
     case sip_method_ack:
         return 0; // of a 200 whose transaction is gone
     case sip_method_options:
@@ -57,14 +57,14 @@ void SipEndpoint::forgetSetUp()
     std::vector<SipRedirection>().swap(m_redirections);
 }
 
-int SipEndpoint::onBye(sip_t const* request)
+int SipEndpoint::onBye(nta_incoming_t* transaction, sip_t const* request)
 {
     SipCause const cause = SipCause::FROM_REQUEST(REASON_OF(request));
     bool const wasUp = m_dialog == SipDialogState::UP || m_dialog == SipDialogState::ANSWERED;
     SipDialogState::Action const action = advance(SipDialogState::BYE_IN);
     if (action == SipDialogState::REFUSE)
         return 481; // there is no dialog yet
-    trace("<- BYE, -> 200");
+    trace("<- BYE");
     takeCharge(request); // it ends whatever that is
     if (action == SipDialogState::TERMINATE)
         answerFinally(487, {});
@@ -73,6 +73,8 @@ int SipEndpoint::onBye(sip_t const* request)
     takeCarried(request);
     endOffers();
     forgetTransaction();
+    if (awaitsFinalCharge())
+        return holdBye(transaction, cause);
     leaveCall(cause);
     return 200;
 }
@@ -131,7 +133,11 @@ int SipEndpoint::HANDLE_BYE_RESPONSE(SipEndpoint* endpoint, nta_outgoing_t* tran
     endpoint->m_bye = nullptr;
     endpoint->advance(SipDialogState::BYE_DONE);
     endpoint->handle(
-        [&] { endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE"); });
+        [&]
+        {
+            endpoint->trace(isOurs ? "the BYE was not answered" : "<- " + std::to_string(status) + " to the BYE");
+            endpoint->takeBill(isOurs ? nullptr : response);
+        });
     endpoint->finishIfDone();
     return 0;
 }

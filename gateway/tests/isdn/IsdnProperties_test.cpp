@@ -1,4 +1,5 @@
 #include "IsdnFixture.h"
+#include "isdn/element/IsdnCharge.h"
 #include "isdn/element/IsdnUserUser.h"
 
 namespace
@@ -283,6 +284,74 @@ TEST_F(IsdnChargingTest, ChargesAreToldDuringTheCallAndAtItsEnd)
     ASSERT_EQ(advice.size(), 2u);
     EXPECT_EQ(advice[1].cmd, PRI_SUBCMD_AOC_E);
     EXPECT_EQ(advice[1].u.aoc_e.recorded.money.amount.cost, 50);
+}
+
+TEST_F(IsdnChargingTest, WhoHangsUpHearsTheTotalWithTheRelease)
+{
+    open();
+    answerCallToWire();
+    std::ignore = other.say(CHARGE(25, Q956::ETypeOfChargingInfo::SUB_TOTAL));
+    ASSERT_TRUE(watch.runUntil([&] { return !advice.empty(); }));
+    side->clear(31);
+    ASSERT_TRUE(waitForPeer("DISCONNECTING"));
+    EXPECT_EQ(other.getPeerValue(CC_PropertyId::CAUSE), "Normal, unspecified");
+    EXPECT_FALSE(side->has("HANGUP 31")) << "not before it is known";
+    std::ignore = other.say(CHARGE(50, Q956::ETypeOfChargingInfo::TOTAL));
+    other.hangUp();
+    ASSERT_TRUE(waitFor("HANGUP 31"));
+    ASSERT_EQ(advice.size(), 2u);
+    EXPECT_EQ(advice[1].cmd, PRI_SUBCMD_AOC_E);
+    EXPECT_EQ(advice[1].u.aoc_e.recorded.money.amount.cost, 50);
+    expectNothingLeft();
+}
+
+TEST_F(IsdnChargingTest, WhoHangsUpDoesNotWaitForATotalForLong)
+{
+    open();
+    for (bool const isByUs : {false, true})
+    {
+        answerCallToWire();
+        std::ignore = other.say(CHARGE(25, Q956::ETypeOfChargingInfo::SUB_TOTAL));
+        ASSERT_TRUE(watch.runUntil([&] { return !advice.empty(); }));
+        side->clear(31);
+        ASSERT_TRUE(waitForPeer("DISCONNECTING"));
+        if (isByUs)
+            interface->clearCalls(QCause::TEMPORARY_FAILURE);
+        EXPECT_TRUE(waitFor("HANGUP 31"));
+        EXPECT_TRUE(waitForPeer("RELEASED"));
+        EXPECT_EQ(advice.size(), 1u);
+        other.hangUp();
+        expectNothingLeft();
+        side->take();
+        advice.clear();
+    }
+}
+
+TEST_F(IsdnPropertiesTest, APeerThatHangsUpAndWaitsHearsTheTotal)
+{
+    open();
+    callToWire({});
+    side->answer();
+    ASSERT_TRUE(waitForPeer("CONNECTED"));
+    std::ignore = other.say(CC_PropertyBoolean(CC_PropertyId::PROVIDES_DATA, false));
+    std::ignore = other.say(CC_PropertyCause(CC_PropertyId::CAUSE, QCause::NORMAL_UNSPECIFIED, 0));
+    side->onEvent = [&](pri_event const& event)
+    {
+        pri_subcmd_aoc_e bill = {};
+        bill.charge = PRI_AOC_DE_CHARGE_UNITS;
+        bill.recorded.unit.num_items = 1;
+        bill.recorded.unit.item[0] = {7, -1};
+        if (event.e == PRI_EVENT_HANGUP_REQ)
+            side->ask([&](pri* stack) { return pri_aoc_e_send(stack, side->getCall(), &bill); });
+    };
+    std::ignore = other.become(FakeModule::State::DISCONNECTING);
+    EXPECT_TRUE(waitFor("HANGUP_REQ 31"));
+    EXPECT_TRUE(waitForPeer("RELEASED"));
+    auto const* const charge = other.m_adapter->getPeerCharge();
+    ASSERT_NE(charge, nullptr);
+    EXPECT_TRUE(IsdnCharge::IS_TOTAL(*charge));
+    other.hangUp();
+    expectNothingLeft();
 }
 
 TEST_F(IsdnChargingTest, ATariffIsTold)

@@ -88,6 +88,30 @@ echo "charged while it was up: $during; at the end: $total"
 echo "released by the exchange with cause 41, by the gateway with BYE and cause 41"
 stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
 
+# who hangs up hears what it has cost in all with the answer to his BYE
+write_isdn_configuration '' 'charges = "tell"'
+start_exchange <<END
+[[number]]
+number = "4989123"
+units = 25
+currency = "EUR"
+interval = 400
+END
+start_isdn_gateway
+charged() {
+    call_up
+    expect_request INFO body "aoc-d.*currency-amount.0.25"
+    respond_in_dialog "200 OK"
+    send_bye
+    expect 200 CSeq: BYE Content-Type: "application/vnd.etsi.aoc.xml" body "aoc-e.*currency-id.EUR.*currency-amount.0.25"
+}
+RELAYED=m=audio expect_caller charged 4989123
+expect_log 'call 1 a .calling side. released: cause 16 '
+expect_log 'b .called side, timeslot 1. released: cause 16 '
+expect_log 'call 1: 4420 on a to 4989123 on b, .* cleared by a, cause 16 '
+stop_exchange
+stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+
 # in units, by an interface that tells nobody
 write_isdn_configuration
 start_exchange <<END

@@ -13,7 +13,7 @@ charges=tell
 [[ $4 == charges ]] && charges=take
 write_isdn_configuration '' "codecs = [\"PCMA\", \"CLEARMODE\"]
 charges = \"$charges\""
-sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt305 = 500\nt308 = 500\nt309 = 1000\nanswer = 1000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
+sed -i "/^\[\[route/,\$d; s/^t200 = .*/t200 = 200\nt303 = 400\nt305 = 500\nt308 = 500\nt309 = 1000\nanswer = 2000/; s/^last-port = .*/last-port = $((PORT + 99))/; s/^first-port = .*/first-port = $((PORT + 40))/" "$WORK/gateway.toml"
 cat >>"$WORK/gateway.toml" <<END
 [[isdn]]
 name = "c"
@@ -21,7 +21,7 @@ line = "$LINE.c"
 side = "network"
 [isdn.timers]
 reopening = 50
-answer = 1000
+answer = 2000
 t302 = 500
 $(for from in a b c; do
     for to in a:44 b:49 c:48; do

@@ -1,4 +1,4 @@
-# What a call costs (3GPP TS 24.647) crosses the gateway: in INFO so far, in BYE in all. What is no charge is refused, and
+# What a call costs (3GPP TS 24.647) crosses the gateway: in INFO so far, in BYE in all, or in its answer to who hangs up. What is no charge is refused, and
 # an interface that does not take any understands none.
 . "$(dirname "$0")/../lib.bash"
 
@@ -49,5 +49,31 @@ expect_caller caller 4989123
 expect_callee
 expect_trace "told peer Charge=EUR 0.5 .total."
 expect_log "the peer's charge cannot be read"
-stop_gateway "1 calls placed, 1 answered, 1 cleared, 0 failed"
+
+thrifty_caller() {
+    call_up
+    expect_request INFO body "aoc-d.*currency-amount.0.25"
+    respond_once "200 OK"
+    send_bye
+    expect 200 CSeq: BYE Content-Type: "application/vnd.etsi.aoc.xml" body "aoc-e.*currency-amount.0.5./currency-amount"
+}
+hung_up_callee() {
+    expect_invite
+    respond_with "$SDP_OF_CALLEE" retrans "200 OK"
+    expect_request ACK
+    charge_of_callee 1 "$(advice "<aoc-d><charging-info>subtotal</charging-info>$(amount 0.25)</aoc-d>")" 200
+    expect_request BYE
+    send_text '' "SIP/2.0 200 OK
+[last_Via:]
+[last_From:]
+[last_To:]
+[last_Call-ID:]
+[last_CSeq:]
+Content-Type: application/vnd.etsi.aoc+xml" "$(advice "<aoc-e>$(amount 0.5)</aoc-e>")"
+}
+start_callee hung_up_callee
+expect_caller thrifty_caller 4989123
+expect_callee
+expect_log 'call 2: .* cleared by a, cause 16 '
+stop_gateway "2 calls placed, 2 answered, 2 cleared, 0 failed"
 finish

@@ -144,7 +144,7 @@ def calls_to(row):
             steps += ['<pause milliseconds="100"/>', send(callees(method, sequence) + row.headers(method), "", True),
                       receive("200")]
     if not row.has(row.said, "S BYE"):
-        steps += [receive("BYE"), send(response("200 OK", False))]
+        steps += [receive("BYE"), send(response("200 OK", False) + row.headers("OK"))]
     return steps
 
 
