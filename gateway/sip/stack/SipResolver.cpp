@@ -56,7 +56,8 @@ IN_PLACE sipdns_tport const* outgoing_naptr_tport(nta_outgoing_t* request, sres_
         if (record.na_record->r_type != sres_type_naptr || record.na_record->r_status != 0)
             continue;
         std::uint32_t const rank = std::uint32_t{record.na_order} << 16u | record.na_prefer;
-        place += last && rank != *last ? 1 : 0;
+        if (last && rank != *last)
+            ++place;
         last = rank;
         record.na_prefer = place;
     }
