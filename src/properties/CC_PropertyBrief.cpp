@@ -215,7 +215,7 @@ CC_PropertyBrief::CC_PropertyBrief(CC_Property const* property)
     CC_PropertyKind const* const kind = property != nullptr ? CC_PropertyKind::OF(*property) : nullptr;
     char* const place = m_place.data();
     char* behind = place;
-    if (kind != nullptr)
+    if (kind != nullptr && kind->place != CC_PropertyKind::NO_PLACE)
         behind = DESCRIPTIONS[kind->place](place, property, nullptr);
     else if (property != nullptr)
         behind = PUT(place, Brief::OTHER_CLASS, typeid(*property).name());
@@ -246,8 +246,9 @@ __attribute__((noinline)) XCode CC_PropertyBrief::REPLACE_OF_ANY_CLASS(CC_Proper
                                                                        unsigned long long call, unsigned long long leg)
 {
     CC_PropertyKind const* const known = CC_PropertyKind::OF(property);
-    bool const isUndisturbed =
-        known != nullptr && known->isSelfContained && (stored == nullptr || &typeid(*stored) == &typeid(property));
+    bool const isUndisturbed = known != nullptr && known->isSelfContained &&
+                               known->place != CC_PropertyKind::NO_PLACE &&
+                               (stored == nullptr || &typeid(*stored) == &typeid(property));
     if (!isUndisturbed)
         return REPLACE_OF_ANY_KIND(in, property, kind, call, leg);
     // nobody is called, so both values go straight into the record

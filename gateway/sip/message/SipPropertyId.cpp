@@ -1,6 +1,8 @@
 #include "sip/message/SipPropertyId.h"
 
+#include "properties/CC_PropertyKind.h"
 #include "properties/CC_PropertyTable.h"
+#include "sip/dialog/SipSessionWord.h"
 
 #include <cstring>
 #include <initializer_list>
@@ -24,7 +26,7 @@ XCode SipPropertyId::DECLARE()
             if (XCode const result = CC_PropertyTable::DECLARE(names.id, names.longName, names.shortName);
                 !result.isOk())
                 return result;
-    return XCode::OK;
+    return CC_PropertyKind::DECLARE<SipSessionWord>(); // a value and nothing else, of legs that have it all the time
 }
 
 char const* SipPropertyId::NAME(unsigned int id)

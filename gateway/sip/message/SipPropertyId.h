@@ -31,8 +31,8 @@ inline constexpr unsigned int CARRIED_HEADERS = CC_PropertyId::FIRST_OF_MODULES 
 /// CC_PropertyParametrizedString, of a leg: its peer has sent the call elsewhere (SipRedirection)
 inline constexpr unsigned int REDIRECTION = CC_PropertyId::FIRST_OF_MODULES + 9;
 
-/// Declares the names of these, with which logs and dumps show them from then on: OK, also when they have these
-/// already; otherwise as CC_PropertyTable::DECLARE.
+/// Declares SipSessionWord as a class that does nothing but hold a value, and the names of these, with which logs and
+/// dumps show them from then on: OK, also when they have these already; otherwise as CC_PropertyTable::DECLARE.
 XCode DECLARE();
 /// The name of any property id, these included once they are declared; "(unknown)" otherwise.
 char const* NAME(unsigned int id);
