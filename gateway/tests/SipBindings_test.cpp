@@ -95,9 +95,25 @@ TEST_F(SipBindingsTest, WhatWasOvertakenChangesNothing)
     EXPECT_EQ(bindings.update("alice", {{"a", 1000, 0}}, "1", 6), SipBindings::OUT_OF_ORDER);
     EXPECT_EQ(bindings.clear("alice", "1", 7), SipBindings::OUT_OF_ORDER);
     EXPECT_EQ(found(), "a ");
-    EXPECT_EQ(bindings.update("alice", {{"a", 1000, 60}}, "2", 1), SipBindings::OK); // the phone was started anew
+    EXPECT_EQ(bindings.update("alice", {{"a", 1000, 60}}, "2", 1),
+              SipBindings::REFRESHED); // the phone was started anew
     EXPECT_EQ(bindings.clear("alice", "1", 8), SipBindings::OK);
     EXPECT_EQ(found(), "");
+}
+
+TEST_F(SipBindingsTest, WhoStaysWhereHeIsTellsNothingNew)
+{
+    EXPECT_EQ(set("a", 60), SipBindings::OK);
+    EXPECT_EQ(set("a", 60), SipBindings::REFRESHED);
+    EXPECT_EQ(set("a", 120, "2"), SipBindings::REFRESHED);
+    EXPECT_EQ(set("b", 60), SipBindings::OK);
+    EXPECT_EQ(set("b", 0), SipBindings::OK);
+    EXPECT_EQ(bindings.update("alice", {{"a", 1000, 60, "elsewhere"}}, "1", ++sequence), SipBindings::OK);
+    EXPECT_EQ(bindings.update("alice", {{"a", 1000, 60, "elsewhere", "<sip:edge;lr>"}}, "1", ++sequence),
+              SipBindings::OK);
+    EXPECT_EQ(bindings.update("alice", {}, "1", ++sequence), SipBindings::REFRESHED);
+    clock.advance(61000);
+    EXPECT_EQ(set("a", 60), SipBindings::OK); // it had expired
 }
 
 TEST_F(SipBindingsTest, AFileKeepsThem)
@@ -109,6 +125,7 @@ TEST_F(SipBindingsTest, AFileKeepsThem)
         set("sip:two", 120);
         store.write("alice", {{"sip:gone", "1", 1, 1000, 5000}});
         store.write("alice", bindings.find("alice")); // in its place
+        store.write("carol", {{"sip:c", "1", 1, 1000, SipBindings::NOW() + 60}}, true);
         store.write("o'bob;--", {{"sip:b", "2", 4294967295u, 0, SipBindings::NOW() + 60, "sip:nat", "<sip:edge;lr>"}});
         EXPECT_EQ(store.getNumberOfFailures(), 0u);
     }
@@ -125,6 +142,7 @@ TEST_F(SipBindingsTest, AFileKeepsThem)
     EXPECT_EQ(kept.find("alice")[1].preference, 500u);
     EXPECT_EQ(kept.find("o'bob;--").at(0).sequence, 4294967295u);
     EXPECT_EQ(kept.find("o'bob;--").at(0).called, "sip:nat");
+    EXPECT_EQ(kept.find("carol").size(), 1u); // what waits is written at the end
     EXPECT_EQ(kept.find("o'bob;--").at(0).route, "<sip:edge;lr>");
     SipBindingStore const other(folder.getFile(), "b",
                                 [](std::string const&, SipBinding const&) { ADD_FAILURE() << "another interface's"; });

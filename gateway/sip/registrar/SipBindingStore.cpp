@@ -10,6 +10,7 @@ namespace
 {
 constexpr int PATIENCE = 1000; // milliseconds, for another process that has the file
 constexpr auto PAUSE = std::chrono::seconds(1);
+constexpr auto GATHERING = std::chrono::milliseconds(100);
 
 struct Finalizer
 {
@@ -33,6 +34,28 @@ std::string TEXT(Statement const& statement, int column)
 {
     auto const* const text = reinterpret_cast<char const*>(sqlite3_column_text(statement.get(), column));
     return text != nullptr ? text : "";
+}
+
+/// Once, and ready for the next time.
+bool RUN(Statement const& statement)
+{
+    bool const isDone = sqlite3_step(statement.get()) == SQLITE_DONE;
+    sqlite3_reset(statement.get());
+    return isDone;
+}
+
+/// The columns from the third on.
+bool WRITE(Statement const& row, SipBinding const& binding, std::size_t place)
+{
+    BIND(row, 3, binding.uri);
+    BIND(row, 4, binding.callId);
+    sqlite3_bind_int64(row.get(), 5, binding.sequence);
+    sqlite3_bind_int64(row.get(), 6, binding.preference);
+    sqlite3_bind_int64(row.get(), 7, binding.until);
+    sqlite3_bind_int64(row.get(), 8, static_cast<sqlite3_int64>(place));
+    BIND(row, 9, binding.called);
+    BIND(row, 10, binding.route);
+    return RUN(row);
 }
 
 /// Signals are the main thread's.
@@ -93,11 +116,15 @@ SipBindingStore::~SipBindingStore()
     sqlite3_close(m_database);
 }
 
-void SipBindingStore::write(std::string const& user, std::vector<SipBinding> bindings)
+void SipBindingStore::write(std::string const& user, std::vector<SipBinding> bindings, bool mayWait)
 {
     {
         std::lock_guard const lock(m_mutex);
+        bool const isAwake = !m_changes.empty() && mayWait; // or will be
         m_changes[user] = std::move(bindings);
+        m_isUrgent = m_isUrgent || !mayWait;
+        if (isAwake)
+            return;
     }
     m_wake.notify_one();
 }
@@ -124,8 +151,10 @@ void SipBindingStore::run()
         m_wake.wait(lock, [this] { return m_isEnding || !m_changes.empty(); });
         if (m_changes.empty())
             return;
+        m_wake.wait_for(lock, GATHERING, [this] { return m_isEnding || m_isUrgent; });
         Changes changes;
         changes.swap(m_changes);
+        m_isUrgent = false;
         lock.unlock();
         bool const isWritten = writeAll(changes);
         lock.lock();
@@ -141,39 +170,28 @@ void SipBindingStore::run()
 
 bool SipBindingStore::writeAll(Changes const& changes)
 {
+    Statement const removal = PREPARE(m_database, "DELETE FROM binding WHERE interface = ? AND user = ?");
+    Statement const row =
+        PREPARE(m_database, "INSERT INTO binding (interface, user, uri, call_id, sequence, preference, "
+                            "until, place, called, route) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?)");
     bool isGood = execute("BEGIN IMMEDIATE");
     for (auto change = changes.begin(); isGood && change != changes.end(); ++change)
-        isGood = writeUser(change->first, change->second);
+    {
+        auto const& [user, bindings] = *change;
+        BIND(removal, 1, m_interface);
+        BIND(removal, 2, user);
+        isGood = RUN(removal);
+        for (std::size_t i = 0; isGood && i < bindings.size(); ++i)
+        {
+            BIND(row, 1, m_interface);
+            BIND(row, 2, user);
+            isGood = WRITE(row, bindings[i], i);
+        }
+    }
     if (isGood && execute("COMMIT"))
         return true;
     execute("ROLLBACK");
     return false;
-}
-
-bool SipBindingStore::writeUser(std::string const& user, std::vector<SipBinding> const& bindings)
-{
-    Statement const removal = PREPARE(m_database, "DELETE FROM binding WHERE interface = ? AND user = ?");
-    BIND(removal, 1, m_interface);
-    BIND(removal, 2, user);
-    bool isGood = sqlite3_step(removal.get()) == SQLITE_DONE;
-    for (std::size_t i = 0; isGood && i < bindings.size(); ++i)
-    {
-        Statement const row =
-            PREPARE(m_database, "INSERT INTO binding (interface, user, uri, call_id, sequence, "
-                                "preference, until, place, called, route) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?)");
-        BIND(row, 1, m_interface);
-        BIND(row, 2, user);
-        BIND(row, 3, bindings[i].uri);
-        BIND(row, 4, bindings[i].callId);
-        sqlite3_bind_int64(row.get(), 5, bindings[i].sequence);
-        sqlite3_bind_int64(row.get(), 6, bindings[i].preference);
-        sqlite3_bind_int64(row.get(), 7, bindings[i].until);
-        sqlite3_bind_int64(row.get(), 8, static_cast<sqlite3_int64>(i));
-        BIND(row, 9, bindings[i].called);
-        BIND(row, 10, bindings[i].route);
-        isGood = sqlite3_step(row.get()) == SQLITE_DONE;
-    }
-    return isGood;
 }
 
 bool SipBindingStore::execute(char const* statement)

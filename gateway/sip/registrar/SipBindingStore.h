@@ -17,8 +17,9 @@ struct sqlite3;
 /// The contacts of an interface's users in a file (SQLite), so that they outlive the process.
 ///
 /// A thread of its own writes; whoever changes something only leaves it there. What a user has left replaces what he
-/// left before, so nothing piles up but users. A process that is killed loses what was not written yet: some
-/// milliseconds' worth, unless the disk is slow. What the disk refuses is tried again each second.
+/// left before, so nothing piles up but users. What may wait is written with what else comes in a tenth of a second,
+/// since to write is dear and to write more is not. A process that is killed loses what was not written yet: some
+/// milliseconds' worth of the rest, unless the disk is slow. What the disk refuses is tried again each second.
 class SipBindingStore
 {
 public:
@@ -35,8 +36,8 @@ public:
     SipBindingStore(SipBindingStore const&) = delete;
     SipBindingStore& operator=(SipBindingStore const&) = delete;
 
-    /// All that the user has from now on.
-    void write(std::string const& user, std::vector<SipBinding> bindings);
+    /// All that the user has from now on. `mayWait`: were it lost, he would still be where he is known to be.
+    void write(std::string const& user, std::vector<SipBinding> bindings, bool mayWait = false);
     unsigned long long getNumberOfFailures() const { return m_failures; }
 
 private:
@@ -45,7 +46,6 @@ private:
     void load(std::function<void(std::string const&, SipBinding const&)> const& restore);
     void run();
     bool writeAll(Changes const& changes);
-    bool writeUser(std::string const& user, std::vector<SipBinding> const& bindings);
     bool execute(char const* statement);
 
     std::string m_interface;
@@ -53,7 +53,8 @@ private:
     std::atomic<unsigned long long> m_failures = 0;
     std::mutex m_mutex;
     std::condition_variable m_wake;
-    Changes m_changes; // the mutex's, and so is the next
+    Changes m_changes; // the mutex's, and so are the next two
+    bool m_isUrgent = false;
     bool m_isEnding = false;
     std::thread m_thread;
 };

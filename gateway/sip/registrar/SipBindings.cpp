@@ -18,12 +18,15 @@ SipBindings::Result SipBindings::update(std::string const& user, std::vector<Wis
                                         std::string const& callId, std::uint32_t sequence)
 {
     std::vector<SipBinding> bindings = find(user);
+    bool isNews = false;
     for (Wish const& wish : wishes)
     {
         auto const found = std::find_if(bindings.begin(), bindings.end(),
                                         [&](SipBinding const& binding) { return binding.uri == wish.uri; });
         if (found != bindings.end() && IS_LATE(*found, callId, sequence))
             return OUT_OF_ORDER;
+        isNews = isNews || found == bindings.end() || wish.seconds == 0 || found->called != wish.called ||
+                 found->route != wish.route;
         if (found != bindings.end())
             bindings.erase(found);
         if (wish.seconds != 0)
@@ -33,7 +36,7 @@ SipBindings::Result SipBindings::update(std::string const& user, std::vector<Wis
     if (bindings.size() > m_mostOfUser)
         return TOO_MANY;
     m_users[user] = std::move(bindings);
-    return OK;
+    return isNews ? OK : REFRESHED;
 }
 
 SipBindings::Result SipBindings::clear(std::string const& user, std::string const& callId, std::uint32_t sequence)

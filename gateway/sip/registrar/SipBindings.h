@@ -35,6 +35,7 @@ public:
     enum Result
     {
         OK,
+        REFRESHED,    ///< OK as well, and the user has no contact that he had not before, and none less
         OUT_OF_ORDER, ///< a later request of the same Call-ID was there before
         TOO_MANY
     };

@@ -98,10 +98,10 @@ int SipRegistrar::take(nta_incoming_t* transaction, sip_t const* request, std::s
             return refused;
         result = m_bindings.update(user, wishes, callId, sequence);
     }
-    if (result != SipBindings::OK)
+    if (result != SipBindings::OK && result != SipBindings::REFRESHED)
         return result == SipBindings::TOO_MANY ? 403 : 500;
     if (contact != nullptr && m_store != nullptr)
-        m_store->write(user, m_bindings.find(user));
+        m_store->write(user, m_bindings.find(user), result == SipBindings::REFRESHED);
     answer(transaction, user, SipPath::GET_HEADER(request, *route));
     return 200;
 }

@@ -24,6 +24,7 @@ $(printf '%s\n' "$@")" ''
 CSeq: $((sequence + 1)) REGISTER
 [field2]
 $(printf '%s\n' "$@")" ''
+    expect_optional 401 # again, to a first one that was repeated
     expect "$status" ${checked[@]+"${checked[@]}"}
 }
 CONTACT='Contact: <sip:[field0]@'"$HOST:$PORT_CALLER>"
