@@ -253,6 +253,11 @@ void IsdnEndpoint::leaveCall(QCause cause)
     sendHeldRelease();
     if (m_state != IsdnCallState::CLEARING)
         m_timer.stop();
+    if (m_isCalling && !std::exchange(m_isCounted, true))
+    {
+        Counters& counters = m_interface.getEnvironment().counters;
+        ++(m_wasAnswered ? counters.cleared : counters.failed);
+    }
     if (!std::exchange(m_isInCall, false))
     {
         finishIfDone();
@@ -260,11 +265,6 @@ void IsdnEndpoint::leaveCall(QCause cause)
     }
     m_adapter.drop(cause, 0);
     m_media.reset();
-    if (m_isCalling)
-    {
-        Counters& counters = m_interface.getEnvironment().counters;
-        ++(m_wasAnswered ? counters.cleared : counters.failed);
-    }
     if (m_isCalling)
         spdlog::debug("call {} {} (calling side, timeslot {}) released: cause {} ({})", m_callNumber, getName().view(),
                       m_timeslot, static_cast<int>(cause), CAUSE_SHORT_NAME(cause));

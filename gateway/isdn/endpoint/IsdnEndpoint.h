@@ -165,6 +165,7 @@ private:
     bool m_isInCall = false;
     bool m_hadPeer = false;
     bool m_wasAnswered = false;
+    bool m_isCounted = false; // as cleared or failed
     bool m_hasToldData = false;
     bool m_isPeerHeld = false;
     bool m_isOnHold = false; // by HOLD, so that it has no channel

@@ -45,6 +45,26 @@ TEST_F(IsdnCalledTest, TheFarSideClears)
     expectNothingLeft();
 }
 
+TEST_F(IsdnCalledTest, BothSidesClearAtOnce)
+{
+    open();
+    for (bool const isCrossing : {false, true})
+    {
+        call("4989123");
+        ASSERT_TRUE(waitFor("RING 4989123."));
+        side->answer();
+        ASSERT_TRUE(waitForPeer("CONNECTED"));
+        if (!isCrossing)
+            side->clear(31);
+        other.hangUp();
+        loop.runTurn(); // ours is on its way
+        if (isCrossing)
+            side->clear(31);
+        expectNothingLeft();
+        side->take();
+    }
+}
+
 TEST_F(IsdnCalledTest, ARefusalBearsItsCause)
 {
     open();

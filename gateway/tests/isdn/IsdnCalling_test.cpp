@@ -165,6 +165,7 @@ TEST_F(IsdnCallingTest, ANumberWithoutARouteIsRefused)
     side->call("49");
     EXPECT_TRUE(watch.runUntil([&] { return side->has("HANGUP 3") || side->has("HANGUP_REQ 3"); }));
     expectNothingLeft();
+    EXPECT_EQ(counters.failed, 1u);
 }
 
 TEST_F(IsdnCallingTest, DigitsAreCollectedUntilTheNumberIsComplete)
@@ -279,6 +280,7 @@ TEST_F(IsdnCallingTest, ThePreferredChannelIsTakenAnotherIfItIsNotFree)
     side->call("4989123", true, 20, true);
     EXPECT_TRUE(watch.runUntil([&] { return side->has("HANGUP 44") || side->has("HANGUP_REQ 44"); }));
     EXPECT_EQ(fourth.getCall(), nullptr);
+    EXPECT_EQ(counters.failed, 1u);
 }
 
 TEST_F(IsdnCallingTest, ACallThatIsNotAdmittedIsRefused)
@@ -288,6 +290,36 @@ TEST_F(IsdnCallingTest, ACallThatIsNotAdmittedIsRefused)
     side->call("4989123");
     EXPECT_TRUE(watch.runUntil([&] { return side->has("HANGUP 42") || side->has("HANGUP_REQ 42"); }));
     EXPECT_EQ(interface->getNumberOfEndpoints(), 0u);
+}
+
+TEST_F(IsdnCallingTest, ARestartOfAChannelLeavesTheOthers)
+{
+    open();
+    side->call("4989123", true, 20);
+    ASSERT_TRUE(waitForOffer());
+    std::ignore = other.become(FakeModule::State::CONNECTED);
+    ASSERT_TRUE(waitFor("ANSWER"));
+    FakeModule third("third");
+    routes.front().to = "third";
+    side->take();
+    side->call("4989123", true, 21);
+    ASSERT_TRUE(watch.runUntil([&] { return third.getCall() != nullptr; }));
+    std::ignore = third.become(FakeModule::State::CONNECTED);
+    ASSERT_TRUE(waitFor("ANSWER"));
+    side->ask([](pri* stack) { return pri_reset(stack, 21); });
+    EXPECT_TRUE(watch.runUntil([&] { return third.getPeerState() == "RELEASED"; }, std::chrono::seconds(3)));
+    EXPECT_TRUE(waitFor("RESTART_ACK"));
+    third.hangUp();
+    EXPECT_TRUE(watch.runUntil([&] { return interface->getChannels().isFree(21); }, std::chrono::seconds(3)));
+    EXPECT_EQ(other.getPeerState(), "CONNECTED");
+    EXPECT_FALSE(interface->getChannels().isFree(20));
+    side->take();
+    routes.front().to = "third";
+    side->call("4989123", true, 21);
+    EXPECT_TRUE(watch.runUntil([&] { return third.getCall() != nullptr; })) << "it serves again";
+    third.hangUp();
+    other.hangUp();
+    expectNothingLeft();
 }
 
 TEST_F(IsdnCallingTest, ARestartClearsTheCall)

@@ -149,6 +149,14 @@ Situation const SITUATIONS[] = {
          test.side->notify(PRI_NOTIFY_REMOTE_HOLD);
          ASSERT_TRUE(test.waitForPeer("HELD"));
      }},
+    {"CallingIsOnHold", true, true, true,
+     [](IsdnLossTest& test)
+     {
+         test.bringUpCalling();
+         test.side->hold(test.side->getCall());
+         ASSERT_TRUE(test.waitFor("HOLD_ACK"));
+         ASSERT_TRUE(test.waitForPeer("HELD"));
+     }},
     {"CallingIsBeingCleared", true, false, false,
      [](IsdnLossTest& test)
      {

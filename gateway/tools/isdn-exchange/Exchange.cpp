@@ -83,6 +83,8 @@ Exchange::Exchange(IsdnWires&& wires, Plan const& plan, Capture& capture, Report
     pri_hangup_fix_enable(m_stack, 1);
     pri_hold_enable(m_stack, 1);
     pri_transfer_enable(m_stack, 1);
+    if (plan.t200 != 0)
+        pri_set_timer(m_stack, PRI_TIMER_T200, static_cast<int>(plan.t200));
 }
 
 Exchange::~Exchange()

@@ -173,6 +173,7 @@ try
     table.read("at-once", plan.atOnce);
     table.read("lost", plan.lost);
     table.read("repeated", plan.repeated);
+    table.read("t200", plan.t200);
     table.checkKeys();
     READ_EACH(toml, "number", [&](toml::table const& one) { plan.subscribers.push_back(READ_SUBSCRIBER(file, one)); });
     READ_EACH(toml, "call", [&](toml::table const& one) { plan.calls.push_back(READ_CALL(file, one)); });

@@ -86,6 +86,7 @@ struct Plan
     unsigned int atOnce = 0;     ///< calls of its own; those that are too many wait. 0: no limit
     unsigned int lost = 0;       ///< frames of the D channel, per cent
     unsigned int repeated = 0;   ///< the same
+    unsigned int t200 = 0;       ///< milliseconds until a frame is sent again (Q.921); 0: as the stack has it
     std::vector<Subscriber> subscribers;
     std::vector<Call> calls;
 
