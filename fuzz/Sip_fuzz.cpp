@@ -64,7 +64,7 @@ void READ_MESSAGE(std::string const& text)
         CHECK_LINES(SipIdentity::GET_ASSERTED(caller.party, OWN));
         CHECK_LINES(SipIdentity::GET_ASSERTED(SipIdentity::READ_CALLED(sip), OWN));
         CHECK_LINES(SipDiversion::READ(sip).getHeaders(OWN, "sip:4989@192.0.2.2"));
-        SipBody::READ(sip);
+        SipBody::READ(sip, true);
     }
     msg_destroy(message);
 }
@@ -107,10 +107,10 @@ void READ_INPUT(std::string const& text)
 
 void READ_BODY(std::string const& text)
 {
-    SipBody::READ(text, "multipart/mixed;boundary=b", {}, {});
+    SipBody::READ(text, "multipart/mixed;boundary=b", {}, {}, true);
     std::size_t const end = text.find('\n');
     if (end != std::string::npos)
-        SipBody::READ(std::string_view(text).substr(end + 1), std::string_view(text).substr(0, end), {}, {});
+        SipBody::READ(std::string_view(text).substr(end + 1), std::string_view(text).substr(0, end), {}, {}, true);
 }
 
 void READ_CHARGE(std::string const& text)

@@ -344,6 +344,7 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
                    "nat",
                    "redirections",
                    "headers",
+                   "isup",
                    "user",
                    "passwords",
                    "authenticate",
@@ -402,6 +403,9 @@ SipConfiguration SipConfiguration::READ(ConfigurationSection const& section, boo
     READ_HEADERS(section, interface);
     interface.isBehindNat = section.flag("nat");
     interface.isTrusted = section.has("trusted") ? section.flag("trusted") : !interface.authenticates;
+    interface.carriesIsup = section.flag("isup");
+    if (interface.carriesIsup && !interface.isTrusted)
+        section.refuse("isup", "tells who withholds his number: it is for peers that are trusted");
     READ_REGISTRAR(section, interface);
     READ_REGISTRATION(section, interface);
     interface.allow = section.ranges("allow");

@@ -83,6 +83,7 @@ struct SipConfiguration
     bool isBehindNat = false;           ///< its peers: they are where their messages come from
     bool isTrusted = true;              ///< its peers, in the sense of RFC 3325
     std::vector<std::string> headers{}; ///< names of those that cross besides the usual ones
+    bool carriesIsup = false;           ///< from and to its peers, as it stands
     std::string user;                   ///< as whom it shows itself to a peer that asks; empty: it does not
     std::shared_ptr<SipPasswords const> passwords; ///< with a user, or where it asks: never null
     bool authenticates = false;                    ///< asks who sends

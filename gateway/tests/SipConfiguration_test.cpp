@@ -233,6 +233,8 @@ TEST(SipConfiguration, WhatCannotBeServedIsOneLineWithFileKeyAndReason)
         {whole + "peers = [\"127.0.0.1:2\"]", "f: sip[0].peers: expected tables, [[peers]]"},
         {whole + "probe = 3601", "f: sip[0].probe: must be from 0 to 3600"},
         {whole + "transport = \"tls\"", "f: sip[0].tls-certificate: is missing"},
+        {whole + "isup = true\ntrusted = false",
+         "f: sip[0].isup: tells who withholds his number: it is for peers that are trusted"},
         {whole + "transport = \"named\"", "f: sip[0].transport: 'named' is for peers that have a name without a port"},
         {whole + "transport = \"tls\"\ntls-certificate = \"c\"", "f: sip[0].tls-key: is missing"},
         {whole + "transports = [\"udp\", \"tls\"]\ntls-certificate = \"c\"\ntls-key = \"k\"",

@@ -15,6 +15,7 @@
 #include "sip/message/SipCarriedHeaders.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipIdentity.h"
+#include "sip/message/SipIsup.h"
 #include "sip/message/SipParty.h"
 #include "sip/message/SipQuality.h"
 #include "sip/message/SipRedirection.h"
@@ -300,6 +301,9 @@ private:
 
     // headers that cross: SipEndpoint_Carried.cpp
     void addCarried(CC_PropertyContainer& own, sip_t const* message);
+    void addIsup(CC_PropertyContainer& own, sip_t const* message);
+    SipIsup getIsup();
+    SipIsup getNewIsup();
     void addUserToUser(CC_PropertyContainer& own, sip_t const* message);
     void takeCarried(sip_t const* message);
     std::string getCarried(SipCarriedHeaders::Message message);
@@ -430,11 +434,13 @@ private:
     std::string m_carried;                        // what our peer's last message had for the other side
     unsigned int m_userToUsers = 0;               // that our peer has sent
     std::optional<unsigned int> m_userToUserTold; // to our peer: its counter
-    SipParty m_called;                            // as far as its number has come
-    std::string m_firstOffer;                     // calling side: of the first INVITE, if others may follow
-    std::vector<nta_leg_t*> m_formerLegs;         // calling side: of INVITEs with fewer digits
-    std::vector<Attempt> m_attempts;              // called side
-    bool m_isNumberOpen = false;                  // called side: digits may follow
+    unsigned int m_isups = 0;                     // likewise
+    std::optional<unsigned int> m_isupTold;
+    SipParty m_called;                    // as far as its number has come
+    std::string m_firstOffer;             // calling side: of the first INVITE, if others may follow
+    std::vector<nta_leg_t*> m_formerLegs; // calling side: of INVITEs with fewer digits
+    std::vector<Attempt> m_attempts;      // called side
+    bool m_isNumberOpen = false;          // called side: digits may follow
     unsigned int m_maxForwards = 0;
     bool m_isReferring = false;    // our peer has asked for a transfer that is not done
     bool m_isTransferring = false; // the other side's has

@@ -94,12 +94,13 @@ bool SipEndpoint::answerReliably(int status, char const* phrase, std::string con
         SipIdentity::GET_ASSERTED(SipParty::OF_PEER(m_adapter), m_interface.getConfiguration().getAddress(),
                                   m_interface.getConfiguration().isTrusted) +
         getCarried(SipCarriedHeaders::RESPONSE);
-    SipContent const content = SipContent::OF(isAnswer ? session : std::string(), getTariffForAnswer());
+    SipContent const content = SipContent::OF(isAnswer ? session : std::string(), getTariffForAnswer(), getNewIsup());
+    sip_payload_t const payload = content.getPayload();
     nta_reliable_t const* const reliable = nta_reliable_treply(
         m_transaction, HANDLE_PRACK, this, status, phrase, SIPTAG_CONTACT_STR(getContact()),
         SIPTAG_ALLOW(m_interface.getAllow()), TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
         TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
-        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD_STR(content.body.c_str())), TAG_END());
+        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD(&payload)), TAG_END());
     if (reliable == nullptr)
         return false;
     trace("-> " + std::to_string(status) + (isAnswer ? " with a session description" : "") + ", reliably");
@@ -216,21 +217,26 @@ void SipEndpoint::answerFromPeer(int status, char const* phrase, std::string con
                                 (status >= 200 ? m_sessionTimer.getResponseHeaders() : std::string());
     if (status >= 200 && !session.empty())
         m_ownSession = session;
-    SipContent const content = SipContent::OF(session, getTariffForAnswer());
+    SipContent const content = SipContent::OF(session, getTariffForAnswer(), getNewIsup());
+    sip_payload_t const payload = content.getPayload();
     nta_incoming_treply(m_transaction, status, phrase, SIPTAG_CONTACT_STR(getContact()),
                         SIPTAG_ALLOW(m_interface.getAllow()), SIPTAG_SUPPORTED(m_interface.getSupported()),
                         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
                         TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
-                        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD_STR(content.body.c_str())), TAG_END());
+                        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD(&payload)), TAG_END());
 }
 
 void SipEndpoint::answerFinally(unsigned int status, std::string const& reasonHeader)
 {
     trace("-> " + std::to_string(status) + (reasonHeader.empty() ? "" : ", Reason: ") + reasonHeader);
     std::string const headers = getCarried(SipCarriedHeaders::RESPONSE);
+    SipContent const content = SipContent::OF({}, {}, getNewIsup());
+    sip_payload_t const payload = content.getPayload();
     nta_incoming_treply(m_transaction, static_cast<int>(status), nullptr,
                         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
-                        TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())), TAG_END());
+                        TAG_IF(!reasonHeader.empty(), SIPTAG_REASON_STR(reasonHeader.c_str())),
+                        TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
+                        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD(&payload)), TAG_END());
     forgetTransaction(); // the stack goes on repeating the answer until its ACK
 }
 

@@ -11,6 +11,7 @@
 #include "properties/CC_PropertyUnsigned.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/message/SipAddress.h"
+#include "sip/message/SipContent.h"
 #include "sip/message/SipDiversion.h"
 #include "sip/message/SipIdentity.h"
 #include "sip/message/SipPrivacy.h"
@@ -164,6 +165,8 @@ bool SipEndpoint::startInvite()
     noteSession(SipOfferAnswer::SENT, SipOfferAnswer::INVITE, m_ownSession);
     trace("-> INVITE " + m_inviteUri + (m_inviteRoute.empty() ? "" : " by " + m_inviteRoute) +
           (m_hasOffer ? " with a session description" : ""));
+    SipContent const content = SipContent::OF(m_ownSession, {}, getIsup());
+    sip_payload_t const payload = content.getPayload();
     m_invite.transaction = m_interface.getSender().send(
         m_leg, HANDLE_INVITE_RESPONSE, this, SIP_METHOD_INVITE, URL_STRING_MAKE(m_inviteUri.c_str()),
         SIPTAG_CONTACT_STR(getContact()), SIPTAG_MAX_FORWARDS_STR(hops.c_str()), SIPTAG_ALLOW(m_interface.getAllow()),
@@ -171,8 +174,8 @@ bool SipEndpoint::startInvite()
         TAG_IF(takesCharges, SIPTAG_ACCEPT_STR("application/sdp, application/vnd.etsi.aoc+xml")),
         TAG_IF(!m_inviteRoute.empty(), SIPTAG_ROUTE_STR(m_inviteRoute.c_str())),
         TAG_IF(!headers.empty(), SIPTAG_HEADER_STR(headers.c_str())),
-        TAG_IF(m_hasOffer, SIPTAG_CONTENT_TYPE_STR("application/sdp")),
-        TAG_IF(m_hasOffer, SIPTAG_PAYLOAD_STR(m_ownSession.c_str())), TAG_END());
+        TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
+        TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD(&payload)), TAG_END());
     if (m_invite.transaction == nullptr)
         return false;
     m_invite.sequence = nta_leg_get_seq(m_leg);

@@ -3,6 +3,7 @@
 #include "properties/CC_PropertyString.h"
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
+#include "sip/message/SipBody.h"
 #include "sip/message/SipProperty.h"
 #include "sip/message/SipPropertyId.h"
 #include "sip/message/SipUserToUser.h"
@@ -29,6 +30,39 @@ void SipEndpoint::addCarried(CC_PropertyContainer& own, sip_t const* message)
         m_carried = std::move(lines);
     }
     addUserToUser(own, message);
+    addIsup(own, message);
+}
+
+void SipEndpoint::addIsup(CC_PropertyContainer& own, sip_t const* message)
+{
+    if (!m_interface.getConfiguration().carriesIsup)
+        return;
+    if (SipIsup const isup = SipBody::READ(message, true).isup; !isup.isEmpty())
+    {
+        CC_PropertyParametrizedString::ParametrizedString const content(SipProperty::STRING(isup.getText()));
+        CC_PropertyParametrizedString property(SipPropertyId::ISUP);
+        property.setContent(m_isups++, content); // the same once more is news
+        SipProperty::ADD(own, property);
+    }
+}
+
+/// What came last from the other side, where our peer is to have it.
+SipIsup SipEndpoint::getIsup()
+{
+    auto const* const property = m_interface.getConfiguration().carriesIsup
+                                     ? getPeer<CC_PropertyParametrizedString>(SipPropertyId::ISUP)
+                                     : nullptr;
+    if (property == nullptr)
+        return {};
+    m_isupTold = property->getUpdateCounter();
+    return SipIsup::OF_TEXT(property->getContent().content.view());
+}
+
+/// The same, once.
+SipIsup SipEndpoint::getNewIsup()
+{
+    auto const* const property = getPeer<CC_PropertyParametrizedString>(SipPropertyId::ISUP);
+    return property != nullptr && m_isupTold != property->getUpdateCounter() ? getIsup() : SipIsup{};
 }
 
 void SipEndpoint::addUserToUser(CC_PropertyContainer& own, sip_t const* message)
@@ -46,7 +80,10 @@ void SipEndpoint::takeCarried(sip_t const* message)
 {
     CC_PropertyContainer own;
     if (message->sip_request != nullptr)
+    {
         addUserToUser(own, message);
+        addIsup(own, message);
+    }
     else
         addCarried(own, message);
     if (m_isInCall && !own.isEmpty())

@@ -3,8 +3,8 @@
 #include "sip/endpoint/SipEndpoint.h"
 #include "sip/endpoint/SipInterface.h"
 #include "sip/endpoint/SipRules.h"
-#include "sip/message/SipAdvice.h"
 #include "sip/message/SipBody.h"
+#include "sip/message/SipContent.h"
 #include "sip/message/SipPropertyId.h"
 
 int SipEndpoint::handleRequest(nta_leg_t*, nta_incoming_t* transaction, sip_t const* request)
@@ -110,11 +110,13 @@ void SipEndpoint::sendBye(SipCause const& cause)
     std::string const charge = getFinalCharge();
     std::string const userToUser = getLastUserToUser();
     trace("-> BYE" + std::string(charge.empty() ? "" : " with a charge") + ", Reason: " + reason);
+    SipContent const content = SipContent::OF({}, charge, getNewIsup());
+    sip_payload_t const payload = content.getPayload();
     m_bye = m_interface.getSender().send(m_leg, HANDLE_BYE_RESPONSE, this, SIP_METHOD_BYE, nullptr,
                                          SIPTAG_REASON_STR(reason.c_str()),
                                          TAG_IF(!userToUser.empty(), SIPTAG_HEADER_STR(userToUser.c_str())),
-                                         TAG_IF(!charge.empty(), SIPTAG_CONTENT_TYPE_STR(SipAdvice::TYPE)),
-                                         TAG_IF(!charge.empty(), SIPTAG_PAYLOAD_STR(charge.c_str())), TAG_END());
+                                         TAG_IF(!content.isEmpty(), SIPTAG_CONTENT_TYPE_STR(content.type.c_str())),
+                                         TAG_IF(!content.isEmpty(), SIPTAG_PAYLOAD(&payload)), TAG_END());
     if (m_bye != nullptr)
         return;
     advance(SipDialogState::BYE_DONE);
@@ -204,4 +206,5 @@ bool SipEndpoint::isInConference() const
     return m_adapter.getCallPropertyUnfiltered(SipPropertyId::CONFERENCE) != nullptr;
 }
 
-std::string SipEndpoint::SESSION_OF(sip_t const* message) { return SipBody::READ(message).session; }
+/// What else was in the way of a request has got it its 415 before; a response is taken as far as it is understood.
+std::string SipEndpoint::SESSION_OF(sip_t const* message) { return SipBody::READ(message, true).session; }

@@ -51,7 +51,7 @@ int SipEndpoint::onMoreDigits(nta_incoming_t* transaction, sip_t const* request)
     bool const isSameRoute = !routes.isEmpty() && routes.getProvider() == m_routes.getProvider() &&
                              routes.getNumber() == m_routes.getNumber() + digits;
     if (!isSameRoute || SESSION_OF(request) != m_firstOffer || request->sip_contact == nullptr ||
-        !SipBody::READ(request).isUnderstood())
+        !SipBody::READ(request, m_interface.getConfiguration().carriesIsup).isUnderstood())
     {
         clear({QCause::INVALID_NUMBER_FORMAT, ADDRESS_INCOMPLETE, {}});
         return m_interface.handleRequest(nullptr, transaction, request);

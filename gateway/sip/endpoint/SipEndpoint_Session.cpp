@@ -96,7 +96,8 @@ int SipEndpoint::checkOffer(nta_incoming_t* transaction, sip_t const* request)
         return 491;
     if (isEarly ? !isAgreedEarly() : m_dialog != SipDialogState::UP && m_dialog != SipDialogState::ANSWERED)
         return isEarly ? 491 : 481;
-    if (int const refused = SipRules::CHECK_BODY(transaction, request); refused != 0)
+    if (int const refused = SipRules::CHECK_BODY(transaction, request, m_interface.getConfiguration().carriesIsup);
+        refused != 0)
         return refused;
     if (int const refused = takeTimer(transaction, request); refused != 0)
         return refused;

@@ -392,7 +392,7 @@ int SipInterface::checkInvite(nta_incoming_t* transaction, sip_t const* request)
         nta_incoming_treply(transaction, 400, "Missing Contact Header", TAG_END());
         return 400;
     }
-    return SipRules::CHECK_BODY(transaction, request);
+    return SipRules::CHECK_BODY(transaction, request, m_configuration.carriesIsup);
 }
 
 bool SipInterface::admits(InternetAddress const& source)

@@ -59,9 +59,9 @@ int SipRules::CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request, 
     return nta_check_required(transaction, request, supported, TAG_END());
 }
 
-int SipRules::CHECK_BODY(nta_incoming_t* transaction, sip_t const* request)
+int SipRules::CHECK_BODY(nta_incoming_t* transaction, sip_t const* request, bool takesIsup)
 {
-    if (SipBody::READ(request).isUnderstood())
+    if (SipBody::READ(request, takesIsup).isUnderstood())
         return 0;
     nta_incoming_treply(transaction, SIP_415_UNSUPPORTED_MEDIA, SIPTAG_ACCEPT_STR(SipBody::ACCEPT),
                         SIPTAG_ACCEPT_ENCODING_STR(SipBody::ACCEPT_ENCODING), TAG_END());

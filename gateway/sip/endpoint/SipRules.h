@@ -18,7 +18,7 @@ int CHECK(nta_incoming_t* transaction, sip_t const* request, sip_supported_t con
 /// An extension that is required and not among the supported: 420 with Unsupported.
 int CHECK_REQUIRED(nta_incoming_t* transaction, sip_t const* request, sip_supported_t const* supported);
 /// A body, or an encoding, that is not understood and not optional either: 415 with Accept and Accept-Encoding.
-int CHECK_BODY(nta_incoming_t* transaction, sip_t const* request);
+int CHECK_BODY(nta_incoming_t* transaction, sip_t const* request, bool takesIsup);
 
 /// What the called side is to count down from: one less than the request's own, within bounds.
 unsigned int MAX_FORWARDS_AFTER(sip_t const* request);

@@ -132,7 +132,7 @@ private:
     bool m_isComplete = false;
 };
 
-SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternative, unsigned int depth)
+SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternative, bool takesIsup, unsigned int depth)
 {
     SipText::CUT(type, ';');
     std::string const boundary = SipReason::UNQUOTE(SipText::FIND_PARAMETER(type, ';', "boundary"));
@@ -146,7 +146,7 @@ SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternat
         if (number == MOST_PARTS)
             return {{}, SipBody::TYPE};
         Part const part = Part::OF(*text);
-        SipBody const read = SipBody::READ(part.body, part.type, part.encoding, part.disposition, depth + 1);
+        SipBody const read = SipBody::READ(part.body, part.type, part.encoding, part.disposition, takesIsup, depth + 1);
         isOneUnderstood = isOneUnderstood || read.isUnderstood();
         if (!read.isUnderstood())
             result.obstacle = read.obstacle;
@@ -154,6 +154,8 @@ SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternat
             result.session = read.session;
         if (read.isUnderstood() && result.advice.empty())
             result.advice = read.advice;
+        if (read.isUnderstood() && result.isup.isEmpty())
+            result.isup = read.isup;
     }
     if (!parts.isComplete())
         return {{}, SipBody::TYPE};
@@ -166,7 +168,7 @@ SipBody READ_PARTS(std::string_view body, std::string_view type, bool isAlternat
 } // namespace
 
 SipBody SipBody::READ(std::string_view body, std::string_view type, std::string_view encoding,
-                      std::string_view disposition, unsigned int depth)
+                      std::string_view disposition, bool takesIsup, unsigned int depth)
 {
     if (body.empty())
         return {};
@@ -180,8 +182,10 @@ SipBody SipBody::READ(std::string_view body, std::string_view type, std::string_
         result = {std::string(body), NONE};
     else if (SipAdvice::IS_TYPE(type) && IS_IDENTITY(encoding))
         result = {{}, NONE, std::string(body)};
+    else if (takesIsup && SipIsup::IS_TYPE(type) && IS_IDENTITY(encoding))
+        result = {{}, NONE, {}, {std::string(type), std::string(body)}};
     else if (isMultipart)
-        result = READ_PARTS(body, type, isAlternative, depth);
+        result = READ_PARTS(body, type, isAlternative, takesIsup, depth);
     if (IS_OPTIONAL(disposition))
         result.obstacle = NONE;
     return result;
@@ -199,7 +203,7 @@ std::string WITH_PARAMETERS(char const* value, msg_param_t const* parameters)
 }
 } // namespace
 
-SipBody SipBody::READ(sip_t const* message)
+SipBody SipBody::READ(sip_t const* message, bool takesIsup)
 {
     if (message->sip_payload == nullptr || message->sip_payload->pl_data == nullptr)
         return {};
@@ -215,7 +219,7 @@ SipBody SipBody::READ(sip_t const* message)
         IS_TYPE(TEXT_OF(type->c_type), "application/sdp"))
         return {std::string(body), NONE}; // most are
     return READ(body, type != nullptr ? WITH_PARAMETERS(type->c_type, type->c_params) : "", encoding,
-                disposition != nullptr ? WITH_PARAMETERS(disposition->cd_type, disposition->cd_params) : "");
+                disposition != nullptr ? WITH_PARAMETERS(disposition->cd_type, disposition->cd_params) : "", takesIsup);
 }
 
 std::string SipBody::PAYLOAD_OF(sip_t const* message)

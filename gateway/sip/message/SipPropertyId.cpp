@@ -21,7 +21,7 @@ XCode SipPropertyId::DECLARE()
           Names{SESSION_OFFER, "Session-Offer", "session-offer"},
           Names{SESSION_ANSWER, "Session-Answer", "session-answer"}, Names{CALL_NUMBER, "Call-Number", "call-number"},
           Names{MAX_FORWARDS, "Max-Forwards", "max-forwards"}, Names{REDIRECTION, "Redirection", "redirection"},
-          Names{CARRIED_HEADERS, "Carried-Headers", "carried-headers"}})
+          Names{CARRIED_HEADERS, "Carried-Headers", "carried-headers"}, Names{ISUP, "ISUP", "isup"}})
         if (std::strcmp(NAME(names.id), names.longName) != 0)
             if (XCode const result = CC_PropertyTable::DECLARE(names.id, names.longName, names.shortName);
                 !result.isOk())

@@ -42,7 +42,7 @@ callee_of_hidden() {
 }
 private_caller() { hanging_up_caller 'Privacy: user;critical'; }
 callee_of_private() {
-    expect_invite From: 'sip:anonymous@anonymous.invalid' Privacy: 'id' nowhere 'Alice|4420'
+    expect_invite From: 'sip:anonymous@anonymous.invalid' Privacy: 'id' nowhere 'Alice|4420[@>]'
     ending_callee
 }
 
