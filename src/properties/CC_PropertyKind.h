@@ -28,8 +28,9 @@ public:
     /// Whether nobody hears of an assignment or the object's end either. The media layer may hear of a context's.
     bool isSelfContained;
 
-    /// The class's place among the library's own (CC_PropertyClasses); NO_PLACE for a module's.
+    /// The class's place among the library's own (CC_PropertyClasses), or NO_PLACE.
     unsigned int place;
+    /// The place of a module's class.
     static constexpr unsigned int NO_PLACE = ~0U;
 
     /// The kind of the object's very class; null for a module's that was not declared. Any thread.
