@@ -5,6 +5,7 @@
 #include "tests/support/TestLine.h"
 
 #include <algorithm>
+#include <functional>
 #include <random>
 #include <set>
 #include <vector>
@@ -75,6 +76,55 @@ private:
     CC_CallLeg const& m_leg;
 };
 
+/// Changes a leg that joins the call, after the adapters there were told that it comes and before they hear of it.
+class Guest : public CC_CallObserver
+{
+public:
+    using Change = std::function<XCode(CC_CallLeg&)>;
+
+    Guest(CC_Call& call, Change change) : m_call(call), m_change(std::move(change))
+    {
+        EXPECT_TRUE(call.addCallObserver(this).isOk());
+    }
+    ~Guest() override { m_call.removeCallObserver(this); }
+
+    void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
+    void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
+    void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
+    void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
+    {
+        EXPECT_TRUE(m_change(*CC_EvCallCallLegModified::FROM(event).getCallLeg()).isOk());
+    }
+
+private:
+    CC_Call& m_call;
+    Change m_change;
+};
+
+/// A leg without an adapter, in the call for as long as this lives.
+class JoinedLeg
+{
+public:
+    JoinedLeg(CC_Call& call, char const* name, State::State state) : leg(*new CC_CallLeg), m_call(call)
+    {
+        EXPECT_TRUE(leg.setProperty(CC_PropertyString(NAME, name)).isOk());
+        EXPECT_TRUE(leg.setProperty(State(STATE, state)).isOk());
+        EXPECT_TRUE(call.addCallLeg(leg).isOk());
+    }
+    ~JoinedLeg()
+    {
+        m_call.removeCallLeg(leg);
+        leg.removeReference();
+    }
+    JoinedLeg(JoinedLeg const&) = delete;
+    JoinedLeg& operator=(JoinedLeg const&) = delete;
+
+    CC_CallLeg& leg;
+
+private:
+    CC_Call& m_call;
+};
+
 class CC_CallAdapter_Following_Test : public TestLines
 {
 protected:
@@ -94,6 +144,13 @@ protected:
         CC_PropertyContainer shown;
         EXPECT_TRUE((adapter.*get)(shown, CC_PropertyContainer::ALL_GROUPS).isOk());
         return TEXT_OF(shown);
+    }
+
+    /// a's call with nobody in it yet.
+    void dialNobody()
+    {
+        provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
+        ASSERT_TRUE(a.dial().isOk());
     }
 
     unsigned int random(unsigned int below) { return static_cast<unsigned int>(m_random() % below); }
@@ -215,106 +272,41 @@ TEST_F(CC_CallAdapter_Following_Test, HoweverALegChangesItsViewsAreThoseOfAFullC
 
 TEST_F(CC_CallAdapter_Following_Test, AChangeThatComesBeforeTheAdapterHearsOfTheLegIsSeenWhenTheModuleIsTold)
 {
-    struct Guest : CC_CallObserver
-    {
-        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
-        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
-        {
-            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
-            EXPECT_TRUE(leg->setProperty(CC_PropertyString(NAME, "by the guest")).isOk());
-        }
-    };
-    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
-    ASSERT_TRUE(a.dial().isOk());
-    Guest guest;
-    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter
+    dialNobody();
+    Guest guest(theCall(), [](CC_CallLeg& leg) { return leg.setProperty(CC_PropertyString(NAME, "by the guest")); });
     ASSERT_TRUE(b.accept(theCall()).isOk());
     listen();
     EXPECT_EQ(a.peer(NAME), "by the guest");
     b.say(DISPLAY, "B");
     EXPECT_EQ(heardBy(a), Lines{"a: peer changed (Display)"});
-    theCall().removeCallObserver(&guest);
 }
 
 TEST_F(CC_CallAdapter_Following_Test, AChangeOfAJoiningLegThatLooksLikeTheFormerPeerIsSeenToo)
 {
-    /// Makes way for a leg that joins, and changes that as well.
-    struct Guest : CC_CallObserver
-    {
-        explicit Guest(CC_CallLeg& peer) : former(peer) {}
-        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
-        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
-        {
-            EXPECT_TRUE(former.setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::RELEASED)).isOk());
-            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
-            EXPECT_TRUE(leg->setProperty(CC_PropertyString(NAME, "by the guest")).isOk());
-        }
-        CC_CallLeg& former;
-    };
-    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
-    ASSERT_TRUE(a.dial().isOk());
-    CC_CallLeg* const legs[] = {new CC_CallLeg, new CC_CallLeg};
-    for (CC_CallLeg* const leg : legs)
-    {
-        ASSERT_TRUE(leg->setProperty(CC_PropertyString(NAME, "alike")).isOk());
-        ASSERT_TRUE(leg->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::CONNECTED)).isOk());
-    }
-    ASSERT_TRUE(theCall().addCallLeg(*legs[0]).isOk());
+    dialNobody();
+    JoinedLeg const former(theCall(), "alike", State::CONNECTED);
     settle();
-    Guest guest(*legs[0]);
-    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter
-    ASSERT_TRUE(theCall().addCallLeg(*legs[1]).isOk());
+    Guest guest(theCall(),
+                [&](CC_CallLeg& leg)
+                {
+                    EXPECT_TRUE(former.leg.setProperty(State(STATE, State::RELEASED)).isOk()); // makes way
+                    return leg.setProperty(CC_PropertyString(NAME, "by the guest"));
+                });
+    JoinedLeg const next(theCall(), "alike", State::CONNECTED);
     settle();
     EXPECT_EQ(a.peer(NAME), "by the guest");
-    theCall().removeCallObserver(&guest);
-    for (CC_CallLeg* const leg : legs)
-    {
-        theCall().removeCallLeg(*leg);
-        leg->removeReference();
-    }
 }
 
 TEST_F(CC_CallAdapter_Following_Test, ALegThatRisesWhileItJoinsTakesOver)
 {
-    /// Raises a leg that joins.
-    struct Guest : CC_CallObserver
-    {
-        void onCallObservationEnded(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegRemoved(CC_Event<CC_Call> const&) override {}
-        void onCallPropertyChanged(CC_Event<CC_Call> const&) override {}
-        void onCallCallLegAdded(CC_Event<CC_Call> const& event) override
-        {
-            CC_CallLeg* const leg = CC_EvCallCallLegModified::FROM(event).getCallLeg();
-            EXPECT_TRUE(leg->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::CONNECTED)).isOk());
-        }
-    };
-    provider.m_dial = [](CC_Call&, String const&, String const&, CC_PropertyContainer const&) { return XCode::OK; };
-    ASSERT_TRUE(a.dial().isOk());
-    CC_CallLeg* const legs[] = {new CC_CallLeg, new CC_CallLeg};
-    char const* const names[] = {"the first", "the second"};
-    for (int i = 0; i < 2; ++i)
-    {
-        ASSERT_TRUE(legs[i]->setProperty(CC_PropertyString(NAME, names[i])).isOk());
-        ASSERT_TRUE(legs[i]->setProperty(CC_PropertyCallLegState(STATE, CC_PropertyCallLegState::TRYING)).isOk());
-    }
-    ASSERT_TRUE(theCall().addCallLeg(*legs[0]).isOk());
+    dialNobody();
+    JoinedLeg const first(theCall(), "the first", State::TRYING);
     settle();
     EXPECT_EQ(a.peer(NAME), "the first");
-    Guest guest;
-    ASSERT_TRUE(theCall().addCallObserver(&guest).isOk()); // told after a's adapter, for which it was no peer
-    ASSERT_TRUE(theCall().addCallLeg(*legs[1]).isOk());
+    Guest guest(theCall(), [](CC_CallLeg& leg) { return leg.setProperty(State(STATE, State::CONNECTED)); });
+    JoinedLeg const second(theCall(), "the second", State::TRYING); // no peer yet when a's adapter is told
     settle();
     EXPECT_EQ(a.peer(NAME), "the second");
-    theCall().removeCallObserver(&guest);
-    for (CC_CallLeg* const leg : legs)
-    {
-        theCall().removeCallLeg(*leg);
-        leg->removeReference();
-    }
 }
 
 TEST_F(CC_CallAdapter_Following_Test, AChangeInsideTheNewsThroughWhichTheLegJoinsIsSeenToo)
