@@ -56,7 +56,7 @@ snd_path $folder
 END
     echo "<sip:inner@$NETWORK.1:$PORT_A>;regint=600;audio_codecs=PCMU;answermode=auto;auth_user=inner;auth_pass=secret" >"$folder/accounts"
     touch "$folder/contacts"
-    in_phone baresip -f "$folder" </dev/null >"$WORK/inner.log" 2>&1 &
+    ip netns exec $PHONE baresip -f "$folder" </dev/null >"$WORK/inner.log" 2>&1 & # not by the function: that would be a shell with a child
     background+=($!)
 }
 tell_inner_phone() {
