@@ -3,6 +3,8 @@
 #include "callcontrol/CallControl.h"
 #include "configuration/Configuration.h"
 #include "platform/eventloop/TYEvent.h"
+#include "properties/CC_PropertyKind.h"
+#include "sip/dialog/SipSessionWord.h"
 #include "sip/message/SipCause.h"
 #include "sip/message/SipPropertyId.h"
 #include "sip/registrar/SipBindingStore.h"
@@ -11,6 +13,7 @@
 
 #include <algorithm>
 #include <stdexcept>
+#include <tuple>
 
 namespace
 {
@@ -49,6 +52,7 @@ void SipModule::open(GatewayHost& host)
 {
     if (!SipPropertyId::DECLARE().isOk())
         throw std::runtime_error("the names of the SIP properties cannot be declared");
+    std::ignore = CC_PropertyKind::DECLARE<SipSessionWord>(); // where there is no room it only takes longer
     m_environment.emplace(SipEnvironment{host, m_stack});
     m_removal = new TYEvent(
         *CallControl::GET_CC_EVENT_LOOP(), EventPrio::LOW,

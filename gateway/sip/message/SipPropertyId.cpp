@@ -1,8 +1,6 @@
 #include "sip/message/SipPropertyId.h"
 
-#include "properties/CC_PropertyKind.h"
 #include "properties/CC_PropertyTable.h"
-#include "sip/dialog/SipSessionWord.h"
 
 #include <cstring>
 #include <initializer_list>
@@ -26,7 +24,7 @@ XCode SipPropertyId::DECLARE()
             if (XCode const result = CC_PropertyTable::DECLARE(names.id, names.longName, names.shortName);
                 !result.isOk())
                 return result;
-    return CC_PropertyKind::DECLARE<SipSessionWord>(); // a value and nothing else, of legs that have it all the time
+    return XCode::OK;
 }
 
 char const* SipPropertyId::NAME(unsigned int id)

@@ -33,7 +33,7 @@ inline constexpr unsigned int REDIRECTION = CC_PropertyId::FIRST_OF_MODULES + 9;
 /// CC_PropertyParametrizedString, of a leg: the last message of ISUP that its peer has sent (SipIsup)
 inline constexpr unsigned int ISUP = CC_PropertyId::FIRST_OF_MODULES + 10;
 
-/// Declares SipSessionWord as a class that does nothing but hold a value, and the names of these, with which logs and
+/// Declares the names of these, with which logs and
 /// dumps show them from then on: OK, also when they have these already; otherwise as CC_PropertyTable::DECLARE.
 XCode DECLARE();
 /// The name of any property id, these included once they are declared; "(unknown)" otherwise.
