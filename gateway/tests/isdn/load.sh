@@ -21,7 +21,7 @@ done >>"$WORK/gateway.toml"
 # 34, so there are more calls than channels have seconds.
 start_exchange <<END
 lost = $lost
-t200 = 200
+t200 = $((lost > 1 ? 200 : 1000))
 at-once = 30
 [[call]]
 to = "4989123"
